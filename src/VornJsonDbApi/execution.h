@@ -1,0 +1,27 @@
+// What the operations share beside runSqlEx.
+#pragma once
+
+#include "util/log.h"
+
+#include <string>
+
+// The row callback of sqlite3_exec: decodes the row into an object, typed by the member types of
+// the table whose statement is running, and appends it to the Json::Value array that arg points to.
+// Returns 0, or -1 to stop the statement. What is thrown inside is kept for runSqlEx to throw
+// again.
+int DbCallBackFillList(void* arg, int n_column, char** column_value, char** column_name);
+
+// The context line of a failed operation, when SQLite had something to say.
+inline void logSqlError(const std::string& strSqlError, const std::string& strSql)
+{
+    if (!strSqlError.empty())
+        LOG_PLAIN("sql error, err=%s, sql=%s", strSqlError.c_str(), strSql.c_str());
+}
+
+// Whether SQLite's last error text tells of a UNIQUE or PRIMARY KEY violation.
+inline bool isDuplicateKey(const std::string& strSqlError)
+{
+    return std::string::npos != strSqlError.find("UNIQUE constraint failed");
+}
+
+inline constexpr char kDuplicateKeyMessage[] = "DUPLICATE_PRIMARY_KEY";

@@ -1,0 +1,202 @@
+// The text so far is itself a format of sqlite3_mprintf. Its grammar there:
+//
+//     conversion = "%" flag* [width] ["." [precision]] ["l" | "ll"] type
+//     flag       = "-" | "+" | " " | "#" | "!" | "0" | ","
+//     width      = digits | "*"        precision = digits | "*"
+//     type       = d i r              signed integer       (r: 1st, 2nd, ...)
+//                | u x X o p          unsigned integer
+//                | c                  a character by its code
+//                | f e E g G          floating point
+//                | s z q Q w          text                 (z: released by the formatter)
+//                | n                  no output, stores the length so far through a pointer
+//                | %                  a percent sign, takes no argument
+//
+// Any other type ends the output at its "%". A lone "%" at the very end is written.
+//
+// One value is passed, and a text may ask for more. So each conversion is formatted on its own:
+// every "*", every "%n" and every other conversion but "%%" takes one slot, in order. The first
+// slot is the value, given only to a conversion of its own kind; all others are 0, 0.0 or NULL of
+// the conversion's kind. "%n" stores nothing, "%z" releases nothing, "*" means no width. A width or
+// precision above kMaxField counts as kMaxField, so that data cannot ask for gigabytes.
+
+#include "VornJsonDbApi/formatted_text.h"
+
+#include "util/sqlite_text.h"
+
+#include <algorithm>
+#include <cstring>
+#include <utility>
+
+namespace {
+
+constexpr unsigned kMaxField = 4096;
+
+enum class TypeKind {
+    kEnd,
+    kSigned,
+    kUnsigned,
+    kPointer,
+    kCharacter,
+    kFloat,
+    kText,
+    kLength,
+    kPercent
+};
+
+struct Conversion {
+    std::string strFormat;  // without its "*", with width and precision limited, "z" as "s"
+    int iStars = 0;
+    int iLongs = 0;
+    TypeKind type = TypeKind::kEnd;
+};
+
+TypeKind typeKind(char cType)
+{
+    switch (cType) {
+    case 'd':
+    case 'i':
+    case 'r': return TypeKind::kSigned;
+    case 'u':
+    case 'x':
+    case 'X':
+    case 'o': return TypeKind::kUnsigned;
+    case 'p': return TypeKind::kPointer;
+    case 'c': return TypeKind::kCharacter;
+    case 'f':
+    case 'e':
+    case 'E':
+    case 'g':
+    case 'G': return TypeKind::kFloat;
+    case 's':
+    case 'z':
+    case 'q':
+    case 'Q':
+    case 'w': return TypeKind::kText;
+    case 'n': return TypeKind::kLength;
+    case '%': return TypeKind::kPercent;
+    default: return TypeKind::kEnd;
+    }
+}
+
+bool isDigit(char c)
+{
+    return '0' <= c && c <= '9';
+}
+
+// Reads digits or a "*" at szText into the conversion and returns the first character behind them.
+const char* readField(const char* szText, Conversion& conversion)
+{
+    if ('*' == *szText) {
+        ++conversion.iStars;
+        return szText + 1;
+    }
+    if (!isDigit(*szText)) return szText;
+    unsigned uField = 0;
+    for (; isDigit(*szText); ++szText) uField = uField * 10 + static_cast<unsigned>(*szText - '0');
+    // SQLite lets the number wrap at 32 bits and drops the sign.
+    conversion.strFormat += std::to_string(std::min(uField & 0x7fffffffU, kMaxField));
+    return szText;
+}
+
+// Reads the conversion behind a "%" and moves szText behind it.
+Conversion readConversion(const char*& szText)
+{
+    Conversion conversion;
+    const std::size_t nFlags = strspn(szText, "-+ #!0,");
+    conversion.strFormat.assign("%").append(szText, nFlags);
+    szText = readField(szText + nFlags, conversion);
+    if ('.' == *szText) {
+        conversion.strFormat += '.';
+        szText = readField(szText + 1, conversion);
+    }
+    for (; 'l' == *szText && 2 > conversion.iLongs; ++szText) {
+        conversion.strFormat += 'l';
+        ++conversion.iLongs;
+    }
+    conversion.type = typeKind(*szText);
+    if (TypeKind::kEnd == conversion.type) return conversion;
+    conversion.strFormat += 'z' == *szText ? 's' : *szText;
+    ++szText;
+    return conversion;
+}
+
+// Constructing from a null result throws std::logic_error, which is how a lack of memory ends here.
+template <typename Argument>
+std::string format(const char* szFormat, Argument argument)
+{
+    const SqliteText szText(sqlite3_mprintf(szFormat, argument));
+    return std::string(static_cast<const char*>(szText));
+}
+
+std::string formatInteger(const Conversion& conversion, long long iValue)
+{
+    const char* szFormat = conversion.strFormat.c_str();
+    if (TypeKind::kCharacter == conversion.type) return format(szFormat, static_cast<int>(iValue));
+    if (TypeKind::kPointer == conversion.type || 2 == conversion.iLongs)
+        return format(szFormat, iValue);
+    if (1 == conversion.iLongs) return format(szFormat, static_cast<long>(iValue));
+    return format(szFormat, static_cast<int>(iValue));
+}
+
+std::string formatConversion(const Conversion& conversion, const FormatArgument& argument)
+{
+    switch (conversion.type) {
+    case TypeKind::kSigned:
+    case TypeKind::kUnsigned:
+    case TypeKind::kPointer:
+    case TypeKind::kCharacter: return formatInteger(conversion, argument.iValue);
+    case TypeKind::kFloat: return format(conversion.strFormat.c_str(), argument.dValue);
+    case TypeKind::kText: return format(conversion.strFormat.c_str(), argument.szValue);
+    case TypeKind::kPercent: return format(conversion.strFormat.c_str(), 0);
+    case TypeKind::kLength:
+    case TypeKind::kEnd: break;
+    }
+    return std::string();
+}
+
+// Formats a text that holds conversions.
+std::string formatText(const char* szText, FormatArgument value)
+{
+    std::string strOut;
+    const auto takeSlot = [&value] { return std::exchange(value, FormatArgument()); };
+    for (;;) {
+        const char* szPercent = strchr(szText, '%');
+        if (nullptr == szPercent) return strOut += szText;
+        strOut.append(szText, szPercent);
+        szText = szPercent + 1;
+        if ('\0' == *szText) return strOut += '%';
+
+        const Conversion conversion = readConversion(szText);
+        if (TypeKind::kEnd == conversion.type) return strOut;
+        for (int i = 0; i < conversion.iStars; ++i) takeSlot();
+        const FormatArgument argument =
+            TypeKind::kPercent == conversion.type ? FormatArgument() : takeSlot();
+        strOut += formatConversion(conversion, argument);
+        // The character with the code 0 ends the text.
+        if (TypeKind::kCharacter == conversion.type && 0 == static_cast<int>(argument.iValue))
+            return strOut;
+    }
+}
+
+bool isPlain(const std::string& strText)
+{
+    return std::string::npos == strText.find('%') && std::string::npos == strText.find('\0');
+}
+
+}  // namespace
+
+FormattedText::FormattedText(std::string strText)
+    : strText_(std::move(strText)), blPlain_(isPlain(strText_))
+{
+}
+
+void FormattedText::appendValue(const char* szConversion, const FormatArgument& argument)
+{
+    const std::string strFormat = blPlain_ ? szConversion : strText_ + szConversion;
+    const std::string strFormatted = formatText(strFormat.c_str(), argument);
+    if (blPlain_)
+        strText_ += strFormatted;
+    else
+        strText_ = strFormatted;
+    blPlain_ = isPlain(blPlain_ ? strFormatted : strText_);
+}

@@ -1,0 +1,44 @@
+// The text of a value list, which grows by one formatted value at a time.
+#pragma once
+
+#include <string>
+
+// A value and its kind, as SQLite's formatter takes it.
+struct FormatArgument {
+    enum class Kind { kNone, kInteger, kFloat, kText };
+
+    Kind kind = Kind::kNone;
+    long long iValue = 0;
+    double dValue = 0;
+    const char* szValue = nullptr;
+
+    static FormatArgument integer(long long iValue) { return {Kind::kInteger, iValue, 0, nullptr}; }
+    static FormatArgument floating(double dValue) { return {Kind::kFloat, 0, dValue, nullptr}; }
+    static FormatArgument text(const char* szValue) { return {Kind::kText, 0, 0, szValue}; }
+};
+
+// Kept: by contract every value is appended as
+//
+//     text = sqlite3_mprintf(text + conversion, value)
+//
+// with the whole text so far, stored values included, as the format; so a "%" in an earlier value
+// is read as a conversion of its own by every later one. This class gives the same bytes wherever C
+// defines them, in linear time while the text holds no "%", and without reading arguments that were
+// never passed where it does. The rules stand in formatted_text.cpp.
+class FormattedText {
+public:
+    explicit FormattedText(std::string strText);
+
+    // Appends one conversion of sqlite3_mprintf ("%Q", "%lld", "%llu", "%f", "%lf") and formats the
+    // text with the argument. Throws std::logic_error when SQLite finds no memory.
+    void appendValue(const char* szConversion, const FormatArgument& argument);
+
+    // Appends text that holds neither "%" nor a NUL byte.
+    void append(const char* szText) { strText_ += szText; }
+
+    const std::string& text() const { return strText_; }
+
+private:
+    std::string strText_;
+    bool blPlain_;
+};

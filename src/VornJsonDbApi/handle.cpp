@@ -1,0 +1,43 @@
+#include "VornJsonDbApi/execution.h"
+#include "util/log.h"
+
+#include <VornJsonDbApi.h>
+
+#include <utility>
+
+// The constructor's argument checks are of the plain family, and construction goes on.
+#define REPORT(COND) ((COND) ? LOG_PLAIN("Failed [%s]", #COND) : void())
+
+VornJsonDbApi::VornJsonDbApi(sqlite3* pDatabase, std::string& strTable, Json::Value& jDefinition,
+                             std::string& strCreate)
+    : pDb(pDatabase), strName(strTable), jTableDef(jDefinition), strSqlCreate(strCreate)
+{
+    REPORT(!pDb);
+    REPORT(strName.empty());
+    REPORT(jTableDef.empty());
+    REPORT(strSqlCreate.empty());
+    (void)FAILED(0 > tableCreate());
+}
+
+VornJsonDbApi::~VornJsonDbApi()
+{
+    pDb = nullptr;
+}
+
+int VornJsonDbApi::tableCreate()
+{
+    if (0 <= runSqlEx(strSqlCreate)) return 0;
+    LOG_ERROR("create table failed, sql=%s", strSqlCreate.c_str());
+    logSqlError(strSqlError, strSqlCreate);
+    return -1;
+}
+
+void VornJsonDbApi::setErrMsg(std::string strMsg)
+{
+    strErrMsg = std::move(strMsg);
+}
+
+std::string VornJsonDbApi::getErrMsg()
+{
+    return strErrMsg;
+}

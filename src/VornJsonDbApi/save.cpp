@@ -1,0 +1,56 @@
+#include "VornJsonDbApi/execution.h"
+#include "util/json_text.h"
+#include "util/log.h"
+
+#include <VornJsonDbApi.h>
+
+#include <utility>
+
+// INSERT INTO t (a,b) VALUES (1,'x') ;select * from t where rowid == last_insert_rowid();
+int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
+{
+    std::string strSql;
+    Json::Value jArrayTmp(Json::arrayValue);
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const auto fail = [&] {
+        LOG_PLAIN("blCreate=%d, jRecInOut=%s", blCreate, toString(jRecInOut).c_str());
+        LOG_PLAIN("jType=%s", toString(jType).c_str());
+        logSqlError(strSqlError, strSql);
+        return -1;
+    };
+
+    strSql.append(blCreate ? "INSERT INTO " : "REPLACE INTO ").append(strName).append(" (");
+    if (FAILED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();
+    strSql += ") VALUES (";
+    if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
+    strSql.append(";select * from ").append(strName).append(" where rowid == last_insert_rowid();");
+    if (FAILED(strSql.empty())) return fail();
+    if (FAILED(0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp))) return fail();
+    if (!strSqlError.empty()) {
+        LOG_ERROR("sql error, sql=%s", strSql.c_str());
+        return fail();
+    }
+    if (FAILED(0 == jArrayTmp.size())) return fail();
+
+    jRecInOut = std::move(jArrayTmp[0]);
+    return 0;
+}
+
+int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
+{
+    Json::Value jParam = jRecIn;
+    // Kept: the text of an earlier failure counts too, also where this call ran no SQL.
+    const auto fail = [&] {
+        LOG_PLAIN("call create rec, rec=%s", toString(jParam).c_str());
+        if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;
+        return -1;
+    };
+
+    if (FAILED(jRecIn.empty())) return fail();
+    if (FAILED(0 > fillDefaultValue(jParam, false))) return fail();
+    if (FAILED(0 > checkJsonType(jParam))) return fail();
+    if (FAILED(0 > recSave(jParam, true))) return fail();
+
+    jRecOut = std::move(jParam);
+    return 0;
+}

@@ -1,0 +1,34 @@
+// Owner of a text that SQLite allocated.
+#pragma once
+
+#include <sqlite3.h>
+
+// Assignable from sqlite3_mprintf and comparable with NULL, so that a check can stand in the code
+// just as it is logged.
+class SqliteText {
+public:
+    SqliteText() = default;
+    explicit SqliteText(char* szText) : szText_(szText) {}
+    ~SqliteText() { sqlite3_free(szText_); }
+    SqliteText(const SqliteText&) = delete;
+    SqliteText& operator=(const SqliteText&) = delete;
+
+    SqliteText& operator=(char* szText)
+    {
+        sqlite3_free(szText_);
+        szText_ = szText;
+        return *this;
+    }
+
+    operator const char*() const { return szText_; }
+
+    // For sqlite3_exec to put its error text into; what was held before is released.
+    char** receive()
+    {
+        *this = nullptr;
+        return &szText_;
+    }
+
+private:
+    char* szText_ = nullptr;
+};

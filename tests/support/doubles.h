@@ -1,0 +1,61 @@
+// Doubles for what the library calls outside itself, put in by symbol interposition: the functions
+// are defined in the test program, where the loader finds them before the real ones. By default
+// they pass every call on; the log is always caught.
+#pragma once
+
+#include <sqlite3.h>
+
+#include <ctime>
+#include <functional>
+#include <string>
+#include <vector>
+
+namespace doubles {
+
+using RowCallback = int (*)(void*, int, char**, char**);
+using Exec = std::function<int(sqlite3*, const char*, RowCallback, void*, char**)>;
+
+// One line as the library wrote it.
+struct LogRecord {
+    bool blSyslog;  // otherwise printf
+    int iPriority;  // of syslog, otherwise -1
+    int iErrno;     // when the line was written
+    std::string strText;
+};
+
+struct State {
+    // sqlite3_exec: the texts that were run since the last reset, and a replacement.
+    std::vector<std::string> statements;
+    Exec exec;
+    // usleep: never sleeps in earnest, unless told to.
+    std::vector<unsigned> sleeps;
+    bool blReallySleep = false;
+    // syslog and printf.
+    std::vector<LogRecord> log;
+    // sqlite3_changes: what it answers instead of the truth.
+    std::function<int()> changes;
+    // sqlite3_mprintf: the n-th call from now (1 is the next one) gives NULL; 0 is never.
+    int iFailMprintf = 0;
+    // operator new: the n-th call from now throws std::bad_alloc; 0 is never.
+    int iFailNew = 0;
+    // operator new: what it leaves in errno, as an allocator may; 0 leaves errno alone.
+    int iErrnoOfNew = 0;
+    // gmtime_r, localtime_r and strftime fail.
+    bool blFailTime = false;
+    bool blFailStrftime = false;
+    // time: what it answers instead of the truth; -1 is the truth.
+    time_t now = -1;
+};
+
+State& state();
+
+// Back to passing every call on, with nothing recorded.
+void reset();
+
+// The real sqlite3_exec, unrecorded.
+int realExec(sqlite3* pDb, const char* szSql, RowCallback callback, void* arg, char** errText);
+
+// An error text as SQLite would hand it out.
+char* errorText(const char* szText);
+
+}  // namespace doubles
