@@ -47,6 +47,7 @@
 #include <json/value.h>
 
 #include <string>
+#include <vector>
 
 /// Marks what the shared library exports.
 #define VORN_JSON_DB_EXPORT __attribute__((visibility("default")))
@@ -61,6 +62,13 @@ struct sqlite3;
 extern VORN_JSON_DB_EXPORT bool blLogToStdout;
 /// True: also log trace lines, which report no failure.
 extern VORN_JSON_DB_EXPORT bool blDebugOutput;
+
+/// How SqlExpandMemberList() joins its terms.
+enum {
+    VORN_SQL_WHERE_TYPE_OR = 0,    ///< ` (a or b )`
+    VORN_SQL_WHERE_TYPE_AND = 1,   ///< ` (a and b )`
+    VORN_SQL_WHERE_TYPE_COMMA = 2  ///< `a , b`
+};
 
 namespace VORN_JSON_DB {
 
@@ -84,6 +92,30 @@ namespace VORN_JSON_DB {
 /// again. The reference stays valid until the process ends; what a host changes through it holds
 /// from the next statement on.
 VORN_JSON_DB_EXPORT Json::Value& recType(Json::Value& jTableDef, std::string& strJsonName);
+
+/// Copies the members of the object @p jSubSet into @p jIn, which is an object or null: those that
+/// @p jIn lacks, and with @p blOverwrite also those that it has. Members are copied whole, not
+/// merged. Returns 0, or -1 with @p jIn unchanged when one of the two is of another kind.
+VORN_JSON_DB_EXPORT int jsonCopyMember(Json::Value& jIn, Json::Value& jSubSet, bool blOverwrite);
+
+/// Sets @p now to the seconds since the epoch plus @p offsetSecond. Returns 0.
+VORN_JSON_DB_EXPORT int getTimeAfterNow(int offsetSecond, long& now);
+
+/// Sets @p strOut to the present time plus @p offsetSecond seconds as convert2ReadableTime() writes
+/// it. Returns 0, or -1 with @p strOut unchanged.
+VORN_JSON_DB_EXPORT int getTimeAfterNow(int offsetSecond, std::string& strOut, int iType);
+
+/// Sets @p strOut to @p ullTimeStamp, in seconds since the epoch, as text. Of the bit set @p iType
+/// only these are read:
+///
+/// - 1: UTC, otherwise local time
+/// - 2: `Thu, 01 Jan 1970 00:00:00 GMT`, the letters GMT also after local time; wins over 4
+/// - 4: `1970-01-01 00:00:00`
+///
+/// So 3, 4 and 5 say what they mean. Names of days and months follow the host's locale. Returns 0,
+/// or -1 with @p strOut unchanged for a time beyond what the calendar holds or a set without 2
+/// and 4.
+VORN_JSON_DB_EXPORT int convert2ReadableTime(long ullTimeStamp, std::string& strOut, int iType);
 
 }  // namespace VORN_JSON_DB
 
@@ -162,6 +194,63 @@ public:
     /// ended before it ran any SQL.
     int recCreate(Json::Value& jRecIn, Json::Value& jRecOut);
 
+    /// Appends every record that the request @p jRecParam selects to the array @p jRecArrayOut (or
+    /// null, which becomes an array with the first record). The array is not cleared.
+    ///
+    /// The request is null or an object:
+    ///
+    ///     {"member": value}                   member equals value
+    ///     {"member": [value]}                 member is the value of the list; give one item only:
+    ///                                         several are written without a comma between them
+    ///     {"vornSqlWhereFilter": "id > 5"}    SQL of the host, as it stands
+    ///     {"sort_by": "name", "sort_direction": "desc"}   written as a text literal, so that
+    ///     SQLite
+    ///                                         does not order by the column
+    ///     {"limit": 10, "offset": 20}         paging; "offset" only with "limit"
+    ///
+    /// Terms are joined by "and". Members that the table does not declare are ignored. A member
+    /// that is NULL in the row is left out of its record.
+    ///
+    /// Returns 0 for any number of records, or -1; records decoded before the failure then stay.
+    int recList(Json::Value& jRecParam, Json::Value& jRecArrayOut);
+
+    /// Copies the first record that recList() gives for @p jRecParam into @p jRecOut, an object or
+    /// null; members that the record lacks stay there. Every match is read: pass "limit" 1.
+    ///
+    /// Returns 1, 0 when nothing matched, or -1; @p jRecOut is unchanged for 0 and -1.
+    int recGetOne(Json::Value& jRecParam, Json::Value& jRecOut);
+
+    /// Sets the members of the object @p jRecIn in every row for which the SQL condition
+    /// @p strSqlWhere, taken as it stands, holds. Members that are not declared are ignored, and an
+    /// array becomes a membership term, which no SET list takes: save the whole record instead.
+    ///
+    /// Returns 0, also when no row matched, or -1. An empty condition is refused.
+    int recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWhere);
+
+    /// Sets the members of the object @p jParamIn, type-checked as by checkJsonType(), in every row
+    /// that the conditions of the object @p jFilterIn select (as in recList(), without paging).
+    ///
+    /// Returns 0, also when no row matched, or -1. A filter that selects by nothing is refused.
+    /// getErrMsg() is set on failure as by recCreate().
+    int recUpdateByFilter(Json::Value& jFilterIn, Json::Value& jParamIn);
+
+    /// Deletes the rows that the conditions of the object @p jRecParam select (as in recList(),
+    /// without paging). A request that selects by nothing deletes every row when @p blDeleteAll,
+    /// otherwise it is refused. Returns the number of rows deleted, or -1.
+    int recDelete(Json::Value& jRecParam, bool blDeleteAll = false);
+
+    /// Deletes every row. Returns the number of rows deleted, or -1.
+    int recDeleteAll();
+
+    /// Deletes the rows whose member @p szKey, declared "string", is in @p strVector, which must
+    /// not be empty; give one item only, as in a list of recList(). Returns the number of rows
+    /// deleted, or -1.
+    int recDeleteByArray(std::vector<std::string>& strVector, const char* szKey);
+
+    /// Deletes the rows whose member @p szKey, declared "string", equals @p strValue, which must
+    /// not be empty. Returns the number of rows deleted, or -1.
+    int recDeleteByName(std::string& strValue, const char* szKey);
+
     /// Appends the column list `a,b,c` to @p sql: the declared members, or those of them that the
     /// record @p rec holds. Returns 0.
     ///
@@ -176,6 +265,33 @@ public:
     /// JSON text. A "%" in the text so far, earlier values included, is read as a conversion of
     /// sqlite3_mprintf by every value that follows: such members are not written faithfully.
     int SqlExpandMemberSymbol(std::string& sql, Json::Value& rec);
+
+    /// Appends the terms of the request @p jRecParam, an object or null, to @p out, joined as
+    /// @p andType says (VORN_SQL_WHERE_TYPE_OR, _AND or _COMMA): ` (a='x' and b=1 )`.
+    ///
+    /// Returns 0, 1 when the request holds no condition and nothing was written, or -1 with what
+    /// was appended before the failure left in @p out.
+    int SqlExpandMemberList(Json::Value& jRecParam, std::string& out, int andType);
+
+    /// Appends the equality term of one declared member to @p out: `name='O''Brien'`, `id=5`. Only
+    /// text and JSON are quoted; the text of a number is not looked at. Returns 0, or -1 with @p
+    /// out unchanged.
+    int SqlMakeByMatchField(std::string& strField, Json::Value& jParam, std::string& out);
+
+    /// Appends the membership term of one declared member to @p out: `name in ('x' )`; nothing for
+    /// an empty array. Several items are written without a comma. Returns 0, or -1 with @p out
+    /// unchanged.
+    int SqlMakeByListField(const char* szField, Json::Value& jList, std::string& out);
+
+    /// Sets the member @p szKey of @p jParamOut, an object or null, to the array of the texts in
+    /// @p strVector. Returns 0, or -1 with @p jParamOut unchanged.
+    int VectorParamToJson(std::vector<std::string>& strVector, const char* szKey,
+                          Json::Value& jParamOut);
+
+    /// Appends the sorting and paging clause of the request @p jFilter, an object or null, to @p
+    /// out: ` order by 'name' DESC LIMIT 10 OFFSET 20`. "limit" and "offset" are written as their
+    /// JSON text, unchecked. Returns 0, or -1 with @p out unchanged.
+    int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
     sqlite3* pDb = nullptr;

@@ -7,6 +7,9 @@
 enum class Decode { kNo, kText, kInt32, kInt64, kBool, kJson };
 // How a member is written in the value list of INSERT and REPLACE.
 enum class Value { kNo, kText, kSigned, kUnsigned, kFloat, kDouble, kJson };
+// How a member is written in an equality term. A membership list knows only text and JSON words and
+// writes the rest bare, "bool" too.
+enum class Term { kText, kJson, kBool, kBare };
 // Which kind of JSON value the type check asks for.
 enum class Check { kNo, kIntegral, kBool, kString, kArray, kObject };
 
@@ -14,6 +17,7 @@ struct TypeWord {
     std::string_view strWord;
     Decode decode;
     Value value;
+    Term term;
     Check check;
 };
 
@@ -21,27 +25,27 @@ struct TypeWord {
 // "double" can be written but not read back, a "Json::Value" the other way round).
 // clang-format off
 inline constexpr TypeWord kTypeWords[] = {
-    //  word                  decode a row     value list         type check
-    {"string",             Decode::kText,   Value::kText,     Check::kString  },
-    {"int",                Decode::kInt32,  Value::kSigned,   Check::kIntegral},
-    {"unsigned int",       Decode::kInt32,  Value::kUnsigned, Check::kNo      },
-    {"unsigned",           Decode::kNo,     Value::kUnsigned, Check::kNo      },
-    {"long",               Decode::kNo,     Value::kSigned,   Check::kNo      },
-    {"unsigned long",      Decode::kNo,     Value::kUnsigned, Check::kNo      },
-    {"long long",          Decode::kInt64,  Value::kSigned,   Check::kIntegral},
-    {"unsigned long long", Decode::kInt64,  Value::kUnsigned, Check::kNo      },
-    {"float",              Decode::kNo,     Value::kFloat,    Check::kNo      },
-    {"double",             Decode::kNo,     Value::kDouble,   Check::kNo      },
-    {"bool",               Decode::kBool,   Value::kSigned,   Check::kBool    },
-    {"Json::Value",        Decode::kJson,   Value::kNo,       Check::kNo      },
-    {"Json::objectValue",  Decode::kJson,   Value::kJson,     Check::kObject  },
-    {"Json::arrayValue",   Decode::kJson,   Value::kJson,     Check::kArray   },
-    {"uid_t",              Decode::kNo,     Value::kNo,       Check::kIntegral},
-    {"time_t",             Decode::kNo,     Value::kNo,       Check::kIntegral},
+    //  word               decode a row     value list        condition    type check
+    {"string",             Decode::kText,   Value::kText,     Term::kText, Check::kString  },
+    {"int",                Decode::kInt32,  Value::kSigned,   Term::kBare, Check::kIntegral},
+    {"unsigned int",       Decode::kInt32,  Value::kUnsigned, Term::kBare, Check::kNo      },
+    {"unsigned",           Decode::kNo,     Value::kUnsigned, Term::kBare, Check::kNo      },
+    {"long",               Decode::kNo,     Value::kSigned,   Term::kBare, Check::kNo      },
+    {"unsigned long",      Decode::kNo,     Value::kUnsigned, Term::kBare, Check::kNo      },
+    {"long long",          Decode::kInt64,  Value::kSigned,   Term::kBare, Check::kIntegral},
+    {"unsigned long long", Decode::kInt64,  Value::kUnsigned, Term::kBare, Check::kNo      },
+    {"float",              Decode::kNo,     Value::kFloat,    Term::kBare, Check::kNo      },
+    {"double",             Decode::kNo,     Value::kDouble,   Term::kBare, Check::kNo      },
+    {"bool",               Decode::kBool,   Value::kSigned,   Term::kBool, Check::kBool    },
+    {"Json::Value",        Decode::kJson,   Value::kNo,       Term::kJson, Check::kNo      },
+    {"Json::objectValue",  Decode::kJson,   Value::kJson,     Term::kJson, Check::kObject  },
+    {"Json::arrayValue",   Decode::kJson,   Value::kJson,     Term::kJson, Check::kArray   },
+    {"uid_t",              Decode::kNo,     Value::kNo,       Term::kBare, Check::kIntegral},
+    {"time_t",             Decode::kNo,     Value::kNo,       Term::kBare, Check::kIntegral},
 };
 // clang-format on
 
-inline constexpr TypeWord kUnknownWord = {"", Decode::kNo, Value::kNo, Check::kNo};
+inline constexpr TypeWord kUnknownWord = {"", Decode::kNo, Value::kNo, Term::kBare, Check::kNo};
 
 // The row of a type word. Words are compared whole and case-sensitively.
 inline const TypeWord& typeWord(std::string_view strWord)

@@ -1,0 +1,154 @@
+#include "util/json_members.h"
+#include "util/json_text.h"
+#include "util/log.h"
+#include "util/sqlite_text.h"
+#include "util/type_words.h"
+
+#include <VornJsonDbApi.h>
+
+#include <utility>
+
+namespace {
+
+constexpr char kRawFilterKey[] = "vornSqlWhereFilter";
+
+// How terms are put together: " (" a " and " b " )", or a " , " b.
+struct Joiner {
+    const char* szBefore;
+    const char* szBetween;
+    const char* szAfter;
+};
+
+constexpr Joiner kOr = {" (", " or ", " )"};
+constexpr Joiner kAnd = {" (", " and ", " )"};
+constexpr Joiner kComma = {"", " , ", ""};
+
+// Null for an unknown joiner type.
+const Joiner* joinerOf(int iType)
+{
+    switch (iType) {
+    case VORN_SQL_WHERE_TYPE_OR: return &kOr;
+    case VORN_SQL_WHERE_TYPE_AND: return &kAnd;
+    case VORN_SQL_WHERE_TYPE_COMMA: return &kComma;
+    default: return nullptr;
+    }
+}
+
+}  // namespace
+
+//  (a='x' and b in ('1' ) and  x > 1  )
+int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strSqlWhereOut,
+                                       int andType)
+{
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    if (FAILED(jRecParam.type() != Json::objectValue && jRecParam.type() != Json::nullValue))
+        return -1;
+    const Joiner* pJoiner = joinerOf(andType);
+    if (nullptr == pJoiner) {
+        LOG_ERROR("error andType=%d", andType);
+        return -1;
+    }
+
+    Json::Value::Members jmFieldName = memberNames(jRecParam);
+    bool blWritten = false;
+    for (std::size_t i = 0; i < jmFieldName.size(); ++i) {
+        const bool blRawFilter = kRawFilterKey == jmFieldName[i];
+        if (!blRawFilter && !hasMember(jType, jmFieldName[i])) continue;
+        strSqlWhereOut += blWritten ? pJoiner->szBetween : pJoiner->szBefore;
+        Json::Value& jTmp = jRecParam[jmFieldName[i]];
+        // Kept: a table that declares a member of the raw filter's name cannot be asked by it.
+        if (blRawFilter) {
+            if (FAILED(!jRecParam[jmFieldName[i]].isString())) return -1;
+            strSqlWhereOut.append(" ").append(jTmp.asString()).append(" ");
+        } else if (jTmp.isArray()) {
+            if (FAILED(0 > SqlMakeByListField(jmFieldName[i].c_str(), jTmp, strSqlWhereOut)))
+                return -1;
+        } else {
+            if (FAILED(0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut))) return -1;
+        }
+        blWritten = true;
+    }
+    if (!blWritten) return 1;
+    strSqlWhereOut += pJoiner->szAfter;
+    return 0;
+}
+
+// name='O''Brien', flag=1, id=5
+int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jParam, std::string& out)
+{
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value* pjMember = findMember(jType, strField);
+    if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strField)")) return -1;
+
+    SqliteText szSql;
+    const char* szQuote = "'";
+    switch (typeWord(typeWordOf(*pjMember)).term) {
+    case Term::kText:
+        if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
+        break;
+    case Term::kJson:
+        if (FAILED_AS(NULL == (szSql = sqlite3_mprintf("%q", toString(jParam).c_str())),
+                      "NULL == (szSql = sqlite3_mprintf(\"%q\", jParam.toString().c_str()))"))
+            return -1;
+        break;
+    case Term::kBool:
+        szQuote = "";
+        if (FAILED(NULL == (szSql = sqlite3_mprintf("%d", jParam.asInt())))) return -1;
+        break;
+    case Term::kBare:
+        szQuote = "";
+        if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
+        break;
+    }
+    std::string strTerm = strField;
+    strTerm.append("=").append(szQuote).append(szSql).append(szQuote);
+    out += strTerm;
+    return 0;
+}
+
+// name in ('x' ), id in (5 )
+int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jList, std::string& out)
+{
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    if (FAILED(!szField || !szField[0])) return -1;
+    const Json::Value* pjMember = findMember(jType, szField);
+    if (FAILED_AS(nullptr == pjMember, "!jType.isMember(szField)")) return -1;
+    const Term term = typeWord(typeWordOf(*pjMember)).term;
+    if (FAILED(jList.type() != Json::arrayValue)) return -1;
+    if (jList.empty()) return 0;
+
+    // Kept: nothing stands between the items, so that two texts read as one ('1''2').
+    std::string strTerm = std::string(szField) + " in (";
+    for (Json::ArrayIndex i = 0; i < jList.size(); ++i) {
+        SqliteText szSql;
+        const char* szQuote = "'";
+        switch (term) {
+        case Term::kJson:
+            if (FAILED_AS(NULL == (szSql = sqlite3_mprintf("%q", toString(jList[i]).c_str())),
+                          "NULL == (szSql = sqlite3_mprintf(\"%q\", jList[i].toString().c_str()))"))
+                return -1;
+            break;
+        case Term::kBool:
+        case Term::kBare: szQuote = ""; [[fallthrough]];
+        case Term::kText:
+            if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jList[i].asString().c_str()))))
+                return -1;
+            break;
+        }
+        strTerm.append(szQuote).append(szSql).append(szQuote);
+    }
+    out += strTerm + " )";
+    return 0;
+}
+
+int VornJsonDbApi::VectorParamToJson(std::vector<std::string>& strVector, const char* szKey,
+                                     Json::Value& jParamOut)
+{
+    if (FAILED(jParamOut.type() != Json::objectValue && jParamOut.type() != Json::nullValue))
+        return -1;
+    if (FAILED(!szKey || !szKey[0])) return -1;
+    Json::Value jList(Json::arrayValue);
+    for (const std::string& strValue : strVector) jList.append(strValue);
+    jParamOut[szKey] = std::move(jList);
+    return 0;
+}

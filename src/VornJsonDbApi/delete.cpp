@@ -1,0 +1,97 @@
+#include "VornJsonDbApi/execution.h"
+#include "util/json_members.h"
+#include "util/log.h"
+
+#include <VornJsonDbApi.h>
+
+#include <sstream>
+
+namespace {
+
+std::string joined(const std::vector<std::string>& strVector)
+{
+    std::ostringstream stream;
+    const char* szComma = "";
+    for (const std::string& strValue : strVector) {
+        stream << szComma << strValue;
+        szComma = ",";
+    }
+    return stream.str();
+}
+
+}  // namespace
+
+// DELETE FROM t  WHERE  (id=1 );
+int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
+{
+    const std::string strSqlPrefix = "DELETE FROM " + strName + " ";
+    std::string strSql;
+    std::string strSqlRun;
+    int err = 0;
+    const auto fail = [&] {
+        logSqlError(strSqlError, strSqlRun);
+        return -1;
+    };
+
+    if (FAILED(jRecParam.type() != Json::objectValue)) return fail();
+    if (FAILED(0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
+    if (!blDeleteAll && FAILED(strSql.empty())) return fail();
+    strSqlRun = strSqlPrefix;
+    // Kept: two blanks stand before WHERE.
+    if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
+    strSqlRun += ";";
+    if (FAILED(0 > (err = runSqlEx(strSqlRun)))) return fail();
+    if (!strSqlError.empty()) {
+        LOG_ERROR("sql error, sql=%s", strSqlRun.c_str());
+        return fail();
+    }
+    if (blDebugOutput) LOG_PLAIN("delete rec number=%d", err);
+    return err;
+}
+
+int VornJsonDbApi::recDeleteAll()
+{
+    Json::Value jEveryRecord(Json::objectValue);
+    return recDelete(jEveryRecord, true);
+}
+
+int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const char* szKey)
+{
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    Json::Value jParam(Json::objectValue);
+    int err = 0;
+    const auto fail = [&] {
+        LOG_PLAIN("recDeleteByArray failed, name=%s, strVector=%s", szKey,
+                  joined(strVector).c_str());
+        return -1;
+    };
+
+    if (FAILED(0 >= strVector.size())) return fail();
+    if (FAILED(!szKey || !szKey[0])) return fail();
+    const Json::Value* pjMember = findMember(jType, szKey);
+    if (FAILED_AS(nullptr == pjMember, "!jType.isMember(szKey)")) return fail();
+    if (FAILED_AS(typeWordOf(*pjMember) != "string",
+                  "jType[szKey][\"cpptype\"].asString() != \"string\""))
+        return fail();
+    if (FAILED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();
+    if (FAILED(0 > (err = recDelete(jParam)))) return fail();
+    return err;
+}
+
+int VornJsonDbApi::recDeleteByName(std::string& strValue, const char* szKey)
+{
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    std::vector<std::string> strVector;
+    int err = 0;
+    const auto fail = [&] {
+        LOG_PLAIN("recDeleteByName failed, name=%s, strValue=%s", szKey, strValue.c_str());
+        return -1;
+    };
+
+    if (FAILED(strValue.empty())) return fail();
+    if (FAILED(!szKey || !szKey[0])) return fail();
+    if (FAILED_AS(!hasMember(jType, szKey), "!jType.isMember(szKey)")) return fail();
+    strVector.push_back(strValue);
+    if (FAILED(0 > (err = recDeleteByArray(strVector, szKey)))) return fail();
+    return err;
+}

@@ -1,0 +1,46 @@
+#include "VornJsonDbApi/execution.h"
+#include "util/json_text.h"
+#include "util/log.h"
+
+#include <VornJsonDbApi.h>
+
+using VORN_JSON_DB::jsonCopyMember;
+
+// SELECT a,b FROM t  WHERE  (a='x' ) order by 'a' LIMIT 1;
+int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
+{
+    std::string strSqlPrefix = "SELECT ";
+    std::string strSql;
+    std::string strSqlLimit;
+    std::string strSqlRun;
+    const auto fail = [&] {
+        LOG_PLAIN("jRecParam=%s", toString(jRecParam).c_str());
+        logSqlError(strSqlError, strSqlRun);
+        return -1;
+    };
+
+    if (FAILED(jRecParam.type() != Json::objectValue && jRecParam.type() != Json::nullValue))
+        return fail();
+    if (FAILED(jRecArrayOut.type() != Json::nullValue && jRecArrayOut.type() != Json::arrayValue))
+        return fail();
+    if (FAILED(0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
+    if (FAILED(0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit))) return fail();
+    if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();
+    strSqlPrefix.append(" FROM ").append(strName).append(" ");
+
+    strSqlRun = strSqlPrefix;
+    // Kept: two blanks stand before WHERE.
+    if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
+    strSqlRun.append(strSqlLimit).append(";");
+    if (FAILED(0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut))) return fail();
+    return 0;
+}
+
+int VornJsonDbApi::recGetOne(Json::Value& jRecParam, Json::Value& jRecOut)
+{
+    Json::Value jRecArray(Json::arrayValue);
+    if (FAILED(0 > recList(jRecParam, jRecArray))) return -1;
+    if (jRecArray.empty()) return 0;
+    if (FAILED(0 > jsonCopyMember(jRecOut, jRecArray[0], true))) return -1;
+    return 1;
+}

@@ -1,0 +1,54 @@
+#include "VornJsonDbApi/execution.h"
+#include "util/json_text.h"
+#include "util/log.h"
+
+#include <VornJsonDbApi.h>
+
+// UPDATE t SET a='x' , b=1 WHERE  (id=1 );
+int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWhere)
+{
+    std::string strSql;
+    std::string strSql2;
+    Json::Value jColumnList = jRecIn;
+    const auto fail = [&] {
+        LOG_PLAIN("jRecIn=%s", toString(jRecIn).c_str());
+        logSqlError(strSqlError, strSql);
+        return -1;
+    };
+
+    if (FAILED(strSqlWhere.empty())) return fail();
+    if (FAILED(jRecIn.empty())) return fail();
+    strSql.append("UPDATE ").append(strName).append(" SET ");
+    // A raw filter in the same object is no column.
+    if (jColumnList.isObject()) jColumnList.removeMember("vornSqlWhereFilter");
+    if (FAILED(0 > SqlExpandMemberList(jColumnList, strSql2, VORN_SQL_WHERE_TYPE_COMMA)))
+        return fail();
+    strSql.append(strSql2).append(" WHERE ").append(strSqlWhere).append(";");
+    if (FAILED(strSql.empty())) return fail();
+    if (FAILED(0 > runSqlEx(strSql, NULL, NULL))) return fail();
+    if (!strSqlError.empty()) {
+        LOG_ERROR("sql error msg=%s, sql=%s", strSqlError.c_str(), strSql.c_str());
+        return fail();
+    }
+    return 0;
+}
+
+int VornJsonDbApi::recUpdateByFilter(Json::Value& jFilterIn, Json::Value& jParamIn)
+{
+    std::string strSql;
+    // Kept: the text of an earlier failure counts too, also where this call ran no SQL.
+    const auto fail = [&] {
+        LOG_PLAIN("recUpdateByFilter failed, jParamIn=%s", toString(jParamIn).c_str());
+        if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;
+        return -1;
+    };
+
+    if (FAILED(jFilterIn.empty())) return fail();
+    if (FAILED(jFilterIn.type() != Json::objectValue)) return fail();
+    if (FAILED(jParamIn.type() != Json::objectValue)) return fail();
+    if (FAILED(0 > SqlExpandMemberList(jFilterIn, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
+    if (FAILED(strSql.empty())) return fail();
+    if (FAILED(0 > checkJsonType(jParamIn))) return fail();
+    if (FAILED(0 > recUpdateByWhere(jParamIn, strSql))) return fail();
+    return 0;
+}

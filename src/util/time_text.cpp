@@ -1,0 +1,49 @@
+#include "util/log.h"
+
+#include <VornJsonDbApi.h>
+
+#include <ctime>
+
+namespace {
+
+constexpr int kUtc = 1;
+constexpr int kGmtLayout = 2;
+constexpr int kNumericLayout = 4;
+
+}  // namespace
+
+int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, long& now)
+{
+    now = time(NULL) + offsetSecond;
+    return 0;
+}
+
+int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, int iType)
+{
+    char szTime[1024] = {};
+    struct tm sTime = {};
+    if (iType & kUtc) {
+        if (FAILED(NULL == gmtime_r(&ullTimeStamp, &sTime))) return -1;
+    } else {
+        if (FAILED(NULL == localtime_r(&ullTimeStamp, &sTime))) return -1;
+    }
+    if (iType & kGmtLayout) {
+        // Kept: local time too is followed by the letters GMT.
+        if (FAILED(0 == strftime(szTime, sizeof(szTime), "%a, %d %b %Y %T GMT", &sTime))) return -1;
+    } else if (iType & kNumericLayout) {
+        if (FAILED(0 == strftime(szTime, sizeof(szTime), "%Y-%m-%d %H:%M:%S", &sTime))) return -1;
+    } else {
+        LOG_ERROR("bad iType value=%d", iType);
+        return -1;
+    }
+    strOut = szTime;
+    return 0;
+}
+
+int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, std::string& strOut, int iType)
+{
+    long now = 0;
+    if (FAILED(0 > getTimeAfterNow(offsetSecond, now))) return -1;
+    if (FAILED(0 > convert2ReadableTime(now, strOut, iType))) return -1;
+    return 0;
+}
