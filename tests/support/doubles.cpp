@@ -53,7 +53,8 @@ bool isDue(int& iCountdown)
     return 0 < iCountdown && 0 == --iCountdown;
 }
 
-void record(bool blSyslog, int iPriority, const char* szFormat, va_list arguments)
+__attribute__((format(printf, 3, 0))) void record(bool blSyslog, int iPriority,
+                                                  const char* szFormat, va_list arguments)
 {
     const int iErrno = errno;
     char* szText = nullptr;
@@ -64,7 +65,7 @@ void record(bool blSyslog, int iPriority, const char* szFormat, va_list argument
     errno = ENOTTY;
 }
 
-int writeToStdout(const char* szFormat, va_list arguments)
+__attribute__((format(printf, 1, 0))) int writeToStdout(const char* szFormat, va_list arguments)
 {
     if (!blLogToStdout) return vprintf(szFormat, arguments);
     record(false, -1, szFormat, arguments);
@@ -84,6 +85,9 @@ int doubles::realExec(sqlite3* pDb, const char* szSql, RowCallback callback, voi
 }
 
 extern "C" {
+
+void __syslog_chk(int, int, const char*, ...) __attribute__((format(printf, 3, 4)));
+int __printf_chk(int, const char*, ...) __attribute__((format(printf, 2, 3)));
 
 int sqlite3_exec(sqlite3* pDb, const char* szSql, int (*callback)(void*, int, char**, char**),
                  void* arg, char** errText)

@@ -129,7 +129,8 @@ bool takeErrnoNumber(const LogRecord& record, Parsed& parsed)
     std::smatch match;
     if (!std::regex_search(parsed.strMessage, match, number)) return true;
     if (match[2] != std::to_string(record.iErrno)) return false;
-    parsed.strMessage.replace(static_cast<std::size_t>(match.position(2)), match[2].length(), "?");
+    parsed.strMessage.replace(static_cast<std::size_t>(match.position(2)), match[2].str().size(),
+                              "?");
     return true;
 }
 
