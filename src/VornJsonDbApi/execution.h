@@ -5,12 +5,6 @@
 
 #include <string>
 
-// The row callback of sqlite3_exec: decodes the row into an object, typed by the member types of
-// the table whose statement is running, and appends it to the Json::Value array that arg points to.
-// Returns 0, or -1 to stop the statement. What is thrown inside is kept for runSqlEx to throw
-// again.
-int DbCallBackFillList(void* arg, int n_column, char** column_value, char** column_name);
-
 // The context line of a failed operation, when SQLite had something to say.
 inline void logSqlError(const std::string& strSqlError, const std::string& strSql)
 {

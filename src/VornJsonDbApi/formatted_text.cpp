@@ -120,7 +120,7 @@ Conversion readConversion(const char*& szText)
     return conversion;
 }
 
-// Constructing from a null result throws std::logic_error, which is how a lack of memory ends here.
+// A lack of memory ends in std::logic_error, as constructing a string from SQLite's null does.
 template <typename Argument>
 std::string format(const char* szFormat, Argument argument)
 {
@@ -178,6 +178,16 @@ std::string formatText(const char* szText, FormatArgument value)
     }
 }
 
+std::string formatValue(const char* szConversion, const FormatArgument& argument)
+{
+    switch (argument.kind) {
+    case FormatArgument::Kind::kInteger: return format(szConversion, argument.iValue);
+    case FormatArgument::Kind::kFloat: return format(szConversion, argument.dValue);
+    case FormatArgument::Kind::kText: return format(szConversion, argument.szValue);
+    }
+    return std::string();
+}
+
 bool isPlain(const std::string& strText)
 {
     return std::string::npos == strText.find('%') && std::string::npos == strText.find('\0');
@@ -192,11 +202,12 @@ FormattedText::FormattedText(std::string strText)
 
 void FormattedText::appendValue(const char* szConversion, const FormatArgument& argument)
 {
-    const std::string strFormat = blPlain_ ? szConversion : strText_ + szConversion;
-    const std::string strFormatted = formatText(strFormat.c_str(), argument);
-    if (blPlain_)
-        strText_ += strFormatted;
-    else
-        strText_ = strFormatted;
-    blPlain_ = isPlain(blPlain_ ? strFormatted : strText_);
+    if (!blPlain_) {
+        strText_ = formatText((strText_ + szConversion).c_str(), argument);
+        blPlain_ = isPlain(strText_);
+        return;
+    }
+    const std::string strValue = formatValue(szConversion, argument);
+    strText_ += strValue;
+    blPlain_ = std::string::npos == strValue.find('%');
 }

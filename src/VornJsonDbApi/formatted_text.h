@@ -2,12 +2,13 @@
 #pragma once
 
 #include <string>
+#include <utility>
 
 // A value and its kind, as SQLite's formatter takes it.
 struct FormatArgument {
-    enum class Kind { kNone, kInteger, kFloat, kText };
+    enum class Kind { kInteger, kFloat, kText };
 
-    Kind kind = Kind::kNone;
+    Kind kind = Kind::kInteger;
     long long iValue = 0;
     double dValue = 0;
     const char* szValue = nullptr;
@@ -36,7 +37,7 @@ public:
     // Appends text that holds neither "%" nor a NUL byte.
     void append(const char* szText) { strText_ += szText; }
 
-    const std::string& text() const { return strText_; }
+    std::string take() { return std::move(strText_); }
 
 private:
     std::string strText_;

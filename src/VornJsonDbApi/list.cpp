@@ -1,4 +1,5 @@
 #include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/row_decoder.h"
 #include "util/json_text.h"
 #include "util/log.h"
 
@@ -41,6 +42,10 @@ int VornJsonDbApi::recGetOne(Json::Value& jRecParam, Json::Value& jRecOut)
     Json::Value jRecArray(Json::arrayValue);
     if (FAILED(0 > recList(jRecParam, jRecArray))) return -1;
     if (jRecArray.empty()) return 0;
-    if (FAILED(0 > jsonCopyMember(jRecOut, jRecArray[0], true))) return -1;
+    // The row may be moved where nothing has to be merged.
+    if (jRecOut.empty() && !jRecOut.isArray() && !jRecArray[0].empty())
+        jRecOut.swapPayload(jRecArray[0]);
+    else if (FAILED(0 > jsonCopyMember(jRecOut, jRecArray[0], true)))
+        return -1;
     return 1;
 }

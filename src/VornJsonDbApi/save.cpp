@@ -1,4 +1,5 @@
 #include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/row_decoder.h"
 #include "util/json_text.h"
 #include "util/log.h"
 

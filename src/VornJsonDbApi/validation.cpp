@@ -25,16 +25,19 @@ bool passes(Check check, const Json::Value& jValue)
 int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
 {
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
-    for (const std::string& strKey : memberNames(jType)) {
-        if (hasMember(jParam, strKey)) continue;
+    if (!jType.isObject()) return 0;
+    MemberWalk present(jParam);
+    for (auto it = jType.begin(); it != jType.end(); ++it) {
+        const std::string_view strKey = memberName(it);
+        if (nullptr != present.find(strKey)) continue;
         if (blCheckOnly) {
-            LOG_ERROR("lost data member=%s", strKey.c_str());
+            LOG_ERROR("lost data member=%s", std::string(strKey).c_str());
             if (blDebugOutput) LOG_PLAIN("jParam=%s", toString(jParam).c_str());
             return -1;
         }
-        const Json::Value* pjDefault = findMember(jType[strKey], "cppDefaultValue");
+        const Json::Value* pjDefault = findMember(*it, "cppDefaultValue");
         if (nullptr != pjDefault && (jParam.isNull() || jParam.isObject()))
-            jParam[strKey] = Json::Value(*pjDefault);
+            jParam[std::string(strKey)] = Json::Value(*pjDefault);
     }
     return 0;
 }
@@ -43,16 +46,18 @@ int VornJsonDbApi::checkJsonType(Json::Value& jRecParam)
 {
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     if (FAILED(!jRecParam.isObject())) return -1;
-    for (const std::string& strKey : jRecParam.getMemberNames()) {
-        const Json::Value* pjMember = findMember(jType, strKey);
+    MemberWalk types(jType);
+    for (auto it = jRecParam.begin(); it != jRecParam.end(); ++it) {
+        const std::string_view strKey = memberName(it);
+        const Json::Value* pjMember = types.find(strKey);
         if (nullptr == pjMember) continue;
         const Check check = typeWord(typeWordOf(*pjMember)).check;
         if (Check::kNo == check) {
-            LOG_ERROR("type not found!!, key=%s", strKey.c_str());
+            LOG_ERROR("type not found!!, key=%s", std::string(strKey).c_str());
             return -1;
         }
-        if (!passes(check, jRecParam[strKey])) {
-            LOG_ERROR("type failed, strKey=%s, jRecParam=%s", strKey.c_str(),
+        if (!passes(check, *it)) {
+            LOG_ERROR("type failed, strKey=%s, jRecParam=%s", std::string(strKey).c_str(),
                       toString(jRecParam).c_str());
             return -1;
         }

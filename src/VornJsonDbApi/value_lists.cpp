@@ -13,14 +13,15 @@ bool mayHoldMembers(const Json::Value& jValue)
     return jValue.isNull() || jValue.isObject();
 }
 
-// The names that the definition declares for the table. Kept: a table or "member" that is missing
-// is inserted as null, and later log lines show it.
-Json::Value::Members declaredNames(Json::Value& jTableDef, const std::string& strName)
+// The members that the definition declares for the table, an object or null. Kept: a table or
+// "member" that is missing is inserted as null, and later log lines show it.
+const Json::Value& declaredMembers(Json::Value& jTableDef, const std::string& strName)
 {
-    if (!mayHoldMembers(jTableDef)) return {};
+    if (!mayHoldMembers(jTableDef)) return Json::Value::nullSingleton();
     Json::Value& jTable = jTableDef[strName];
-    if (!mayHoldMembers(jTable)) return {};
-    return memberNames(jTable["member"]);
+    if (!mayHoldMembers(jTable)) return Json::Value::nullSingleton();
+    const Json::Value& jMembers = jTable["member"];
+    return jMembers.isObject() ? jMembers : Json::Value::nullSingleton();
 }
 
 // Appends one member's value as an SQL literal; false when its type word has none.
@@ -55,13 +56,17 @@ bool appendLiteral(FormattedText& text, const std::string& strType, const Json::
 
 int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
 {
-    const Json::Value::Members names = declaredNames(jTableDef, strName);
-    for (std::size_t i = 0; i < names.size(); ++i) {
-        if (nullptr != rec && !hasMember(*rec, names[i])) continue;
-        sql += names[i];
+    const Json::Value& jMembers = declaredMembers(jTableDef, strName);
+    MemberWalk values(nullptr == rec ? Json::Value::nullSingleton() : *rec);
+    Json::ArrayIndex nLeft = jMembers.size();
+    for (auto it = jMembers.begin(); it != jMembers.end(); ++it) {
+        --nLeft;
+        const std::string_view strKey = memberName(it);
+        if (nullptr != rec && nullptr == values.find(strKey)) continue;
+        sql += strKey;
         // Kept: the place in the definition decides, so a record without the last member ends in
         // ",".
-        if (i + 1 < names.size()) sql += ",";
+        if (0 < nLeft) sql += ",";
     }
     return 0;
 }
@@ -70,12 +75,16 @@ int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
 {
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     FormattedText text(sql);
-    const Json::Value::Members names = declaredNames(jTableDef, strName);
-    for (std::size_t i = 0; i < names.size(); ++i) {
-        const std::string& strKey = names[i];
-        const Json::Value* pjMember = findMember(jType, strKey);
+    const Json::Value& jMembers = declaredMembers(jTableDef, strName);
+    MemberWalk types(jType);
+    MemberWalk values(rec);
+    Json::ArrayIndex nLeft = jMembers.size();
+    for (auto it = jMembers.begin(); it != jMembers.end(); ++it) {
+        --nLeft;
+        const std::string_view strKey = memberName(it);
+        const Json::Value* pjMember = types.find(strKey);
         if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strKey)")) return -1;
-        const Json::Value* pjValue = findMember(rec, strKey);
+        const Json::Value* pjValue = values.find(strKey);
         if (nullptr == pjValue) continue;
 
         const std::string strType = typeWordOf(*pjMember);
@@ -83,8 +92,8 @@ int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
             LOG_ERROR("cannot support this type=%s", strType.c_str());
             return -1;
         }
-        text.append(i + 1 < names.size() ? "," : ") ");
+        text.append(0 < nLeft ? "," : ") ");
     }
-    sql = text.text();
+    sql = text.take();
     return 0;
 }

@@ -4,6 +4,7 @@
 
 #include <json/value.h>
 
+#include <string>
 #include <string_view>
 
 // The member, or null where there is none.
@@ -21,6 +22,41 @@ inline Json::Value::Members memberNames(const Json::Value& jValue)
 {
     return jValue.isObject() ? jValue.getMemberNames() : Json::Value::Members();
 }
+
+// The name at an iterator over an object.
+inline std::string_view memberName(const Json::Value::const_iterator& it)
+{
+    const char* szEnd = nullptr;
+    const char* szName = it.memberName(&szEnd);
+    return {szName, static_cast<std::size_t>(szEnd - szName)};
+}
+
+// Finds members of a value that are asked for in ascending order of their names (the order in which
+// jsoncpp holds them) in one walk.
+class MemberWalk {
+public:
+    explicit MemberWalk(const Json::Value& jValue)
+    {
+        if (!jValue.isObject()) return;
+        it_ = jValue.begin();
+        end_ = jValue.end();
+    }
+
+    // The member, or null where there is none.
+    const Json::Value* find(std::string_view strKey)
+    {
+        for (; it_ != end_; ++it_) {
+            const int iOrder = memberName(it_).compare(strKey);
+            if (0 == iOrder) return &*it_;
+            if (0 < iOrder) break;
+        }
+        return nullptr;
+    }
+
+private:
+    Json::Value::const_iterator it_;
+    Json::Value::const_iterator end_;
+};
 
 // The type word of a member as the cache of member types holds it.
 inline std::string typeWordOf(const Json::Value& jMember)

@@ -4,25 +4,71 @@
 #include <json/writer.h>
 
 #include <cstring>
-#include <sstream>
+#include <memory>
+#include <ostream>
+#include <streambuf>
+#include <utility>
 
 namespace {
 
-// Reader and writer are never destroyed: a handle in a global variable of the host may still work
+// Collects what a stream writes in a string.
+class StringBuffer : public std::streambuf {
+public:
+    std::string take() { return std::exchange(strText_, std::string()); }
+
+protected:
+    int_type overflow(int_type c) override
+    {
+        strText_ += traits_type::to_char_type(c);
+        return c;
+    }
+
+    std::streamsize xsputn(const char* szText, std::streamsize nText) override
+    {
+        strText_.append(szText, static_cast<std::size_t>(nText));
+        return nText;
+    }
+
+private:
+    std::string strText_;
+};
+
+// Writer and reader are never destroyed: a handle in a global variable of the host may still work
 // while the process exits.
-Json::StreamWriter& writer()
-{
-    static Json::StreamWriter* pWriter = [] {
+class Writer {
+public:
+    static Writer& instance()
+    {
+        static Writer* pWriter = new Writer;
+        return *pWriter;
+    }
+
+    std::string text(const Json::Value& jValue)
+    {
+        buffer_.take();
+        stream_.clear();
+        pWriter_->write(jValue, &stream_);
+        return buffer_.take();
+    }
+
+private:
+    Writer()
+    {
+        // A lack of memory shall reach the caller, not end in half a text.
+        stream_.exceptions(std::ios_base::badbit);
         Json::StreamWriterBuilder builder;
         builder["commentStyle"] = "None";
         builder["indentation"] = "";
         builder["emitUTF8"] = true;
         builder["useSpecialFloats"] = true;
         builder["precision"] = 17;
-        return builder.newStreamWriter();
-    }();
-    return *pWriter;
-}
+        pWriter_.reset(builder.newStreamWriter());
+    }
+
+    StringBuffer buffer_;
+    std::ostream stream_{&buffer_};
+    std::unique_ptr<Json::StreamWriter> pWriter_;
+};
 
 Json::CharReader& reader()
 {
@@ -44,9 +90,7 @@ bool isDepthLimit(const Json::RuntimeError& error)
 
 std::string toString(const Json::Value& jValue)
 {
-    std::ostringstream stream;
-    writer().write(jValue, &stream);
-    return stream.str();
+    return Writer::instance().text(jValue);
 }
 
 void fromString(const char* szText, Json::Value& jValue)

@@ -1,0 +1,159 @@
+#include "VornJsonDbApi/row_decoder.h"
+
+#include "util/json_members.h"
+#include "util/json_text.h"
+#include "util/log.h"
+#include "util/type_words.h"
+
+#include <VornJsonDbApi.h>
+
+#include <algorithm>
+#include <climits>
+#include <cstdlib>
+#include <cstring>
+#include <set>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace {
+
+// The table whose statement is running: SQLite calls the row callback without a handle.
+std::string strCurJsonName;
+
+// What was thrown in the row callback; nothing may unwind through SQLite's own frames.
+std::exception_ptr pThrownInCallback;
+
+// The member types of that table, once a row of the running statement has asked for them and they
+// are an object.
+const Json::Value* pjMemberTypes = nullptr;
+
+// What a column of the result becomes. Kept for the next statement, which checks it once.
+struct Column {
+    const char* szName = "";
+    std::string strType;
+    Decode decode = Decode::kNo;
+    bool blChecked = false;
+};
+std::vector<Column> columns;
+
+const Json::Value& memberTypes()
+{
+    if (nullptr != pjMemberTypes) return *pjMemberTypes;
+    Json::Value jTableDef;
+    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strCurJsonName);
+    if (jType.isObject()) pjMemberTypes = &jType;
+    return jType;
+}
+
+// A copy of the name that is never released, so that all records can share it as their key.
+const char* sharedName(const char* szName)
+{
+    static auto& names = *new std::set<std::string, std::less<>>;
+    const auto it = names.find(std::string_view(szName));
+    return (names.end() == it ? names.emplace(szName).first : it)->c_str();
+}
+
+// The column at idx, or null, after the failed check's line, when the table has no such member.
+const Column* resolvedColumn(const char* szName, std::size_t idx)
+{
+    if (columns.size() <= idx) columns.resize(idx + 1);
+    Column& column = columns[idx];
+    const bool blSameName = 0 == strcmp(column.szName, szName);
+    if (blSameName && column.blChecked) return &column;
+
+    const Json::Value* pjMember = findMember(memberTypes(), szName);
+    if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strName)")) return nullptr;
+    std::string strType = typeWordOf(*pjMember);
+    if (!blSameName || strType != column.strType) {
+        column.blChecked = false;
+        column.szName = sharedName(szName);
+        column.decode = typeWord(strType).decode;
+        column.strType = std::move(strType);
+    }
+    column.blChecked = true;
+    return &column;
+}
+
+int saturatedToInt(const char* szText)
+{
+    return static_cast<int>(std::clamp<long>(strtol(szText, nullptr, 10), INT_MIN, INT_MAX));
+}
+
+int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
+{
+    if (FAILED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue)) return -1;
+    if (FAILED(0 > idx)) return -1;
+    const Column* pColumn = resolvedColumn(column_name[idx], static_cast<std::size_t>(idx));
+    if (nullptr == pColumn) return -1;
+
+    // NULL means absent, whatever the type word.
+    const char* szValue = column_value[idx];
+    if (nullptr == szValue) return 0;
+
+    const Json::StaticString name(pColumn->szName);
+    switch (pColumn->decode) {
+    case Decode::kText: jRec[name] = szValue; return 0;
+    // Kept: unsigned words too are read through the signed conversions and saturate there.
+    case Decode::kInt32: jRec[name] = saturatedToInt(szValue); return 0;
+    case Decode::kInt64: jRec[name] = Json::Int64(strtoll(szValue, nullptr, 10)); return 0;
+    case Decode::kJson: fromString(szValue, jRec[name]); return 0;
+    case Decode::kBool: jRec[name] = 1 == strtol(szValue, nullptr, 10); return 0;
+    case Decode::kNo: break;
+    }
+    LOG_ERROR("type error, strType=%s", pColumn->strType.c_str());
+    return -1;
+}
+
+int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, char** column_name)
+{
+    if (FAILED(NULL == column_name || NULL == column_value)) return -1;
+    for (int i = 0; i < n_column; ++i) {
+        int iTmp = 0;
+        if (FAILED(NULL == column_name[i]) ||
+                   FAILED(0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i)))) {
+            // Kept: the first column is not traced.
+            if (0 < i) {
+                LOG_PLAIN("column_name[%d]=%s", i, column_name[i]);
+                LOG_PLAIN("column_value[%d]=%s", i, column_value[i]);
+            }
+            return -1;
+        }
+    }
+    return 0;
+}
+
+int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
+{
+    Json::Value jTmp(Json::objectValue);
+    if (FAILED(!pjRecArray)) return -1;
+    if (FAILED(pjRecArray->type() != Json::arrayValue && pjRecArray->type() != Json::nullValue))
+        return -1;
+    if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
+    pjRecArray->append(std::move(jTmp));
+    return 0;
+}
+
+}  // namespace
+
+int DbCallBackFillList(void* arg, int n_column, char** column_value, char** column_name)
+{
+    try {
+        return fillList(static_cast<Json::Value*>(arg), n_column, column_value, column_name);
+    } catch (...) {
+        pThrownInCallback = std::current_exception();
+        return -1;
+    }
+}
+
+void beginStatement(const std::string& strTable)
+{
+    strCurJsonName = strTable;
+    pjMemberTypes = nullptr;
+    for (Column& column : columns) column.blChecked = false;
+}
+
+std::exception_ptr takeThrown()
+{
+    return std::exchange(pThrownInCallback, nullptr);
+}
