@@ -1,0 +1,315 @@
+#!/usr/bin/env bash
+# Tests examples/records as its user sees it: exit status, standard output and standard error, all
+# compared exactly, and what stands in the database file afterwards (read with the sqlite3 shell).
+#
+# usage: records_test.sh PROGRAM TABLES-FOLDER WORK-FOLDER
+#
+# The last part imports the whole of iso_639-3.json and iso_3166-2.json from the package iso-codes
+# and compares every record with its source.
+set -euo pipefail
+export LC_ALL=C.UTF-8
+
+program=$1
+tables=$2
+work=$3
+iso_codes=/usr/share/iso-codes/json
+
+for needed in sqlite3 script; do
+    command -v "$needed" >/dev/null || { echo "$needed is not installed"; exit 1; }
+done
+for needed in iso_639-3 iso_3166-2; do
+    [[ -r $iso_codes/$needed.json ]] || { echo "iso-codes is not installed"; exit 1; }
+done
+
+rm -rf "$work"
+mkdir -p "$work"
+cd "$work"
+
+checks=0
+failures=0
+
+# same NAME EXPECTED ACTUAL
+same() {
+    checks=$((checks + 1))
+    [[ $2 == "$3" ]] && return
+    failures=$((failures + 1))
+    printf 'FAILED line %s: %s\n--- expected\n%s\n--- got\n%s\n' "${BASH_LINENO[-2]}" "$1" "$2" "$3"
+}
+
+# What the file holds and one dot, which keeps the newlines before it.
+text_of() { cat "$1"; printf .; }
+
+# lines TEXT: the text as a program prints it, and the dot
+lines() { printf '%s' "$1${1:+$'\n'}."; }
+
+# expect STATUS STDOUT STDERR ARGUMENT...: runs the program
+expect() {
+    local status=0
+    "$program" "${@:4}" >out 2>err || status=$?
+    same "exit status: ${*:4}" "$1" "$status"
+    same "standard output: ${*:4}" "$(lines "$2")" "$(text_of out)"
+    same "standard error: ${*:4}" "$(lines "$3")" "$(text_of err)"
+}
+
+# refused DATABASE STDERR ARGUMENT...: a failure with exit status 1 that leaves every byte of the
+# database as it was
+refused() {
+    cp "$1" before.db
+    expect 1 '' "$2" "${@:3}"
+    same "file unchanged: ${*:3}" 'same' "$(cmp -s before.db "$1" && echo same || echo changed)"
+    same "integrity: ${*:3}" ok "$(sqlite3 "$1" 'pragma integrity_check')"
+}
+
+# rows DATABASE TABLE EXPECTED: the table's rows in the shell's list form
+rows() { same "rows of $2" "$3" "$(sqlite3 "$1" "select * from $2 order by rowid")"; }
+
+cat >notes.json <<'EOF'
+{"name": "notes", "key": "id",
+ "create": "create table if not exists notes (id integer primary key, done int, tags text, text text)",
+ "definition": {"notes": {"member": {"id": {"cpptype": "int"},
+     "done": {"cpptype": "bool", "cppDefaultValue": false},
+     "tags": {"cpptype": "Json::arrayValue", "cppDefaultValue": []},
+     "text": {"cpptype": "string", "cppDefaultValue": "none"}}}}}
+EOF
+# notes_with CREATE-SQL: the same table with another statement and no key for messages
+notes_with() {
+    sqlite3 :memory: "select json_set(json_remove(readfile('notes.json'), '\$.key'), '\$.create', '$1')"
+}
+
+# ------------------------------------------------------------------------------ wrong arguments
+usage='usage: records [-v] DATABASE TABLE.json COMMAND [ARGUMENT...]
+  -v  show the library'\''s log on standard output
+commands:
+  create RECORD-JSON
+  save RECORD-JSON
+  import FILE.json [KEY]'
+expect 2 '' "$usage"
+expect 2 '' "$usage" -v
+expect 2 '' "$usage" u.db
+expect 2 '' "$usage" u.db notes.json
+expect 2 '' "$usage" -v u.db notes.json
+expect 2 '' "$usage" u.db notes.json erase '{}'
+expect 2 '' "$usage" u.db notes.json Create '{}'
+expect 2 '' "$usage" u.db notes.json '' '{}'
+expect 2 '' "$usage" u.db notes.json create
+expect 2 '' "$usage" u.db notes.json create '{}' '{}'
+expect 2 '' "$usage" u.db notes.json save
+expect 2 '' "$usage" u.db notes.json save '{}' '{}'
+expect 2 '' "$usage" u.db notes.json import
+expect 2 '' "$usage" u.db notes.json import a.json key more
+expect 2 '' "$usage" u.db -v notes.json create '{}'
+same 'wrong arguments make no file' none "$([[ -e u.db ]] && echo made || echo none)"
+
+# -------------------------------------------------------------------------------------- create
+create() { expect "$1" "$2" "$3" n.db notes.json create "$4"; }
+create 0 '{"done":false,"id":1,"tags":[],"text":"none"}' '' '{"id": 1}'
+create 0 '{"done":true,"id":2,"tags":["a",{"b":null}],"text":"Größe '\''\"\\ 語"}' '' \
+    '{"text": "Größe '\''\"\\ \u8a9e", "tags": ["a", {"b": null}], "id": 2, "done": true}'
+create 0 '{"done":false,"id":3,"tags":[],"text":"two\nlines"}' '' \
+    '{"id": 3, "text": "two\nlines", "unknown": 9}'
+rows n.db notes $'1|0|[]|none\n2|1|["a",{"b":null}]|Größe \'"\\ 語\n3|0|[]|two\nlines'
+
+# refuse COMMAND MESSAGE ARGUMENT...
+refuse() { refused n.db "records: $1: $2" n.db notes.json "$1" "${@:3}"; }
+log='failed (-v shows the log)'
+refuse create 'id 1: DUPLICATE_PRIMARY_KEY' '{"id": 1}'
+refuse create "id \"4\": $log" '{"id": "4"}'
+refuse create "id {\"a\":[1,\"\\n\"]}: $log" '{"id": {"a": [1, "\n"]}}'
+refuse create "id 4: $log" '{"id": 4, "done": 1}'
+refuse create "the record: $log" '{"text": 5}'
+refuse create "the record: $log" '{}'
+refuse create "the record: $log" '[1]'
+refuse create 'RECORD-JSON: not valid JSON: Line 1, Column 1 Syntax error: value, object or array'\
+' expected. Line 1, Column 1 A valid JSON document must be either an array or an object value.' ''
+refuse create 'RECORD-JSON: not valid JSON: Line 1, Column 1 A valid JSON document must be either'\
+' an array or an object value.' '"text"'
+refuse create "RECORD-JSON: not valid JSON: Line 1, Column 8 Missing ',' or '}' in object declaration" \
+    '{"id":4'
+refuse create 'RECORD-JSON: not valid JSON: Line 1, Column 10 Extra non-whitespace after JSON value.' \
+    '{"id":4} x'
+refuse create "RECORD-JSON: not valid JSON: Line 1, Column 9 Duplicate key: 'id'" '{"id":4,"id":5}'
+refuse create 'Exceeded stackLimit in readValue().' "$(printf '[%.0s' {1..1001})"
+
+# ---------------------------------------------------------------------------------------- save
+save() { expect "$1" "$2" "$3" n.db notes.json save "$4"; }
+save 0 '{"done":true,"id":4,"tags":[4],"text":"four"}' '' \
+    '{"id": 4, "done": true, "tags": [4], "text": "four"}'
+# Replaces the whole row: what the record lacks is NULL then and absent when read.
+save 0 '{"id":2,"text":"again"}' '' '{"id": 2, "text": "again"}'
+rows n.db notes $'1|0|[]|none\n2|||again\n3|0|[]|two\nlines\n4|1|[4]|four'
+refuse save "id 5: $log" '{"id": 5}'
+refuse save "the record: $log" '[1]'
+refuse save 'double out of Int64 range' '{"id": 1e30, "text": "x"}'
+refuse save 'RECORD-JSON: not valid JSON: Line 1, Column 2 Missing '\''}'\'' or object member name' '{'
+
+# -------------------------------------------------------------------------------------- import
+echo '[{"id": 10}, {"id": 11, "text": "eleven"}]' >plain.json
+echo '{"a": 1, "records": [{"id": 12}], "none": []}' >keyed.json
+echo '[{"id": 20}, {"id": 21}, {"id": 10}, {"id": 22}]' >duplicate.json
+echo '[{"id": 20}, {"id": 21, "done": 0}]' >mistyped.json
+echo '[{"id": 20}, 7]' >odd.json
+echo '[{"id": 20}, ' >broken.json
+: >empty.json
+expect 0 '{"imported":2}' '' n.db notes.json import plain.json
+expect 0 '{"imported":1}' '' n.db notes.json import keyed.json records
+expect 0 '{"imported":0}' '' n.db notes.json import keyed.json none
+rows n.db notes $'1|0|[]|none\n2|||again\n3|0|[]|two\nlines\n4|1|[4]|four\n10|0|[]|none
+11|0|[]|eleven\n12|0|[]|none'
+refuse import 'id 10: DUPLICATE_PRIMARY_KEY' duplicate.json
+refuse import "id 21: $log" mistyped.json
+refuse import "the record: $log" odd.json
+refuse import 'broken.json: not valid JSON: Line 2, Column 1 Syntax error: value, object or array'\
+' expected.' broken.json
+refuse import 'empty.json: not valid JSON: Line 1, Column 1 Syntax error: value, object or array'\
+' expected. Line 1, Column 1 A valid JSON document must be either an array or an object value.' \
+    empty.json
+refuse import 'keyed.json: not an array, KEY has to name the member that is' keyed.json
+refuse import 'keyed.json: no array under "a"' keyed.json a
+refuse import 'keyed.json: no array under "b\n"' keyed.json $'b\n'
+refuse import 'plain.json: no array under "id"' plain.json id
+refuse import 'absent.json: No such file or directory' absent.json
+
+# A transaction that cannot begin: the table's own statement has opened one already.
+notes_with 'create table if not exists notes (id, done, tags, text); savepoint host' >begun.json
+refused n.db "records: import: begin immediate: $log" n.db begun.json import plain.json
+# One that cannot be committed: a text has to be the id of a note by then.
+notes_with 'pragma foreign_keys = on; create table if not exists notes (id text primary key, done,
+    tags, text references notes deferrable initially deferred)' >linked.json
+echo '[{"id": 1, "text": "2"}, {"id": 2, "text": "1"}]' >linked_in.json
+expect 0 '{"imported":2}' '' l.db linked.json import linked_in.json
+refused l.db "records: import: commit: $log" l.db linked.json import plain.json
+# One that SQLite rolls back by itself.
+notes_with 'create table if not exists notes (id, done, tags, text); create trigger if not exists
+    eleven before insert on notes when new.id = 11 begin select raise(rollback, ''eleven''); end' >raising.json
+expect 0 '{"imported":1}' '' r.db raising.json import keyed.json records
+refused r.db "records: import: the record: $log" r.db raising.json import plain.json
+"$program" -v r.db raising.json import plain.json >out 2>err || true
+same 'rolls back by the handle' 1 \
+    "$(grep -c 'error=cannot rollback - no transaction is active, sql=rollback$' out)"
+
+# The bar: only where standard error is a terminal.
+printf -v half '%25s' ''
+half=${half// /#}
+script -qec "'$program' b.db notes.json import plain.json >out" /dev/null >terminal </dev/null
+same 'progress bar' "$(printf '\r[%-50s]  50 %% of 2\r[%s] 100 %% of 2\r\n.' "$half" "$half$half")" \
+    "$(text_of terminal)"
+same 'output beside the bar' "$(lines '{"imported":2}')" "$(text_of out)"
+script -qec "'$program' b.db notes.json import plain.json >out || true" /dev/null >terminal </dev/null
+same 'no bar at the first record' \
+    $'\r\nrecords: import: id 10: DUPLICATE_PRIMARY_KEY\r\n.' "$(text_of terminal)"
+script -qec "'$program' c.db notes.json import plain.json 2>err" /dev/null >terminal </dev/null
+same 'no bar in a file' "$(lines '')" "$(text_of err)"
+same 'only output on the terminal' $'{"imported":2}\r\n.' "$(text_of terminal)"
+
+# --------------------------------------------------------------------------- files and database
+broken() { expect 1 '' "records: create: $1" "$2" "$3" create '{"id": 1}'; }
+broken 'absent.json: No such file or directory' n.db absent.json
+broken 'empty.json: not valid JSON: Line 1, Column 1 Syntax error: value, object or array expected.'\
+' Line 1, Column 1 A valid JSON document must be either an array or an object value.' n.db empty.json
+incomplete='"name", "create" and "definition" have to be there'
+broken "plain.json: $incomplete" n.db plain.json
+for member in name create definition; do
+    sqlite3 :memory: "select json_set(readfile('notes.json'), '\$.$member', 1)" >"no_$member.json"
+    broken "no_$member.json: $incomplete" n.db "no_$member.json"
+done
+broken '.: unable to open database file' . notes.json
+broken 'absent/n.db: unable to open database file' absent/n.db notes.json
+cp notes.json text.db
+broken 'text.db: file is not a database' text.db notes.json
+notes_with 'create tabel notes (id)' >wrong.json
+broken 'n.db: near "tabel": syntax error' n.db wrong.json
+notes_with 'create table if not exists other (id, done, tags, text)' >other.json
+broken "the record: $log" o.db other.json
+
+status=0
+"$program" n.db notes.json create '{"id": 30}' >/dev/full 2>err || status=$?
+same 'exit status: full disk' 1 "$status"
+same 'standard error: full disk' $'records: create: standard output cannot be written\n.' \
+    "$(text_of err)"
+
+# ------------------------------------------------------------------------------------------ -v
+# The log, with process ids, line numbers and error texts of the system replaced.
+status=0
+"$program" -v n.db notes.json create '{"id": 1}' >out 2>err || status=$?
+same 'exit status: -v' 1 "$status"
+same 'standard error: -v' $'records: create: id 1: DUPLICATE_PRIMARY_KEY\n.' "$(text_of err)"
+sed -E 's/^\([0-9]+\)/(PID)/; s/VornJsonDbApi:[0-9]+/VornJsonDbApi:N/g; s/errno=[0-9]+/errno=N/
+    s/\)\([^()]*\)Failed/)(TEXT)Failed/; s/, err=[A-Z][a-z ]*$/, err=TEXT/' out >log
+record='{"done":false,"id":1,"tags":[],"text":"none"}'
+types='{"done":{"cppDefaultValue":false,"cpptype":"bool"},"id":{"cpptype":"int"},"tags":'\
+'{"cppDefaultValue":[],"cpptype":"Json::arrayValue"},"text":{"cppDefaultValue":"none",'\
+'"cpptype":"string"}}'
+sql="INSERT INTO notes (done,id,tags,text) VALUES (0,1,'[]','none') ;select * from notes where"\
+' rowid == last_insert_rowid();'
+unique='UNIQUE constraint failed: notes.id'
+same 'log' "(PID) VornJsonDbApi:N i=0,errno=N, run sql failed, error=$unique, sql=$sql
+(PID) VornJsonDbApi:N run sql fail, err=$unique
+(PID) VornJsonDbApi:N (VornJsonDbApi:N)(TEXT)Failed [0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)], err=TEXT
+
+(PID) VornJsonDbApi:N blCreate=1, jRecInOut=$record
+(PID) VornJsonDbApi:N jType=$types
+(PID) VornJsonDbApi:N sql error, err=$unique, sql=$sql
+(PID) VornJsonDbApi:N (VornJsonDbApi:N)(TEXT)Failed [0 > recSave(jParam, true)], err=TEXT
+
+(PID) VornJsonDbApi:N call create rec, rec=$record
+." "$(text_of log)"
+expect 0 '{"done":false,"id":31,"tags":[],"text":"none"}' '' -v n.db notes.json create '{"id": 31}'
+
+# ------------------------------------------------------------------------------- all of iso-codes
+# compare TABLE FILE KEY COUNT: every record of the source stands in the table and the other way
+# round, member by member; what the source leaves out reads as an empty text.
+compare() {
+    local columns values
+    columns=$(sqlite3 iso.db "select group_concat(name) from pragma_table_info('$1')")
+    values=$(sqlite3 iso.db "select group_concat('ifnull(json_extract(value, ''$.' || name || '''), '''')')
+        from pragma_table_info('$1')")
+    sqlite3 iso.db "create temp table source as
+            select $values from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"');
+        select 'source', count(*) from source;
+        select 'table', count(*) from $1;
+        select 'only in the source', count(*) from (select * from source except select $columns from $1);
+        select 'only in the table', count(*) from (select $columns from $1 except select * from source);
+        select 'members without a column', count(*)
+            from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"') r, json_each(r.value) m
+            where m.key not in (select name from pragma_table_info('$1'));" >compared
+    same "records of $1" "source|$4
+table|$4
+only in the source|0
+only in the table|0
+members without a column|0" "$(cat compared)"
+}
+
+cp "$tables"/*.json .
+count() {
+    sqlite3 :memory: "select json_array_length(readfile('$iso_codes/$1'), '\$.\"$2\"')"
+}
+languages=$(count iso_639-3.json 639-3)
+subdivisions=$(count iso_3166-2.json 3166-2)
+same 'there are thousands' yes "$( ((languages > 7000 && subdivisions > 4000)) && echo yes)"
+
+expect 0 "{\"imported\":$languages}" '' iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
+expect 0 "{\"imported\":$subdivisions}" '' \
+    iso.db subdivisions.json import "$iso_codes/iso_3166-2.json" 3166-2
+compare languages iso_639-3.json 639-3 "$languages"
+compare subdivisions iso_3166-2.json 3166-2 "$subdivisions"
+same 'integrity' ok "$(sqlite3 iso.db 'pragma integrity_check')"
+
+refused iso.db 'records: create: alpha_3 "deu": DUPLICATE_PRIMARY_KEY' \
+    iso.db languages.json create '{"alpha_3": "deu", "name": "German", "scope": "I", "type": "L"}'
+refused iso.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
+    iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
+expect 0 '{"code":"AD-02","name":"Canillo","parent":"","type":"Parish (again)"}' '' iso.db \
+    subdivisions.json save '{"code": "AD-02", "name": "Canillo", "parent": "", "type": "Parish (again)"}'
+
+# The last of thousands fails: nothing of them stays.
+sqlite3 :memory: "select json_insert(readfile('$iso_codes/iso_639-3.json'), '\$.\"639-3\"[#]',
+    json('{\"alpha_3\": \"aaa\", \"name\": \"Twice\", \"scope\": \"I\", \"type\": \"L\"}'))" >twice.json
+expect 0 '{"alpha_2":"","alpha_3":"qaa","bibliographic":"","common_name":"","inverted_name":"","name":'\
+'"Reserved","scope":"I","type":"L"}' '' \
+    t.db languages.json create '{"alpha_3": "qaa", "name": "Reserved", "scope": "I", "type": "L"}'
+refused t.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
+    t.db languages.json import twice.json 639-3
+rows t.db languages 'qaa|Reserved|I|L||||'
+
+echo "$checks checks, $failures failed"
+((failures == 0))
