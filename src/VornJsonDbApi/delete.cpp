@@ -41,9 +41,9 @@ int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun += ";";
     if (FAILED(0 > (err = runSqlEx(strSqlRun)))) return fail();
-    if (!strSqlError.empty()) {
-        LOG_ERROR("sql error, sql=%s", strSqlRun.c_str());
-        return fail();
+    if (!strSqlError.empty()) {                             // Guard: a run that succeeds empties it
+        LOG_ERROR("sql error, sql=%s", strSqlRun.c_str());  // Guard
+        return fail();                                      // Guard
     }
     if (blDebugOutput) LOG_PLAIN("delete rec number=%d", err);
     return err;
@@ -73,7 +73,8 @@ int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const c
     if (FAILED_AS(typeWordOf(*pjMember) != "string",
                   "jType[szKey][\"cpptype\"].asString() != \"string\""))
         return fail();
-    if (FAILED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();
+    // Guard: object and key were looked at above.
+    if (FAILED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();  // Guard
     if (FAILED(0 > (err = recDelete(jParam)))) return fail();
     return err;
 }

@@ -183,9 +183,9 @@ std::string formatValue(const char* szConversion, const FormatArgument& argument
     switch (argument.kind) {
     case FormatArgument::Kind::kInteger: return format(szConversion, argument.iValue);
     case FormatArgument::Kind::kFloat: return format(szConversion, argument.dValue);
-    case FormatArgument::Kind::kText: return format(szConversion, argument.szValue);
+    case FormatArgument::Kind::kText: break;
     }
-    return std::string();
+    return format(szConversion, argument.szValue);
 }
 
 bool isPlain(const std::string& strText)

@@ -26,7 +26,7 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
         return fail();
     if (FAILED(0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
     if (FAILED(0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit))) return fail();
-    if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();
+    if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();  // Guard: always 0
     strSqlPrefix.append(" FROM ").append(strName).append(" ");
 
     strSqlRun = strSqlPrefix;

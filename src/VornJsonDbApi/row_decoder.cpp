@@ -82,8 +82,10 @@ int saturatedToInt(const char* szText)
 
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
 {
-    if (FAILED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue)) return -1;
-    if (FAILED(0 > idx)) return -1;
+    // Guard: the record is an object of our own.
+    if (FAILED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue))  // Guard
+        return -1;                                                                   // Guard
+    if (FAILED(0 > idx)) return -1;  // Guard: the loop begins at 0
     const Column* pColumn = resolvedColumn(column_name[idx], static_cast<std::size_t>(idx));
     if (nullptr == pColumn) return -1;
 

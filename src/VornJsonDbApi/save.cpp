@@ -21,15 +21,15 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
     };
 
     strSql.append(blCreate ? "INSERT INTO " : "REPLACE INTO ").append(strName).append(" (");
-    if (FAILED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();
+    if (FAILED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();  // Guard: always 0
     strSql += ") VALUES (";
     if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
     strSql.append(";select * from ").append(strName).append(" where rowid == last_insert_rowid();");
-    if (FAILED(strSql.empty())) return fail();
+    if (FAILED(strSql.empty())) return fail();  // Guard: it has its verb
     if (FAILED(0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp))) return fail();
-    if (!strSqlError.empty()) {
-        LOG_ERROR("sql error, sql=%s", strSql.c_str());
-        return fail();
+    if (!strSqlError.empty()) {                          // Guard: a run that succeeds empties it
+        LOG_ERROR("sql error, sql=%s", strSql.c_str());  // Guard
+        return fail();                                   // Guard
     }
     if (FAILED(0 == jArrayTmp.size())) return fail();
 
@@ -48,7 +48,7 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
     };
 
     if (FAILED(jRecIn.empty())) return fail();
-    if (FAILED(0 > fillDefaultValue(jParam, false))) return fail();
+    if (FAILED(0 > fillDefaultValue(jParam, false))) return fail();  // Guard: always 0
     if (FAILED(0 > checkJsonType(jParam))) return fail();
     if (FAILED(0 > recSave(jParam, true))) return fail();
 

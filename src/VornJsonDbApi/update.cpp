@@ -24,11 +24,11 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
     if (FAILED(0 > SqlExpandMemberList(jColumnList, strSql2, VORN_SQL_WHERE_TYPE_COMMA)))
         return fail();
     strSql.append(strSql2).append(" WHERE ").append(strSqlWhere).append(";");
-    if (FAILED(strSql.empty())) return fail();
+    if (FAILED(strSql.empty())) return fail();  // Guard: it has its verb
     if (FAILED(0 > runSqlEx(strSql, NULL, NULL))) return fail();
-    if (!strSqlError.empty()) {
-        LOG_ERROR("sql error msg=%s, sql=%s", strSqlError.c_str(), strSql.c_str());
-        return fail();
+    if (!strSqlError.empty()) {  // Guard: a run that succeeds empties it
+        LOG_ERROR("sql error msg=%s, sql=%s", strSqlError.c_str(), strSql.c_str());  // Guard
+        return fail();                                                               // Guard
     }
     return 0;
 }

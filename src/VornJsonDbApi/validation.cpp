@@ -15,9 +15,9 @@ bool passes(Check check, const Json::Value& jValue)
     case Check::kString: return jValue.isString();
     case Check::kArray: return jValue.isArray();
     case Check::kObject: return jValue.isObject();
-    case Check::kNo: break;
+    case Check::kNo: break;  // Guard: asked of known words only
     }
-    return false;
+    return false;  // Guard
 }
 
 }  // namespace

@@ -43,7 +43,7 @@ int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, i
 int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, std::string& strOut, int iType)
 {
     long now = 0;
-    if (FAILED(0 > getTimeAfterNow(offsetSecond, now))) return -1;
+    if (FAILED(0 > getTimeAfterNow(offsetSecond, now))) return -1;  // Guard: always 0
     if (FAILED(0 > convert2ReadableTime(now, strOut, iType))) return -1;
     return 0;
 }
