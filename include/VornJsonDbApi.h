@@ -294,6 +294,10 @@ public:
     int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
+    // recSave() with the stored row handed back in jStored, which may be the record itself.
+    __attribute__((visibility("hidden"))) int saveRecord(Json::Value& jRecInOut, bool blCreate,
+                                                         Json::Value& jStored);
+
     sqlite3* pDb = nullptr;
     std::string strName;
     Json::Value jTableDef;

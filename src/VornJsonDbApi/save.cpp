@@ -1,14 +1,35 @@
 #include "VornJsonDbApi/execution.h"
 #include "VornJsonDbApi/row_decoder.h"
+#include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/member_types.h"
 
 #include <VornJsonDbApi.h>
 
 #include <utility>
 
-// INSERT INTO t (a,b) VALUES (1,'x') ;select * from t where rowid == last_insert_rowid();
+namespace {
+
+// Whether the record holds every member of the table, so that no default can be added to it.
+bool isComplete(const Json::Value& jRecord, const Json::Value& jType)
+{
+    if (jType.empty()) return false;
+    MemberWalk members(jRecord);
+    for (auto it = jType.begin(); it != jType.end(); ++it)
+        if (nullptr == members.find(memberName(it))) return false;
+    return true;
+}
+
+}  // namespace
+
 int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
+{
+    return saveRecord(jRecInOut, blCreate, jRecInOut);
+}
+
+// INSERT INTO t (a,b) VALUES (1,'x') ;select * from t where rowid == last_insert_rowid();
+int VornJsonDbApi::saveRecord(Json::Value& jRecInOut, bool blCreate, Json::Value& jStored)
 {
     std::string strSql;
     Json::Value jArrayTmp(Json::arrayValue);
@@ -33,13 +54,15 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
     }
     if (FAILED(0 == jArrayTmp.size())) return fail();
 
-    jRecInOut = std::move(jArrayTmp[0]);
+    jStored = std::move(jArrayTmp[0]);
     return 0;
 }
 
 int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
 {
-    Json::Value jParam = jRecIn;
+    // A complete record serves as it is; to others defaults are added in a copy.
+    Json::Value jCopy;
+    Json::Value& jParam = isComplete(jRecIn, knownMemberTypes(strName)) ? jRecIn : jCopy = jRecIn;
     // Kept: the text of an earlier failure counts too, also where this call ran no SQL.
     const auto fail = [&] {
         LOG_PLAIN("call create rec, rec=%s", toString(jParam).c_str());
@@ -50,8 +73,7 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
     if (FAILED(jRecIn.empty())) return fail();
     if (FAILED(0 > fillDefaultValue(jParam, false))) return fail();  // Guard: always 0
     if (FAILED(0 > checkJsonType(jParam))) return fail();
-    if (FAILED(0 > recSave(jParam, true))) return fail();
-
-    jRecOut = std::move(jParam);
+    if (FAILED_AS(0 > saveRecord(jParam, true, jRecOut), "0 > recSave(jParam, true)"))
+        return fail();
     return 0;
 }

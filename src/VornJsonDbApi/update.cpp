@@ -1,4 +1,5 @@
 #include "VornJsonDbApi/execution.h"
+#include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
 
@@ -9,7 +10,13 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
 {
     std::string strSql;
     std::string strSql2;
-    Json::Value jColumnList = jRecIn;
+    // A raw filter in the same object is no column.
+    Json::Value jWithoutFilter;
+    if (hasMember(jRecIn, "vornSqlWhereFilter")) {
+        jWithoutFilter = jRecIn;
+        jWithoutFilter.removeMember("vornSqlWhereFilter");
+    }
+    Json::Value& jColumnList = jWithoutFilter.isNull() ? jRecIn : jWithoutFilter;
     const auto fail = [&] {
         LOG_PLAIN("jRecIn=%s", toString(jRecIn).c_str());
         logSqlError(strSqlError, strSql);
@@ -19,8 +26,6 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
     if (FAILED(strSqlWhere.empty())) return fail();
     if (FAILED(jRecIn.empty())) return fail();
     strSql.append("UPDATE ").append(strName).append(" SET ");
-    // A raw filter in the same object is no column.
-    if (jColumnList.isObject()) jColumnList.removeMember("vornSqlWhereFilter");
     if (FAILED(0 > SqlExpandMemberList(jColumnList, strSql2, VORN_SQL_WHERE_TYPE_COMMA)))
         return fail();
     strSql.append(strSql2).append(" WHERE ").append(strSqlWhere).append(";");
