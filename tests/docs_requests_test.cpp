@@ -123,6 +123,15 @@ TEST_F(DocsRequests, TheRawFilter)
     check("The raw filter", 15);
 }
 
+TEST_F(DocsRequests, TheRawFilterWithATextFromOutside)
+{
+    char* szFilter = sqlite3_mprintf("title like %Q", "Gulliver's%");
+    Json::Value jRequest;
+    jRequest["vornSqlWhereFilter"] = szFilter;
+    sqlite3_free(szFilter);
+    EXPECT_EQ("3", selected(jRequest));
+}
+
 TEST_F(DocsRequests, InsideJsonMembers)
 {
     check("Inside JSON members", 5);

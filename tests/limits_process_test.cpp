@@ -44,6 +44,16 @@ TEST_F(Limits, LockedCallBlocks)
     EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
     EXPECT_EQ(std::vector<unsigned>(500, 10000), doubles::state().sleeps);
 
+    // What the host set to wait on the connection is asked in each attempt.
+    int iAsked = 0;
+    const auto giveUp = [](void* pAsked, int) {
+        ++*static_cast<int*>(pAsked);
+        return 0;
+    };
+    EXPECT_EQ(SQLITE_OK, sqlite3_busy_handler(database.get(), giveUp, &iAsked));
+    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(500, iAsked);
+
     // The host's own attempt is answered at once, and what follows it does not wait.
     doubles::state().sleeps.clear();
     const auto begin = [&] {
