@@ -1,0 +1,267 @@
+// docs/limits.md, what reaches beyond one call: locks, retries, threads, definitions, the reader.
+
+#include "support/limits.h"
+
+#include <json/reader.h>
+
+#include <functional>
+#include <locale>
+#include <mutex>
+#include <thread>
+
+namespace {
+
+// A second connection to a database file.
+class Other {
+public:
+    explicit Other(const Database& database)
+    {
+        EXPECT_EQ(SQLITE_OK, sqlite3_open(database.path().c_str(), &pDb_));
+    }
+    ~Other() { EXPECT_EQ(SQLITE_OK, sqlite3_close(pDb_)); }
+    Other(const Other&) = delete;
+    Other& operator=(const Other&) = delete;
+
+    int run(const char* szSql) { return doubles::realExec(pDb_, szSql, nullptr, nullptr, nullptr); }
+
+private:
+    sqlite3* pDb_ = nullptr;
+};
+
+constexpr char kMembers[] = R"({"id":{"cpptype":"int"},"text":{"cpptype":"string"}})";
+constexpr char kColumns[] = "id integer primary key, text text";
+
+}  // namespace
+
+TEST_F(Limits, LockedCallBlocks)
+{
+    Database database(Database::Place::kFile);
+    Table table(database, kMembers, kColumns);
+    Other other(database);
+    EXPECT_EQ(SQLITE_OK, other.run("begin exclusive"));
+    Json::Value jRequest;
+    Json::Value jRecords;
+    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(std::vector<unsigned>(500, 10000), doubles::state().sleeps);
+
+    // What the host set to wait on the connection is asked in each attempt.
+    int iAsked = 0;
+    const auto giveUp = [](void* pAsked, int) {
+        ++*static_cast<int*>(pAsked);
+        return 0;
+    };
+    EXPECT_EQ(SQLITE_OK, sqlite3_busy_handler(database.get(), giveUp, &iAsked));
+    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(500, iAsked);
+
+    // The host's own attempt is answered at once, and what follows it does not wait.
+    doubles::state().sleeps.clear();
+    const auto begin = [&] {
+        return doubles::realExec(database.get(), sqlExample().c_str(), nullptr, nullptr, nullptr);
+    };
+    EXPECT_EQ(SQLITE_BUSY, begin());
+    EXPECT_EQ(SQLITE_OK, other.run("rollback"));
+    EXPECT_EQ(SQLITE_OK, begin());
+    EXPECT_NE(SQLITE_OK, other.run("begin exclusive"));
+    table.create(R"({"id":1,"text":"x"})");
+    EXPECT_LE(0, table.api.runSqlEx("commit"));
+
+    // In WAL mode a reader does not wait for a writer.
+    EXPECT_EQ("wal", database.value("pragma journal_mode=wal"));
+    EXPECT_EQ(SQLITE_OK, other.run(sqlExample().c_str()));
+    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(1U, jRecords.size());
+    EXPECT_EQ(std::vector<unsigned>(), doubles::state().sleeps);
+    EXPECT_EQ(SQLITE_OK, other.run("rollback"));
+}
+
+TEST_F(Limits, RetryRunsTheWholeTextAgain)
+{
+    Database database(Database::Place::kFile);
+    Table table(database, kMembers, kColumns);
+    Other other(database);
+    const std::string strCount = "select count(*) from " + table.strName;
+
+    // The first attempt of an INSERT: the other connection comes between it and the re-selection.
+    int iAttempts = 0;
+    int iOther = SQLITE_OK;
+    doubles::state().exec = [&](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
+                                void* arg, char** errText) {
+        const std::string strSql = szSql;
+        const std::size_t nInsert = strSql.find(";select") + 1;
+        if (0 == nInsert || 1 < ++iAttempts) {
+            if (0 != nInsert) other.run("rollback");
+            return doubles::realExec(pDb, szSql, callback, arg, errText);
+        }
+        const std::string strInsert = strSql.substr(0, nInsert);
+        EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strInsert.c_str(), nullptr, nullptr, nullptr));
+        iOther = other.run("begin exclusive");
+        return doubles::realExec(pDb, szSql + nInsert, callback, arg, errText);
+    };
+
+    Json::Value jRecord = jExample();
+    EXPECT_EQ(0, table.api.recSave(jRecord, true));
+    EXPECT_EQ(SQLITE_OK, iOther);
+    EXPECT_EQ(2, iAttempts);
+    EXPECT_EQ("2", database.value(strCount));
+
+    database.run("delete from " + table.strName);
+    iAttempts = 0;
+    EXPECT_LE(0, table.api.runSqlEx(sqlExample()));
+    jRecord = jExample();
+    EXPECT_EQ(0, table.api.recSave(jRecord, true));
+    EXPECT_LE(0, table.api.runSqlEx("commit"));
+    EXPECT_EQ(SQLITE_BUSY, iOther);
+    EXPECT_EQ(1, iAttempts);
+    EXPECT_EQ("1", database.value(strCount));
+}
+
+namespace {
+
+// SQL function of a host: lists another table while a statement runs.
+void listOther(sqlite3_context* pContext, int, sqlite3_value**)
+{
+    auto* pOther = static_cast<VornJsonDbApi*>(sqlite3_user_data(pContext));
+    Json::Value jRequest;
+    Json::Value jRecords;
+    EXPECT_EQ(0, pOther->recList(jRequest, jRecords));
+    sqlite3_result_int(pContext, 1);
+}
+
+}  // namespace
+
+TEST_F(Limits, OneThread)
+{
+    table_.create(R"({"id":1,"text":"x"})");
+    Table other(database_, R"({"name":{"cpptype":"string"}})", "name text");
+    other.create(R"({"name":"y"})");
+    EXPECT_EQ(SQLITE_OK, sqlite3_create_function(database_.get(), "list_other", 0, SQLITE_UTF8,
+                                                 &other.api, listOther, nullptr, nullptr));
+    // Rows of the page's table are looked up among the members of the other one.
+    Json::Value jNested;
+    jNested["vornSqlWhereFilter"] = "list_other()";
+    EXPECT_EQ("-1", ids(jNested));
+    EXPECT_EQ(failed("!jType.isMember(strName)"), takeLog().at(0));
+
+    // One after the other; two threads with one lock around every call.
+    std::mutex mutex;
+    const auto listMany = [&mutex](VornJsonDbApi& api, const std::string& strExpected) {
+        for (int i = 0; i < 200; ++i) {
+            const std::lock_guard<std::mutex> lock(mutex);
+            Json::Value jRequest;
+            Json::Value jRecords;
+            EXPECT_EQ(0, api.recList(jRequest, jRecords));
+            EXPECT_EQ(strExpected, text(jRecords));
+        }
+    };
+    const std::string strStored = "[" + stored(1) + "]";
+    std::thread thread(listMany, std::ref(other.api), R"([{"name":"y"}])");
+    listMany(table_.api, strStored);
+    thread.join();
+}
+
+TEST_F(Limits, FirstDefinitionWins)
+{
+    const std::string strSecond = R"({"id":{"cpptype":"int"},"zone":{"cpptype":"string"}})";
+    Database database;
+    database.run("create table " + table_.strName + " (id integer primary key, zone text)");
+    EXPECT_EQ("", ids(Json::nullValue));  // the first definition is read
+    Table second(database, table_.strName, strSecond, "id integer");
+    Json::Value jRecord = json(R"({"id":1,"zone":"north"})");
+    Json::Value jStored;
+    EXPECT_EQ(-1, second.api.recCreate(jRecord, jStored));
+    EXPECT_EQ("0", database.value("select count(*) from " + table_.strName));
+    takeLog();
+
+    Table named(database, strSecond, "id integer primary key, zone text");
+    EXPECT_EQ(text(jRecord), text(named.create(text(jRecord))));
+
+    VORN_JSON_DB::recType(second.jDefinition, second.strName) =
+        second.jDefinition[second.strName]["member"];
+    Table replaced(database, table_.strName, strSecond, "id integer");
+    EXPECT_EQ(text(jRecord), text(replaced.create(text(jRecord))));
+}
+
+namespace {
+
+// [[[...]]] of that many levels.
+std::string nested(std::size_t nLevels)
+{
+    return std::string(nLevels, '[') + std::string(nLevels, ']');
+}
+
+// As a host reads a text that is deeper than jsoncpp's default allows.
+Json::Value readDeep(const std::string& strText)
+{
+    Json::CharReaderBuilder builder;
+    builder["stackLimit"] = 10000;
+    const std::unique_ptr<Json::CharReader> pReader(builder.newCharReader());
+    Json::Value jValue;
+    EXPECT_TRUE(pReader->parse(strText.data(), strText.data() + strText.size(), &jValue, nullptr));
+    return jValue;
+}
+
+}  // namespace
+
+TEST_F(Limits, DeepJsonReadsBackAsNull)
+{
+    for (std::size_t nLevels : {1000U, 1001U}) {
+        Json::Value jRecord;
+        jRecord["id"] = static_cast<int>(nLevels);
+        jRecord["tags"] = readDeep(nested(nLevels));
+        jRecord["text"] = nested(nLevels);
+        Json::Value jStored;
+        EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
+        EXPECT_EQ(1000U == nLevels, jStored["tags"].isArray()) << nLevels;
+        EXPECT_EQ(1001U == nLevels, jStored["tags"].isNull()) << nLevels;
+        EXPECT_EQ(nested(nLevels), database_.value("select tags from " + table_.strName +
+                                                   " where id = " + std::to_string(nLevels)));
+        EXPECT_TRUE(jRecord["tags"] == readDeep(jStored["text"].asString())) << nLevels;
+    }
+}
+
+namespace {
+
+struct DecimalComma : std::numpunct<char> {
+    char do_decimal_point() const override { return ','; }
+};
+
+// The global C++ locale with a decimal comma, for as long as it lives.
+class CommaLocale {
+public:
+    CommaLocale() : before_(std::locale::global(std::locale(std::locale(), new DecimalComma))) {}
+    ~CommaLocale() { std::locale::global(before_); }
+    CommaLocale(const CommaLocale&) = delete;
+    CommaLocale& operator=(const CommaLocale&) = delete;
+
+private:
+    std::locale before_;
+};
+
+}  // namespace
+
+TEST_F(Limits, GlobalLocaleWithADecimalComma)
+{
+    Table table(database_, R"({"o":{"cpptype":"Json::objectValue"}})", "o text");
+    const auto create = [&](const Json::Value& jObject) {
+        Json::Value jRecord;
+        jRecord["o"] = jObject;
+        Json::Value jStored;
+        EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
+        return jStored["o"]["rate"];
+    };
+    const Json::Value jFraction = jExample(0);
+    const Json::Value jText = jExample(1);
+    {
+        const CommaLocale locale;
+        EXPECT_EQ("1.0", text(create(jFraction)));
+        EXPECT_EQ(R"("1.5")", text(create(jText)));
+        EXPECT_EQ("12345", text(create(json(R"({"rate":12345})"))));
+    }
+    EXPECT_EQ("1.5", text(create(jFraction)));
+    EXPECT_EQ((Rows{{R"({"rate":1.5})"},
+                    {R"({"rate":"1.5"})"},
+                    {R"({"rate":12345})"},
+                    {R"({"rate":1.5})"}}),
+              database_.rows("select o from " + table.strName));
+}
