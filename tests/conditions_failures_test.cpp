@@ -201,7 +201,8 @@ protected:
 TEST_F(BadDefinition, LogsTheTypesOnceACallAndFindsNoTerm)
 {
     // Makes sure that the process knows one table at least.
-    const Table known(database_, R"({"a":{"cpptype":"string"}})", "a");
+    Table known(database_, R"({"a":{"cpptype":"string"}})", "a");
+    VORN_JSON_DB::recType(known.jDefinition, known.strName);
     EXPECT_EQ(1, api_.SqlExpandMemberList(jRequest_, strOut_, kAnd));
     EXPECT_EQ("before", strOut_);
     EXPECT_EQ(typeLines("!jTableDef.isMember(strJsonName)"), takeLines());
