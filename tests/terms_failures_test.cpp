@@ -149,6 +149,34 @@ TEST_F(TermFailures, LeaveTheHandleSoundWhereAnAccessorThrows)
     EXPECT_EQ(R"([{"flag":true,"n":5}])", text(jRecords));
 }
 
+// Whatever way a call ends, SQLite has every buffer back.
+TEST_F(TermFailures, ReleaseEveryBuffer)
+{
+    Json::Value jGood = json(R"(["x","y","z"])");
+    Json::Value jBad = json(R"(["x","y",{}])");
+    Json::Value jText = json(R"("x")");
+    Json::Value jSort = json(R"({"sort_by":"x"})");
+    Json::Value jBadSort = json(R"({"sort_by":"x","sort_direction":{}})");
+    std::string strField = "name";
+    std::string strOut;
+    const sqlite3_int64 iUsed = sqlite3_memory_used();
+    EXPECT_LT(0, iUsed);
+    EXPECT_EQ(0, table_.api.SqlMakeByMatchField(strField, jText, strOut));
+    EXPECT_EQ(iUsed, sqlite3_memory_used());
+    EXPECT_EQ(0, table_.api.SqlMakeByListField("name", jGood, strOut));
+    EXPECT_EQ(iUsed, sqlite3_memory_used());
+    EXPECT_THROW(table_.api.SqlMakeByListField("name", jBad, strOut), Json::LogicError);
+    EXPECT_EQ(iUsed, sqlite3_memory_used());
+    doubles::state().iFailMprintf = 3;
+    EXPECT_EQ(-1, table_.api.SqlMakeByListField("name", jGood, strOut));
+    EXPECT_EQ(iUsed, sqlite3_memory_used());
+    EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jSort, strOut));
+    EXPECT_EQ(iUsed, sqlite3_memory_used());
+    EXPECT_THROW(table_.api.SqlFilterConditionFromJson(jBadSort, strOut), Json::LogicError);
+    EXPECT_EQ(iUsed, sqlite3_memory_used());
+    takeLog();
+}
+
 // A lack of memory in C++ goes to the host; nothing was written, and nothing leaks.
 TEST_F(TermFailures, LeaveTheTextAloneWhereMemoryRunsOut)
 {
