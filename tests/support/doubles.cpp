@@ -158,6 +158,7 @@ int __printf_chk(int /*iFlag*/, const char* szFormat, ...)
 time_t time(time_t* pTime) noexcept
 {
     static auto* const pReal = real<time_t(time_t*)>("time");
+    if (state().blNoClock) return -1;
     const time_t now = -1 == state().now ? pReal(nullptr) : state().now;
     if (nullptr != pTime) *pTime = now;
     return now;

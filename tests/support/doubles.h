@@ -45,6 +45,8 @@ struct State {
     bool blFailStrftime = false;
     // time: what it answers instead of the truth; -1 is the truth.
     time_t now = -1;
+    // time: fails, with -1.
+    bool blNoClock = false;
 };
 
 State& state();
