@@ -44,16 +44,17 @@ doubles::Exec execOfStatus(int iStatus, const char* szError)
     };
 }
 
-// No value list can hold a member of this type.
-const char kUnsavable[] = R"("unsavable":{"cpptype":"Json::Value"})";
+// No value list can hold a member of this type. Its name sorts before those of other members, which
+// keeps their column lists complete.
+const char kUnsavable[] = R"("Unsavable":{"cpptype":"Json::Value"})";
 
 std::string lastSqlError(Table& table)
 {
     doubles::state().log.clear();
-    Json::Value jRecord = json(R"({"unsavable":1})");
+    Json::Value jRecord = json(R"({"Unsavable":1})");
     EXPECT_EQ(-1, table.api.recSave(jRecord, true));
     const std::string strHead = plain("sql error, err=");
-    const std::string strTail = ", sql=INSERT INTO " + table.strName + " (unsavable) VALUES (";
+    const std::string strTail = ", sql=INSERT INTO " + table.strName + " (Unsavable,) VALUES (";
     for (const std::string& strLine : takeLog()) {
         if (0 != strLine.compare(0, strHead.size(), strHead)) continue;
         const std::size_t nTail = strLine.rfind(strTail);

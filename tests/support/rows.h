@@ -26,6 +26,7 @@ doubles::Exec execOfRow(Row row);
 doubles::Exec execOfStatus(int iStatus, const char* szError);
 
 // The SQL error text that the handle holds, as a save that ends before it runs any SQL logs it;
-// empty for none. Takes the log. The table's definition has to have kUnsavable as a member.
+// empty for none. Takes the log. The table's definition has to have kUnsavable as a member, beside
+// others in small letters.
 extern const char kUnsavable[];
 std::string lastSqlError(Table& table);
