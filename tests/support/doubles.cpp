@@ -118,6 +118,7 @@ int usleep(useconds_t uMicroseconds)
 {
     static auto* const pReal = real<decltype(usleep)>("usleep");
     state().sleeps.push_back(uMicroseconds);
+    if (state().onSleep) state().onSleep();
     return state().blReallySleep ? pReal(uMicroseconds) : 0;
 }
 

@@ -30,6 +30,7 @@ struct State {
     // usleep: never sleeps in earnest, unless told to.
     std::vector<unsigned> sleeps;
     bool blReallySleep = false;
+    std::function<void()> onSleep;
     // syslog and printf.
     std::vector<LogRecord> log;
     // sqlite3_changes: what it answers instead of the truth.
