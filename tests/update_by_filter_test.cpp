@@ -150,12 +150,18 @@ TEST_F(UpdateByFilter, RefusesValuesOfTheWrongType)
         const char* szKey;
         const char* szValues;
     } cases[] = {
-        {"id", R"({"id":"5"})"},     {"id", R"({"id":null})"},
-        {"id", R"({"id":1.5})"},     {"name", R"({"name":5})"},
-        {"name", R"({"name":null})"}, {"flag", R"({"flag":1})"},
-        {"flag", R"({"flag":"true"})"}, {"data", R"({"data":[1]})"},
-        {"data", R"({"data":"{}"})"}, {"tags", R"({"tags":{"a":1}})"},
-        {"id", R"({"flag":true,"id":"5"})"}, {"flag", R"({"flag":0,"id":"5"})"},
+        {"id", R"({"id":"5"})"},
+        {"id", R"({"id":null})"},
+        {"id", R"({"id":1.5})"},
+        {"name", R"({"name":5})"},
+        {"name", R"({"name":null})"},
+        {"flag", R"({"flag":1})"},
+        {"flag", R"({"flag":"true"})"},
+        {"data", R"({"data":[1]})"},
+        {"data", R"({"data":"{}"})"},
+        {"tags", R"({"tags":{"a":1}})"},
+        {"id", R"({"flag":true,"id":"5"})"},
+        {"flag", R"({"flag":0,"id":"5"})"},
     };
     for (const auto& row : cases) {
         const std::string strValues = row.szValues;
