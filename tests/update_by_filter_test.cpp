@@ -1,48 +1,14 @@
-// Updating by a filter object, and the duplicate message that comes with its failures.
+// Updating by a filter object.
 
-#include "support/records.h"
+#include "support/filter_update.h"
 
 namespace {
 
 const std::string kNoConditions =
     failed("0 > SqlExpandMemberList(jFilterIn, strSql, VORN_SQL_WHERE_TYPE_AND)");
-const std::string kNoUpdate = failed("0 > recUpdateByWhere(jParamIn, strSql)");
-const std::string kNotRun = failed("0 > runSqlEx(strSql, NULL, NULL)");
 const std::string kBadTypes = failed("0 > checkJsonType(jParamIn)");
 
-class UpdateByFilter : public RecordsTest {
-protected:
-    int update(const std::string& strFilter, const std::string& strValues)
-    {
-        jFilter_ = json(strFilter);
-        jValues_ = json(strValues);
-        const int iResult = table_.api.recUpdateByFilter(jFilter_, jValues_);
-        EXPECT_EQ(json(strFilter), jFilter_) << "the filter was changed";
-        EXPECT_EQ(json(strValues), jValues_) << "the values were changed";
-        return iResult;
-    }
-
-    std::string statement(const std::string& strTail) const
-    {
-        return "UPDATE " + table_.strName + " SET " + strTail;
-    }
-
-    static std::string summary(const std::string& strValues)
-    {
-        return plain("recUpdateByFilter failed, jParamIn=" + strValues);
-    }
-
-    // The lines of a statement that SQLite refused, down to the summary.
-    static Lines refused(const std::string& strError, const std::string& strSql,
-                         const std::string& strValues)
-    {
-        return {runFailed(strError, strSql), kNotRun,   plain("jRecIn=" + strValues),
-                sqlError(strError, strSql),  kNoUpdate, summary(strValues)};
-    }
-
-    Json::Value jFilter_;
-    Json::Value jValues_;
-};
+class UpdateByFilter : public UpdateByFilterTest {};
 
 TEST_F(UpdateByFilter, ComposesOneStatement)
 {
@@ -241,114 +207,6 @@ TEST_F(UpdateByFilter, WhatAnAccessorThrowsReachesTheHost)
     EXPECT_EQ("1Ann0,2Bob0,3O'Brien1", contents());
 }
 
-TEST_F(UpdateByFilter, TellsTheHostOfADuplicate)
-{
-    const struct {
-        const char* szValues;
-        const char* szSet;
-        const char* szColumn;
-    } cases[] = {
-        {R"({"name":"Bob"})", "name='Bob'", ".name"},
-        {R"({"id":2})", "id=2", ".id"},
-    };
-    for (const auto& row : cases) {
-        table_.api.setErrMsg("");
-        EXPECT_EQ(-1, update(R"({"id":1})", row.szValues));
-        const std::string strSql = statement(std::string(row.szSet) + " WHERE  (id=1 );");
-        EXPECT_EQ(refused("UNIQUE constraint failed: " + table_.strName + row.szColumn, strSql,
-                          row.szValues),
-                  takeLog());
-        EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table_.api.getErrMsg());
-        EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
-    }
-    // Nothing but the host clears it.
-    EXPECT_EQ(0, update(R"({"id":1})", R"({"flag":true})"));
-    EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table_.api.getErrMsg());
-    EXPECT_EQ(-1, update(R"({"id":1})", "{}"));
-    EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table_.api.getErrMsg());
-}
-
-TEST_F(UpdateByFilter, AnotherConstraintIsNoDuplicate)
-{
-    Table table(database_, R"({"n":{"cpptype":"int"}})", "n integer check (n < 10)");
-    database_.run("insert into " + table.strName + " values (1)");
-    jFilter_ = json(R"({"n":1})");
-    jValues_ = json(R"({"n":11})");
-    table.api.setErrMsg("mine");
-    EXPECT_EQ(-1, table.api.recUpdateByFilter(jFilter_, jValues_));
-    EXPECT_EQ(refused("CHECK constraint failed: n < 10",
-                      "UPDATE " + table.strName + " SET n=11 WHERE  (n=1 );", R"({"n":11})"),
-              takeLog());
-    EXPECT_EQ("mine", table.api.getErrMsg());
-}
-
-TEST_F(UpdateByFilter, AnEarlierDuplicateCountsForEveryFailureWithoutSql)
-{
-    makeStaleDuplicate();
-    const struct {
-        const char* szFilter;
-        const char* szValues;
-    } cases[] = {
-        {"{}", R"({"id":5})"},
-        {"[1]", R"({"id":5})"},
-        {R"({"id":1})", "[1]"},
-        {R"({"vornSqlWhereFilter":5})", R"({"id":5})"},
-        {R"({"undeclared":5})", R"({"id":5})"},
-        {R"({"id":1})", R"({"id":"5"})"},
-        {R"({"id":1})", "{}"},
-    };
-    for (const auto& row : cases) {
-        table_.api.setErrMsg("");
-        EXPECT_EQ(-1, update(row.szFilter, row.szValues)) << row.szFilter;
-        EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table_.api.getErrMsg()) << row.szFilter;
-    }
-    EXPECT_EQ(Lines(), takeStatements());
-    takeLog();
-
-    // Only the level below has a line for the text.
-    EXPECT_EQ(-1, update(R"({"id":1})", "{}"));
-    EXPECT_EQ((Lines{failed("jRecIn.empty()"), plain("jRecIn={}"),
-                     sqlError("UNIQUE constraint failed: " + table_.strName + ".id", ""), kNoUpdate,
-                     summary("{}")}),
-              takeLog());
-    EXPECT_EQ(-1, update("{}", "{}"));
-    EXPECT_EQ((Lines{failed("jFilterIn.empty()"), summary("{}")}), takeLog());
-
-    // A statement that succeeds, of whatever operation, ends it.
-    EXPECT_EQ(0, update(R"({"id":9})", R"({"flag":true})"));
-    table_.api.setErrMsg("");
-    EXPECT_EQ(-1, update("{}", "{}"));
-    EXPECT_EQ("", table_.api.getErrMsg());
-}
-
-TEST_F(UpdateByFilter, AnEarlierErrorOfAnotherKindLeavesTheMessage)
-{
-    makeStale();
-    table_.api.setErrMsg("mine");
-    EXPECT_EQ(-1, update("{}", "{}"));
-    EXPECT_EQ("mine", table_.api.getErrMsg());
-    EXPECT_EQ((Lines{failed("jFilterIn.empty()"), summary("{}")}), takeLog());
-}
-
-TEST_F(UpdateByFilter, ADuplicateOfOneHandleIsNoneOfAnother)
-{
-    makeStaleDuplicate();
-    VornJsonDbApi other(database_.get(), table_.strName, table_.jDefinition, table_.strCreate);
-    EXPECT_EQ(-1, other.recUpdateByFilter(jFilter_, jValues_));
-    EXPECT_EQ("", other.getErrMsg());
-}
-
-TEST_F(UpdateByFilter, AReplaceTakesAwayTheRowsInItsWayAndIsNoDuplicate)
-{
-    Json::Value jRecord = json(R"({"flag":true,"id":1,"name":"Bob","tags":[2]})");
-    EXPECT_EQ(0, table_.api.recSave(jRecord, false));
-    EXPECT_EQ("1Bob1,3O'Brien1", contents());
-    EXPECT_EQ(0, update(R"({"name":"Bob"})", R"({"id":2})"));
-    EXPECT_EQ("2Bob1,3O'Brien1", contents());
-    EXPECT_EQ("", table_.api.getErrMsg());
-    EXPECT_EQ(Lines(), takeLog());
-}
-
 TEST_F(UpdateByFilter, TracesTheTextOfSqliteWhenAsked)
 {
     blDebugOutput = true;
@@ -368,9 +226,11 @@ TEST_F(UpdateByFilterLocked, GivesUpAfterEveryAttempt)
     Json::Value jValues = json(R"({"flag":false})");
     EXPECT_EQ(-1, table_.api.recUpdateByFilter(jFilter, jValues));
     const std::string strSql = "UPDATE " + table_.strName + " SET flag=0 WHERE  (id=1 );";
-    EXPECT_EQ((Lines{runFailed("database is locked", strSql, 500), kNotRun,
-                     plain(R"(jRecIn={"flag":false})"), sqlError("database is locked", strSql),
-                     kNoUpdate, plain(R"(recUpdateByFilter failed, jParamIn={"flag":false})")}),
+    EXPECT_EQ((Lines{runFailed("database is locked", strSql, 500),
+                     failed("0 > runSqlEx(strSql, NULL, NULL)"), plain(R"(jRecIn={"flag":false})"),
+                     sqlError("database is locked", strSql),
+                     failed("0 > recUpdateByWhere(jParamIn, strSql)"),
+                     plain(R"(recUpdateByFilter failed, jParamIn={"flag":false})")}),
               takeLog());
     expectEveryAttempt(strSql);
     other("commit");
