@@ -463,5 +463,43 @@ refused t.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
     t.db languages.json import twice.json 639-3
 rows t.db languages 'qaa|Reserved|I|L||||'
 
+# listed TABLE FILE KEY: the list of every record is the source, completed by its defaults, in its
+# order
+listed() {
+    local members
+    members=$(sqlite3 iso.db "select group_concat('''' || name || ''', ' ||
+            'ifnull(json_extract(value, ''$.' || name || '''), '''')')
+        from (select name from pragma_table_info('$1') order by name)")
+    sqlite3 :memory: "select json_object($members)
+        from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"')" >"wanted_$1"
+    "$program" iso.db "$1.json" list >out 2>err
+    same "list of $1" same "$(cmp "wanted_$1" out && echo same)"
+}
+expect 0 "{\"deleted\":$languages}" '' iso.db languages.json delete-all
+expect 0 "{\"deleted\":$subdivisions}" '' iso.db subdivisions.json delete-all
+expect 0 "{\"imported\":$languages}" '' iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
+expect 0 "{\"imported\":$subdivisions}" '' \
+    iso.db subdivisions.json import "$iso_codes/iso_3166-2.json" 3166-2
+listed languages iso_639-3.json 639-3
+listed subdivisions iso_3166-2.json 3166-2
+
+# chosen CONDITION: how many languages it selects
+chosen() { sqlite3 iso.db "select count(*) from languages where $1"; }
+living=$(chosen "type = 'L'")
+extinct=$(chosen "type = 'E'")
+same 'there are living and extinct ones' yes "$( ((living > 5000 && extinct > 300)) && echo yes)"
+"$program" iso.db languages.json list '{"type": "L"}' >out
+same 'list of living languages' same "$(grep '"type":"L"}$' wanted_languages | cmp - out && echo same)"
+expect 0 "{\"updated\":$living}" '' iso.db languages.json update '{"type": "L"}' '{"type": "living"}'
+same 'updated languages' "0|$living" "$(chosen "type = 'L'")|$(chosen "type = 'living'")"
+expect 0 "{\"deleted\":$extinct}" '' iso.db languages.json delete '{"type": "E"}'
+mapfile -t codes < <(sqlite3 iso.db 'select alpha_3 from languages')
+same 'what is left' $((languages - extinct)) "${#codes[@]}"
+refused iso.db "records: delete-by: {\"alpha_3\":\"\"}: $log" \
+    iso.db languages.json delete-by alpha_3 "${codes[@]}" ''
+expect 0 "{\"deleted\":${#codes[@]}}" '' iso.db languages.json delete-by alpha_3 "${codes[@]}"
+expect 0 '' '' iso.db languages.json list
+same 'integrity at the end' ok "$(sqlite3 iso.db 'pragma integrity_check')"
+
 echo "$checks checks, $failures failed"
 ((failures == 0))
