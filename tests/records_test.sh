@@ -3,65 +3,7 @@
 # compared exactly, and what stands in the database file afterwards (read with the sqlite3 shell).
 #
 # usage: records_test.sh PROGRAM TABLES-FOLDER WORK-FOLDER
-#
-# The last part imports the whole of iso_639-3.json and iso_3166-2.json from the package iso-codes
-# and compares every record with its source.
-set -euo pipefail
-export LC_ALL=C.UTF-8
-
-program=$1
-tables=$2
-work=$3
-iso_codes=/usr/share/iso-codes/json
-
-for needed in sqlite3 script; do
-    command -v "$needed" >/dev/null || { echo "$needed is not installed"; exit 1; }
-done
-for needed in iso_639-3 iso_3166-2; do
-    [[ -r $iso_codes/$needed.json ]] || { echo "iso-codes is not installed"; exit 1; }
-done
-
-rm -rf "$work"
-mkdir -p "$work"
-cd "$work"
-
-checks=0
-failures=0
-
-# same NAME EXPECTED ACTUAL
-same() {
-    checks=$((checks + 1))
-    [[ $2 == "$3" ]] && return
-    failures=$((failures + 1))
-    printf 'FAILED line %s: %s\n--- expected\n%s\n--- got\n%s\n' "${BASH_LINENO[-2]}" "$1" "$2" "$3"
-}
-
-# What the file holds and one dot, which keeps the newlines before it.
-text_of() { cat "$1"; printf .; }
-
-# lines TEXT: the text as a program prints it, and the dot
-lines() { printf '%s' "$1${1:+$'\n'}."; }
-
-# expect STATUS STDOUT STDERR ARGUMENT...: runs the program
-expect() {
-    local status=0
-    "$program" "${@:4}" >out 2>err || status=$?
-    same "exit status: ${*:4}" "$1" "$status"
-    same "standard output: ${*:4}" "$(lines "$2")" "$(text_of out)"
-    same "standard error: ${*:4}" "$(lines "$3")" "$(text_of err)"
-}
-
-# refused DATABASE STDERR ARGUMENT...: a failure with exit status 1 that leaves every byte of the
-# database as it was
-refused() {
-    cp "$1" before.db
-    expect 1 '' "$2" "${@:3}"
-    same "file unchanged: ${*:3}" 'same' "$(cmp -s before.db "$1" && echo same || echo changed)"
-    same "integrity: ${*:3}" ok "$(sqlite3 "$1" 'pragma integrity_check')"
-}
-
-# rows DATABASE TABLE EXPECTED: the table's rows in the shell's list form
-rows() { same "rows of $2" "$3" "$(sqlite3 "$1" "select * from $2 order by rowid")"; }
+. "$(dirname "${BASH_SOURCE[0]}")/support/records.sh"
 
 cat >notes.json <<'EOF'
 {"name": "notes", "key": "id",
@@ -127,7 +69,6 @@ rows n.db notes $'1|0|[]|none\n2|1|["a",{"b":null}]|Größe \'"\\ 語\n3|0|[]|tw
 
 # refuse COMMAND MESSAGE ARGUMENT...
 refuse() { refused n.db "records: $1: $2" n.db notes.json "$1" "${@:3}"; }
-log='failed (-v shows the log)'
 refuse create 'id 1: DUPLICATE_PRIMARY_KEY' '{"id": 1}'
 refuse create "id \"4\": $log" '{"id": "4"}'
 refuse create "id {\"a\":[1,\"\\n\"]}: $log" '{"id": {"a": [1, "\n"]}}'
@@ -407,99 +348,4 @@ same 'log' "(PID) VornJsonDbApi:N i=0,errno=N, run sql failed, error=$unique, sq
 ." "$(text_of log)"
 expect 0 '{"done":false,"id":31,"tags":[],"text":"none"}' '' -v n.db notes.json create '{"id": 31}'
 
-# ------------------------------------------------------------------------------- all of iso-codes
-# compare TABLE FILE KEY COUNT: every record of the source stands in the table and the other way
-# round, member by member; what the source leaves out reads as an empty text.
-compare() {
-    local columns values
-    columns=$(sqlite3 iso.db "select group_concat(name) from pragma_table_info('$1')")
-    values=$(sqlite3 iso.db "select group_concat('ifnull(json_extract(value, ''$.' || name || '''), '''')')
-        from pragma_table_info('$1')")
-    sqlite3 iso.db "create temp table source as
-            select $values from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"');
-        select 'source', count(*) from source;
-        select 'table', count(*) from $1;
-        select 'only in the source', count(*) from (select * from source except select $columns from $1);
-        select 'only in the table', count(*) from (select $columns from $1 except select * from source);
-        select 'members without a column', count(*)
-            from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"') r, json_each(r.value) m
-            where m.key not in (select name from pragma_table_info('$1'));" >compared
-    same "records of $1" "source|$4
-table|$4
-only in the source|0
-only in the table|0
-members without a column|0" "$(cat compared)"
-}
-
-cp "$tables"/*.json .
-count() {
-    sqlite3 :memory: "select json_array_length(readfile('$iso_codes/$1'), '\$.\"$2\"')"
-}
-languages=$(count iso_639-3.json 639-3)
-subdivisions=$(count iso_3166-2.json 3166-2)
-same 'there are thousands' yes "$( ((languages > 7000 && subdivisions > 4000)) && echo yes)"
-
-expect 0 "{\"imported\":$languages}" '' iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
-expect 0 "{\"imported\":$subdivisions}" '' \
-    iso.db subdivisions.json import "$iso_codes/iso_3166-2.json" 3166-2
-compare languages iso_639-3.json 639-3 "$languages"
-compare subdivisions iso_3166-2.json 3166-2 "$subdivisions"
-same 'integrity' ok "$(sqlite3 iso.db 'pragma integrity_check')"
-
-refused iso.db 'records: create: alpha_3 "deu": DUPLICATE_PRIMARY_KEY' \
-    iso.db languages.json create '{"alpha_3": "deu", "name": "German", "scope": "I", "type": "L"}'
-refused iso.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
-    iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
-expect 0 '{"code":"AD-02","name":"Canillo","parent":"","type":"Parish (again)"}' '' iso.db \
-    subdivisions.json save '{"code": "AD-02", "name": "Canillo", "parent": "", "type": "Parish (again)"}'
-
-# The last of thousands fails: nothing of them stays.
-sqlite3 :memory: "select json_insert(readfile('$iso_codes/iso_639-3.json'), '\$.\"639-3\"[#]',
-    json('{\"alpha_3\": \"aaa\", \"name\": \"Twice\", \"scope\": \"I\", \"type\": \"L\"}'))" >twice.json
-expect 0 '{"alpha_2":"","alpha_3":"qaa","bibliographic":"","common_name":"","inverted_name":"","name":'\
-'"Reserved","scope":"I","type":"L"}' '' \
-    t.db languages.json create '{"alpha_3": "qaa", "name": "Reserved", "scope": "I", "type": "L"}'
-refused t.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
-    t.db languages.json import twice.json 639-3
-rows t.db languages 'qaa|Reserved|I|L||||'
-
-# listed TABLE FILE KEY: the list of every record is the source, completed by its defaults, in its
-# order
-listed() {
-    local members
-    members=$(sqlite3 iso.db "select group_concat('''' || name || ''', ' ||
-            'ifnull(json_extract(value, ''$.' || name || '''), '''')')
-        from (select name from pragma_table_info('$1') order by name)")
-    sqlite3 :memory: "select json_object($members)
-        from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"')" >"wanted_$1"
-    "$program" iso.db "$1.json" list >out 2>err
-    same "list of $1" same "$(cmp "wanted_$1" out && echo same)"
-}
-expect 0 "{\"deleted\":$languages}" '' iso.db languages.json delete-all
-expect 0 "{\"deleted\":$subdivisions}" '' iso.db subdivisions.json delete-all
-expect 0 "{\"imported\":$languages}" '' iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
-expect 0 "{\"imported\":$subdivisions}" '' \
-    iso.db subdivisions.json import "$iso_codes/iso_3166-2.json" 3166-2
-listed languages iso_639-3.json 639-3
-listed subdivisions iso_3166-2.json 3166-2
-
-# chosen CONDITION: how many languages it selects
-chosen() { sqlite3 iso.db "select count(*) from languages where $1"; }
-living=$(chosen "type = 'L'")
-extinct=$(chosen "type = 'E'")
-same 'there are living and extinct ones' yes "$( ((living > 5000 && extinct > 300)) && echo yes)"
-"$program" iso.db languages.json list '{"type": "L"}' >out
-same 'list of living languages' same "$(grep '"type":"L"}$' wanted_languages | cmp - out && echo same)"
-expect 0 "{\"updated\":$living}" '' iso.db languages.json update '{"type": "L"}' '{"type": "living"}'
-same 'updated languages' "0|$living" "$(chosen "type = 'L'")|$(chosen "type = 'living'")"
-expect 0 "{\"deleted\":$extinct}" '' iso.db languages.json delete '{"type": "E"}'
-mapfile -t codes < <(sqlite3 iso.db 'select alpha_3 from languages')
-same 'what is left' $((languages - extinct)) "${#codes[@]}"
-refused iso.db "records: delete-by: {\"alpha_3\":\"\"}: $log" \
-    iso.db languages.json delete-by alpha_3 "${codes[@]}" ''
-expect 0 "{\"deleted\":${#codes[@]}}" '' iso.db languages.json delete-by alpha_3 "${codes[@]}"
-expect 0 '' '' iso.db languages.json list
-same 'integrity at the end' ok "$(sqlite3 iso.db 'pragma integrity_check')"
-
-echo "$checks checks, $failures failed"
-((failures == 0))
+finish
