@@ -14,16 +14,18 @@
 /// "key" is this program's own and may be absent: the member that names a record in a message.
 ///
 /// Records go to standard output as JSON, one a line. Messages are one line on standard error. The
-/// exit status is 0, 1 when something failed, 2 for wrong arguments.
+/// exit status is 0, 1 when something failed, 2 for wrong arguments, 3 when `get` finds nothing,
+/// about which it says nothing else.
+#include "progress.h"
+
 #include <VornJsonDbApi.h>
 
 #include <json/reader.h>
 #include <json/writer.h>
 #include <sqlite3.h>
-#include <unistd.h>
 
 #include <cerrno>
-#include <cstdio>
+#include <cstdint>
 #include <cstring>
 #include <fstream>
 #include <iostream>
@@ -42,9 +44,14 @@ namespace {
 
 using Arguments = std::vector<std::string>;
 
+constexpr int kFailed = 1;
+constexpr int kWrongArguments = 2;
+constexpr int kNothingFound = 3;
+
 // What a command works with.
 struct Table {
     VornJsonDbApi& api;
+    sqlite3* pDb;
     std::string strKey;  // the member that names a record in a message, or empty
 };
 
@@ -62,6 +69,15 @@ std::string toText(const Json::Value& jValue)
 void print(const Json::Value& jValue)
 {
     std::cout << toText(jValue) << '\n';
+}
+
+// {"deleted":3}
+template <typename Number>
+void printCount(const char* szWhat, Number count)
+{
+    Json::Value jResult;
+    jResult[szWhat] = count;
+    print(jResult);
 }
 
 // Reads one JSON object or array; strSource names it in the message when it is none.
@@ -100,21 +116,46 @@ std::string nameOf(const Table& table, const Json::Value& jRecord)
     return table.strKey + " " + toText(jRecord[table.strKey]);
 }
 
-// Ends the command after an operation on strWhat returned -1. The library has a message for the
-// user where it knows the reason; everything else stands in its log.
-[[noreturn]] void fail(const Table& table, const std::string& strWhat)
+// Runs one operation of the library and returns its result. After -1 it ends the command: the
+// library has a message for the user where it knows the reason, all else stands in its log.
+template <typename Operation>
+int attempt(Table& table, const std::string& strWhat, Operation operation)
 {
+    table.api.setErrMsg("");  // nothing else clears the message of an earlier operation
+    const int iResult = operation();
+    if (0 <= iResult) return iResult;
     const std::string strReason = table.api.getErrMsg();
     throw std::runtime_error(strWhat + ": " +
                              (strReason.empty() ? "failed (-v shows the log)" : strReason));
+}
+
+void runSql(Table& table, const char* szSql)
+{
+    attempt(table, szSql, [&] { return table.api.runSqlEx(szSql); });
+}
+
+// Does the work as a whole or, when it throws, not at all. The transaction is the host's: the
+// library knows none. IMMEDIATE takes the write lock at once, so that no part of the work meets a
+// database that somebody else has locked meanwhile.
+template <typename Work>
+void inTransaction(Table& table, Work work)
+{
+    runSql(table, "begin immediate");
+    try {
+        work();
+        runSql(table, "commit");
+    } catch (...) {
+        // It may fail where SQLite has rolled back already, and closing the database does it too.
+        table.api.runSqlEx("rollback");
+        throw;
+    }
 }
 
 int create(Table& table, const Arguments& arguments)
 {
     Json::Value jRecord = parseArgument(arguments[0], "RECORD-JSON");
     Json::Value jStored;
-    table.api.setErrMsg("");
-    if (0 > table.api.recCreate(jRecord, jStored)) fail(table, nameOf(table, jRecord));
+    attempt(table, nameOf(table, jRecord), [&] { return table.api.recCreate(jRecord, jStored); });
     print(jStored);
     return 0;
 }
@@ -123,38 +164,10 @@ int create(Table& table, const Arguments& arguments)
 int save(Table& table, const Arguments& arguments)
 {
     Json::Value jRecord = parseArgument(arguments[0], "RECORD-JSON");
-    table.api.setErrMsg("");
-    if (0 > table.api.recSave(jRecord, false)) fail(table, nameOf(table, jRecord));
+    attempt(table, nameOf(table, jRecord), [&] { return table.api.recSave(jRecord, false); });
     print(jRecord);
     return 0;
 }
-
-// A bar on standard error, where that is a terminal.
-class Progress {
-public:
-    explicit Progress(unsigned uTotal) : uTotal_(uTotal), blShown_(0 < uTotal && 1 == isatty(2)) {}
-    ~Progress()
-    {
-        if (blShown_) std::fputc('\n', stderr);
-    }
-    Progress(const Progress&) = delete;
-    Progress& operator=(const Progress&) = delete;
-
-    void show(unsigned uDone)
-    {
-        const int iPercent = static_cast<int>(100ULL * uDone / uTotal_);
-        if (!blShown_ || iPercent == iPercent_) return;
-        iPercent_ = iPercent;
-        const std::string strBar(static_cast<std::size_t>(iPercent / 2), '#');
-        std::fprintf(stderr, "\r[%-50s] %3d %% of %u", strBar.c_str(), iPercent, uTotal_);
-        std::fflush(stderr);
-    }
-
-private:
-    unsigned uTotal_;
-    bool blShown_;
-    int iPercent_ = -1;
-};
 
 Json::Value readArray(const Arguments& arguments)
 {
@@ -169,40 +182,88 @@ Json::Value readArray(const Arguments& arguments)
     throw std::runtime_error(strPath + ": no array under " + toText(strKey));
 }
 
-void runSql(Table& table, const char* szSql)
-{
-    table.api.setErrMsg("");
-    if (0 > table.api.runSqlEx(szSql)) fail(table, szSql);
-}
-
-void createAll(Table& table, Json::Value& jArray)
-{
-    Progress progress(jArray.size());
-    Json::Value jStored;
-    for (Json::ArrayIndex i = 0; i < jArray.size(); ++i) {
-        table.api.setErrMsg("");
-        if (0 > table.api.recCreate(jArray[i], jStored)) fail(table, nameOf(table, jArray[i]));
-        progress.show(i + 1);
-    }
-}
-
-// All records or none. The transaction is the host's: the library knows none. IMMEDIATE takes the
-// write lock at once, so that no record meets a database that somebody else has locked meanwhile.
+// All records or none.
 int import(Table& table, const Arguments& arguments)
 {
     Json::Value jArray = readArray(arguments);
-    runSql(table, "begin immediate");
-    try {
-        createAll(table, jArray);
-        runSql(table, "commit");
-    } catch (...) {
-        // It may fail where SQLite has rolled back already, and closing the database does it too.
-        table.api.runSqlEx("rollback");
-        throw;
-    }
-    Json::Value jResult;
-    jResult["imported"] = jArray.size();
-    print(jResult);
+    inTransaction(table, [&] {
+        Progress progress(jArray.size());
+        Json::Value jStored;
+        for (Json::Value& jRecord : jArray) {
+            attempt(table, nameOf(table, jRecord),
+                    [&] { return table.api.recCreate(jRecord, jStored); });
+            progress.advance();
+        }
+    });
+    printCount("imported", jArray.size());
+    return 0;
+}
+
+int list(Table& table, const Arguments& arguments)
+{
+    const std::string strEveryRecord = "{}";
+    Json::Value jRequest =
+        parseArgument(arguments.empty() ? strEveryRecord : arguments[0], "REQUEST-JSON");
+    Json::Value jRecords(Json::arrayValue);
+    attempt(table, toText(jRequest), [&] { return table.api.recList(jRequest, jRecords); });
+    for (const Json::Value& jRecord : jRecords) print(jRecord);
+    return 0;
+}
+
+int get(Table& table, const Arguments& arguments)
+{
+    Json::Value jRequest = parseArgument(arguments[0], "REQUEST-JSON");
+    const std::string strRequest = toText(jRequest);
+    // Without it the library reads every record that matches and takes the first.
+    if (jRequest.isObject()) jRequest["limit"] = 1;
+    Json::Value jRecord;
+    if (0 == attempt(table, strRequest, [&] { return table.api.recGetOne(jRequest, jRecord); }))
+        return kNothingFound;
+    print(jRecord);
+    return 0;
+}
+
+int update(Table& table, const Arguments& arguments)
+{
+    Json::Value jFilter = parseArgument(arguments[0], "FILTER-JSON");
+    Json::Value jValues = parseArgument(arguments[1], "VALUES-JSON");
+    attempt(table, toText(jFilter), [&] { return table.api.recUpdateByFilter(jFilter, jValues); });
+    // The library does not tell how many, SQLite does: all rows that the filter selected.
+    printCount("updated", sqlite3_changes(table.pDb));
+    return 0;
+}
+
+// A request that selects by nothing is refused: delete-all says it clearly.
+int deleteSome(Table& table, const Arguments& arguments)
+{
+    Json::Value jRequest = parseArgument(arguments[0], "REQUEST-JSON");
+    printCount("deleted",
+               attempt(table, toText(jRequest), [&] { return table.api.recDelete(jRequest); }));
+    return 0;
+}
+
+int deleteAll(Table& table, const Arguments& /*none*/)
+{
+    printCount("deleted", attempt(table, "every record", [&] { return table.api.recDeleteAll(); }));
+    return 0;
+}
+
+// One call for each value, because the library writes several values of a list without a comma.
+int deleteBy(Table& table, const Arguments& arguments)
+{
+    const std::string& strKey = arguments[0];
+    int iDeleted = 0;
+    inTransaction(table, [&] {
+        for (std::size_t i = 1; i < arguments.size(); ++i) {
+            std::string strValue = arguments[i];
+            Json::Value jRequest;
+            jRequest[strKey] = strValue;
+            iDeleted += attempt(table, toText(jRequest), [&] {
+                return table.api.recDeleteByName(strValue, strKey.c_str());
+            });
+        }
+    });
+    printCount("deleted", iDeleted);
     return 0;
 }
 
@@ -218,6 +279,12 @@ constexpr Command kCommands[] = {
     {"create", "RECORD-JSON", 1, 1, create},
     {"save", "RECORD-JSON", 1, 1, save},
     {"import", "FILE.json [KEY]", 1, 2, import},
+    {"list", "[REQUEST-JSON]", 0, 1, list},
+    {"get", "REQUEST-JSON", 1, 1, get},
+    {"update", "FILTER-JSON VALUES-JSON", 2, 2, update},
+    {"delete", "REQUEST-JSON", 1, 1, deleteSome},
+    {"delete-all", "", 0, 0, deleteAll},
+    {"delete-by", "KEY VALUE...", 2, SIZE_MAX, deleteBy},
 };
 
 const Command* findCommand(const std::string& strName, std::size_t uArguments)
@@ -235,8 +302,9 @@ int usage()
                  "  -v  show the library's log on standard output\n"
                  "commands:\n";
     for (const Command& command : kCommands)
-        std::cerr << "  " << command.szName << ' ' << command.szArguments << '\n';
-    return 2;
+        std::cerr << "  " << command.szName << (*command.szArguments ? " " : "")
+                  << command.szArguments << '\n';
+    return kWrongArguments;
 }
 
 struct CloseDatabase {
@@ -277,7 +345,7 @@ int run(const Command& command, const std::string& strDatabase, const std::strin
     if (0 > api.tableCreate())
         throw std::runtime_error(strDatabase + ": " + sqlite3_errmsg(database.get()));
 
-    Table table{api, jTable["key"].asString()};
+    Table table{api, database.get(), jTable["key"].asString()};
     const int iStatus = command.run(table, arguments);
     if (!std::cout.flush()) throw std::runtime_error("standard output cannot be written");
     return iStatus;
@@ -302,6 +370,6 @@ int main(int argc, char** argv)
     } catch (const std::exception& error) {
         // Also what jsoncpp throws, through the library, at a value of the wrong kind.
         std::cerr << "records: " << pCommand->szName << ": " << error.what() << '\n';
-        return 1;
+        return kFailed;
     }
 }

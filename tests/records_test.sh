@@ -3,65 +3,7 @@
 # compared exactly, and what stands in the database file afterwards (read with the sqlite3 shell).
 #
 # usage: records_test.sh PROGRAM TABLES-FOLDER WORK-FOLDER
-#
-# The last part imports the whole of iso_639-3.json and iso_3166-2.json from the package iso-codes
-# and compares every record with its source.
-set -euo pipefail
-export LC_ALL=C.UTF-8
-
-program=$1
-tables=$2
-work=$3
-iso_codes=/usr/share/iso-codes/json
-
-for needed in sqlite3 script; do
-    command -v "$needed" >/dev/null || { echo "$needed is not installed"; exit 1; }
-done
-for needed in iso_639-3 iso_3166-2; do
-    [[ -r $iso_codes/$needed.json ]] || { echo "iso-codes is not installed"; exit 1; }
-done
-
-rm -rf "$work"
-mkdir -p "$work"
-cd "$work"
-
-checks=0
-failures=0
-
-# same NAME EXPECTED ACTUAL
-same() {
-    checks=$((checks + 1))
-    [[ $2 == "$3" ]] && return
-    failures=$((failures + 1))
-    printf 'FAILED line %s: %s\n--- expected\n%s\n--- got\n%s\n' "${BASH_LINENO[-2]}" "$1" "$2" "$3"
-}
-
-# What the file holds and one dot, which keeps the newlines before it.
-text_of() { cat "$1"; printf .; }
-
-# lines TEXT: the text as a program prints it, and the dot
-lines() { printf '%s' "$1${1:+$'\n'}."; }
-
-# expect STATUS STDOUT STDERR ARGUMENT...: runs the program
-expect() {
-    local status=0
-    "$program" "${@:4}" >out 2>err || status=$?
-    same "exit status: ${*:4}" "$1" "$status"
-    same "standard output: ${*:4}" "$(lines "$2")" "$(text_of out)"
-    same "standard error: ${*:4}" "$(lines "$3")" "$(text_of err)"
-}
-
-# refused DATABASE STDERR ARGUMENT...: a failure with exit status 1 that leaves every byte of the
-# database as it was
-refused() {
-    cp "$1" before.db
-    expect 1 '' "$2" "${@:3}"
-    same "file unchanged: ${*:3}" 'same' "$(cmp -s before.db "$1" && echo same || echo changed)"
-    same "integrity: ${*:3}" ok "$(sqlite3 "$1" 'pragma integrity_check')"
-}
-
-# rows DATABASE TABLE EXPECTED: the table's rows in the shell's list form
-rows() { same "rows of $2" "$3" "$(sqlite3 "$1" "select * from $2 order by rowid")"; }
+. "$(dirname "${BASH_SOURCE[0]}")/support/records.sh"
 
 cat >notes.json <<'EOF'
 {"name": "notes", "key": "id",
@@ -82,7 +24,13 @@ usage='usage: records [-v] DATABASE TABLE.json COMMAND [ARGUMENT...]
 commands:
   create RECORD-JSON
   save RECORD-JSON
-  import FILE.json [KEY]'
+  import FILE.json [KEY]
+  list [REQUEST-JSON]
+  get REQUEST-JSON
+  update FILTER-JSON VALUES-JSON
+  delete REQUEST-JSON
+  delete-all
+  delete-by KEY VALUE...'
 expect 2 '' "$usage"
 expect 2 '' "$usage" -v
 expect 2 '' "$usage" u.db
@@ -97,6 +45,16 @@ expect 2 '' "$usage" u.db notes.json save
 expect 2 '' "$usage" u.db notes.json save '{}' '{}'
 expect 2 '' "$usage" u.db notes.json import
 expect 2 '' "$usage" u.db notes.json import a.json key more
+expect 2 '' "$usage" u.db notes.json list '{}' '{}'
+expect 2 '' "$usage" u.db notes.json get
+expect 2 '' "$usage" u.db notes.json get '{}' '{}'
+expect 2 '' "$usage" u.db notes.json update '{}'
+expect 2 '' "$usage" u.db notes.json update '{}' '{}' '{}'
+expect 2 '' "$usage" u.db notes.json delete
+expect 2 '' "$usage" u.db notes.json delete '{}' '{}'
+expect 2 '' "$usage" u.db notes.json delete-all '{}'
+expect 2 '' "$usage" u.db notes.json delete-by
+expect 2 '' "$usage" u.db notes.json delete-by text
 expect 2 '' "$usage" u.db -v notes.json create '{}'
 same 'wrong arguments make no file' none "$([[ -e u.db ]] && echo made || echo none)"
 
@@ -111,7 +69,6 @@ rows n.db notes $'1|0|[]|none\n2|1|["a",{"b":null}]|Größe \'"\\ 語\n3|0|[]|tw
 
 # refuse COMMAND MESSAGE ARGUMENT...
 refuse() { refused n.db "records: $1: $2" n.db notes.json "$1" "${@:3}"; }
-log='failed (-v shows the log)'
 refuse create 'id 1: DUPLICATE_PRIMARY_KEY' '{"id": 1}'
 refuse create "id \"4\": $log" '{"id": "4"}'
 refuse create "id {\"a\":[1,\"\\n\"]}: $log" '{"id": {"a": [1, "\n"]}}'
@@ -201,6 +158,142 @@ script -qec "'$program' c.db notes.json import plain.json 2>err" /dev/null >term
 same 'no bar in a file' "$(lines '')" "$(text_of err)"
 same 'only output on the terminal' $'{"imported":2}\r\n.' "$(text_of terminal)"
 
+# ------------------------------------------------------------------------------- list and get
+cat >requests.json <<'EOF'
+[{"id": 1, "text": "one"}, {"id": 2, "text": "O'Größe"}, {"id": 3, "done": true, "text": "one"},
+ {"id": 4, "tags": ["a", {"b": 1}], "text": "two\nlines"}, {"id": 5, "text": "five"}]
+EOF
+# fresh_requests: the same five records in a new q.db
+fresh_requests() {
+    rm -f q.db
+    expect 0 '{"imported":5}' '' q.db notes.json import requests.json
+}
+fresh_requests
+note1='{"done":false,"id":1,"tags":[],"text":"one"}'
+note2='{"done":false,"id":2,"tags":[],"text":"O'\''Größe"}'
+note3='{"done":true,"id":3,"tags":[],"text":"one"}'
+note4='{"done":false,"id":4,"tags":["a",{"b":1}],"text":"two\nlines"}'
+note5='{"done":false,"id":5,"tags":[],"text":"five"}'
+every=$note1$'\n'$note2$'\n'$note3$'\n'$note4$'\n'$note5
+
+# list EXPECTED [REQUEST-JSON]
+list() { expect 0 "$1" '' q.db notes.json list "${@:2}"; }
+list "$every"
+list "$every" '{}'
+list "$every" '{"unknown": 1}'
+list "$note1"$'\n'"$note3" '{"text": "one"}'
+list "$note3" '{"text": "one", "done": true}'
+list "$note2" '{"text": "O'\''Größe"}'
+list "$note2" '{"text": ["O'\''Größe"]}'
+list "$note4" '{"tags": [["a", {"b": 1}]]}'
+list "$note4"$'\n'"$note5" '{"vornSqlWhereFilter": "id > 3"}'
+list "$note2"$'\n'"$note3" '{"limit": 2, "offset": 1}'
+list '' '{"id": 6}'
+list '' '{"text": ["one", "five"]}'
+list '' '{"limit": 0}'
+expect 0 '' '' new.db notes.json list
+
+# get STATUS EXPECTED REQUEST-JSON
+get() { expect "$1" "$2" '' q.db notes.json get "$3"; }
+get 0 "$note4" '{"id": 4}'
+get 0 "$note1" '{}'
+get 0 "$note1" '{"limit": 5}'
+get 0 "$note3" '{"text": "one", "limit": 0, "offset": 1}'
+get 3 '' '{"id": 6}'
+get 3 '' '{"id": 1, "offset": 1}'
+expect 3 '' '' new.db notes.json get '{}'
+# One record is asked for, however many match.
+"$program" -v q.db notes.json get '{"vornSqlWhereFilter": "nothing"}' >out 2>err || true
+same 'get asks for one' yes \
+    "$(grep -q 'sql=SELECT .* FROM notes  WHERE  ( nothing  ) LIMIT 1;$' out && echo yes)"
+
+# turned COMMAND MESSAGE ARGUMENT...: a request that fails and leaves the file as it was
+turned() { refused q.db "records: $1: $2" q.db notes.json "$1" "${@:3}"; }
+no_json='not valid JSON: Line 1, Column 2 Missing '\''}'\'' or object member name'
+for command in list get delete; do
+    turned $command "REQUEST-JSON: $no_json" '{'
+    turned $command "[1]: $log" '[1]'
+    turned $command "{\"vornSqlWhereFilter\":\"\\nno\"}: $log" '{"vornSqlWhereFilter": "\nno"}'
+    turned $command "{\"vornSqlWhereFilter\":1}: $log" '{"vornSqlWhereFilter": 1}'
+    turned $command "{\"text\":[]}: $log" '{"text": []}'
+    turned $command 'Value is not convertible to Int.' '{"done": "x"}'
+done
+turned list 'in Json::Value::asCString(): requires stringValue' '{"sort_by": 1}'
+turned list "{\"limit\":\"x\"}: $log" '{"limit": "x"}'
+turned get "{\"limit\":2,\"offset\":\"x\"}: $log" '{"limit": 2, "offset": "x"}'
+
+# -------------------------------------------------------------------------------------- update
+# update COUNT FILTER-JSON VALUES-JSON
+update() { expect 0 "{\"updated\":$1}" '' q.db notes.json update "$2" "$3"; }
+update 1 '{"id": 1}' '{"text": "Ünder '\'' 100 %d"}'
+get 0 '{"done":false,"id":1,"tags":[],"text":"Ünder '\'' 100 %d"}' '{"id": 1}'
+update 2 '{"vornSqlWhereFilter": "id in (3, 5)"}' '{"done": true}'
+update 2 '{"done": true}' '{"done": true, "unknown": 1}'
+update 1 '{"id": 4, "unknown": 1}' '{"id": 40, "text": "moved"}'
+update 0 '{"id": 4}' '{"text": "nobody"}'
+update 0 '{"text": ["one", "five"]}' '{"text": "nobody"}'
+# The paging of a list has no meaning here.
+update 3 '{"done": false, "limit": 1}' '{"text": "same"}'
+rows q.db notes $'1|0|[]|same\n2|0|[]|same\n3|1|[]|one\n5|1|[]|five\n40|0|["a",{"b":1}]|same'
+turned update "FILTER-JSON: $no_json" '{' '{}'
+turned update "VALUES-JSON: $no_json" '{}' '{'
+turned update "{}: $log" '{}' '{"text": "x"}'
+turned update "{\"unknown\":1}: $log" '{"unknown": 1}' '{"text": "x"}'
+turned update "{\"limit\":1}: $log" '{"limit": 1}' '{"text": "x"}'
+turned update "[1]: $log" '[1]' '{"text": "x"}'
+turned update "{\"id\":1}: $log" '{"id": 1}' '{}'
+turned update "{\"id\":1}: $log" '{"id": 1}' '[1]'
+turned update "{\"id\":1}: $log" '{"id": 1}' '{"unknown": 1}'
+turned update "{\"id\":1}: $log" '{"id": 1}' '{"done": 1}'
+turned update "{\"id\":1}: $log" '{"id": 1}' '{"tags": ["x"]}'
+turned update '{"id":1}: DUPLICATE_PRIMARY_KEY' '{"id": 1}' '{"id": 2}'
+turned update '{"done":true}: DUPLICATE_PRIMARY_KEY' '{"done": true}' '{"id": 7}'
+
+# ------------------------------------------------------------------------------------- deletes
+fresh_requests
+# delete COUNT REQUEST-JSON
+delete() { expect 0 "{\"deleted\":$1}" '' q.db notes.json delete "$2"; }
+turned delete "{}: $log" '{}'
+turned delete "{\"unknown\":1}: $log" '{"unknown": 1}'
+turned delete "{\"limit\":1}: $log" '{"limit": 1}'
+delete 0 '{"id": 6}'
+delete 0 '{"text": ["one", "five"]}'
+list "$every"
+delete 1 '{"id": 2}'
+delete 1 '{"text": ["five"]}'
+delete 1 '{"vornSqlWhereFilter": "text like '\''two%'\''"}'
+delete 2 '{"text": "one", "limit": 1}'
+list ''
+
+fresh_requests
+# delete_by COUNT KEY VALUE...
+delete_by() { expect 0 "{\"deleted\":$1}" '' q.db notes.json delete-by "${@:2}"; }
+delete_by 0 text six '%s' '["one"]'
+list "$every"
+delete_by 1 text "O'Größe"
+delete_by 4 text five one $'two\nlines' one six
+list ''
+
+fresh_requests
+turned delete-by "{\"text\":\"\"}: $log" text ''
+turned delete-by "{\"\":\"one\"}: $log" '' one
+turned delete-by "{\"unk\\nown\":\"one\"}: $log" $'unk\nown' one
+turned delete-by "{\"vornSqlWhereFilter\":\"1\"}: $log" vornSqlWhereFilter 1
+turned delete-by "{\"id\":\"1\"}: $log" id 1
+# All values or none.
+turned delete-by "{\"text\":\"\"}: $log" text one five '' "O'Größe"
+notes_with 'create table if not exists notes (id, done, tags, text); create trigger if not exists
+    kept before delete on notes when old.id = 5 begin select raise(abort, ''kept''); end' >kept.json
+expect 0 '{"imported":5}' '' k.db kept.json import requests.json
+refused k.db "records: delete-by: {\"text\":\"five\"}: $log" k.db kept.json delete-by text one five
+refused k.db "records: delete: {\"done\":false}: $log" k.db kept.json delete '{"done": false}'
+refused k.db "records: delete-all: every record: $log" k.db kept.json delete-all
+refused n.db "records: delete-by: begin immediate: $log" n.db begun.json delete-by text eleven
+
+expect 0 '{"deleted":5}' '' q.db notes.json delete-all
+expect 0 '{"deleted":0}' '' q.db notes.json delete-all
+list ''
+
 # --------------------------------------------------------------------------- files and database
 broken() { expect 1 '' "records: create: $1" "$2" "$3" create '{"id": 1}'; }
 broken 'absent.json: No such file or directory' n.db absent.json
@@ -255,61 +348,4 @@ same 'log' "(PID) VornJsonDbApi:N i=0,errno=N, run sql failed, error=$unique, sq
 ." "$(text_of log)"
 expect 0 '{"done":false,"id":31,"tags":[],"text":"none"}' '' -v n.db notes.json create '{"id": 31}'
 
-# ------------------------------------------------------------------------------- all of iso-codes
-# compare TABLE FILE KEY COUNT: every record of the source stands in the table and the other way
-# round, member by member; what the source leaves out reads as an empty text.
-compare() {
-    local columns values
-    columns=$(sqlite3 iso.db "select group_concat(name) from pragma_table_info('$1')")
-    values=$(sqlite3 iso.db "select group_concat('ifnull(json_extract(value, ''$.' || name || '''), '''')')
-        from pragma_table_info('$1')")
-    sqlite3 iso.db "create temp table source as
-            select $values from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"');
-        select 'source', count(*) from source;
-        select 'table', count(*) from $1;
-        select 'only in the source', count(*) from (select * from source except select $columns from $1);
-        select 'only in the table', count(*) from (select $columns from $1 except select * from source);
-        select 'members without a column', count(*)
-            from json_each(readfile('$iso_codes/$2'), '\$.\"$3\"') r, json_each(r.value) m
-            where m.key not in (select name from pragma_table_info('$1'));" >compared
-    same "records of $1" "source|$4
-table|$4
-only in the source|0
-only in the table|0
-members without a column|0" "$(cat compared)"
-}
-
-cp "$tables"/*.json .
-count() {
-    sqlite3 :memory: "select json_array_length(readfile('$iso_codes/$1'), '\$.\"$2\"')"
-}
-languages=$(count iso_639-3.json 639-3)
-subdivisions=$(count iso_3166-2.json 3166-2)
-same 'there are thousands' yes "$( ((languages > 7000 && subdivisions > 4000)) && echo yes)"
-
-expect 0 "{\"imported\":$languages}" '' iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
-expect 0 "{\"imported\":$subdivisions}" '' \
-    iso.db subdivisions.json import "$iso_codes/iso_3166-2.json" 3166-2
-compare languages iso_639-3.json 639-3 "$languages"
-compare subdivisions iso_3166-2.json 3166-2 "$subdivisions"
-same 'integrity' ok "$(sqlite3 iso.db 'pragma integrity_check')"
-
-refused iso.db 'records: create: alpha_3 "deu": DUPLICATE_PRIMARY_KEY' \
-    iso.db languages.json create '{"alpha_3": "deu", "name": "German", "scope": "I", "type": "L"}'
-refused iso.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
-    iso.db languages.json import "$iso_codes/iso_639-3.json" 639-3
-expect 0 '{"code":"AD-02","name":"Canillo","parent":"","type":"Parish (again)"}' '' iso.db \
-    subdivisions.json save '{"code": "AD-02", "name": "Canillo", "parent": "", "type": "Parish (again)"}'
-
-# The last of thousands fails: nothing of them stays.
-sqlite3 :memory: "select json_insert(readfile('$iso_codes/iso_639-3.json'), '\$.\"639-3\"[#]',
-    json('{\"alpha_3\": \"aaa\", \"name\": \"Twice\", \"scope\": \"I\", \"type\": \"L\"}'))" >twice.json
-expect 0 '{"alpha_2":"","alpha_3":"qaa","bibliographic":"","common_name":"","inverted_name":"","name":'\
-'"Reserved","scope":"I","type":"L"}' '' \
-    t.db languages.json create '{"alpha_3": "qaa", "name": "Reserved", "scope": "I", "type": "L"}'
-refused t.db 'records: import: alpha_3 "aaa": DUPLICATE_PRIMARY_KEY' \
-    t.db languages.json import twice.json 639-3
-rows t.db languages 'qaa|Reserved|I|L||||'
-
-echo "$checks checks, $failures failed"
-((failures == 0))
+finish
