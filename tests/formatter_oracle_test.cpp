@@ -107,6 +107,8 @@ public:
     {
         std::string strText;
         for (unsigned i = number(7); 0 < i; --i) strText += piece();
+        // Where the new conversion is never reached, an earlier one may read the value.
+        if (0 == number(4)) strText += conversion("diuxXoprfeEgGsqQw") + piece() + "%k";
         return strText;
     }
 
