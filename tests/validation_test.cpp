@@ -10,7 +10,7 @@ namespace {
 const char* const kNoObjects[] = {"null", "true", "5",     "-5", "18446744073709551615",
                                   "1.5",  "\"\"", "\"a\"", "[]", R"([1,{"a":2}])"};
 
-class Defaults : public TableTest {
+class DefaultValues : public TableTest {
 protected:
     // The record after fillDefaultValue in filling mode, which never fails.
     std::string filled(Table& table, const std::string& strRecord)
@@ -38,7 +38,7 @@ protected:
                "a,b,c"};
 };
 
-TEST_F(Defaults, FillWhatTheRecordLacks)
+TEST_F(DefaultValues, FillWhatTheRecordLacks)
 {
     const struct {
         const char* szRecord;
@@ -56,7 +56,7 @@ TEST_F(Defaults, FillWhatTheRecordLacks)
     for (const auto& c : cases) EXPECT_EQ(c.szFilled, filled(abc_, c.szRecord)) << c.szRecord;
 }
 
-TEST_F(Defaults, AreCopiedWholeWhateverTheirKind)
+TEST_F(DefaultValues, AreCopiedWholeWhateverTheirKind)
 {
     for (const char* szDefault :
          {"null", "true", "false", "0", "-7", "18446744073709551615", "1.5", "\"\"",
@@ -74,7 +74,7 @@ TEST_F(Defaults, AreCopiedWholeWhateverTheirKind)
     }
 }
 
-TEST_F(Defaults, AreCopiesOfTheirOwn)
+TEST_F(DefaultValues, AreCopiesOfTheirOwn)
 {
     Table table(database_, R"({"v":{"cpptype":"Json::objectValue","cppDefaultValue":{"k":[1]}}})",
                 "v");
@@ -87,7 +87,7 @@ TEST_F(Defaults, AreCopiesOfTheirOwn)
               table.jDefinition[table.strName]["member"]["v"]["cppDefaultValue"]);
 }
 
-TEST_F(Defaults, LeaveARecordAloneThatIsNoObject)
+TEST_F(DefaultValues, LeaveARecordAloneThatIsNoObject)
 {
     for (const char* szRecord : kNoObjects) {
         if (json(szRecord).isNull()) continue;
@@ -98,7 +98,7 @@ TEST_F(Defaults, LeaveARecordAloneThatIsNoObject)
     EXPECT_EQ(Lines{error("lost data member=a")}, lost(abc_, "null"));
 }
 
-TEST_F(Defaults, AreNotNeededWhereEveryMemberIsPresent)
+TEST_F(DefaultValues, AreNotNeededWhereEveryMemberIsPresent)
 {
     for (const char* szRecord : {R"({"a":"","b":1,"c":2})", R"({"a":null,"b":null,"c":null})",
                                  R"({"a":1,"b":1,"c":1,"d":1})"}) {
@@ -109,7 +109,7 @@ TEST_F(Defaults, AreNotNeededWhereEveryMemberIsPresent)
     EXPECT_EQ(Lines(), takeLog());
 }
 
-TEST_F(Defaults, AreReportedAsLostByTheFirstName)
+TEST_F(DefaultValues, AreReportedAsLostByTheFirstName)
 {
     const struct {
         const char* szRecord;
@@ -134,7 +134,7 @@ TEST_F(Defaults, AreReportedAsLostByTheFirstName)
     }
 }
 
-TEST_F(Defaults, AreNoneInATableWithoutMembers)
+TEST_F(DefaultValues, AreNoneInATableWithoutMembers)
 {
     Table table(database_, "{}", "a");
     for (const char* szRecord : {"{}", "null", R"({"a":1})", "[1]", "5"}) {
