@@ -49,7 +49,8 @@ bool leadsToSource(const Parsed& parsed)
     static const auto util = readSources("util");
     std::smatch match;
     static const std::regex condition(R"(^Failed \[([\s\S]*)\])");
-    const std::string strWanted = std::regex_search(parsed.strMessage, match, condition)
+    const bool blFailed = 0 == parsed.strMessage.compare(0, 8, "Failed [");
+    const std::string strWanted = blFailed && std::regex_search(parsed.strMessage, match, condition)
                                       ? squeezed(match[1])
                                       : (parsed.blError ? "LOG_ERROR(" : "LOG_PLAIN(");
     const auto iLine = static_cast<std::size_t>(parsed.iLine);
@@ -127,6 +128,7 @@ bool takeErrnoNumber(const LogRecord& record, Parsed& parsed)
 {
     static const std::regex number(R"((^|[ ,])errno=(\d+),)");
     std::smatch match;
+    if (std::string::npos == parsed.strMessage.find("errno=")) return true;
     if (!std::regex_search(parsed.strMessage, match, number)) return true;
     if (match[2] != std::to_string(record.iErrno)) return false;
     parsed.strMessage.replace(static_cast<std::size_t>(match.position(2)), match[2].str().size(),

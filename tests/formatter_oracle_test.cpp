@@ -1,0 +1,268 @@
+// Value lists against SQLite's own formatter: wherever C defines what
+//
+//     sqlite3_mprintf(text + conversion, value)
+//
+// does with its one value, the value list has to be the same, byte for byte.
+
+#include "support/database.h"
+
+#include <cmath>
+#include <cstring>
+#include <random>
+
+namespace {
+
+constexpr int kTexts = 100000;
+constexpr unsigned kMaxField = 4096;
+
+// What a format reads, found by a scanner of the test's own.
+struct Reads {
+    bool blDefined = true;  // nothing but conversions that may be called with one value
+    int iCount = 0;
+    std::string strFirst;  // the first conversion that reads: its length and type, "lld"
+};
+
+// A number of at most kMaxField, or digits that are none; moves past it.
+bool smallNumber(const std::string& strText, std::size_t& i)
+{
+    const std::size_t nEnd = std::min(strText.find_first_not_of("0123456789", i), strText.size());
+    const std::string strDigits = strText.substr(i, nEnd - i);
+    i = nEnd;
+    const std::size_t nZeros = std::min(strDigits.find_first_not_of('0'), strDigits.size());
+    const std::string strNumber = strDigits.substr(nZeros);
+    return strNumber.size() <= 4 && (strNumber.empty() || std::stoul(strNumber) <= kMaxField);
+}
+
+Reads scan(const std::string& strText)
+{
+    Reads reads;
+    const auto at = [&](std::size_t i) { return i < strText.size() ? strText[i] : '\0'; };
+    for (std::size_t i = 0; std::string::npos != (i = strText.find('%', i));) {
+        i = strText.find_first_not_of("-+ #!0,", i + 1);
+        if (std::string::npos == i) return reads;
+        const bool blWidth = smallNumber(strText, i);
+        bool blPrecision = true;
+        if ('.' == at(i)) {
+            ++i;
+            blPrecision = smallNumber(strText, i);
+        }
+        if ('*' == at(i) || !blWidth || !blPrecision) reads.blDefined = false;
+        if (!reads.blDefined) return reads;
+        std::string strRead;
+        while ('l' == at(i) && strRead.size() < 2) strRead += strText[i++];
+        const char cType = at(i++);
+        if ('%' == cType) continue;
+        if ('\0' == cType || nullptr == strchr("diuxXoprfeEgGcszqQwn", cType)) return reads;
+        if ('n' == cType || 'z' == cType) reads.blDefined = false;
+        if (1 == ++reads.iCount) reads.strFirst = strRead + cType;
+    }
+    return reads;
+}
+
+struct Value {
+    const char* szConversion;
+    Json::Value jValue;
+};
+
+// Whether the one argument that is read has the type of the value.
+bool suits(const Value& value, const std::string& strRead)
+{
+    const char cType = strRead.back();
+    if (value.jValue.isString()) return nullptr != strchr("sqQw", cType);
+    if (0 == strcmp("%lf", value.szConversion)) return nullptr != strchr("feEgG", cType);
+    if ('p' == cType) return true;
+    return "ll" == strRead.substr(0, strRead.size() - 1) && nullptr != strchr("diuxXor", cType);
+}
+
+// Whether the described call is one that C defines.
+bool isComparable(const std::string& strFormat, const Value& value)
+{
+    // The call sees the text up to its first NUL byte.
+    const Reads reads = scan(strFormat.c_str());
+    return reads.blDefined &&
+           (0 == reads.iCount || (1 == reads.iCount && suits(value, reads.strFirst)));
+}
+
+std::string described(const std::string& strFormat, const Value& value)
+{
+    const char* szFormat = strFormat.c_str();
+    char* szText = nullptr;
+    if (value.jValue.isString())
+        szText = sqlite3_mprintf(szFormat, value.jValue.asCString());
+    else if (0 == strcmp("%lld", value.szConversion))
+        szText = sqlite3_mprintf(szFormat, static_cast<long long>(value.jValue.asInt64()));
+    else if (0 == strcmp("%llu", value.szConversion))
+        szText =
+            sqlite3_mprintf(szFormat, static_cast<unsigned long long>(value.jValue.asUInt64()));
+    else
+        szText = sqlite3_mprintf(szFormat, value.jValue.asDouble());
+    const std::string strText = szText;
+    sqlite3_free(szText);
+    return strText;
+}
+
+class Generator {
+public:
+    std::string text()
+    {
+        std::string strText;
+        for (unsigned i = number(7); 0 < i; --i) strText += piece();
+        // Where the new conversion is never reached, an earlier one may read the value.
+        if (0 == number(4)) strText += conversion("diuxXoprfeEgGsqQw") + piece() + "%k";
+        return strText;
+    }
+
+    Value value()
+    {
+        switch (number(4)) {
+        case 0:
+            return {"%Q",
+                    anyOf({"x", "", "it's", "100%", "%s%n", "\xc5\xbe\xf0\x9f\x90\x8e", "\"\n"})};
+        case 1: return {"%lld", Json::Value(static_cast<Json::Int64>(bits()))};
+        case 2: return {"%llu", Json::Value(static_cast<Json::UInt64>(bits()))};
+        default: return {"%lf", Json::Value(real())};
+        }
+    }
+
+    unsigned number(unsigned uBelow) { return static_cast<unsigned>(random_() % uBelow); }
+
+private:
+    std::string anyOf(std::initializer_list<const char*> texts)
+    {
+        return *(texts.begin() + number(static_cast<unsigned>(texts.size())));
+    }
+
+    unsigned long long bits() { return random_() >> number(64); }
+
+    double real()
+    {
+        const int iExponent = static_cast<int>(number(40)) - 20;
+        return std::ldexp(static_cast<double>(random_() % 1000000), iExponent) *
+               (number(2) ? 1 : -1);
+    }
+
+    std::string conversion(const char* szTypes)
+    {
+        std::string strText = "%";
+        for (unsigned i = number(3); 0 < i; --i) strText += "-+ #!0,"[number(7)];
+        if (0 == number(3))
+            strText += anyOf({"1", "5", "12", "40", "4096", "4097", "99999999999", "*"});
+        if (0 == number(3))
+            strText += anyOf({".", ".0", ".3", ".17", ".400", ".5000", ".*", "..", ".-1"});
+        strText += anyOf({"", "", "l", "ll", "ll", "ll"});
+        return strText + szTypes[number(static_cast<unsigned>(strlen(szTypes)))];
+    }
+
+    std::string piece()
+    {
+        switch (number(16)) {
+        case 0: return conversion("diuxXoprfeEgGcszqQwn");
+        case 1: return conversion("diuxXoprfeEgGsqQw");
+        case 2: return conversion("%");
+        case 3: return conversion("kTSDhL'\")(; \t*.l9");
+        case 4: return "%%";
+        case 5: return "%";
+        case 6: return anyOf({"'", "\"", "''", "`", "\\"});
+        case 7:
+            return 0 == number(4) ? std::string(1, '\0')
+                                  : anyOf({"\xc3\xa9", "\xf0\x9f\x90\x8e", "\xff", "\xe2\x80\xae"});
+        case 8: return anyOf({"0", "17", "4096", "4294967301"});
+        case 9: return std::string(1, "diuxXoprfeEgGcszqQwnl.*-+ #!0,"[number(30)]);
+        default: return anyOf({"a", "INSERT INTO t (a,b) VALUES (", ",", ") ", "x y", "\n", "--"});
+        }
+    }
+
+    std::mt19937_64 random_{20250131};
+};
+
+class FormatterOracle : public TableTest {
+protected:
+    Table text_{database_, R"({"v":{"cpptype":"string"}})", "v"};
+    Table signed_{database_, R"({"v":{"cpptype":"long long"}})", "v"};
+    Table unsigned_{database_, R"({"v":{"cpptype":"unsigned long long"}})", "v"};
+    Table real_{database_, R"({"v":{"cpptype":"double"}})", "v"};
+
+    Table& tableFor(const Value& value)
+    {
+        const std::string strConversion = value.szConversion;
+        if ("%Q" == strConversion) return text_;
+        if ("%lf" == strConversion) return real_;
+        return "%lld" == strConversion ? signed_ : unsigned_;
+    }
+};
+
+TEST_F(FormatterOracle, AgreesWithSqliteWhereverThatIsDefined)
+{
+    Generator generator;
+    int iComparable = 0;
+    int iWithPercent = 0;
+    int iEarlierRead = 0;
+    for (int i = 0; i < kTexts && !HasFailure(); ++i) {
+        const std::string strText = generator.text();
+        const Value value = generator.value();
+        Json::Value jRecord;
+        jRecord["v"] = value.jValue;
+        std::string strSql = strText;
+        ASSERT_EQ(0, tableFor(value).api.SqlExpandMemberSymbol(strSql, jRecord));
+        ASSERT_LE(2U, strSql.size());
+        ASSERT_EQ(") ", strSql.substr(strSql.size() - 2));
+
+        const std::string strFormat = strText + value.szConversion;
+        if (!isComparable(strFormat, value)) continue;
+        ++iComparable;
+        if (std::string::npos != strText.find('%')) ++iWithPercent;
+        if (1 == scan(strText.c_str()).iCount) ++iEarlierRead;
+        EXPECT_EQ(described(strFormat, value) + ") ", strSql)
+            << "text " << testing::PrintToString(strText) << ", value " << text(value.jValue);
+    }
+    EXPECT_EQ(Lines(), takeLog());
+    EXPECT_LT(50000, iComparable);
+    EXPECT_LT(25000, iWithPercent);
+    EXPECT_LT(1000, iEarlierRead);
+    RecordProperty("comparable", iComparable);
+    RecordProperty("withPercent", iWithPercent);
+    RecordProperty("earlierRead", iEarlierRead);
+}
+
+TEST(FormatterOracleScanner, TellsWhatIsDefined)
+{
+    const Value integer{"%lld", 7};
+    const Value word{"%Q", "x"};
+    const Value real{"%lf", 1.5};
+    const struct {
+        const char* szFormat;
+        const Value& value;
+        bool blComparable;
+    } cases[] = {
+        {"a%lld", integer, true},
+        {"%lld%lld", integer, false},
+        {"%d%k%lld", integer, false},
+        {"%lld%k%lld", integer, true},
+        {"%%lld", integer, true},
+        {"%%%lld", integer, true},
+        {"%n%lld", integer, false},
+        {"%k%n%lld", integer, true},
+        {"%s%k%lld", integer, false},
+        {"%s%k%Q", word, true},
+        {"%z%k%Q", word, false},
+        {"%*d%k%lld", integer, false},
+        {"%*%%lld", integer, false},
+        {"%4096lld", integer, true},
+        {"%4097lld", integer, false},
+        {"%.5000f", real, false},
+        {"%5.3f%k", real, true},
+        {"%p%k%lld", integer, true},
+        {"%ld%k%lld", integer, false},
+        {"%c%k%lld", integer, false},
+        {"%x%k%lf", real, false},
+        {"%f", real, true},
+        {"%4294967301lld", integer, false},
+        {"%004096lld", integer, true},
+        {"%5", integer, true},
+        {"%", integer, true},
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(c.blComparable, isComparable(c.szFormat, c.value)) << c.szFormat;
+}
+
+}  // namespace
