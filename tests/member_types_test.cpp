@@ -267,4 +267,17 @@ TEST_F(FirstMemberTypes, OfAnEmptyNameFailAfterTheLookUps)
         testing::ExitedWithCode(0), "");
 }
 
+// The one test of this process that asks for a table without a name.
+TEST(MemberTypesOfNoName, AreRefusedAfterTheLookUps)
+{
+    doubles::reset();
+    Json::Value jDefinition = json(R"({"":{"member":{"a":{"cpptype":"int"}}}})");
+    std::string strNoName;
+    EXPECT_TRUE(VORN_JSON_DB::recType(jDefinition, strNoName).isNull());
+    const Lines lines = takeLog();
+    ASSERT_EQ(4U, lines.size());
+    EXPECT_EQ(utilFailed("strJsonName.empty()"), lines[0]);
+    EXPECT_EQ(utilPlain("strJsonName="), lines[1]);
+}
+
 }  // namespace

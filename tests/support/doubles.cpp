@@ -16,6 +16,8 @@ bool blDebugOutput = false;
 
 namespace doubles {
 
+void (*onEveryLine)(const std::string& strText) = nullptr;
+
 State& state()
 {
     static State state;
@@ -60,6 +62,7 @@ __attribute__((format(printf, 3, 0))) void record(bool blSyslog, int iPriority,
     char* szText = nullptr;
     if (0 > vasprintf(&szText, szFormat, arguments)) abort();
     state().log.push_back({blSyslog, iPriority, iErrno, szText});
+    if (nullptr != doubles::onEveryLine) doubles::onEveryLine(szText);
     free(szText);
     // The real ones may leave anything in errno.
     errno = ENOTTY;

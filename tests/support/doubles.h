@@ -55,6 +55,9 @@ State& state();
 // Back to passing every call on, with nothing recorded.
 void reset();
 
+// Is shown every line of the whole program, whatever is reset.
+extern void (*onEveryLine)(const std::string& strText);
+
 // The real sqlite3_exec, unrecorded.
 int realExec(sqlite3* pDb, const char* szSql, RowCallback callback, void* arg, char** errText);
 
