@@ -25,11 +25,21 @@ need_packages() {
     as_root env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
 }
 
-# build PRESET [OPTION...]: configures and builds build/PRESET.
+# build PRESET [OPTION...]: configures and builds build/PRESET; what a build says is shown when it fails.
 build() {
     local preset=$1
     shift
-    say "building build/$preset"
-    cmake --preset "$preset" "$@" >/dev/null
-    cmake --build "build/$preset" | tail -n 1
+    build_in "build/$preset" "$preset" "$@"
+}
+
+# build_in FOLDER PRESET [OPTION...]: the same in another folder.
+build_in() {
+    local folder=$1 preset=$2
+    shift 2
+    say "building $folder"
+    mkdir -p "$folder"
+    if ! { cmake --preset "$preset" -B "$folder" "$@" && cmake --build "$folder"; } >"$folder/build.log" 2>&1; then
+        cat "$folder/build.log"
+        return 1
+    fi
 }

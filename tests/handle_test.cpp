@@ -63,6 +63,18 @@ TEST_F(Handle, SurvivesANullConnection)
     EXPECT_EQ(-1, api.recSave(jRecord, true));
 }
 
+TEST_F(Handle, ChecksItsArgumentsInOrder)
+{
+    VornJsonDbApi api(nullptr, strEmpty_, jEmpty_, strEmpty_);
+    Lines lines = takeLog();
+    ASSERT_EQ(9U, lines.size());
+    lines.resize(5);
+    EXPECT_EQ((Lines{plain("Failed [!pDb]"), plain("Failed [strName.empty()]"),
+                     plain("Failed [jTableDef.empty()]"), plain("Failed [strSqlCreate.empty()]"),
+                     failed("0 >= strSql.length()")}),
+              lines);
+}
+
 TEST_F(Handle, LogsEachEmptyArgumentForItself)
 {
     {

@@ -1,0 +1,61 @@
+// docs/design.md names the test of every kept behaviour, and the guards.
+
+#include <gtest/gtest.h>
+
+#include <fstream>
+#include <iterator>
+#include <regex>
+#include <set>
+#include <string>
+
+namespace {
+
+std::string contents(const char* szPath)
+{
+    std::ifstream file(szPath);
+    return {std::istreambuf_iterator<char>(file), {}};
+}
+
+std::set<std::string> registeredTests()
+{
+    std::set<std::string> names;
+    const auto& unitTest = *testing::UnitTest::GetInstance();
+    for (int i = 0; i < unitTest.total_test_suite_count(); ++i) {
+        const auto& suite = *unitTest.GetTestSuite(i);
+        for (int j = 0; j < suite.total_test_count(); ++j)
+            names.insert(std::string(suite.name()) + "." + suite.GetTestInfo(j)->name());
+    }
+    return names;
+}
+
+TEST(DesignPage, NamesTestsThatExist)
+{
+    const std::string strPage = contents(VORN_DOCS "/design.md");
+    const std::set<std::string> tests = registeredTests();
+    static const std::regex name(R"(`([A-Z][A-Za-z]+\.[A-Z][A-Za-z]+)`)");
+    int iNames = 0;
+    for (std::sregex_iterator it(strPage.begin(), strPage.end(), name), end; it != end; ++it) {
+        EXPECT_EQ(1U, tests.count((*it)[1])) << (*it)[1];
+        ++iNames;
+    }
+    EXPECT_LT(25, iNames);
+}
+
+TEST(DesignPage, ListsEveryGuard)
+{
+    const std::string strPage = contents(VORN_DOCS "/design.md");
+    std::ifstream file(VORN_TEST_DATA "/messages.txt");
+    bool blGuards = false;
+    int iGuards = 0;
+    for (std::string strLine; std::getline(file, strLine);) {
+        if (0 == strLine.find("# ")) {
+            blGuards = 0 == strLine.find("# guards");
+        } else if (blGuards) {
+            EXPECT_NE(std::string::npos, strPage.find("`" + strLine + "`")) << strLine;
+            ++iGuards;
+        }
+    }
+    EXPECT_LT(5, iGuards);
+}
+
+}  // namespace
