@@ -5,6 +5,9 @@ cd "$(dirname "${BASH_SOURCE[0]}")/.."
 build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev libgtest-dev
                 iso-codes sqlite3)
 
+# The tests that run the whole suite in one process, and the hosts.
+whole_suite='^(in_memory|on_files|records|records_iso_codes|readme_host|cxx11_host)$'
+
 say() {
     printf '== %s\n' "$*"
 }
@@ -42,4 +45,14 @@ build_in() {
         cat "$folder/build.log"
         return 1
     fi
+}
+
+# run_whole_suite FOLDER: in a build folder; what the tests say is shown when one fails.
+run_whole_suite() {
+    say "running the whole suite in $1"
+    if ! ctest --test-dir "$1" --output-on-failure -j "$(nproc)" -R "$whole_suite" >"$1/tests.log" 2>&1; then
+        cat "$1/tests.log"
+        return 1
+    fi
+    grep 'tests passed' "$1/tests.log"
 }
