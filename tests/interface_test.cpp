@@ -131,6 +131,7 @@ TEST(Symbols, UndefinedAreTheFlagsAndTheDoubledCalls)
     for (const char* szName : {"blLogToStdout", "blDebugOutput", "syslog", "printf", "usleep",
                                "getpid", "sqlite3_exec", "sqlite3_changes", "sqlite3_mprintf"})
         EXPECT_EQ(1U, names.count(szName)) << szName;
+    if (VORN_COVERAGE) GTEST_SKIP() << "the counters of a coverage build write files themselves";
     for (const char* szName : {"vsyslog", "vprintf", "puts", "putchar", "fputs", "fwrite", "fflush",
                                "write", "fprintf", "std::cout", "std::cerr", "__syslog_chk",
                                "__printf_chk", "sqlite3_open", "sqlite3_close", "setlocale"})

@@ -6,7 +6,8 @@
 #include <utility>
 
 // The constructor's argument checks are of the plain family, and construction goes on.
-#define REPORT(COND) ((COND) ? LOG_PLAIN("Failed [%s]", #COND) : void())
+#define REPORT(COND) \
+    if (COND) LOG_PLAIN("Failed [%s]", #COND)
 
 VornJsonDbApi::VornJsonDbApi(sqlite3* pDatabase, std::string& strTable, Json::Value& jDefinition,
                              std::string& strCreate)

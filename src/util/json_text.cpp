@@ -17,10 +17,11 @@ public:
     std::string take() { return std::exchange(strText_, std::string()); }
 
 protected:
-    int_type overflow(int_type c) override
+    // Guard: jsoncpp writes whole strings.
+    int_type overflow(int_type c) override  // Guard
     {
-        strText_ += traits_type::to_char_type(c);
-        return c;
+        strText_ += traits_type::to_char_type(c);  // Guard
+        return c;                                  // Guard
     }
 
     std::streamsize xsputn(const char* szText, std::streamsize nText) override

@@ -6,7 +6,8 @@
 #define FAILED(COND) FAILED_AS(COND, #COND)
 
 // For a check whose code has to differ from its text.
-#define FAILED_AS(COND, TEXT) ((COND) ? (LOG_ERROR("Failed [%s], err=%m", TEXT), true) : false)
+#define FAILED_AS(COND, TEXT) \
+    ((COND) ? (logFailed(VORN_LOG_COMPONENT, __LINE__, TEXT), true) : false)
 
 // One line of the error family, or of the plain family. VORN_LOG_COMPONENT is set by the build.
 #define LOG_ERROR(...) \
@@ -34,3 +35,9 @@ private:
     int iLine_;
     int iErrno_;
 };
+
+// The line of a failed check.
+inline void logFailed(const char* szComponent, int iLine, const char* szCondition)
+{
+    LogLine(LogLine::Family::kError, szComponent, iLine).write("Failed [%s], err=%m", szCondition);
+}
