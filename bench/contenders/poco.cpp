@@ -1,6 +1,7 @@
 // A host on Poco::Data, statements prepared once on variables that are bound to them, with
 // Poco::JSON.
 #include "contenders/all.h"
+#include "contenders/prepared.h"
 
 #include <Poco/Data/SQLite/Connector.h>
 #include <Poco/Data/SQLite/Utility.h>
@@ -49,6 +50,8 @@ struct Row {
 
 class PocoHost : public JsonContender<Var> {
 public:
+    explicit PocoHost(Prepare when) : when_(when) {}
+
     sqlite3* connection() override { return Poco::Data::SQLite::Utility::dbHandle(session_); }
 
     void create(int id) override
@@ -61,39 +64,40 @@ public:
         in_.strName = rec.getValue<std::string>("name");
         in_.iQty = rec.getValue<Poco::Int64>("qty");
         in_.strTags = text(rec.get("tags"));
-        insert_.execute();
-        result_ = only(stored_);
+        insert_.get().execute();
+        result_ = only(stored_.get());
     }
 
     void fetch(int id) override
     {
         in_.iId = idOf(id);
-        result_ = only(byId_);
+        result_ = only(byId_.get());
     }
 
     void listGroup(int group) override
     {
         in_.strGrp = groupRequest(group).extract<Object::Ptr>()->getValue<std::string>("grp");
-        result_ = all(byGroup_);
+        result_ = all(byGroup_.get());
     }
 
-    void listAll() override { result_ = all(every_); }
+    void listAll() override { result_ = all(every_.get()); }
 
     void update(int id) override
     {
         in_.strName = change(id).extract<Object::Ptr>()->getValue<std::string>("name");
         in_.iId = idOf(id);
-        update_.execute();
+        update_.get().execute();
     }
 
     void remove(int id) override
     {
         in_.iId = idOf(id);
-        remove_.execute();
+        remove_.get().execute();
     }
 
 private:
-    using Statement = Poco::Data::Statement;
+    using PocoStatement = Poco::Data::Statement;
+    using Statement = Prepared<PocoStatement>;
 
     static Poco::Data::Session opened()
     {
@@ -118,7 +122,7 @@ private:
         return parser_.parse(strText);
     }
 
-    Statement select(const std::string& strWhere)
+    PocoStatement select(const std::string& strWhere)
     {
         // One row for each execution, as long as there are some.
         return (session_ << std::string("SELECT ") + kColumns + " FROM task" + strWhere,
@@ -139,13 +143,13 @@ private:
         return rec;
     }
 
-    Var only(Statement& statement)
+    Var only(PocoStatement& statement)
     {
         must(1 == statement.execute(), "one row");
         return row();
     }
 
-    Var all(Statement& statement)
+    Var all(PocoStatement& statement)
     {
         Array::Ptr rows = new Array;
         do {
@@ -154,20 +158,29 @@ private:
         return rows;
     }
 
+    const Prepare when_;
     Poco::Data::Session session_ = opened();
     Row in_;
     Row out_;
-    Statement insert_ =
-        (session_ << std::string("INSERT INTO task (") + kColumns + ") VALUES (?,?,?,?,?,?,?)",
-         use(in_.iDone), use(in_.strGrp), use(in_.iId), use(in_.strMeta), use(in_.strName),
-         use(in_.iQty), use(in_.strTags));
-    Statement stored_ = select(" WHERE rowid = last_insert_rowid()");
-    Statement byId_ = (select(" WHERE id = ?"), use(in_.iId));
-    Statement byGroup_ = (select(" WHERE grp = ?"), use(in_.strGrp));
-    Statement every_ = select("");
-    Statement update_ =
-        (session_ << "UPDATE task SET name = ? WHERE id = ?", use(in_.strName), use(in_.iId));
-    Statement remove_ = (session_ << "DELETE FROM task WHERE id = ?", use(in_.iId));
+    Statement insert_{when_, [this]() -> PocoStatement {
+                          return (session_ << std::string("INSERT INTO task (") + kColumns +
+                                                  ") VALUES (?,?,?,?,?,?,?)",
+                                  use(in_.iDone), use(in_.strGrp), use(in_.iId), use(in_.strMeta),
+                                  use(in_.strName), use(in_.iQty), use(in_.strTags));
+                      }};
+    Statement stored_{when_, [this] { return select(" WHERE rowid = last_insert_rowid()"); }};
+    Statement byId_{when_,
+                    [this]() -> PocoStatement { return (select(" WHERE id = ?"), use(in_.iId)); }};
+    Statement byGroup_{
+        when_, [this]() -> PocoStatement { return (select(" WHERE grp = ?"), use(in_.strGrp)); }};
+    Statement every_{when_, [this] { return select(""); }};
+    Statement update_{when_, [this]() -> PocoStatement {
+                          return (session_ << "UPDATE task SET name = ? WHERE id = ?",
+                                  use(in_.strName), use(in_.iId));
+                      }};
+    Statement remove_{when_, [this]() -> PocoStatement {
+                          return (session_ << "DELETE FROM task WHERE id = ?", use(in_.iId));
+                      }};
     Poco::JSON::Parser parser_;
     std::ostringstream stream_;
 };
@@ -176,7 +189,12 @@ private:
 
 std::unique_ptr<Contender> makePoco()
 {
-    return std::make_unique<PocoHost>();
+    return std::make_unique<PocoHost>(Prepare::kEachCall);
+}
+
+std::unique_ptr<Contender> makePocoKept()
+{
+    return std::make_unique<PocoHost>(Prepare::kOnce);
 }
 
 }  // namespace bench

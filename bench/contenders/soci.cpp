@@ -1,7 +1,8 @@
-// A host on SOCI, statements prepared once on variables that are bound to them, with jsoncpp as the
-// host by hand uses it.
+// A host on SOCI, its statements on variables that are bound to them, with jsoncpp as the host by
+// hand uses it.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
+#include "contenders/prepared.h"
 
 #include <soci/soci.h>
 #include <soci/sqlite3/soci-sqlite3.h>
@@ -25,7 +26,7 @@ struct Row {
 
 class Soci : public JsonContender<Json::Value> {
 public:
-    Soci() = default;
+    explicit Soci(Prepare when) : when_(when) {}
 
     sqlite3* connection() override
     {
@@ -43,48 +44,46 @@ public:
         in_.strName = jRecord["name"].asString();
         in_.iQty = jRecord["qty"].asInt64();
         in_.strTags = text_.write(jRecord["tags"]);
-        insert_.execute(true);
-        result_ = only(stored_);
+        insert_.get().execute(true);
+        result_ = only(stored_.get());
     }
 
     void fetch(int id) override
     {
         in_.iId = request(id)["id"].asInt();
-        result_ = only(byId_);
+        result_ = only(byId_.get());
     }
 
     void listGroup(int group) override
     {
         in_.strGrp = groupRequest(group)["grp"].asString();
-        result_ = all(byGroup_);
+        result_ = all(byGroup_.get());
     }
 
-    void listAll() override { result_ = all(every_); }
+    void listAll() override { result_ = all(every_.get()); }
 
     void update(int id) override
     {
         in_.strName = change(id)["name"].asString();
         in_.iId = request(id)["id"].asInt();
-        update_.execute(true);
+        update_.get().execute(true);
     }
 
     void remove(int id) override
     {
         in_.iId = request(id)["id"].asInt();
-        remove_.execute(true);
+        remove_.get().execute(true);
     }
 
 private:
-    static std::string select(const char* szWhere)
-    {
-        return std::string("SELECT ") + kColumns + " FROM task" + szWhere;
-    }
+    using Statement = Prepared<soci::statement>;
 
-    soci::details::prepare_temp_type intoOut(const std::string& strSql)
+    soci::details::prepare_temp_type intoOut(const char* szWhere)
     {
-        return (session_.prepare << strSql, soci::into(out_.iDone), soci::into(out_.strGrp),
-                soci::into(out_.iId), soci::into(out_.strMeta), soci::into(out_.strName),
-                soci::into(out_.iQty), soci::into(out_.strTags));
+        return (session_.prepare << std::string("SELECT ") + kColumns + " FROM task" + szWhere,
+                soci::into(out_.iDone), soci::into(out_.strGrp), soci::into(out_.iId),
+                soci::into(out_.strMeta), soci::into(out_.strName), soci::into(out_.iQty),
+                soci::into(out_.strTags));
     }
 
     Json::Value row()
@@ -126,22 +125,36 @@ private:
         Session() : soci::session(soci::sqlite3, ":memory:") { makeTable(*this); }
     };
 
+    const Prepare when_;
     Session session_;
     Row in_;
     Row out_;
-    soci::statement insert_ =
-        (session_.prepare << std::string("INSERT INTO task (") + kColumns +
-                                 ") VALUES (:done,:grp,:id,:meta,:name,:qty,:tags)",
-         soci::use(in_.iDone), soci::use(in_.strGrp), soci::use(in_.iId), soci::use(in_.strMeta),
-         soci::use(in_.strName), soci::use(in_.iQty), soci::use(in_.strTags));
-    soci::statement stored_ = intoOut(select(" WHERE rowid = last_insert_rowid()"));
-    soci::statement byId_ = (intoOut(select(" WHERE id = :id")), soci::use(in_.iId));
-    soci::statement byGroup_ = (intoOut(select(" WHERE grp = :grp")), soci::use(in_.strGrp));
-    soci::statement every_ = intoOut(select(""));
-    soci::statement update_ = (session_.prepare << "UPDATE task SET name = :name WHERE id = :id",
-                               soci::use(in_.strName), soci::use(in_.iId));
-    soci::statement remove_ =
-        (session_.prepare << "DELETE FROM task WHERE id = :id", soci::use(in_.iId));
+    Statement insert_{
+        when_, [this]() -> soci::statement {
+            return (session_.prepare << std::string("INSERT INTO task (") + kColumns +
+                                            ") VALUES (:done,:grp,:id,:meta,:name,:qty,:tags)",
+                    soci::use(in_.iDone), soci::use(in_.strGrp), soci::use(in_.iId),
+                    soci::use(in_.strMeta), soci::use(in_.strName), soci::use(in_.iQty),
+                    soci::use(in_.strTags));
+        }};
+    Statement stored_{when_, [this]() -> soci::statement {
+                          return intoOut(" WHERE rowid = last_insert_rowid()");
+                      }};
+    Statement byId_{when_, [this]() -> soci::statement {
+                        return (intoOut(" WHERE id = :id"), soci::use(in_.iId));
+                    }};
+    Statement byGroup_{when_, [this]() -> soci::statement {
+                           return (intoOut(" WHERE grp = :grp"), soci::use(in_.strGrp));
+                       }};
+    Statement every_{when_, [this]() -> soci::statement { return intoOut(""); }};
+    Statement update_{when_, [this]() -> soci::statement {
+                          return (session_.prepare << "UPDATE task SET name = :name WHERE id = :id",
+                                  soci::use(in_.strName), soci::use(in_.iId));
+                      }};
+    Statement remove_{when_, [this]() -> soci::statement {
+                          return (session_.prepare << "DELETE FROM task WHERE id = :id",
+                                  soci::use(in_.iId));
+                      }};
     JsoncppText text_;
 };
 
@@ -149,7 +162,12 @@ private:
 
 std::unique_ptr<Contender> makeSoci()
 {
-    return std::make_unique<Soci>();
+    return std::make_unique<Soci>(Prepare::kEachCall);
+}
+
+std::unique_ptr<Contender> makeSociKept()
+{
+    return std::make_unique<Soci>(Prepare::kOnce);
 }
 
 }  // namespace bench

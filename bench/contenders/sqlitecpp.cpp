@@ -1,6 +1,7 @@
-// A host on SQLiteCpp, statements prepared once, with jsoncpp as the host by hand uses it.
+// A host on SQLiteCpp, with jsoncpp as the host by hand uses it.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
+#include "contenders/prepared.h"
 
 #include <SQLiteCpp/SQLiteCpp.h>
 
@@ -12,55 +13,67 @@ namespace {
 
 class SqliteCpp : public JsonContender<Json::Value> {
 public:
-    SqliteCpp() = default;
+    explicit SqliteCpp(Prepare when) : when_(when) {}
 
     sqlite3* connection() override { return database_.getHandle(); }
 
     void create(int id) override
     {
         const Json::Value& jRecord = record(id);
-        insert_.bind(1, jRecord["done"].asBool() ? 1 : 0);
-        insert_.bind(2, jRecord["grp"].asString());
-        insert_.bind(3, jRecord["id"].asInt());
-        insert_.bind(4, text_.write(jRecord["meta"]));
-        insert_.bind(5, jRecord["name"].asString());
-        insert_.bind(6, static_cast<int64_t>(jRecord["qty"].asInt64()));
-        insert_.bind(7, text_.write(jRecord["tags"]));
-        insert_.exec();
-        insert_.reset();
-        result_ = only(stored_);
+        SQLite::Statement& insert = insert_.get();
+        insert.bind(1, jRecord["done"].asBool() ? 1 : 0);
+        insert.bind(2, jRecord["grp"].asString());
+        insert.bind(3, jRecord["id"].asInt());
+        insert.bind(4, text_.write(jRecord["meta"]));
+        insert.bind(5, jRecord["name"].asString());
+        insert.bind(6, static_cast<int64_t>(jRecord["qty"].asInt64()));
+        insert.bind(7, text_.write(jRecord["tags"]));
+        insert.exec();
+        insert.reset();
+        result_ = only(stored_.get());
     }
 
     void fetch(int id) override
     {
-        byId_.bind(1, request(id)["id"].asInt());
-        result_ = only(byId_);
+        SQLite::Statement& byId = byId_.get();
+        byId.bind(1, request(id)["id"].asInt());
+        result_ = only(byId);
     }
 
     void listGroup(int group) override
     {
-        byGroup_.bind(1, groupRequest(group)["grp"].asString());
-        result_ = all(byGroup_);
+        SQLite::Statement& byGroup = byGroup_.get();
+        byGroup.bind(1, groupRequest(group)["grp"].asString());
+        result_ = all(byGroup);
     }
 
-    void listAll() override { result_ = all(every_); }
+    void listAll() override { result_ = all(every_.get()); }
 
     void update(int id) override
     {
-        update_.bind(1, change(id)["name"].asString());
-        update_.bind(2, request(id)["id"].asInt());
-        update_.exec();
-        update_.reset();
+        SQLite::Statement& statement = update_.get();
+        statement.bind(1, change(id)["name"].asString());
+        statement.bind(2, request(id)["id"].asInt());
+        statement.exec();
+        statement.reset();
     }
 
     void remove(int id) override
     {
-        remove_.bind(1, request(id)["id"].asInt());
-        remove_.exec();
-        remove_.reset();
+        SQLite::Statement& statement = remove_.get();
+        statement.bind(1, request(id)["id"].asInt());
+        statement.exec();
+        statement.reset();
     }
 
 private:
+    using Statement = Prepared<SQLite::Statement>;
+
+    Statement prepared(const std::string& strSql)
+    {
+        return {when_, [this, strSql] { return SQLite::Statement(database_, strSql); }};
+    }
+
     static SQLite::Database opened()
     {
         SQLite::Database database(":memory:", SQLite::OPEN_READWRITE | SQLite::OPEN_CREATE);
@@ -109,16 +122,17 @@ private:
         return jRows;
     }
 
+    const Prepare when_;
     const std::string select_ = std::string("SELECT ") + kColumns + " FROM task";
     SQLite::Database database_ = opened();
-    SQLite::Statement insert_{
-        database_, std::string("INSERT INTO task (") + kColumns + ") VALUES (?,?,?,?,?,?,?)"};
-    SQLite::Statement stored_{database_, select_ + " WHERE rowid = last_insert_rowid()"};
-    SQLite::Statement byId_{database_, select_ + " WHERE id = ?"};
-    SQLite::Statement byGroup_{database_, select_ + " WHERE grp = ?"};
-    SQLite::Statement every_{database_, select_};
-    SQLite::Statement update_{database_, "UPDATE task SET name = ? WHERE id = ?"};
-    SQLite::Statement remove_{database_, "DELETE FROM task WHERE id = ?"};
+    Statement insert_ =
+        prepared(std::string("INSERT INTO task (") + kColumns + ") VALUES (?,?,?,?,?,?,?)");
+    Statement stored_ = prepared(select_ + " WHERE rowid = last_insert_rowid()");
+    Statement byId_ = prepared(select_ + " WHERE id = ?");
+    Statement byGroup_ = prepared(select_ + " WHERE grp = ?");
+    Statement every_ = prepared(select_);
+    Statement update_ = prepared("UPDATE task SET name = ? WHERE id = ?");
+    Statement remove_ = prepared("DELETE FROM task WHERE id = ?");
     JsoncppText text_;
 };
 
@@ -126,7 +140,12 @@ private:
 
 std::unique_ptr<Contender> makeSqliteCpp()
 {
-    return std::make_unique<SqliteCpp>();
+    return std::make_unique<SqliteCpp>(Prepare::kEachCall);
+}
+
+std::unique_ptr<Contender> makeSqliteCppKept()
+{
+    return std::make_unique<SqliteCpp>(Prepare::kOnce);
 }
 
 }  // namespace bench
