@@ -74,10 +74,29 @@ void expect(bool blHolds, const char* szContender, const char* szOperation, cons
     printf("%s, %s: %s\n", szContender, szOperation, szWhat);
 }
 
+// The contenders and the operations as JSON, for the scripts.
+void printLists()
+{
+    Json::Value jLists;
+    for (const bench::ContenderEntry& contender : bench::contenders()) {
+        Json::Value jContender;
+        jContender["name"] = contender.szName;
+        jContender["title"] = contender.szTitle;
+        jLists["contenders"].append(jContender);
+    }
+    for (const bench::OperationEntry& operation : bench::operations())
+        jLists["operations"].append(operation.szName);
+    printf("%s\n", bench::toText(jLists).c_str());
+}
+
 }  // namespace
 
-int main()
+int main(int argc, char** argv)
 {
+    if (2 == argc && std::string("--lists") == argv[1]) {
+        printLists();
+        return 0;
+    }
     for (const bench::OperationEntry& entry : bench::operations()) {
         const Outcome library = outcomeOf("library", entry.operation);
         const std::vector<Json::Value> expected = expectedResults(entry.operation);
