@@ -61,7 +61,7 @@ def count_value_lists(programs):
 
 def take_times(programs):
     say("taking the times of the operations")
-    output = programs.output("bench_times", "--benchmark_format=json", "--benchmark_min_time=0.05",
+    output = programs.output("bench_times", "--benchmark_format=json", "--benchmark_min_time=0.02",
                              "--benchmark_repetitions=3", "--benchmark_report_aggregates_only=true")
     times = {}
     for benchmark in json.loads(output)["benchmarks"]:
