@@ -9,23 +9,23 @@ const std::vector<ContenderEntry>& contenders()
     static const std::vector<ContenderEntry> entries = {
         {"library", "this library", makeLibrary},
         {"floor", "the floor", makeFloor},
-        {"capi", "C API by hand, jsoncpp, statements kept", makeCApi},
+        {"capi", "C API by hand, jsoncpp, kept", makeCApi},
 #ifdef BENCH_NLOHMANN
-        {"nlohmann", "C API by hand, nlohmann::json, statements kept", makeNlohmann},
+        {"nlohmann", "C API by hand, nlohmann::json, kept", makeNlohmann},
 #endif
 #ifdef BENCH_SQLITECPP
         {"sqlitecpp", "SQLiteCpp, jsoncpp", makeSqliteCpp},
-        {"sqlitecpp-kept", "SQLiteCpp, jsoncpp, statements kept", makeSqliteCppKept},
+        {"sqlitecpp-kept", "SQLiteCpp, jsoncpp, kept", makeSqliteCppKept},
 #endif
 #ifdef BENCH_SOCI
         {"soci", "SOCI, jsoncpp", makeSoci},
-        {"soci-kept", "SOCI, jsoncpp, statements kept", makeSociKept},
+        {"soci-kept", "SOCI, jsoncpp, kept", makeSociKept},
 #endif
 #ifdef BENCH_POCO
         {"poco", "Poco::Data, Poco::JSON", makePoco},
-        {"poco-kept", "Poco::Data, Poco::JSON, statements kept", makePocoKept},
+        {"poco-kept", "Poco::Data, Poco::JSON, kept", makePocoKept},
 #endif
-        {"sqljson", "SQLite's JSON functions, jsoncpp, statements kept", makeSqlJson},
+        {"sqljson", "SQLite's JSON functions, jsoncpp, kept", makeSqlJson},
     };
     return entries;
 }

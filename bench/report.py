@@ -107,7 +107,7 @@ def listing_table(results, field, number):
 
 
 def listed(results):
-    return [(n, t.replace(", statements kept", "")) for n, t in results.titles.items()
+    return [(n, t.replace(", kept", "")) for n, t in results.titles.items()
             if (n, results.sizes[0]) in results.listings]
 
 
@@ -145,10 +145,10 @@ created record is read back as stored, and tags and meta are parsed. `bench_chec
 their tables.
 
 The library runs one composed text through `sqlite3_exec` for each operation. The *floor* is that very text, ready
-made, with a callback that throws the rows away: what is above it is the library's own. The contenders by hand keep
-their prepared statements; SQLiteCpp, SOCI and Poco::Data prepare for each call as their own examples do, and are
-shown once more with statements that are kept. A host that keeps prepared statements saves the preparing, which is
-most of a small operation; this library's interface cannot.
+made, with a callback that throws the rows away: what is above it is the library's own. "Kept" stands for statements
+that are prepared once and kept, as the contenders by hand do; SQLiteCpp, SOCI and Poco::Data are shown with
+statements that are prepared for each call, as in their own examples, and with kept ones. A host that keeps its
+statements saves the preparing, which is most of a small operation; this library's interface cannot.
 
 ## Limits
 
