@@ -1,0 +1,21 @@
+// Every contender; the optional ones are missing where their library was not found. "Kept" prepares
+// its statements once, without it they are prepared for each call.
+#pragma once
+
+#include "contender.h"
+
+namespace bench {
+
+std::unique_ptr<Contender> makeLibrary();
+std::unique_ptr<Contender> makeFloor();
+std::unique_ptr<Contender> makeCApi();
+std::unique_ptr<Contender> makeNlohmann();
+std::unique_ptr<Contender> makeSqliteCpp();
+std::unique_ptr<Contender> makeSqliteCppKept();
+std::unique_ptr<Contender> makeSoci();
+std::unique_ptr<Contender> makeSociKept();
+std::unique_ptr<Contender> makePoco();
+std::unique_ptr<Contender> makePocoKept();
+std::unique_ptr<Contender> makeSqlJson();
+
+}  // namespace bench

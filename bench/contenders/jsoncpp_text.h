@@ -1,0 +1,47 @@
+// jsoncpp's reader and writer as a host that cares keeps them: made once, without comments.
+#pragma once
+
+#include "workload.h"
+
+#include <json/reader.h>
+#include <json/writer.h>
+
+#include <memory>
+#include <sstream>
+#include <string>
+
+namespace bench {
+
+class JsoncppText {
+public:
+    JsoncppText()
+    {
+        Json::CharReaderBuilder readers;
+        readers["collectComments"] = false;
+        reader_.reset(readers.newCharReader());
+        Json::StreamWriterBuilder writers;
+        writers["commentStyle"] = "None";
+        writers["indentation"] = "";
+        writers["emitUTF8"] = true;
+        writer_.reset(writers.newStreamWriter());
+    }
+
+    void read(const char* pBegin, const char* pEnd, Json::Value& jValue)
+    {
+        must(reader_->parse(pBegin, pEnd, &jValue, nullptr), pBegin);
+    }
+
+    std::string write(const Json::Value& jValue)
+    {
+        stream_.str({});
+        writer_->write(jValue, &stream_);
+        return stream_.str();
+    }
+
+private:
+    std::unique_ptr<Json::CharReader> reader_;
+    std::unique_ptr<Json::StreamWriter> writer_;
+    std::ostringstream stream_;
+};
+
+}  // namespace bench

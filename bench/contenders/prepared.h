@@ -1,0 +1,35 @@
+// A statement of a C++ library: prepared once, as hosts do that care, or for each call, as the
+// libraries' own examples do.
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <utility>
+
+namespace bench {
+
+enum class Prepare { kOnce, kEachCall };
+
+template <typename StatementType>
+class Prepared {
+public:
+    Prepared(Prepare when, std::function<StatementType()> make)
+        : when_(when), make_(std::move(make))
+    {
+    }
+
+    // Valid until the next call.
+    StatementType& get()
+    {
+        if (Prepare::kEachCall == when_) statement_.reset();
+        if (nullptr == statement_) statement_.reset(new StatementType(make_()));
+        return *statement_;
+    }
+
+private:
+    Prepare when_;
+    std::function<StatementType()> make_;
+    std::unique_ptr<StatementType> statement_;
+};
+
+}  // namespace bench

@@ -1,0 +1,216 @@
+"""Writes performance.md and its plots from what measure.py measured, prints the document, and fails
+when a limit is missed.
+
+    report.py RESULTS.json FOLDER
+"""
+
+import json
+import os
+import sys
+
+import plot
+
+TITLES = {
+    "create": "create a record and read it back", "fetch": "fetch a record by its key",
+    "group": "list a group of ten", "list": "list a row of all", "update": "update a member by key",
+    "delete": "delete a record by its key",
+}
+# What stands on the left, the figure's name, the limit and the aim beyond it.
+LIMITS = [
+    ("create, instructions over the floor's", ("count", "create", "floor"), 1.50, 1.35),
+    ("fetch, instructions over the floor's", ("count", "fetch", "floor"), 1.45, 1.35),
+    ("update, instructions over the floor's", ("count", "update", "floor"), 1.45, 1.25),
+    ("delete, instructions over the floor's", ("count", "delete", "floor"), 1.28, 1.15),
+    ("a listed row, over the C API by hand with jsoncpp", ("count", "list", "capi"), 0.75, 0.65),
+    ("a listed row, over the C API by hand with nlohmann::json", ("count", "list", "nlohmann"), 0.95, None),
+    ("a group of ten, over the C API by hand with jsoncpp", ("count", "group", "capi"), 1.20, 1.00),
+    ("create, over SQLiteCpp", ("count", "create", "sqlitecpp"), 1.10, None),
+    ("fetch, over SQLiteCpp", ("count", "fetch", "sqlitecpp"), 1.05, None),
+    ("create, over SOCI", ("count", "create", "soci"), 0.85, None),
+    ("fetch, over Poco::Data", ("count", "fetch", "poco"), 0.65, None),
+    ("user CPU time of a listed row, 1,000,000 rows over 10,000", ("growth", 1000000, 10000), 1.30, None),
+    ("peak memory of a listed row, over the C API by hand", ("memory", "library", "capi"), 1.05, None),
+    ("value list of 50 members, one of 1 MiB, over that text and those members alone",
+     ("value_list",), 1.10, None),
+]
+
+
+class Results:
+    def __init__(self, path):
+        with open(path) as file:
+            self.all = json.load(file)
+        self.titles = {c["name"]: c["title"] for c in self.all["contenders"]}
+        self.operations = self.all["operations"]
+        # Instructions for each call; a list has one call and counts by its rows.
+        self.counts = {
+            (c["contender"], c["operation"]):
+                c["instructions"] / (c["rows"] if c["operation"] == "list" else c["calls"])
+            for c in self.all["counts"]}
+        self.listings = {(r["contender"], r["rows"]): r for r in self.all["listings"]}
+        self.sizes = sorted({r["rows"] for r in self.all["listings"]})
+
+    def listing(self, contender, rows, field):
+        found = self.listings.get((contender, rows))
+        return found[field] if found else None
+
+    def figure(self, kind, *keys):
+        """The measured ratio, None where it was not measured."""
+        if kind == "count":
+            operation, other = keys
+            pair = self.counts.get(("library", operation)), self.counts.get((other, operation))
+        elif kind == "growth":
+            pair = [self.listing("library", rows, "user_ns_per_row") for rows in keys]
+        elif kind == "memory":
+            pair = [self.listing(c, self.sizes[-1], "peak_bytes_per_row") for c in keys]
+        else:
+            lists = self.all["value_lists"]
+            pair = lists["both"], lists["long_alone"] + lists["many_alone"]
+        return pair[0] / pair[1] if None not in pair else None
+
+
+def table(header, rows):
+    """A Markdown table; all columns but the first are numbers."""
+    widths = [max(len(row[i]) for row in [header, *rows]) for i in range(len(header))]
+    pad = lambda row: "| " + " | ".join(
+        cell.ljust(width) if i == 0 else cell.rjust(width) for i, (cell, width) in enumerate(zip(row, widths))) + " |"
+    rule = "|" + "|".join("-" * (w + 2) if i == 0 else "-" * (w + 1) + ":" for i, w in enumerate(widths)) + "|"
+    return "\n".join([pad(header), rule, *map(pad, rows)])
+
+
+def verdict(value, limit, aim):
+    if value is None:
+        return "not measured"
+    if value > limit:
+        return "MISSED"
+    return "ok, aim reached" if aim and value <= aim else "ok"
+
+
+def limits_table(results):
+    rows = []
+    for what, figure, limit, aim in LIMITS:
+        value = results.figure(*figure)
+        rows.append((what, "-" if value is None else f"{value:.2f}", f"{limit:.2f}",
+                     f"{aim:.2f}" if aim else "", verdict(value, limit, aim)))
+    return table(("figure", "measured", "at most", "aim", ""), rows)
+
+
+def operations_table(results, value_of, number):
+    return table(("", *results.operations),
+                 [(title, *(number(value_of(name, o)) for o in results.operations))
+                  for name, title in results.titles.items()])
+
+
+def listing_table(results, field, number):
+    rows = [(title, *(number(results.listing(name, size, field)) for size in results.sizes))
+            for name, title in listed(results)]
+    return table(("", *(f"{size:,}" for size in results.sizes)), rows)
+
+
+def listed(results):
+    return [(n, t.replace(", kept", "")) for n, t in results.titles.items()
+            if (n, results.sizes[0]) in results.listings]
+
+
+def plots(results):
+    thousands = lambda value: f"{value / 1000:,.1f} k"
+    microseconds = lambda nanoseconds: f"{nanoseconds / 1000:,.1f} µs".replace(".0 ", " ")
+    largest = results.sizes[-1]
+    yield "operations.svg", plot.bars(
+        "Instructions of each operation",
+        [(TITLES[o], [(n, t, results.counts[n, o]) for n, t in results.titles.items()])
+         for o in results.operations], thousands)
+    yield "listing.svg", plot.lines(
+        "User CPU time of a listed row", "rows in the table", "microseconds for each row",
+        [(n, t, [(s, results.listing(n, s, "user_ns_per_row") / 1000) for s in results.sizes])
+         for n, t in listed(results)], lambda value: f"{value:g}")
+    yield "memory.svg", plot.bars(
+        "Peak memory of a listed row",
+        [(f"bytes for each of {largest:,} rows",
+          [(n, t, results.listing(n, largest, "peak_bytes_per_row")) for n, t in listed(results)])],
+        lambda value: f"{value:,.0f}")
+
+
+def document(results, notes):
+    facts = results.all["machine"]
+    skipped = ("\n**Skipped:** the table of 1,000,000 rows, because less than 6 GB of memory were free.\n"
+               if results.all["largest_skipped"] else "")
+    return f"""# Performance
+
+Written by `scripts/bench` from what it measured; edit `bench/notes.md` and run it again.
+
+The work: a table `task` of seven members (two texts, one of them indexed in groups of ten, an integer key, a
+64-bit integer, a boolean, an array of two texts, an object of two members) in memory, the writes in one
+transaction. Every contender takes its records and requests as JSON that was made before, and hands JSON back: a
+created record is read back as stored, and tags and meta are parsed. `bench_check` compares their results and
+their tables.
+
+The library runs one composed text through `sqlite3_exec` for each operation. The *floor* is that very text, ready
+made, with a callback that throws the rows away: what is above it is the library's own. "Kept" stands for statements
+that are prepared once and kept, as the contenders by hand do; SQLiteCpp, SOCI and Poco::Data are shown with
+statements that are prepared for each call, as in their own examples, and with kept ones. A host that keeps its
+statements saves the preparing, which is most of a small operation; this library's interface cannot.
+
+## Limits
+
+{limits_table(results)}
+{skipped}
+## Instructions
+
+Counted by callgrind at {results.all["rows"]:,} records, for each call, and for each row where all rows are listed.
+Dropping what a call returned belongs to the next call; dropping the list of all rows is not counted.
+
+{operations_table(results, lambda n, o: results.counts[n, o], lambda v: f"{v:,.0f}")}
+
+![Instructions of each operation](performance/operations.svg)
+
+## Time
+
+Microseconds of CPU time on the machine below, for each call or listed row, by Google Benchmark (median of three).
+
+{operations_table(results, lambda n, o: results.all["times"][f"{n}/{o}"], lambda v: f"{v:.1f}")}
+
+## Long lists
+
+User CPU time of a listed row in microseconds by the size of the table (median of five, each run in a process of its
+own; at 1,000,000 rows of the others one run).
+
+{listing_table(results, "user_ns_per_row", lambda v: f"{v / 1000:.2f}")}
+
+![User CPU time of a listed row](performance/listing.svg)
+
+Growth of the kernel's high-water mark of memory while the table is listed, in bytes for each row.
+
+{listing_table(results, "peak_bytes_per_row", lambda v: f"{v:,.0f}")}
+
+![Peak memory of a listed row](performance/memory.svg)
+
+## Where the rest of the cost is
+
+{notes}
+## Machine
+
+{facts["processor"]}, {facts["cores"]} cores, {facts["memory_gib"]} GiB, {facts["system"]}, {facts["compiler"]},
+everything of ours at -O2.
+
+{chr(10).join("- " + package for package in facts["packages"])}
+"""
+
+
+def main():
+    results, folder = Results(sys.argv[1]), sys.argv[2]
+    with open(os.path.join(os.path.dirname(os.path.abspath(__file__)), "notes.md"), encoding="utf-8") as file:
+        notes = file.read()
+    os.makedirs(os.path.join(folder, "performance"), exist_ok=True)
+    for name, svg in plots(results):
+        with open(os.path.join(folder, "performance", name), "w", encoding="utf-8") as file:
+            file.write(svg)
+    text = document(results, notes)
+    with open(os.path.join(folder, "performance.md"), "w", encoding="utf-8") as file:
+        file.write(text)
+    print(text)
+    missed = [what for what, figure, limit, _ in LIMITS if (results.figure(*figure) or 0) > limit]
+    if missed:
+        sys.exit("limits missed: " + "; ".join(missed))
+
+
+main()
