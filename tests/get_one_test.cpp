@@ -86,6 +86,45 @@ TEST_F(GetOne, OverwritesMembersAndKeepsTheOthers)
               text(jOut_));
 }
 
+TEST_F(GetOne, MayTakeTheRequestItselfAsTheOutput)
+{
+    const struct {
+        const char* szBoth;
+        int iResult;
+        const char* szAfter;
+    } cases[] = {
+        {R"({"id":2,"limit":1})", 1, R"({"flag":false,"id":2,"limit":1,"name":"Bob"})"},
+        {R"({"limit":1,"offset":1})", 1,
+         R"({"flag":false,"id":2,"limit":1,"name":"Bob","offset":1})"},
+        {"null", 1, R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
+        {"{}", 1, R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
+        {R"({"id":9})", 0, R"({"id":9})"},
+        {R"({"tags":[]})", -1, R"({"tags":[]})"},
+        {"[1]", -1, "[1]"},
+        {R"("x")", -1, R"("x")"},
+    };
+    for (const auto& row : cases) {
+        Json::Value jBoth = json(row.szBoth);
+        EXPECT_EQ(row.iResult, table_.api.recGetOne(jBoth, jBoth)) << row.szBoth;
+        EXPECT_EQ(row.szAfter, text(jBoth)) << row.szBoth;
+        EXPECT_EQ(-1 == row.iResult, !takeLog().empty()) << row.szBoth;
+    }
+}
+
+// The record is the host's own: what becomes of it touches no later one.
+TEST_F(GetOne, GivesARecordOfItsOwn)
+{
+    EXPECT_EQ(1, get(R"({"id":2})"));
+    Json::Value jFirst = jOut_;
+    jFirst["name"] = "changed";
+    jFirst.removeMember("flag");
+    jFirst["new"] = 1;
+    jOut_ = Json::nullValue;
+    EXPECT_EQ(1, get(R"({"id":2})"));
+    EXPECT_EQ(R"({"flag":false,"id":2,"name":"Bob"})", text(jOut_));
+    EXPECT_EQ(R"({"id":2,"name":"changed","new":1})", text(jFirst));
+}
+
 TEST_F(GetOne, ARowOfNullsLeavesANullOutput)
 {
     Table table(database_, R"({"a":{"cpptype":"string"}})", "a");
