@@ -116,4 +116,28 @@ TEST_F(StrangeRows, OfAMemberWithoutATypeAreRefused)
     EXPECT_EQ(R"([{"i":true}])", text(rows_));
 }
 
+// Two rows of one statement, as if SQLite went on after the first failed.
+TEST_F(StrangeRows, WithoutTypesAskForThemEveryTime)
+{
+    VORN_JSON_DB::recType(table_.jDefinition, table_.strName) = Json::nullValue;
+    state().exec = [](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
+                      char** errText) {
+        Row row = {{"i"}, {"1"}};
+        EXPECT_EQ(-1, row.handTo(callback, arg));
+        EXPECT_EQ(-1, row.handTo(callback, arg));
+        *errText = doubles::errorText("query aborted");
+        return SQLITE_ABORT;
+    };
+    EXPECT_EQ(-1, run(&rows_));
+    const Lines lines = takeLog();
+    ASSERT_EQ(15U, lines.size());
+    for (std::size_t i : {0U, 7U}) {
+        EXPECT_EQ(utilFailed("jType[strJsonName].type() != Json::objectValue"), lines[i]);
+        EXPECT_EQ(utilPlain("strJsonName=" + table_.strName), lines[i + 1]);
+        EXPECT_EQ(utilPlain("jTableDef=null"), lines[i + 2]);
+        EXPECT_EQ(0U, lines[i + 3].find(utilPlain("jType={")));
+        EXPECT_EQ(failed("!jType.isMember(strName)"), lines[i + 4]);
+    }
+}
+
 }  // namespace
