@@ -15,7 +15,7 @@
 ///
 /// Records go to standard output as JSON, one a line. Messages are one line on standard error. The
 /// exit status is 0, 1 when something failed, 2 for wrong arguments, 3 when `get` finds nothing,
-/// about which it says nothing else.
+/// about which it says nothing else. `get` reads one record: it puts "limit" 1 into the request.
 #include "progress.h"
 
 #include <VornJsonDbApi.h>

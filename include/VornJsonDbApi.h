@@ -6,24 +6,31 @@
 ///
 ///     #include <VornJsonDbApi.h>
 ///     #include <sqlite3.h>
+///     #include <cstdio>
 ///
 ///     bool blLogToStdout = false;  // the host defines both flags
 ///     bool blDebugOutput = false;
 ///
-///     sqlite3* pDb = nullptr;
-///     sqlite3_open("tasks.db", &pDb);
-///     std::string strName = "task";
-///     std::string strCreate = "CREATE TABLE IF NOT EXISTS task (id INTEGER PRIMARY KEY, name
-///     TEXT)"; Json::Value jDef; jDef["task"]["member"]["id"]["cpptype"] = "int";
-///     jDef["task"]["member"]["name"]["cpptype"] = "string";
-///     jDef["task"]["member"]["name"]["cppDefaultValue"] = "unnamed";
+///     int main()
 ///     {
-///         VornJsonDbApi task(pDb, strName, jDef, strCreate);
-///         Json::Value jRec, jStored;
-///         jRec["id"] = 1;
-///         if (0 > task.recCreate(jRec, jStored)) { ... task.getErrMsg() ... }
+///         sqlite3* pDb = nullptr;
+///         if (SQLITE_OK != sqlite3_open("tasks.db", &pDb)) return 1;
+///         std::string strName = "task";
+///         std::string strCreate =
+///             "create table if not exists task (id integer primary key, name text)";
+///         Json::Value jDefinition;
+///         jDefinition["task"]["member"]["id"]["cpptype"] = "int";
+///         jDefinition["task"]["member"]["name"]["cpptype"] = "string";
+///         jDefinition["task"]["member"]["name"]["cppDefaultValue"] = "unnamed";
+///         {
+///             VornJsonDbApi task(pDb, strName, jDefinition, strCreate);
+///             Json::Value jRecord;
+///             Json::Value jStored;
+///             jRecord["id"] = 1;
+///             if (0 > task.recCreate(jRecord, jStored)) puts(task.getErrMsg().c_str());
+///         }
+///         sqlite3_close(pDb);
 ///     }
-///     sqlite3_close(pDb);
 ///
 /// Results: every operation returns an int, negative on failure. Each failed check is logged with
 /// the source text of its condition. Outputs are written only on success unless said otherwise.
@@ -31,12 +38,13 @@
 /// Threads: the library keeps process-wide state and takes no locks. Use it from one thread at a
 /// time, all handles together.
 ///
-/// Exceptions: the library throws nothing of its own. What reaches the host is std::bad_alloc (and
-/// jsoncpp's Json::RuntimeError) when memory runs out, std::logic_error where SQLite found no
-/// memory for a value list, and Json::LogicError where an accessor of jsoncpp meets a value of the
-/// wrong kind, such as a text under an integer member in recSave. Handle, connection, records and
-/// result arrays are then as they were; a text that an SQL builder was appending to keeps what was
-/// appended before, except where the builder says that it is unchanged.
+/// Exceptions: the library throws nothing of its own. Where an accessor of jsoncpp meets a value of
+/// the wrong kind, such as a text under an integer member in recSave(), its Json::LogicError
+/// reaches the host; records and result arrays are then as they were, and a text that an SQL
+/// builder was appending to keeps what was appended before, except where the builder says that it
+/// is unchanged. When memory runs out, std::bad_alloc, jsoncpp's Json::RuntimeError or (in a value
+/// list) std::logic_error reaches the host; a list then keeps the records that it had appended, and
+/// a write may have been made. After each of them handle and connection are sound.
 ///
 /// Ownership: the host owns the connection and every argument. A handle copies the name, the
 /// definition and the CREATE statement; it neither opens nor closes the connection, which has to
@@ -93,7 +101,8 @@ namespace VORN_JSON_DB {
 /// from the next statement on.
 VORN_JSON_DB_EXPORT Json::Value& recType(Json::Value& jTableDef, std::string& strJsonName);
 
-/// Copies the members of the object @p jSubSet into @p jIn, which is an object or null: those that
+/// Copies the members of the object @p jSubSet, which must not be a member of @p jIn, into @p jIn,
+/// which is an object or null: those that
 /// @p jIn lacks, and with @p blOverwrite also those that it has. Members are copied whole, not
 /// merged. Returns 0, or -1 with @p jIn unchanged when one of the two is of another kind.
 VORN_JSON_DB_EXPORT int jsonCopyMember(Json::Value& jIn, Json::Value& jSubSet, bool blOverwrite);
@@ -143,8 +152,8 @@ public:
     /// Replaces the message that getErrMsg() returns.
     void setErrMsg(std::string strMsg);
 
-    /// The message for the host's user: empty in a new handle, "DUPLICATE_PRIMARY_KEY" after an
-    /// operation met a violated UNIQUE or PRIMARY KEY constraint.
+    /// The message for the host's user: empty in a new handle, "DUPLICATE_PRIMARY_KEY" after
+    /// recCreate() or recUpdateByFilter() met a violated UNIQUE or PRIMARY KEY constraint.
     ///
     /// Nothing but setErrMsg() clears it. Look at it only after a result of -1, and call
     /// setErrMsg("") before the operation: a later failure of another kind leaves it in place.
@@ -191,22 +200,21 @@ public:
     ///
     /// Returns 0, or -1 with @p jRecOut unchanged. getErrMsg() is then "DUPLICATE_PRIMARY_KEY" when
     /// the last SQL failure of this handle was a violated UNIQUE constraint, even if this call
-    /// ended before it ran any SQL.
+    /// ended before it ran any SQL. An integer beyond 64 bits passes the type check and throws.
     int recCreate(Json::Value& jRecIn, Json::Value& jRecOut);
 
     /// Appends every record that the request @p jRecParam selects to the array @p jRecArrayOut (or
     /// null, which becomes an array with the first record). The array is not cleared.
     ///
-    /// The request is null or an object:
+    /// The request is null or an object, which may hold
     ///
-    ///     {"member": value}                   member equals value
-    ///     {"member": [value]}                 member is the value of the list; give one item only:
-    ///                                         several are written without a comma between them
-    ///     {"vornSqlWhereFilter": "id > 5"}    SQL of the host, as it stands
-    ///     {"sort_by": "name", "sort_direction": "desc"}   written as a text literal, so that
-    ///     SQLite
-    ///                                         does not order by the column
-    ///     {"limit": 10, "offset": 20}         paging; "offset" only with "limit"
+    /// - `{"member": value}`: the member equals the value;
+    /// - `{"member": [value]}`: the member is the value of the list. Give one item only: several
+    ///   are written without a comma between them;
+    /// - `{"vornSqlWhereFilter": "id > 5"}`: SQL of the host, as it stands;
+    /// - `{"sort_by": "name", "sort_direction": "desc"}`: written as a text literal, so that SQLite
+    ///   does not order by the column;
+    /// - `{"limit": 10, "offset": 20}`: paging; "offset" counts only with "limit".
     ///
     /// Terms are joined by "and". Members that the table does not declare are ignored. A member
     /// that is NULL in the row is left out of its record.
@@ -221,10 +229,11 @@ public:
     int recGetOne(Json::Value& jRecParam, Json::Value& jRecOut);
 
     /// Sets the members of the object @p jRecIn in every row for which the SQL condition
-    /// @p strSqlWhere, taken as it stands, holds. Members that are not declared are ignored, and an
-    /// array becomes a membership term, which no SET list takes: save the whole record instead.
+    /// @p strSqlWhere, taken as it stands, holds. No types are checked. Members that are not
+    /// declared are ignored, and so is "vornSqlWhereFilter"; an array becomes a membership term,
+    /// which no SET list takes: save the whole record instead.
     ///
-    /// Returns 0, also when no row matched, or -1. An empty condition is refused.
+    /// Returns 0, also when no row matched, or -1. An empty condition or record is refused.
     int recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWhere);
 
     /// Sets the members of the object @p jParamIn, type-checked as by checkJsonType(), in every row
@@ -259,7 +268,9 @@ public:
     int SqlExpandMemberName(std::string& sql, Json::Value* rec = nullptr);
 
     /// Appends the value list that goes with SqlExpandMemberName(sql, &rec) to @p sql, closed by
-    /// ") ". Returns 0, or -1 with @p sql unchanged, as it also is when an accessor throws.
+    /// ") " behind the last declared member. Returns 0, or -1 with @p sql unchanged, as it also is
+    /// when an accessor throws. A record without that member gives a list that ends with a comma, a
+    /// table without members gives nothing.
     ///
     /// Text is escaped, integers and numbers (six decimals) are bare, objects and arrays become
     /// JSON text. A "%" in the text so far, earlier values included, is read as a conversion of
@@ -294,10 +305,6 @@ public:
     int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
-    // recSave() with the stored row handed back in jStored, which may be the record itself.
-    __attribute__((visibility("hidden"))) int saveRecord(Json::Value& jRecInOut, bool blCreate,
-                                                         Json::Value& jStored);
-
     sqlite3* pDb = nullptr;
     std::string strName;
     Json::Value jTableDef;

@@ -224,6 +224,8 @@ namespace {
 
 struct DecimalComma : std::numpunct<char> {
     char do_decimal_point() const override { return ','; }
+    char do_thousands_sep() const override { return '.'; }
+    std::string do_grouping() const override { return "\3"; }
 };
 
 // The global C++ locale with a decimal comma, for as long as it lives.
@@ -248,20 +250,21 @@ TEST_F(Limits, GlobalLocaleWithADecimalComma)
         jRecord["o"] = jObject;
         Json::Value jStored;
         EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
-        return jStored["o"]["rate"];
+        return text(jStored["o"]);
     };
     const Json::Value jFraction = jExample(0);
     const Json::Value jText = jExample(1);
     {
         const CommaLocale locale;
-        EXPECT_EQ("1.0", text(create(jFraction)));
-        EXPECT_EQ(R"("1.5")", text(create(jText)));
-        EXPECT_EQ("12345", text(create(json(R"({"rate":12345})"))));
+        EXPECT_EQ(R"({"rate":null})", create(jFraction));
+        EXPECT_EQ(R"({"rate":"1.5","unit":"EUR"})", create(jText));
+        EXPECT_EQ(R"({"rate":12345,"unit":"EUR"})", create(json(R"({"rate":12345,"unit":"EUR"})")));
+        EXPECT_EQ(Lines(), takeLog());
     }
-    EXPECT_EQ("1.5", text(create(jFraction)));
-    EXPECT_EQ((Rows{{R"({"rate":1.5})"},
-                    {R"({"rate":"1.5"})"},
-                    {R"({"rate":12345})"},
-                    {R"({"rate":1.5})"}}),
+    EXPECT_EQ(R"({"rate":1.5,"unit":"EUR"})", create(jFraction));
+    EXPECT_EQ((Rows{{R"({"rate":1.5,"unit":"EUR"})"},
+                    {R"({"rate":"1.5","unit":"EUR"})"},
+                    {R"({"rate":12345,"unit":"EUR"})"},
+                    {R"({"rate":1.5,"unit":"EUR"})"}}),
               database_.rows("select o from " + table.strName));
 }

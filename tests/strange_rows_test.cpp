@@ -140,4 +140,21 @@ TEST_F(StrangeRows, WithoutTypesAskForThemEveryTime)
     }
 }
 
+// What a host changes through the reference of recType holds from the next statement on.
+TEST_F(StrangeRows, KeepTheTypesOfTheStatementsFirstRow)
+{
+    Row row{{"s"}, {"5"}};
+    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
+    state().exec = [&](sqlite3*, const char*, doubles::RowCallback callback, void* arg, char**) {
+        EXPECT_EQ(0, row.handTo(callback, arg));
+        jTypes["s"]["cpptype"] = "int";
+        EXPECT_EQ(0, row.handTo(callback, arg));
+        return SQLITE_OK;
+    };
+    EXPECT_EQ(0, run(&rows_));
+    EXPECT_EQ(0, run(&rows_));
+    EXPECT_EQ(R"([{"s":"5"},{"s":"5"},{"s":5},{"s":5}])", text(rows_));
+    EXPECT_EQ(Lines(), takeLog());
+}
+
 }  // namespace

@@ -18,7 +18,7 @@ struct FormatArgument {
     static FormatArgument text(const char* szValue) { return {Kind::kText, 0, 0, szValue}; }
 };
 
-// Kept: by contract every value is appended as
+// Kept: every value is appended as
 //
 //     text = sqlite3_mprintf(text + conversion, value)
 //

@@ -18,11 +18,14 @@
 
 namespace {
 
+// None of this is ever destroyed: a handle in a global variable of the host may still work while
+// the process exits.
+
 // The table whose statement is running: SQLite calls the row callback without a handle.
-std::string strCurJsonName;
+std::string& strCurJsonName = *new std::string;
 
 // What was thrown in the row callback; nothing may unwind through SQLite's own frames.
-std::exception_ptr pThrownInCallback;
+std::exception_ptr& pThrownInCallback = *new std::exception_ptr;
 
 // The member types of that table, once a row of the running statement has asked for them and they
 // are an object.
@@ -35,7 +38,7 @@ struct Column {
     Decode decode = Decode::kNo;
     bool blChecked = false;
 };
-std::vector<Column> columns;
+std::vector<Column>& columns = *new std::vector<Column>;
 
 const Json::Value& memberTypes()
 {

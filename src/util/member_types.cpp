@@ -1,5 +1,3 @@
-#include "util/member_types.h"
-
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
@@ -56,24 +54,13 @@ bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jT
     return !FAILED(jType == Json::nullValue || !jType.isMember(strJsonName));
 }
 
-// Never destroyed: references to its entries stay valid until the process ends.
-Json::Value& cache()
-{
-    static Json::Value& jType = *new Json::Value;
-    return jType;
-}
-
 }  // namespace
-
-const Json::Value& knownMemberTypes(const std::string& strJsonName)
-{
-    const Json::Value* pjEntry = findMember(cache(), strJsonName);
-    return nullptr != pjEntry && pjEntry->isObject() ? *pjEntry : Json::Value::nullSingleton();
-}
 
 Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonName)
 {
-    Json::Value& jType = cache();
+    // Never destroyed: references to its entries stay valid until the process ends.
+    static Json::Value& jType = *new Json::Value;
+
     const bool blKnown = hasMember(jType, strJsonName) || fillEntry(jTableDef, strJsonName, jType);
     if (blKnown && !FAILED(jType[strJsonName].type() != Json::objectValue))
         return jType[strJsonName];
