@@ -1,0 +1,44 @@
+// Loads a plugin that uses the library, unloads it and loads it again, and uses it a last time
+// while the process exits: the library was loaded after this program's globals were made, so its
+// own would be gone by then. The status tells which step failed.
+
+#include <VornJsonDbApi.h>
+#include <dlfcn.h>
+
+#include <cstdlib>
+
+bool blLogToStdout = true;
+bool blDebugOutput = false;
+
+namespace {
+
+using CreatesRecord = bool (*)(int);
+
+void* pPlugin = nullptr;
+
+bool createsRecord(int iId)
+{
+    const auto pFunction = reinterpret_cast<CreatesRecord>(dlsym(pPlugin, "createsRecord"));
+    return nullptr != pFunction && pFunction(iId);
+}
+
+struct AtExit {
+    ~AtExit()
+    {
+        if (!createsRecord(3)) _Exit(4);
+    }
+};
+const AtExit atExit;
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    if (2 != argc) return 1;
+    pPlugin = dlopen(argv[1], RTLD_NOW);
+    if (nullptr == pPlugin || !createsRecord(1)) _Exit(2);
+    dlclose(pPlugin);
+    pPlugin = dlopen(argv[1], RTLD_NOW);
+    if (nullptr == pPlugin || !createsRecord(2)) _Exit(3);
+    return 0;
+}
