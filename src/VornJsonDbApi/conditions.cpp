@@ -82,7 +82,7 @@ int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jPara
 
     SqliteText szSql;
     const char* szQuote = "'";
-    switch (typeWord(typeWordOf(*pjMember)).term) {
+    switch (typeWordRow(*pjMember).term) {
     case Term::kText:
         if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
         break;
@@ -113,7 +113,7 @@ int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jList, s
     if (FAILED(!szField || !szField[0])) return -1;
     const Json::Value* pjMember = findMember(jType, szField);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(szField)")) return -1;
-    const Term term = typeWord(typeWordOf(*pjMember)).term;
+    const Term term = typeWordRow(*pjMember).term;
     if (FAILED(jList.type() != Json::arrayValue)) return -1;
     if (jList.empty()) return 0;
 

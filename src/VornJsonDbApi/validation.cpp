@@ -51,7 +51,7 @@ int VornJsonDbApi::checkJsonType(Json::Value& jRecParam)
         const std::string_view strKey = memberName(it);
         const Json::Value* pjMember = types.find(strKey);
         if (nullptr == pjMember) continue;
-        const Check check = typeWord(typeWordOf(*pjMember)).check;
+        const Check check = typeWordRow(*pjMember).check;
         if (Check::kNo == check) {
             LOG_ERROR("type not found!!, key=%s", std::string(strKey).c_str());
             return -1;

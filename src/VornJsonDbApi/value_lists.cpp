@@ -25,9 +25,9 @@ const Json::Value& declaredMembers(Json::Value& jTableDef, const std::string& st
 }
 
 // Appends one member's value as an SQL literal; false when its type word has none.
-bool appendLiteral(FormattedText& text, const std::string& strType, const Json::Value& jValue)
+bool appendLiteral(FormattedText& text, const Json::Value& jMember, const Json::Value& jValue)
 {
-    switch (typeWord(strType).value) {
+    switch (typeWordRow(jMember).value) {
     case Value::kText:
         text.appendValue("%Q", FormatArgument::text(jValue.asString().c_str()));
         return true;
@@ -87,9 +87,8 @@ int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
         const Json::Value* pjValue = values.find(strKey);
         if (nullptr == pjValue) continue;
 
-        const std::string strType = typeWordOf(*pjMember);
-        if (!appendLiteral(text, strType, *pjValue)) {
-            LOG_ERROR("cannot support this type=%s", strType.c_str());
+        if (!appendLiteral(text, *pjMember, *pjValue)) {
+            LOG_ERROR("cannot support this type=%s", typeWordOf(*pjMember).c_str());
             return -1;
         }
         text.append(0 < nLeft ? "," : ") ");

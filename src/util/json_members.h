@@ -13,6 +13,11 @@ inline const Json::Value* findMember(const Json::Value& jValue, std::string_view
     return jValue.isObject() ? jValue.find(strKey.data(), strKey.data() + strKey.size()) : nullptr;
 }
 
+inline Json::Value* findMember(Json::Value& jValue, std::string_view strKey)
+{
+    return const_cast<Json::Value*>(findMember(const_cast<const Json::Value&>(jValue), strKey));
+}
+
 inline bool hasMember(const Json::Value& jValue, std::string_view strKey)
 {
     return nullptr != findMember(jValue, strKey);
@@ -58,7 +63,7 @@ private:
     Json::Value::const_iterator end_;
 };
 
-// The type word of a member as the cache of member types holds it.
+// The type word of a member as the cache of member types holds it, as text.
 inline std::string typeWordOf(const Json::Value& jMember)
 {
     const Json::Value* pjWord = findMember(jMember, "cpptype");

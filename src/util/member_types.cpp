@@ -61,9 +61,13 @@ Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonN
     // Never destroyed: references to its entries stay valid until the process ends.
     static Json::Value& jType = *new Json::Value;
 
-    const bool blKnown = hasMember(jType, strJsonName) || fillEntry(jTableDef, strJsonName, jType);
-    if (blKnown && !FAILED(jType[strJsonName].type() != Json::objectValue))
-        return jType[strJsonName];
+    Json::Value* pjEntry = findMember(jType, strJsonName);
+    if (nullptr == pjEntry && fillEntry(jTableDef, strJsonName, jType))
+        pjEntry = findMember(jType, strJsonName);
+    if (nullptr != pjEntry &&
+        !FAILED_AS(pjEntry->type() != Json::objectValue,
+                                         "jType[strJsonName].type() != Json::objectValue"))
+        return *pjEntry;
 
     LOG_PLAIN("strJsonName=%s", strJsonName.c_str());
     LOG_PLAIN("jTableDef=%s", toString(jTableDef).c_str());

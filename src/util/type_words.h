@@ -1,6 +1,8 @@
 // The vocabulary of "cpptype": one row a word, one column a consumer.
 #pragma once
 
+#include "util/json_members.h"
+
 #include <string_view>
 
 // How a column of a result row becomes a member.
@@ -53,4 +55,15 @@ inline const TypeWord& typeWord(std::string_view strWord)
     for (const TypeWord& row : kTypeWords)
         if (row.strWord == strWord) return row;
     return kUnknownWord;
+}
+
+// The row of a member's type word as the cache of member types holds it.
+inline const TypeWord& typeWordRow(const Json::Value& jMember)
+{
+    const Json::Value* pjWord = findMember(jMember, "cpptype");
+    const char* szBegin = nullptr;
+    const char* szEnd = nullptr;
+    if (nullptr == pjWord || !pjWord->getString(&szBegin, &szEnd))
+        return typeWord(typeWordOf(jMember));
+    return typeWord({szBegin, static_cast<std::size_t>(szEnd - szBegin)});
 }
