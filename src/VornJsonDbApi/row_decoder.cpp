@@ -40,6 +40,17 @@ struct Column {
 };
 std::vector<Column>& columns = *new std::vector<Column>;
 
+// A record with every column of the rows as a null member, to be copied and filled in the order of
+// its members, without a search for any.
+struct Prototype {
+    Json::Value jRecord;
+    std::vector<std::size_t> order;  // the column of each member; empty while there is no prototype
+};
+Prototype& prototype = *new Prototype;
+
+// Rows of the running statement that were filled by name. One is the rule, and needs no prototype.
+int iRowsByName = 0;
+
 const Json::Value& memberTypes()
 {
     if (nullptr != pjMemberTypes) return *pjMemberTypes;
@@ -70,6 +81,7 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
     std::string strType = typeWordOf(*pjMember);
     if (!blSameName || strType != column.strType) {
         column.blChecked = false;
+        prototype.order.clear();
         column.szName = sharedName(szName);
         column.decode = typeWord(strType).decode;
         column.strType = std::move(strType);
@@ -81,6 +93,21 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
 int saturatedToInt(const char* szText)
 {
     return static_cast<int>(std::clamp<long>(strtol(szText, nullptr, 10), INT_MIN, INT_MAX));
+}
+
+// Sets the member from the text of its column; false when the type word has no way to do so.
+bool decode(Decode way, const char* szValue, Json::Value& jMember)
+{
+    switch (way) {
+    case Decode::kText: jMember = szValue; return true;
+    // Kept: unsigned words too are read through the signed conversions and saturate there.
+    case Decode::kInt32: jMember = saturatedToInt(szValue); return true;
+    case Decode::kInt64: jMember = Json::Int64(strtoll(szValue, nullptr, 10)); return true;
+    case Decode::kJson: fromString(szValue, jMember); return true;
+    case Decode::kBool: jMember = 1 == strtol(szValue, nullptr, 10); return true;
+    case Decode::kNo: break;
+    }
+    return false;
 }
 
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
@@ -96,18 +123,12 @@ int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_val
     const char* szValue = column_value[idx];
     if (nullptr == szValue) return 0;
 
-    const Json::StaticString name(pColumn->szName);
-    switch (pColumn->decode) {
-    case Decode::kText: jRec[name] = szValue; return 0;
-    // Kept: unsigned words too are read through the signed conversions and saturate there.
-    case Decode::kInt32: jRec[name] = saturatedToInt(szValue); return 0;
-    case Decode::kInt64: jRec[name] = Json::Int64(strtoll(szValue, nullptr, 10)); return 0;
-    case Decode::kJson: fromString(szValue, jRec[name]); return 0;
-    case Decode::kBool: jRec[name] = 1 == strtol(szValue, nullptr, 10); return 0;
-    case Decode::kNo: break;
+    if (Decode::kNo == pColumn->decode) {
+        LOG_ERROR("type error, strType=%s", pColumn->strType.c_str());
+        return -1;
     }
-    LOG_ERROR("type error, strType=%s", pColumn->strType.c_str());
-    return -1;
+    decode(pColumn->decode, szValue, jRec[Json::StaticString(pColumn->szName)]);
+    return 0;
 }
 
 int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, char** column_name)
@@ -128,13 +149,60 @@ int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, cha
     return 0;
 }
 
+// For rows whose columns were all looked up under these names.
+void makePrototype(std::size_t nColumns)
+{
+    Json::Value jRecord(Json::objectValue);
+    std::vector<std::size_t> order;
+    for (std::size_t i = 0; i < nColumns; ++i) {
+        jRecord[Json::StaticString(columns[i].szName)] = Json::nullValue;
+        order.push_back(i);
+    }
+    if (jRecord.size() != nColumns) return;
+    std::sort(order.begin(), order.end(), [](std::size_t i, std::size_t j) {
+        return 0 > strcmp(columns[i].szName, columns[j].szName);
+    });
+    prototype.jRecord.swap(jRecord);
+    prototype.order.swap(order);
+}
+
+// Whether the row has the prototype's columns, each with a value that can be decoded.
+bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name)
+{
+    if (prototype.order.size() != nColumns || nullptr == column_name || nullptr == column_value)
+        return false;
+    for (std::size_t i = 0; i < nColumns; ++i) {
+        const Column& column = columns[i];
+        if (!column.blChecked || Decode::kNo == column.decode || nullptr == column_value[i] ||
+            nullptr == column_name[i] || 0 != strcmp(column.szName, column_name[i]))
+            return false;
+    }
+    return true;
+}
+
+void fillFromPrototype(Json::Value& jRec, char** column_value)
+{
+    jRec = prototype.jRecord;
+    auto it = jRec.begin();
+    for (std::size_t i : prototype.order) {
+        decode(columns[i].decode, column_value[i], *it);
+        ++it;
+    }
+}
+
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
 {
     Json::Value jTmp(Json::objectValue);
     if (FAILED(!pjRecArray)) return -1;
     if (FAILED(pjRecArray->type() != Json::arrayValue && pjRecArray->type() != Json::nullValue))
         return -1;
-    if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
+    const auto nColumns = static_cast<std::size_t>(std::max(0, n_column));
+    if (0 < n_column && fitsPrototype(nColumns, column_value, column_name)) {
+        fillFromPrototype(jTmp, column_value);
+    } else {
+        if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
+        if (1 < ++iRowsByName && prototype.order.empty()) makePrototype(nColumns);
+    }
     pjRecArray->append(std::move(jTmp));
     return 0;
 }
@@ -155,6 +223,7 @@ void beginStatement(const std::string& strTable)
 {
     strCurJsonName = strTable;
     pjMemberTypes = nullptr;
+    iRowsByName = 0;
     for (Column& column : columns) column.blChecked = false;
 }
 
