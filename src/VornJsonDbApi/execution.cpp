@@ -35,8 +35,9 @@ int VornJsonDbApi::runSqlEx(std::string strSql, int (*callback)(void*, int, char
     SqliteText errText;
     const auto fail = [&](int iResult) {
         strSqlError = textOrUnknown(errText);
-        LOG_PLAIN("i=%d,errno=%d, run sql failed, error=%s, sql=%s", i, errno, strSqlError.c_str(),
-                  strSql.c_str());
+        const char* szError = strSqlError.c_str();
+        const char* szSql = strSql.c_str();
+        LOG_PLAIN("i=%d,errno=%d, run sql failed, error=%s, sql=%s", i, errno, szError, szSql);
         if (blDebugOutput) LOG_PLAIN("run sql fail, err=%s", static_cast<const char*>(errText));
         return iResult;
     };
