@@ -95,19 +95,18 @@ int saturatedToInt(const char* szText)
     return static_cast<int>(std::clamp<long>(strtol(szText, nullptr, 10), INT_MIN, INT_MAX));
 }
 
-// Sets the member from the text of its column; false when the type word has no way to do so.
-bool decode(Decode way, const char* szValue, Json::Value& jMember)
+// Sets the member from the text of its column.
+void decode(Decode way, const char* szValue, Json::Value& jMember)
 {
     switch (way) {
-    case Decode::kText: jMember = szValue; return true;
+    case Decode::kText: jMember = szValue; break;
     // Kept: unsigned words too are read through the signed conversions and saturate there.
-    case Decode::kInt32: jMember = saturatedToInt(szValue); return true;
-    case Decode::kInt64: jMember = Json::Int64(strtoll(szValue, nullptr, 10)); return true;
-    case Decode::kJson: fromString(szValue, jMember); return true;
-    case Decode::kBool: jMember = 1 == strtol(szValue, nullptr, 10); return true;
-    case Decode::kNo: break;
+    case Decode::kInt32: jMember = saturatedToInt(szValue); break;
+    case Decode::kInt64: jMember = Json::Int64(strtoll(szValue, nullptr, 10)); break;
+    case Decode::kJson: fromString(szValue, jMember); break;
+    case Decode::kBool: jMember = 1 == strtol(szValue, nullptr, 10); break;
+    case Decode::kNo: break;  // Guard: the caller has refused it
     }
-    return false;
 }
 
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
