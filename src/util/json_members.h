@@ -36,8 +36,8 @@ inline std::string_view memberName(const Json::Value::const_iterator& it)
     return {szName, static_cast<std::size_t>(szEnd - szName)};
 }
 
-// Finds members of a value that are asked for in ascending order of their names (the order in which
-// jsoncpp holds them) in one walk.
+// Finds members of a value that are asked for once each, in ascending order of their names (the order
+// in which jsoncpp holds them), in one walk.
 class MemberWalk {
 public:
     explicit MemberWalk(const Json::Value& jValue)
@@ -52,20 +52,39 @@ public:
     {
         for (; it_ != end_; ++it_) {
             const int iOrder = memberName(it_).compare(strKey);
-            if (0 == iOrder) return &*it_;
             if (0 < iOrder) break;
+            if (0 == iOrder) return next();
         }
         return nullptr;
     }
 
 private:
+    const Json::Value* next()
+    {
+        const Json::Value& jMember = *it_;
+        ++it_;
+        return &jMember;
+    }
+
     Json::Value::const_iterator it_;
     Json::Value::const_iterator end_;
 };
 
-// The type word of a member as the cache of member types holds it, as text.
+// The type word of a member as the cache of member types holds it, empty where there is none. A host
+// may have put something else than a text there: its text is then in strBuffer.
+inline std::string_view typeWordView(const Json::Value& jMember, std::string& strBuffer)
+{
+    const Json::Value* pjWord = MemberWalk(jMember).find("cpptype");
+    if (nullptr == pjWord) return {};
+    const char* szBegin = nullptr;
+    const char* szEnd = nullptr;
+    if (pjWord->getString(&szBegin, &szEnd))
+        return {szBegin, static_cast<std::size_t>(szEnd - szBegin)};
+    return strBuffer = pjWord->asString();
+}
+
 inline std::string typeWordOf(const Json::Value& jMember)
 {
-    const Json::Value* pjWord = findMember(jMember, "cpptype");
-    return nullptr == pjWord ? std::string() : pjWord->asString();
+    std::string strBuffer;
+    return std::string(typeWordView(jMember, strBuffer));
 }
