@@ -32,6 +32,9 @@ namespace {
 
 constexpr unsigned kMaxField = 4096;
 
+// Bytes that most value lists find enough.
+constexpr std::size_t kUsualList = 256;
+
 enum class TypeKind {
     kEnd,
     kSigned,
@@ -202,6 +205,7 @@ bool isPlain(const std::string& strText)
 FormattedText::FormattedText(std::string strText)
     : strText_(std::move(strText)), blPlain_(isPlain(strText_))
 {
+    strText_.reserve(strText_.size() + kUsualList);
 }
 
 void FormattedText::appendValue(const char* szConversion, const FormatArgument& argument)

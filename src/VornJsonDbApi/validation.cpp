@@ -47,7 +47,8 @@ int VornJsonDbApi::checkJsonType(Json::Value& jRecParam)
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     if (FAILED(!jRecParam.isObject())) return -1;
     MemberWalk types(jType);
-    for (auto it = jRecParam.begin(), end = jRecParam.end(); it != end; ++it) {
+    const Json::Value& jRec = jRecParam;
+    for (auto it = jRec.begin(), end = jRec.end(); it != end; ++it) {
         const std::string_view strKey = memberName(it);
         const Json::Value* pjMember = types.find(strKey);
         if (nullptr == pjMember) continue;
