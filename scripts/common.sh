@@ -56,3 +56,9 @@ run_whole_suite() {
     fi
     grep 'tests passed' "$1/tests.log"
 }
+
+# figures FILE...: what test programs printed as lines "figure: NAME = NUMBER", as one table.
+figures() {
+    say "figures"
+    awk -F ' = ' '/^figure: / && !seen[$0]++ { printf "%-60s %15s\n", substr($1, 9), $2 }' "$@"
+}

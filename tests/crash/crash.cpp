@@ -160,7 +160,9 @@ private:
         const Verdict verdict = check(database(), expected_);
         if (!verdict.strWrong.empty()) ++figures_["lost or wrong"];
         if (!verdict.strCorrupt.empty()) ++figures_["corrupt"];
-        std::cout << verdict.strWrong << verdict.strCorrupt;
+        for (const std::string& strFault : {verdict.strWrong, verdict.strCorrupt})
+            if (!strFault.empty())
+                std::cout << "kill " << figures_["kills"] << ": " << strFault << '\n';
         switch (verdict.pending) {
         case Verdict::kNone: ++figures_["killed between operations"]; break;
         case Verdict::kAbsent: ++figures_["killed in an operation, absent"]; break;
@@ -215,7 +217,7 @@ int main(int argc, char** argv)
     for (Run run(folder, figures); blGood && figures["kills"] < iKills;) {
         blGood = run.round(uSeed);
         save(figures, folder / "progress");
-        if (!blGood) std::cout << "\nsee " << run.keepDatabase() << '\n';
+        if (!blGood) std::cout << "see " << run.keepDatabase() << '\n';
     }
     const bool blSound = show(figures);
     if (!blKept && blSound) fs::remove_all(folder);
