@@ -103,8 +103,7 @@ public:
     // Out of the way of a later run.
     std::string keepDatabase()
     {
-        const std::string strKept =
-            folder_ / ("fault-" + std::to_string(figures_["kills"]) + ".db");
+        std::string strKept = folder_ / ("fault-" + std::to_string(figures_["kills"]) + ".db");
         for (const char* szEnd : kFiles)
             if (fs::exists(database() + szEnd)) fs::rename(database() + szEnd, strKept + szEnd);
         return strKept;
@@ -120,7 +119,7 @@ private:
         Victim writer({VORN_CRASH_WRITER, database(), strMode, std::to_string(random()),
                        std::to_string(expected_.iLastRevision)});
         const long long iBefore = expected_.iAcknowledged;
-        const long long iUntil = iBefore + random() % (kMostAcknowledged + 1);
+        const long long iUntil = iBefore + static_cast<int>(random() % (kMostAcknowledged + 1));
         bool blGood = true;
         const bool blWithin = 0 != random() % 4;
         std::string strLine;
@@ -200,7 +199,7 @@ bool show(Figures& figures)
 
 int main(int argc, char** argv)
 {
-    const long long iKills = 1 < argc ? std::atoll(argv[1]) : 0;
+    const long long iKills = 1 < argc ? std::strtoll(argv[1], nullptr, 10) : 0;
     if (1 > iKills) {
         std::cerr << "usage: crash KILLS [FOLDER]\n";
         return 2;

@@ -13,6 +13,7 @@
 Victim::Victim(const std::vector<std::string>& command)
 {
     std::vector<char*> arguments;
+    arguments.reserve(command.size() + 1);
     for (const std::string& strWord : command)
         arguments.push_back(const_cast<char*>(strWord.c_str()));
     arguments.push_back(nullptr);

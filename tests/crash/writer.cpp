@@ -48,7 +48,7 @@ int main(int argc, char** argv)
         for (;;) pause();
 
     std::mt19937 random(static_cast<unsigned>(std::strtoul(argv[3], nullptr, 10)));
-    int iRevision = std::atoi(argv[4]);
+    int iRevision = static_cast<int>(std::strtol(argv[4], nullptr, 10));
     for (;;) {
         const Operation operation = plan(state, random, iRevision);
         report("begin " + toLine(operation));
