@@ -8,11 +8,13 @@
 #include <VornJsonDbApi.h>
 
 #include <algorithm>
+#include <charconv>
 #include <climits>
 #include <cstdlib>
 #include <cstring>
 #include <set>
 #include <string>
+#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -91,9 +93,18 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
     return &column;
 }
 
-int saturatedToInt(const char* szText)
+// What strtoll reads. Blanks before the number, a "+" and what is too large are left to it; all
+// else is read faster.
+long long integerOf(const char* szText)
 {
-    return static_cast<int>(std::clamp<long>(strtol(szText, nullptr, 10), INT_MIN, INT_MAX));
+    long long iValue = 0;
+    const auto read = std::from_chars(szText, szText + strlen(szText), iValue);
+    return std::errc() == read.ec ? iValue : strtoll(szText, nullptr, 10);
+}
+
+int saturatedToInt(long long iValue)
+{
+    return static_cast<int>(std::clamp<long long>(iValue, INT_MIN, INT_MAX));
 }
 
 // Sets the member from the text of its column.
@@ -104,10 +115,10 @@ void decode(Decode way, const char* szValue, Json::Value& jMember)
     switch (way) {
     case Decode::kText: set(szValue); break;
     // Kept: unsigned words too are read through the signed conversions and saturate there.
-    case Decode::kInt32: set(saturatedToInt(szValue)); break;
-    case Decode::kInt64: set(Json::Int64(strtoll(szValue, nullptr, 10))); break;
+    case Decode::kInt32: set(saturatedToInt(integerOf(szValue))); break;
+    case Decode::kInt64: set(Json::Int64(integerOf(szValue))); break;
     case Decode::kJson: fromString(szValue, jMember); break;
-    case Decode::kBool: set(1 == strtol(szValue, nullptr, 10)); break;
+    case Decode::kBool: set(1 == integerOf(szValue)); break;
     case Decode::kNo: break;  // Guard: the caller has refused it
     }
 }
