@@ -122,11 +122,11 @@ void limitRows(Json::Value& jRequest)
 }
 
 // Who changes a record says which one: {"id": 5}.
-void checkOneRecord(const Json::Value& jRequest)
+void checkOneRecord(const Json::Value& jTypes, const Json::Value& jRequest)
 {
-    refuseIf(!jRequest.isObject() || Json::Value::Members{"id"} != jRequest.getMemberNames(),
+    checkRequest(jTypes, jRequest);
+    refuseIf(Json::Value::Members{"id"} != jRequest.getMemberNames() || jRequest["id"].isArray(),
              "the request names one record by its id");
-    checkKind("int", jRequest["id"]);
 }
 
 }  // namespace
@@ -174,11 +174,11 @@ void checkCommand(const Json::Value& jTypes, Json::Value& jCommand)
         limitRows(jCommand["request"]);
     } else if ("get" == strOperation || "delete" == strOperation) {
         refuseIf(Keys{"op", "request"} != keys, "the command holds a request");
-        checkOneRecord(jCommand["request"]);
+        checkOneRecord(jTypes, jCommand["request"]);
     } else {
         refuseIf("update" != strOperation, "there is no such operation");
         refuseIf(Keys{"op", "request", "values"} != keys, "the command holds a request and values");
-        checkOneRecord(jCommand["request"]);
+        checkOneRecord(jTypes, jCommand["request"]);
         checkRecord(jTypes, jCommand["values"]);
     }
 }

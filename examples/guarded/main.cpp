@@ -2,7 +2,7 @@
 /// A host that takes records and requests from strangers: one command a line on standard input, one
 /// answer a line on standard output. SECURITY.md says what is checked where.
 ///
-///     guarded DATABASE < commands
+///     guarded DATABASE < commands.txt
 ///
 /// host.h shows the commands, guard.cpp what is refused before the library is called, and fence.cpp
 /// what SQLite refuses while it runs.

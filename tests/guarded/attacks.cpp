@@ -200,6 +200,7 @@ std::vector<Attack> percents()
 std::vector<Attack> shapes()
 {
     return {
+        {"request_selects_many", {remove(R"({"done":false})")}, everyNoteIsDeleted, kStops},
         {"list_of_two", {remove(R"({"id":[1,2]})")}, noteTwelveIsDeleted, kLetsThrough},
         {"undeclared_member_deletes",
          {remove(R"({"done":false,"ID":1})")},

@@ -93,6 +93,8 @@ TEST_F(Guard, RefusesWithAReason)
         {R"({"op":"list","request":{"offset":2147483648}})", strPage},
         {R"({"op":"list","request":{"limit":101}})", "\"limit\" is too large"},
         {R"({"op":"get","request":{"id":"1"}})", strKind},
+        {R"({"op":"get","request":{"id":[1]}})", strOne},
+        {R"({"op":"get","request":{"id":1,"limit":1}})", strOne},
         {R"({"op":"get","request":{"text":"x"}})", strOne},
         {R"({"op":"delete","request":{}})", strOne},
         {R"({"op":"delete","request":{"id":1,"text":"x"}})", strOne},

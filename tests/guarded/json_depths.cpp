@@ -17,7 +17,7 @@
 namespace {
 
 constexpr std::size_t kStack = 8 * 1024 * 1024;
-constexpr int kMostDepth = 1 << 18;
+constexpr int kMostDepth = 1 << 17;
 
 struct Trial {
     void (*run)(int iDepth, bool blObject);
