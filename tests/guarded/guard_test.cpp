@@ -53,6 +53,8 @@ TEST_F(Guard, RefusesWithAReason)
         {R"({"op":"list","request":{}} {})", "the command is no JSON object"},
         {R"({"op":"list","request":{},"request":{}})", "the command is no JSON object"},
         {R"({"op":7,"request":{}})", "there is no such operation"},
+        {R"({"op":{},"request":{}})", "there is no such operation"},
+        {R"({"op":"get","request":{"id":1},"values":{}})", "the command holds a request"},
         {R"({"op":"drop","request":{}})", "there is no such operation"},
         {R"({"op":"list"})", "the command holds a request"},
         {R"({"op":"list","request":{},"record":{}})", "the command holds a request"},
