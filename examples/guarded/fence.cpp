@@ -59,7 +59,6 @@ int Fence::run(Access access, const std::function<int()>& work)
     if (!transaction(Access::kRead == access ? "begin" : "begin immediate")) return -1;
     const int iChanges = sqlite3_total_changes(pDb_);
     int iResult = -1;
-    iTicks_ = 0;
     access_ = access;
     try {
         iResult = work();
