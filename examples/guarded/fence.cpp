@@ -1,0 +1,122 @@
+#include "fence.h"
+
+#include <utility>
+
+namespace {
+
+constexpr int kMaxBytes = 512 * 1024;  // a command of guard::kMaxLine, escaped twice
+constexpr int kStepsPerTick = 1000;
+constexpr int kMaxTicks = 100;
+
+struct Limit {
+    int iId;
+    int iMost;
+};
+
+constexpr Limit kLimits[] = {
+    {SQLITE_LIMIT_LENGTH, kMaxBytes},        {SQLITE_LIMIT_SQL_LENGTH, kMaxBytes},
+    {SQLITE_LIMIT_COMPOUND_SELECT, 1},       {SQLITE_LIMIT_EXPR_DEPTH, 20},
+    {SQLITE_LIMIT_LIKE_PATTERN_LENGTH, 100}, {SQLITE_LIMIT_ATTACHED, 0},
+};
+
+void setLimits(sqlite3* pDb)
+{
+    for (const Limit& limit : kLimits) sqlite3_limit(pDb, limit.iId, limit.iMost);
+}
+
+void setDefenses(sqlite3* pDb)
+{
+    sqlite3_db_config(pDb, SQLITE_DBCONFIG_DEFENSIVE, 1, nullptr);
+    sqlite3_db_config(pDb, SQLITE_DBCONFIG_TRUSTED_SCHEMA, 0, nullptr);
+    // A text in double quotes is no text: what the library writes after LIMIT is.
+    sqlite3_db_config(pDb, SQLITE_DBCONFIG_DQS_DML, 0, nullptr);
+}
+
+std::string textOf(const char* szText)
+{
+    return nullptr == szText ? std::string() : szText;
+}
+
+}  // namespace
+
+Fence::Fence(sqlite3* pDb, std::string strTable) : pDb_(pDb), strTable_(std::move(strTable))
+{
+    setLimits(pDb_);
+    setDefenses(pDb_);
+    sqlite3_set_authorizer(pDb_, authorize, this);
+    sqlite3_progress_handler(pDb_, kStepsPerTick, countSteps, this);
+}
+
+Fence::~Fence()
+{
+    sqlite3_progress_handler(pDb_, 0, nullptr, nullptr);
+    sqlite3_set_authorizer(pDb_, nullptr, nullptr);
+}
+
+int Fence::run(Access access, const std::function<int()>& work)
+{
+    // The lock of a writer is taken here, where a locked database is an answer and not a wait.
+    if (!transaction(Access::kRead == access ? "begin" : "begin immediate")) return -1;
+    const int iChanges = sqlite3_total_changes(pDb_);
+    int iResult = -1;
+    access_ = access;
+    try {
+        iResult = work();
+    } catch (...) {
+        rollBack();
+        throw;
+    }
+    const bool blMany = 1 < sqlite3_total_changes(pDb_) - iChanges;
+    if (0 <= iResult && !blMany && transaction("commit")) return iResult;
+    rollBack();
+    return -1;
+}
+
+// Stops what takes too many steps, whatever their reason.
+int Fence::countSteps(void* pFence)
+{
+    return kMaxTicks < ++static_cast<Fence*>(pFence)->iTicks_;
+}
+
+int Fence::authorize(void* pFence, int iAction, const char* szFirst, const char* szSecond,
+                     const char* szDatabase, const char* szTrigger)
+{
+    const bool blPlain =
+        nullptr == szTrigger && (nullptr == szDatabase || std::string("main") == szDatabase);
+    const Fence& fence = *static_cast<Fence*>(pFence);
+    return blPlain && fence.allows(iAction, textOf(szFirst), textOf(szSecond)) ? SQLITE_OK
+                                                                               : SQLITE_DENY;
+}
+
+bool Fence::allows(int iAction, const std::string& strFirst, const std::string& strSecond) const
+{
+    if (Access::kNothing == access_) return false;
+    if (Access::kTransaction == access_) return SQLITE_TRANSACTION == iAction;
+    switch (iAction) {
+    case SQLITE_SELECT: return Access::kRead == access_ || Access::kInsert == access_;
+    case SQLITE_READ: return strTable_ == strFirst;
+    case SQLITE_INSERT: return Access::kInsert == access_ && strTable_ == strFirst;
+    case SQLITE_UPDATE: return Access::kUpdate == access_ && strTable_ == strFirst;
+    case SQLITE_DELETE: return Access::kDelete == access_ && strTable_ == strFirst;
+    // The library reads the row back that it inserted.
+    case SQLITE_FUNCTION: return Access::kInsert == access_ && "last_insert_rowid" == strSecond;
+    default: return false;
+    }
+}
+
+// Does one statement of the fence's own.
+bool Fence::transaction(const char* szSql)
+{
+    iTicks_ = 0;
+    access_ = Access::kTransaction;
+    const int iStatus = sqlite3_exec(pDb_, szSql, nullptr, nullptr, nullptr);
+    access_ = Access::kNothing;
+    return SQLITE_OK == iStatus;
+}
+
+void Fence::rollBack()
+{
+    // SQLite may have rolled back itself.
+    if (0 == sqlite3_get_autocommit(pDb_)) transaction("rollback");
+    access_ = Access::kNothing;
+}

@@ -1,0 +1,42 @@
+/// @file
+/// What SQLite itself can refuse while a command of a stranger runs, should a check before it fail.
+#ifndef EXAMPLES_GUARDED_FENCE_H
+#define EXAMPLES_GUARDED_FENCE_H
+
+#include <sqlite3.h>
+
+#include <functional>
+#include <string>
+
+// What the statements of a call may do with the table.
+enum class Access { kNothing, kTransaction, kRead, kInsert, kUpdate, kDelete };
+
+// Between calls nothing can be done with the connection at all.
+class Fence {
+public:
+    // The connection is the host's and has to outlive the fence.
+    Fence(sqlite3* pDb, std::string strTable);
+    ~Fence();
+    Fence(const Fence&) = delete;
+    Fence& operator=(const Fence&) = delete;
+
+    // Does the work in a transaction of its own, with no more than that access. The work counts
+    // only when its result is not negative and it changed at most one row; otherwise, also when it
+    // throws, everything is as before. Returns the result of the work, or -1.
+    int run(Access access, const std::function<int()>& work);
+
+private:
+    static int authorize(void* pFence, int iAction, const char* szFirst, const char* szSecond,
+                         const char* szDatabase, const char* szTrigger);
+    static int countSteps(void* pFence);
+    bool allows(int iAction, const std::string& strFirst, const std::string& strSecond) const;
+    bool transaction(const char* szSql);
+    void rollBack();
+
+    sqlite3* pDb_;
+    std::string strTable_;
+    Access access_ = Access::kNothing;
+    int iTicks_ = 0;
+};
+
+#endif

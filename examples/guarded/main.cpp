@@ -1,0 +1,47 @@
+/// @file
+/// A host that takes records and requests from strangers: one command a line on standard input, one
+/// answer a line on standard output. SECURITY.md says what is checked where.
+///
+///     guarded DATABASE < commands.txt
+///
+/// host.h shows the commands, guard.cpp what is refused before the library is called, and fence.cpp
+/// what SQLite refuses while it runs.
+#include "guard.h"
+#include "host.h"
+
+#include <json/writer.h>
+
+#include <iostream>
+
+// The log goes to syslog: standard output is for the answers.
+bool blLogToStdout = false;
+bool blDebugOutput = false;
+
+namespace {
+
+// In ASCII, so that an answer is one line whatever is in it.
+std::string toLine(const Json::Value& jValue)
+{
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "";
+    return Json::writeString(builder, jValue) + "\n";
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    sqlite3* pDb = nullptr;
+    if (2 != argc || SQLITE_OK != sqlite3_open(argv[1], &pDb)) {
+        std::cerr << "usage: guarded DATABASE < commands\n";
+        sqlite3_close(pDb);
+        return 2;
+    }
+    {
+        Host host(pDb);
+        std::string strLine;
+        while (guard::readLine(std::cin, strLine))
+            std::cout << toLine(host.answer(strLine)) << std::flush;
+    }
+    return SQLITE_OK == sqlite3_close(pDb) ? 0 : 1;
+}

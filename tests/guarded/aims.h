@@ -1,0 +1,31 @@
+// What an attack may have reached. Each looks at a world that was stopped.
+#pragma once
+
+#include "world.h"
+
+namespace aims {
+
+bool vaultIsEmpty(World& world);
+bool vaultIsGone(World& world);
+bool secretIsTold(World& world);
+bool answersTheQuestion(World& world);
+bool connectionIsReadOnly(World& world);
+bool transactionIsOpen(World& world);
+bool noteIsForged(World& world);
+bool everyNoteIsDeleted(World& world);
+bool noteTwoIsDeleted(World& world);
+bool noteTwelveIsDeleted(World& world);
+bool everyNoteIsTold(World& world);
+bool thousandsAreTold(World& world);
+bool annIsImitated(World& world);
+bool annIsTold(World& world);
+bool authorIsAnother(World& world);
+bool hostIsThrownAt(World& world);
+bool idIsAnother(World& world);
+// The call succeeded, and the member is null.
+bool topicsAreLost(World& world);
+bool noteIsHuge(World& world);
+bool logLineIsForged(World& world);
+bool sqliteIsBusy(World& world);
+
+}  // namespace aims
