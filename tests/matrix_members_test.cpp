@@ -117,7 +117,8 @@ Json::Value holding(const char* szTemplate, const Json::Value& jValue)
 using Call = int (*)(Scene& s, const Json::Value& jValue);
 
 constexpr char kAlone[] = R"({"m":$})";
-constexpr char kRecordOf[] = R"({"m":$,"z":"z"})";
+// Other members are written before and behind it.
+constexpr char kRecordOf[] = R"({"a":"a","m":$,"z":"z"})";
 
 int save(Scene& s, const Json::Value& jValue)
 {
@@ -242,9 +243,10 @@ protected:
     {
         auto& pTable = tables_[strWord];
         if (nullptr == pTable)
-            pTable = std::make_unique<Table>(
-                database_, R"({"m":{"cpptype":")" + strWord + R"("},"z":{"cpptype":"string"}})",
-                "m, z");
+            pTable = std::make_unique<Table>(database_,
+                                             R"({"a":{"cpptype":"string"},"m":{"cpptype":")" +
+                                                 strWord + R"("},"z":{"cpptype":"string"}})",
+                                             "a, m, z");
         return *pTable;
     }
 
@@ -254,7 +256,7 @@ protected:
         SCOPED_TRACE(strCall + ", " + strWord + ", " + szKind);
         Table& table = tableOf(strWord);
         database_.run("delete from " + table.strName);
-        database_.run("insert into " + table.strName + " values (null, 'z')");
+        database_.run("insert into " + table.strName + " (z) values ('z')");
         Scene scene{table.api, VORN_JSON_DB::recType(table.jDefinition, table.strName), {}};
         const Json::Value jValue = json(szKind);
 

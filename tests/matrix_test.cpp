@@ -52,6 +52,12 @@ Json::Value& sound()
     return jRecord = json(kRecord);
 }
 
+Json::Value& noMatch()
+{
+    static Json::Value jRequest;
+    return jRequest = json(R"({"m":6})");
+}
+
 const Call kCalls[] = {
     {"checkJsonType", Way::kInput, [](Scene& s, Json::Value& j) { return s.api.checkJsonType(j); }},
     {"fillDefaultValue, fill", Way::kOutput,
@@ -74,6 +80,10 @@ const Call kCalls[] = {
      [](Scene& s, Json::Value& j) { return s.api.recGetOne(j, s.out.jObject); }},
     {"recGetOne, out", Way::kOutput,
      [](Scene& s, Json::Value& j) { return s.api.recGetOne(sound(), j); }},
+    {"recList, out, no match", Way::kOutput,
+     [](Scene& s, Json::Value& j) { return s.api.recList(noMatch(), j); }},
+    {"recGetOne, out, no match", Way::kInput,
+     [](Scene& s, Json::Value& j) { return s.api.recGetOne(noMatch(), j); }},
     {"recUpdateByWhere", Way::kInput, updateWhere},
     {"recUpdateByFilter, filter", Way::kInput,
      [](Scene& s, Json::Value& j) { return s.api.recUpdateByFilter(j, sound()); }},
@@ -124,7 +134,9 @@ const Row kRows[] = {
                                     "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    0"},
     {"recCreate, out",              "$",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
     {"recList, request",            "$",                    "  0   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
-    {"recList, out",                "$",                    "  0   -1   -1   -1   -1   -1   -1    0    0   -1   -1   -1"},
+    {"recGetOne, out, no match",    "$",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {"recList, out|recList, out, no match",
+                                    "$",                    "  0   -1   -1   -1   -1   -1   -1    0    0   -1   -1   -1"},
     {"recGetOne, request|recGetOne, out",
                                     "$",                    "  1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    1"},
     {"recDelete",                   "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    1"},
