@@ -183,6 +183,7 @@ TEST_F(HostileSql, TextToRun)
 // In a process of its own, because the member types of the names would stay.
 TEST_F(HostileSql, NameOfATable)
 {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
     const auto useName = [&](const std::string& strHostile) {
         std::string strName = strHostile;
         Json::Value jDefinition;
@@ -208,7 +209,7 @@ TEST_F(HostileSql, NameOfATable)
     EXPECT_EXIT(
         {
             forEachString(useName);
-            exit(HasFailure() ? 1 : 0);
+            endProcess(database_);
         },
         testing::ExitedWithCode(0), "");
     printFigure("hostile strings in roles, names of tables", hostileStrings().size());

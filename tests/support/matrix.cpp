@@ -1,5 +1,7 @@
 #include "support/matrix.h"
 
+#include <cstdlib>
+#include <filesystem>
 #include <sstream>
 
 std::vector<std::string> split(const std::string& strText, char cSeparator)
@@ -31,4 +33,10 @@ void expectSound(Database& database, VornJsonDbApi& api, const std::string& strR
     EXPECT_EQ(0, api.recSave(jRecord, true));
     EXPECT_EQ(json(strRecord), jRecord);
     EXPECT_EQ(Lines(), takeLog());
+}
+
+void endProcess(const Database& database)
+{
+    if (!database.path().empty()) std::filesystem::remove(database.path());
+    exit(testing::Test::HasFailure() ? 1 : 0);
 }

@@ -48,6 +48,10 @@ struct Outputs {
 // handle; strRecord is one that its table takes, as JSON.
 void expectSound(Database& database, VornJsonDbApi& api, const std::string& strRecord);
 
+// Ends the process of a death test, with 0 unless a check has failed. Its fixture is never
+// destroyed, so the file of the database goes here.
+[[noreturn]] void endProcess(const Database& database);
+
 // A line for the table of figures.
 inline void printFigure(const std::string& strName, std::size_t nNumber)
 {
