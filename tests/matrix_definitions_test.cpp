@@ -107,6 +107,7 @@ protected:
     std::string strName_;
     std::string strCreate_;
     std::size_t nCells_ = 0;
+    UnwatchedLog unwatched_;
 };
 
 TEST_F(DefinitionMatrix, OfEveryPlace)

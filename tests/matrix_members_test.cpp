@@ -268,6 +268,7 @@ protected:
     }
 
     std::map<std::string, std::unique_ptr<Table>> tables_;
+    UnwatchedLog unwatched_;
 };
 
 TEST_F(MemberMatrix, OfTypeWords)

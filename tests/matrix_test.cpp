@@ -225,6 +225,7 @@ protected:
 
     Table table_{database_, R"({"m":{"cpptype":"int"},"z":{"cpptype":"string"}})", "m, z"};
     std::size_t nCells_ = 0;
+    UnwatchedLog unwatched_;
 };
 
 TEST_F(Matrix, OfJsonArguments)

@@ -79,4 +79,5 @@ private:
     }
 
     inline static std::size_t nCases_ = 0;
+    UnwatchedLog unwatched_;
 };
