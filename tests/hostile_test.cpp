@@ -3,6 +3,7 @@
 #include "support/database.h"
 #include "support/hostile_strings.h"
 
+#include <iostream>
 #include <set>
 
 namespace {
@@ -122,7 +123,9 @@ protected:
 TEST_F(HostileRecords, AreEnough)
 {
     const std::vector<std::string> strings = hostileStrings();
-    EXPECT_LE(150U, std::set<std::string>(strings.begin(), strings.end()).size());
+    const std::size_t nStrings = std::set<std::string>(strings.begin(), strings.end()).size();
+    EXPECT_LE(400U, nStrings);
+    std::cout << "figure: hostile strings = " << nStrings << std::endl;
 }
 
 TEST_F(HostileRecords, InObjectsAndArrays)

@@ -1,6 +1,7 @@
 // The time helpers. No test looks at the clock or the time zone of the machine.
 
 #include "support/database.h"
+#include "support/time_zone.h"
 
 #include <cerrno>
 #include <climits>
@@ -16,35 +17,6 @@ using VORN_JSON_DB::getTimeAfterNow;
 constexpr int kGmt = 3;
 constexpr int kLocal = 4;
 constexpr int kUtc = 5;
-
-// A time zone for as long as the object lives.
-class TimeZone {
-public:
-    explicit TimeZone(const char* szZone)
-    {
-        const char* szBefore = getenv("TZ");
-        blSet_ = nullptr != szBefore;
-        if (blSet_) strBefore_ = szBefore;
-        setenv("TZ", szZone, 1);
-        tzset();
-    }
-
-    ~TimeZone()
-    {
-        if (blSet_)
-            setenv("TZ", strBefore_.c_str(), 1);
-        else
-            unsetenv("TZ");
-        tzset();
-    }
-
-    TimeZone(const TimeZone&) = delete;
-    TimeZone& operator=(const TimeZone&) = delete;
-
-private:
-    bool blSet_ = false;
-    std::string strBefore_;
-};
 
 class TimeText : public HostTest {
 protected:

@@ -1,6 +1,9 @@
 #include "support/hostile_strings.h"
 
+#include "support/hostile_more.h"
+
 #include <iterator>
+#include <utility>
 
 namespace {
 
@@ -124,7 +127,6 @@ const char* const kUnicode[] = {
     "\xef\xbb\xbf",
     "\xe2\x81\xa0",  // no width
     "\xc2\xa0",
-    "\xc2\x85",
     "\xe2\x80\xa8",
     "\xe2\x80\xa9",
     "\xef\xbf\xbd",
@@ -269,5 +271,6 @@ std::vector<std::string> hostileStrings()
     strings.emplace_back(100000, '\'');
     strings.emplace_back(100000, 'x');
     strings.emplace_back(2000, '%');
+    for (std::string& strMore : moreHostileStrings()) strings.push_back(std::move(strMore));
     return strings;
 }

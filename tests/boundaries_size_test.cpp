@@ -1,0 +1,293 @@
+// How wide, long and deep records may be.
+
+#include "support/matrix.h"
+
+#include <pthread.h>
+#include <functional>
+
+namespace {
+
+class Sizes : public TableTest {};
+
+// A definition of that many members, "c0000" and so on.
+struct Wide {
+    explicit Wide(int nColumns)
+    {
+        for (int i = 0; i < nColumns; ++i) {
+            char szName[16];
+            snprintf(szName, sizeof(szName), "c%04d", i);
+            jMembers[szName]["cpptype"] = 0 == i % 2 ? "int" : "string";
+            strColumns += std::string(0 == i ? "" : ",") + szName;
+            if (0 == i % 2)
+                jRecord[szName] = i;
+            else
+                jRecord[szName] = "it's " + std::to_string(i);
+        }
+    }
+
+    // The first of its members.
+    Json::Value part(std::size_t nMembers) const
+    {
+        Json::Value jPart;
+        for (const std::string& strName : jRecord.getMemberNames())
+            if (jPart.size() < nMembers) jPart[strName] = jRecord[strName];
+        return jPart;
+    }
+
+    Json::Value jMembers;
+    std::string strColumns;
+    Json::Value jRecord;
+};
+
+// SQLite's default limit.
+constexpr int kMaxColumns = 2000;
+
+TEST_F(Sizes, AsManyColumnsAsSqliteTakes)
+{
+    const Wide wide(kMaxColumns);
+    Table table(database_, text(wide.jMembers), wide.strColumns);
+    Json::Value jRecord = wide.jRecord;
+    Json::Value jStored;
+    EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
+    EXPECT_EQ(wide.jRecord, jStored);
+    Json::Value jRequest;
+    Json::Value jFetched;
+    EXPECT_EQ(1, table.api.recGetOne(jRequest, jFetched));
+    EXPECT_EQ(wide.jRecord, jFetched);
+    EXPECT_EQ(0, table.api.recSave(jRecord, true));
+    std::string strWhere = "1";
+    EXPECT_EQ(0, table.api.recUpdateByWhere(jRecord, strWhere));
+    Json::Value jRecords;
+    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
+    ASSERT_EQ(2U, jRecords.size());
+    for (const Json::Value& jListed : jRecords) EXPECT_EQ(wide.jRecord, jListed);
+    EXPECT_EQ(Lines(), takeLog());
+}
+
+// SQLite's limit for the depth of an expression is 1,000.
+TEST_F(Sizes, MoreConditionsThanSqliteTakes)
+{
+    const Wide wide(kMaxColumns);
+    Table table(database_, text(wide.jMembers), wide.strColumns);
+    table.create(text(wide.jRecord));
+    Json::Value jRecords;
+    Json::Value jRequest = wide.part(900);
+    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(1U, jRecords.size());
+    jRequest = wide.jRecord;
+    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(-1, table.api.recDelete(jRequest));
+    takeLog();
+    EXPECT_EQ("1", database_.value("select count(*) from " + table.strName));
+    expectSound(database_, table.api, text(wide.jRecord));
+}
+
+TEST_F(Sizes, OneColumnMore)
+{
+    const Wide wide(kMaxColumns + 1);
+    std::string strName = freshName();
+    Json::Value jDefinition;
+    jDefinition[strName]["member"] = wide.jMembers;
+    std::string strCreate = "create table " + strName + " (" + wide.strColumns + ")";
+    VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
+    EXPECT_EQ(plain("sql error, err=too many columns on " + strName + ", sql=" + strCreate),
+              takeLog().at(2));
+    Json::Value jRecord = wide.jRecord;
+    Json::Value jStored;
+    EXPECT_EQ(-1, api.recCreate(jRecord, jStored));
+    EXPECT_EQ(wide.jRecord, jRecord);
+    EXPECT_TRUE(jStored.isNull());
+    Json::Value jRequest;
+    EXPECT_EQ(-1, api.recList(jRequest, jStored));
+    EXPECT_LE(3U, takeLog().size());
+    Table sound(database_, R"({"z":{"cpptype":"string"}})", "z");
+    expectSound(database_, sound.api, R"({"z":"sound"})");
+}
+
+// A mebibyte that has to be escaped in many places.
+std::string longText()
+{
+    std::string strText;
+    while (strText.size() < (1U << 20)) strText += "O'Brien \"\\\n\xc5\xbe\xf0\x9f\x90\x8e; -- ";
+    strText.resize(1U << 20, 'x');
+    return strText;
+}
+
+TEST_F(Sizes, ATextOfAMebibyte)
+{
+    Table table(
+        database_,
+        R"({"n":{"cpptype":"int"},"o":{"cpptype":"Json::objectValue"},"s":{"cpptype":"string"}})",
+        "n, o, s");
+    Json::Value jRecord;
+    jRecord["n"] = 1;
+    jRecord["o"]["k"] = longText();
+    jRecord["s"] = longText();
+    Json::Value jStored;
+    EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
+    EXPECT_EQ(jRecord, jStored);
+    table.create(R"({"n":2,"o":{},"s":"other"})");
+
+    Json::Value jByText;
+    jByText["s"] = longText();
+    Json::Value jByItem;
+    jByItem["s"].append(longText());
+    Json::Value jByJson;
+    jByJson["o"] = jRecord["o"];
+    Json::Value jByFilter;
+    char* szFilter = sqlite3_mprintf("s = %Q", longText().c_str());
+    jByFilter["vornSqlWhereFilter"] = szFilter;
+    sqlite3_free(szFilter);
+    for (Json::Value* pjRequest : {&jByText, &jByItem, &jByJson, &jByFilter}) {
+        Json::Value jFound;
+        EXPECT_EQ(0, table.api.recList(*pjRequest, jFound));
+        ASSERT_EQ(1U, jFound.size());
+        EXPECT_EQ(jRecord, jFound[0]);
+        EXPECT_EQ(0, table.api.recUpdateByFilter(*pjRequest, jByText));
+    }
+    Json::Value jSorted;
+    jSorted["sort_by"] = longText();
+    EXPECT_EQ(0, table.api.recList(jSorted, jStored = Json::Value()));
+    EXPECT_EQ(2U, jStored.size());
+    std::string strValue = longText();
+    EXPECT_EQ(1, table.api.recDeleteByName(strValue, "s"));
+    EXPECT_EQ(Lines(), takeLog());
+    table.api.setErrMsg(longText());
+    EXPECT_EQ(longText(), table.api.getErrMsg());
+}
+
+TEST_F(Sizes, ALogLineOfAMebibyte)
+{
+    Table table(database_, R"({"s":{"cpptype":"int"}})", "s");
+    Json::Value jRecord;
+    jRecord["s"] = longText();
+    Json::Value jStored;
+    EXPECT_EQ(-1, table.api.recCreate(jRecord, jStored));
+    EXPECT_EQ((Lines{error("type failed, strKey=s, jRecParam=" + text(jRecord)),
+                     failed("0 > checkJsonType(jParam)"),
+                     plain("call create rec, rec=" + text(jRecord))}),
+              takeLog());
+}
+
+// jsoncpp goes down one call a level, and so does this test; the frames of a sanitizer are larger.
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+constexpr std::size_t kStack = 64U << 20;
+#else
+constexpr std::size_t kStack = 8U << 20;
+#endif
+
+// Runs it on a stack of that size.
+void onKnownStack(std::function<void()> work)
+{
+    pthread_attr_t attributes;
+    ASSERT_EQ(0, pthread_attr_init(&attributes));
+    ASSERT_EQ(0, pthread_attr_setstacksize(&attributes, kStack));
+    const auto run = [](void* pWork) -> void* {
+        (*static_cast<std::function<void()>*>(pWork))();
+        return nullptr;
+    };
+    pthread_t thread;
+    ASSERT_EQ(0, pthread_create(&thread, &attributes, run, &work));
+    EXPECT_EQ(0, pthread_join(thread, nullptr));
+    pthread_attr_destroy(&attributes);
+}
+
+std::string repeated(const char* szText, std::size_t nTimes)
+{
+    std::string strOut;
+    for (std::size_t i = 0; i < nTimes; ++i) strOut += szText;
+    return strOut;
+}
+
+// [[[]]] and {"k":{"k":{}}}, as text and as value.
+std::string arrays(std::size_t nLevels)
+{
+    return repeated("[", nLevels) + repeated("]", nLevels);
+}
+
+std::string objects(std::size_t nLevels)
+{
+    return repeated("{\"k\":", nLevels - 1) + "{}" + repeated("}", nLevels - 1);
+}
+
+Json::Value nested(Json::ValueType type, std::size_t nLevels)
+{
+    Json::Value jValue(type);
+    for (std::size_t i = 1; i < nLevels; ++i) {
+        Json::Value jOuter(type);
+        (Json::arrayValue == type ? jOuter[0] : jOuter["k"]).swap(jValue);
+        jValue.swap(jOuter);
+    }
+    return jValue;
+}
+
+void storeAndAsk(Database& database, Table& table, std::size_t nLevels)
+{
+    SCOPED_TRACE(nLevels);
+    database.run("delete from " + table.strName);
+    const Json::Value jArrays = nested(Json::arrayValue, nLevels);
+    Json::Value jRecord;
+    jRecord["a"] = jArrays;
+    jRecord["o"] = nested(Json::objectValue, nLevels);
+    Json::Value jStored;
+    EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
+    EXPECT_EQ((Rows{{arrays(nLevels), objects(nLevels)}}),
+              database.rows("select a, o from " + table.strName));
+    const bool blRead = 1000 >= nLevels;
+    EXPECT_EQ(blRead ? jRecord : json(R"({"a":null,"o":null})"), jStored);
+
+    // Found by the whole text, however deep.
+    Json::Value jRequest;
+    jRequest["a"].append(jArrays);
+    jRequest["o"] = jRecord["o"];
+    Json::Value jRecords;
+    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
+    ASSERT_EQ(1U, jRecords.size());
+    EXPECT_EQ(jStored, jRecords[0]);
+    EXPECT_EQ(1, table.api.recDelete(jRequest));
+    EXPECT_EQ(Lines(), takeLog());
+
+    // A refused record goes into the log as deep as it is.
+    Json::Value jBad;
+    jBad["o"] = jArrays;
+    EXPECT_EQ(-1, table.api.recCreate(jBad, jStored));
+    EXPECT_EQ(plain("call create rec, rec={\"o\":" + arrays(nLevels) + "}"), takeLog().back());
+    Json::Value jCopy;
+    EXPECT_EQ(0, VORN_JSON_DB::jsonCopyMember(jCopy, jRecord, true));
+    EXPECT_EQ(jRecord, jCopy);
+}
+
+TEST_F(Sizes, RecordsOfManyLevels)
+{
+    Table table(database_,
+                R"({"a":{"cpptype":"Json::arrayValue"},"o":{"cpptype":"Json::objectValue"}})",
+                "a, o");
+    onKnownStack([&] {
+        for (std::size_t nLevels : {1U, 999U, 1000U, 1001U, 10000U})
+            storeAndAsk(database_, table, nLevels);
+    });
+    expectSound(database_, table.api, R"({"a":[],"o":{}})");
+}
+
+// Texts that another program stored.
+TEST_F(Sizes, RowsOfManyLevels)
+{
+    Table table(database_, R"({"a":{"cpptype":"Json::Value"},"o":{"cpptype":"Json::objectValue"}})",
+                "a, o");
+    onKnownStack([&] {
+        for (std::size_t nLevels : {999U, 1000U, 1001U, 10000U}) {
+            SCOPED_TRACE(nLevels);
+            database_.run("delete from " + table.strName + "; insert into " + table.strName +
+                          " values ('" + arrays(nLevels) + "', '" + objects(nLevels) + "')");
+            Json::Value jRequest;
+            Json::Value jRecord;
+            EXPECT_EQ(1, table.api.recGetOne(jRequest, jRecord));
+            ASSERT_EQ(2U, jRecord.size());
+            EXPECT_EQ(1000U < nLevels ? "null" : arrays(nLevels), text(jRecord["a"]));
+            EXPECT_EQ(1000U < nLevels ? "null" : objects(nLevels), text(jRecord["o"]));
+            EXPECT_EQ(Lines(), takeLog());
+        }
+    });
+}
+
+}  // namespace
