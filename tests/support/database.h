@@ -30,6 +30,8 @@ public:
     enum class Place { kDefault, kFile };
 
     explicit Database(Place place = Place::kDefault);
+    // In that file, which stays, through that VFS (null for the default one).
+    Database(const std::string& strFile, const char* szVfs);
     // Fails the test when a statement is still open.
     ~Database();
     Database(const Database&) = delete;
