@@ -53,6 +53,14 @@ int listSome(Host& host, Json::Value& jOutput)
     return host.table.api.recList(jRequest, jOutput);
 }
 
+// The filter is SQL as it stands, so it can end the statement and begin another.
+int listTwice(Host& host, Json::Value& jOutput)
+{
+    Json::Value jRequest;
+    jRequest["vornSqlWhereFilter"] = "1); SELECT id,name,note,tags FROM records WHERE (1";
+    return host.table.api.recList(jRequest, jOutput);
+}
+
 int getOne(Host& host, Json::Value& jOutput)
 {
     Json::Value jRequest = json(R"({"name":"name7"})");
@@ -110,6 +118,7 @@ const std::vector<Operation>& operations()
         {"recSaveReplace", true, kOldRecord, replace, 0},
         {"recList", true, "[]", list, 0},
         {"recListSome", true, "[]", listSome, 0},
+        {"recListTwice", true, "[]", listTwice, 0},
         {"recGetOne", true, kUntouched, getOne, 1},
         {"recUpdateByWhere", true, kNothing, updateByWhere, 0},
         {"recUpdateByFilter", true, kNothing, updateByFilter, 0},
