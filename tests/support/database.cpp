@@ -55,7 +55,7 @@ Database::Database(Place place)
 
 Database::Database(const std::string& strFile, const char* szVfs)
 {
-    constexpr int kFlags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE;
+    constexpr int kFlags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_URI;
     if (SQLITE_OK != sqlite3_open_v2(strFile.c_str(), &pDb_, kFlags, szVfs))
         ADD_FAILURE() << strFile << ": " << sqlite3_errmsg(pDb_);
 }

@@ -21,6 +21,11 @@ struct Fault {
     // How many operations in a row fail.
     int nLength;
     bool blDiskFull = false;
+
+    friend std::ostream& operator<<(std::ostream& out, const Fault& fault)
+    {
+        return out << fault.szName;
+    }
 };
 
 constexpr int kFromThenOn = std::numeric_limits<int>::max();

@@ -4,6 +4,7 @@
 #include "faults/files/host.h"
 
 #include <functional>
+#include <ostream>
 #include <string>
 #include <vector>
 
@@ -17,6 +18,11 @@ struct Operation {
     std::function<int(Host&, Json::Value& jOutput)> run;
     // Of an undisturbed run.
     int iResult;
+
+    friend std::ostream& operator<<(std::ostream& out, const Operation& operation)
+    {
+        return out << operation.szName;
+    }
 };
 
 const std::vector<Operation>& operations();
