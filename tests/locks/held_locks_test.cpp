@@ -5,6 +5,7 @@
 #include "support/figures.h"
 
 #include <chrono>
+#include <cstdlib>
 #include <tuple>
 
 namespace {
@@ -96,7 +97,11 @@ protected:
 class EveryHeldLock : public HeldLock,
                       public testing::WithParamInterface<std::tuple<Situation, Call>> {
 protected:
-    EveryHeldLock() : HeldLock(situation().szJournal) {}
+    // The long run sleeps in earnest.
+    EveryHeldLock() : HeldLock(situation().szJournal)
+    {
+        state().blReallySleep = nullptr != getenv("VORN_SOAK");
+    }
 
     static const Situation& situation() { return std::get<Situation>(GetParam()); }
     static const Call& call() { return std::get<Call>(GetParam()); }

@@ -71,6 +71,18 @@ std::vector<Fault> faults()
     return all;
 }
 
+// Whether it is the line of a statement that failed at its first attempt for want of the disk.
+bool isErrorOfDisk(const std::string& strLine)
+{
+    const auto begins = [&](const char* szError) {
+        const std::string strBegin =
+            plain(std::string("i=0,errno=?, run sql failed, error=") + szError + ", sql=");
+        return 0 == strLine.compare(0, strBegin.size(), strBegin);
+    };
+    return begins("disk I/O error") || begins("database or disk is full") ||
+           begins("unable to open database file");
+}
+
 // What a trial shows.
 struct Outcome {
     int iResult = 0;
@@ -113,17 +125,18 @@ protected:
     void tryEveryPoint(const DiskFile& file);
 
     Outcome undisturbed_;
-    std::vector<std::string> contents_;
+    std::string strBefore_;
+    std::string strAfterwards_;
 };
 
 void FileFaults::learnUndisturbed(const DiskFile& file)
 {
     file.restore();
-    contents_.push_back(contents(file));
+    strBefore_ = contents(file);
     Host host(file);
     undisturbed_ = run(host, 0);
     EXPECT_EQ(operation().iResult, undisturbed_.iResult);
-    contents_.push_back(contents(file));
+    strAfterwards_ = contents(file);
 }
 
 void FileFaults::expectFailureOrUndisturbed(const Outcome& outcome) const
@@ -136,7 +149,8 @@ void FileFaults::expectFailureOrUndisturbed(const Outcome& outcome) const
         return;
     }
     EXPECT_EQ(-1, outcome.iResult);
-    EXPECT_FALSE(outcome.log.empty());
+    ASSERT_FALSE(outcome.log.empty());
+    EXPECT_TRUE(isErrorOfDisk(outcome.log[0])) << outcome.log[0];
     if (!outcome.jOutput.isArray()) {
         EXPECT_EQ(json(operation().szOutput), outcome.jOutput);
         return;
@@ -164,7 +178,10 @@ void FileFaults::tryEveryPoint(const DiskFile& file)
             EXPECT_EQ(1U, takeStatements().size()) << "was tried again";
             expectFailureOrUndisturbed(outcome);
             EXPECT_TRUE(0 < iFailed || undisturbed_.log == outcome.log);
-            expectNothingLeft(host, file, contents_);
+            if (-1 == outcome.iResult)
+                expectNothingLeft(host, file, {strBefore_, strAfterwards_});
+            else
+                expectNothingLeft(host, file, {strAfterwards_});
         }
         EXPECT_EQ(lMemory, sqlite3_memory_used());
         if (HasFailure()) return;
