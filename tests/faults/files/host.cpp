@@ -10,10 +10,9 @@ namespace fs = std::filesystem;
 namespace {
 
 const char kMembers[] = R"({"id":   {"cpptype": "int"},
-                                  "name": {"cpptype": "string"},
-                                  "note": {"cpptype": "string", "cppDefaultValue": "none"},
-                                  "tags": {"cpptype": "Json::objectValue",
-                                           "cppDefaultValue": {}}})";
+                            "name": {"cpptype": "string"},
+                            "note": {"cpptype": "string", "cppDefaultValue": "none"},
+                            "tags": {"cpptype": "Json::objectValue", "cppDefaultValue": {}}})";
 
 // Pages are small, so that a dozen records need many of them; the cache holds one page, so that
 // changed pages are written before the end of a statement; the file shrinks with its contents.
