@@ -42,6 +42,8 @@ protected:
         addRecords(database_, table_.strName);
     }
 
+    ~HeldLock() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
+
     // The statement of the only call since the last time, after a look at its attempts and sleeps.
     std::string statement(std::size_t nAttempts, std::size_t nSleeps)
     {

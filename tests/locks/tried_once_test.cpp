@@ -10,6 +10,8 @@ using doubles::state;
 
 class OnceTest : public HostTest {
 protected:
+    ~OnceTest() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
+
     // The statement was tried once, and nobody waited.
     std::string onlyStatement()
     {

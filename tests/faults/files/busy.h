@@ -52,6 +52,8 @@ protected:
         host_.database.run("pragma cache_size=1000");
     }
 
+    ~Busy() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
+
     // The result, after the output.
     int run(const char* szOperation, const Held& held)
     {
@@ -66,7 +68,7 @@ protected:
         statements_ = takeStatements();
         EXPECT_EQ(std::vector<std::string>(statements_.size(), statements_.at(0)), statements_);
         EXPECT_EQ(-1 == iResult && 500 == nSleeps ? 500 : nSleeps + 1, statements_.size());
-        Figures::of("locks held, refusals") += fault_vfs::failed();
+        Figures::of("locks, points failed") += fault_vfs::failed();
         return iResult;
     }
 

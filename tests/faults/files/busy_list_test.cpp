@@ -112,7 +112,7 @@ protected:
                 const int iResult = operation.run(host, jOutput);
                 lift();
                 iFailed = 0 == nHeld ? 1 : fault_vfs::failed();
-                Figures::of("locks held, refusals") += fault_vfs::failed();
+                Figures::of("locks, points failed") += fault_vfs::failed();
                 if (iResult != operation.iResult) ++nFailures;
                 EXPECT_EQ(-1 == iResult, !takeLog().empty());
             }

@@ -184,6 +184,7 @@ void FileFaults::tryEveryPoint(const DiskFile& file)
                 expectNothingLeft(host, file, {strAfterwards_});
         }
         EXPECT_EQ(lMemory, sqlite3_memory_used());
+        Figures::of("file faults, findings") += HasFailure() ? 1 : 0;
         if (HasFailure()) return;
     } while (0 < iFailed);
     Figures::of("file faults, points failed") += nFailing - 1;
