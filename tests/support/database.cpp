@@ -53,6 +53,13 @@ Database::Database(Place place)
     if (!strPath_.empty()) run("pragma synchronous=off");
 }
 
+Database::Database(const std::string& strFile, const char* szVfs)
+{
+    constexpr int kFlags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_URI;
+    if (SQLITE_OK != sqlite3_open_v2(strFile.c_str(), &pDb_, kFlags, szVfs))
+        ADD_FAILURE() << strFile << ": " << sqlite3_errmsg(pDb_);
+}
+
 Database::~Database()
 {
     EXPECT_EQ(SQLITE_OK, sqlite3_close(pDb_)) << "a statement was left open";

@@ -30,6 +30,8 @@ public:
     enum class Place { kDefault, kFile };
 
     explicit Database(Place place = Place::kDefault);
+    // In that file, which stays; a name or a URI. Through that VFS, or the default one.
+    explicit Database(const std::string& strFile, const char* szVfs = nullptr);
     // Fails the test when a statement is still open.
     ~Database();
     Database(const Database&) = delete;

@@ -1,0 +1,208 @@
+#include "faults/files/fault_vfs.h"
+
+#include <sqlite3.h>
+
+#include <cerrno>
+#include <map>
+#include <utility>
+
+namespace {
+
+using namespace fault_vfs;
+
+Plan plan;
+int iCounted = 0;
+std::map<Kind, int> countedByKind;
+int iFailed = 0;
+
+// Counts an operation; whether it has to fail.
+bool isDue(Kind kind)
+{
+    if (0 == (plan.uKinds & kind)) return false;
+    ++countedByKind[kind];
+    if (!plan.fails(++iCounted)) return false;
+    ++iFailed;
+    errno = plan.blDiskFull ? ENOSPC : plan.iErrno;
+    return true;
+}
+
+// The real file stands behind this one in the memory that SQLite provides.
+struct File : sqlite3_file {
+    sqlite3_file* real() { return reinterpret_cast<sqlite3_file*>(this + 1); }
+};
+
+sqlite3_file* real(sqlite3_file* pFile)
+{
+    return static_cast<File*>(pFile)->real();
+}
+
+int closeFile(sqlite3_file* pFile)
+{
+    return real(pFile)->pMethods->xClose(real(pFile));
+}
+
+int readFile(sqlite3_file* pFile, void* pOut, int nBytes, sqlite3_int64 lOffset)
+{
+    if (isDue(kRead)) return SQLITE_IOERR_READ;
+    return real(pFile)->pMethods->xRead(real(pFile), pOut, nBytes, lOffset);
+}
+
+int writeFile(sqlite3_file* pFile, const void* pBytes, int nBytes, sqlite3_int64 lOffset)
+{
+    const auto write = real(pFile)->pMethods->xWrite;
+    if (!isDue(kWrite)) return write(real(pFile), pBytes, nBytes, lOffset);
+    const int iErrno = errno;
+    write(real(pFile), pBytes, nBytes / 2, lOffset);
+    errno = iErrno;
+    return plan.blDiskFull ? SQLITE_FULL : SQLITE_IOERR_WRITE;
+}
+
+int truncateFile(sqlite3_file* pFile, sqlite3_int64 lSize)
+{
+    if (isDue(kTruncate)) return SQLITE_IOERR_TRUNCATE;
+    return real(pFile)->pMethods->xTruncate(real(pFile), lSize);
+}
+
+// Nothing here loses its power, so the real disk need not be waited for.
+int syncFile(sqlite3_file*, int)
+{
+    return isDue(kSync) ? SQLITE_IOERR_FSYNC : SQLITE_OK;
+}
+
+int fileSize(sqlite3_file* pFile, sqlite3_int64* pSize)
+{
+    if (isDue(kFileSize)) return SQLITE_IOERR_FSTAT;
+    return real(pFile)->pMethods->xFileSize(real(pFile), pSize);
+}
+
+int lockFile(sqlite3_file* pFile, int iLevel)
+{
+    if (isDue(kLock)) return SQLITE_BUSY;
+    return real(pFile)->pMethods->xLock(real(pFile), iLevel);
+}
+
+int unlockFile(sqlite3_file* pFile, int iLevel)
+{
+    return real(pFile)->pMethods->xUnlock(real(pFile), iLevel);
+}
+
+int checkReservedLock(sqlite3_file* pFile, int* pHeld)
+{
+    return real(pFile)->pMethods->xCheckReservedLock(real(pFile), pHeld);
+}
+
+int fileControl(sqlite3_file* pFile, int iOperation, void* arg)
+{
+    return real(pFile)->pMethods->xFileControl(real(pFile), iOperation, arg);
+}
+
+int sectorSize(sqlite3_file* pFile)
+{
+    return real(pFile)->pMethods->xSectorSize(real(pFile));
+}
+
+int characteristics(sqlite3_file* pFile)
+{
+    return real(pFile)->pMethods->xDeviceCharacteristics(real(pFile));
+}
+
+int mapShared(sqlite3_file* pFile, int iPage, int nBytes, int iExtend, void volatile** ppOut)
+{
+    if (isDue(kMapShared)) return SQLITE_IOERR_SHMMAP;
+    return real(pFile)->pMethods->xShmMap(real(pFile), iPage, nBytes, iExtend, ppOut);
+}
+
+int lockShared(sqlite3_file* pFile, int iOffset, int n, int iFlags)
+{
+    return real(pFile)->pMethods->xShmLock(real(pFile), iOffset, n, iFlags);
+}
+
+void barrier(sqlite3_file* pFile)
+{
+    real(pFile)->pMethods->xShmBarrier(real(pFile));
+}
+
+int unmapShared(sqlite3_file* pFile, int iDelete)
+{
+    return real(pFile)->pMethods->xShmUnmap(real(pFile), iDelete);
+}
+
+const sqlite3_io_methods kMethods = {
+    2,           closeFile,   readFile,        writeFile,  truncateFile,
+    syncFile,    fileSize,    lockFile,        unlockFile, checkReservedLock,
+    fileControl, sectorSize,  characteristics, mapShared,  lockShared,
+    barrier,     unmapShared, nullptr,         nullptr};
+
+sqlite3_vfs* realVfs(sqlite3_vfs* pVfs)
+{
+    return static_cast<sqlite3_vfs*>(pVfs->pAppData);
+}
+
+int openFile(sqlite3_vfs* pVfs, const char* szName, sqlite3_file* pFile, int iFlags, int* pOutFlags)
+{
+    pFile->pMethods = nullptr;
+    if (isDue(kOpen)) return SQLITE_CANTOPEN;
+    const int iStatus = realVfs(pVfs)->xOpen(realVfs(pVfs), szName, real(pFile), iFlags, pOutFlags);
+    if (nullptr != real(pFile)->pMethods) pFile->pMethods = &kMethods;
+    return iStatus;
+}
+
+int deleteFile(sqlite3_vfs* pVfs, const char* szName, int iSyncFolder)
+{
+    if (isDue(kDelete)) return SQLITE_IOERR_DELETE;
+    return realVfs(pVfs)->xDelete(realVfs(pVfs), szName, iSyncFolder);
+}
+
+int accessFile(sqlite3_vfs* pVfs, const char* szName, int iFlags, int* pOut)
+{
+    if (isDue(kAccess)) return SQLITE_IOERR_ACCESS;
+    return realVfs(pVfs)->xAccess(realVfs(pVfs), szName, iFlags, pOut);
+}
+
+// Everything that has no file to fail is the default VFS's own: it does not look at its first
+// argument.
+sqlite3_vfs overDefault()
+{
+    sqlite3_vfs* const pDefault = sqlite3_vfs_find(nullptr);
+    sqlite3_vfs vfs = *pDefault;
+    vfs.zName = "fault";
+    vfs.pNext = nullptr;
+    vfs.pAppData = pDefault;
+    vfs.szOsFile = static_cast<int>(sizeof(File)) + pDefault->szOsFile;
+    vfs.xOpen = openFile;
+    vfs.xDelete = deleteFile;
+    vfs.xAccess = accessFile;
+    return vfs;
+}
+
+}  // namespace
+
+const char* fault_vfs::name()
+{
+    static sqlite3_vfs vfs = overDefault();
+    static const int iRegistered = sqlite3_vfs_register(&vfs, 0);
+    return SQLITE_OK == iRegistered ? vfs.zName : nullptr;
+}
+
+void fault_vfs::follow(Plan newPlan)
+{
+    plan = std::move(newPlan);
+    iCounted = 0;
+    countedByKind.clear();
+    iFailed = 0;
+}
+
+void fault_vfs::lift()
+{
+    plan = Plan();
+}
+
+int fault_vfs::failed()
+{
+    return iFailed;
+}
+
+int fault_vfs::counted(Kind kind)
+{
+    return countedByKind[kind];
+}

@@ -1,0 +1,47 @@
+// A VFS over the default one whose operations fail where a plan says so.
+#pragma once
+
+#include <functional>
+
+namespace fault_vfs {
+
+// To be handed to sqlite3_open_v2; registered by the first call.
+const char* name();
+
+// The kinds of operations, a bit each.
+enum Kind : unsigned {
+    kOpen = 1,
+    kRead = 2,
+    kWrite = 4,
+    kSync = 8,
+    kTruncate = 16,
+    kDelete = 32,
+    kAccess = 64,
+    kFileSize = 128,
+    kMapShared = 256,
+    kLock = 512,
+};
+constexpr unsigned kEverythingButLocks = kLock - 1;
+
+struct Plan {
+    // The kinds that are counted, together and from 1.
+    unsigned uKinds = 0;
+    // Whether the n-th of them fails.
+    std::function<bool(int n)> fails;
+    // What a failure means: no space left, or a broken device. A lock that fails is held by
+    // somebody else. A write that fails leaves the first half of its bytes.
+    bool blDiskFull = false;
+    // What a broken device leaves in errno.
+    int iErrno = 5;
+};
+
+// From now on; the counts begin anew.
+void follow(Plan plan);
+// Nothing fails any more; the counts stay.
+void lift();
+
+int failed();
+// How many operations of that kind were counted.
+int counted(Kind kind);
+
+}  // namespace fault_vfs
