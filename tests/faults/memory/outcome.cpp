@@ -26,8 +26,6 @@ constexpr char kDefinition[] = R"({
         "d": {"cpptype": "unsigned long long"}, "e": {"cpptype": "float"},
         "f": {"cpptype": "double"}, "g": {"cpptype": "Json::arrayValue"}}}})";
 
-constexpr char kRowsBefore[] = "1 Ann 1 {k:[x]} [1,true],2 Bob 0,3 O'Brien 1";
-
 bool isTextBetween(const std::string& strBefore, const std::string& strAfter,
                    const std::string& strNow)
 {
