@@ -39,7 +39,9 @@ struct Call {
 //     "result"          0 where it is left out, "Json::LogicError" where that is thrown
 //     "first", "second", "text", "message", "now", "type", "rows", "made": afterwards, otherwise as
 //                       before
-//     "grows"           true: without memory an output may end between before and after
+//     "grows"           "thrown": where it throws without memory, an output may end between before
+//     and
+//                       after; "refused": also where it gives -1
 //     "silent"          true: the result does not tell whether the rows were written
 struct Case {
     const char* szName;

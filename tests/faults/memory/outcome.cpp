@@ -92,7 +92,8 @@ Attempt::Attempt(const Case& row, Store& store)
     call_.strCreate = jState_.get("create", strCreate).asString();
 
     Json::Value jChange = jsonOf(row.szChange);
-    blGrows_ = jChange.removeMember("grows", nullptr);
+    strGrows_ = jChange.get("grows", "").asString();
+    jChange.removeMember("grows");
     blSilent_ = jChange.removeMember("silent", nullptr);
     if (!jState_.isMember("handle"))
         call_.api.emplace(call_.pDb, call_.strName, call_.jDefinition, call_.strCreate);
@@ -121,6 +122,11 @@ void Attempt::setArguments(const Json::Value& jState)
     call_.now = 0;
     call_.pjResult = nullptr;
     if (call_.api) call_.api->setErrMsg(jState["message"].asString());
+}
+
+bool Attempt::grows() const
+{
+    return "refused" == strGrows_ || ("thrown" == strGrows_ && !strThrown_.empty());
 }
 
 bool Attempt::call(const allocators::Fault& fault)

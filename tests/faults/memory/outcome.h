@@ -23,7 +23,8 @@ public:
     // Before the call, and after an undisturbed one.
     const Json::Value& before() const { return jBefore_; }
     const Json::Value& after() const { return jAfter_; }
-    bool grows() const { return blGrows_; }
+    // Whether an output may be between them.
+    bool grows() const;
     bool silent() const { return blSilent_; }
     const char* name() const { return row_.szName; }
 
@@ -39,7 +40,7 @@ private:
     Json::Value jState_;
     Json::Value jBefore_;
     Json::Value jAfter_;
-    bool blGrows_ = false;
+    std::string strGrows_;
     bool blSilent_ = false;
     int iResult_ = 0;
     std::string strThrown_;
