@@ -24,7 +24,7 @@ constexpr const char* kWords[] = {"string",
                                   "uid_t",
                                   "time_t",
                                   "any other word"};
-constexpr int kRows = 4;
+constexpr int kRows = 3;
 
 // The digits at the front, held within the bounds, as the C library reads them.
 Json::Int64 digits(const std::string& strText, Json::Int64 iLow, Json::Int64 iHigh)
@@ -44,7 +44,7 @@ Json::Int64 digits(const std::string& strText, Json::Int64 iLow, Json::Int64 iHi
 
 struct Expected {
     bool blReadable = true;
-    bool blKnown = true;  // otherwise what joncpp's reader leaves behind a syntax error
+    bool blKnown = true;  // otherwise what jsoncpp's reader leaves behind a syntax error
     Json::Value jValue;
 };
 

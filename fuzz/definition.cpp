@@ -134,6 +134,9 @@ void operate(VornJsonDbApi& api, const Json::Value& jRecord)
     expect(INT_MAX, "recDeleteAll", [&] { return api.recDeleteAll(); });
     const std::string strMessage = api.getErrMsg();
     require(strMessage.empty() || "DUPLICATE_PRIMARY_KEY" == strMessage, "message " + strMessage);
+    const std::string strText = text(jRecord);
+    api.setErrMsg(strText);
+    require(strText == api.getErrMsg(), "message " + api.getErrMsg());
 }
 
 }  // namespace

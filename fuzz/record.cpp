@@ -26,8 +26,8 @@ bool read(const std::string& strText, Input& input)
         if (!jItem.isObject() || !jItem["cpptype"].isString()) return false;
         const std::string strKey(1, static_cast<char>('a' + i));
         input.jMembers[strKey]["cpptype"] = jItem["cpptype"];
-        for (const char* szKey : {"cppDefaultValue"})
-            if (jItem.isMember(szKey)) input.jMembers[strKey][szKey] = jItem[szKey];
+        if (jItem.isMember("cppDefaultValue"))
+            input.jMembers[strKey]["cppDefaultValue"] = jItem["cppDefaultValue"];
         if (jItem.isMember("value")) input.jRecord[strKey] = jItem["value"];
         input.strColumns.append(input.strColumns.empty() ? "" : ",").append(strKey);
     }
@@ -82,6 +82,19 @@ void findAgain(FuzzTable& table, const Stored& expected, const Json::Value& jRec
     }
 }
 
+void fillDefaults(FuzzTable& table, const Input& input, const Json::Value& jComplete)
+{
+    for (const Json::Value& jRecord : {input.jRecord, jComplete}) {
+        Json::Value jFilled = jRecord;
+        require((input.jMembers.size() == jRecord.size() ? 0 : -1) ==
+                    table.api.fillDefaultValue(jFilled, true),
+                "check for members");
+        require(jFilled == jRecord, "a check changed the record");
+        require(0 == table.api.fillDefaultValue(jFilled, false), "fillDefaultValue");
+        require(jFilled == jComplete, "defaults: " + text(jFilled) + " for " + text(jComplete));
+    }
+}
+
 }  // namespace
 
 void testInput(const std::string& strInput)
@@ -93,6 +106,7 @@ void testInput(const std::string& strInput)
     bool blSql = false;
 
     const Json::Value jComplete = withDefaults(input.jMembers, input.jRecord);
+    fillDefaults(table, input, jComplete);
     Stored created = storedRecord(input.jMembers, jComplete);
     if (input.jRecord.empty() || !passesTypeCheck(input.jMembers, jComplete))
         created = {Stored::End::kFails, {}};

@@ -78,10 +78,12 @@ void require(bool blHolds, const std::string& strText)
 
 bool parseJson(const std::string& strText, Json::Value& jValue)
 {
-    Json::CharReaderBuilder builder;
-    Json::CharReaderBuilder::strictMode(&builder.settings_);
-    builder["strictRoot"] = false;
-    const std::unique_ptr<Json::CharReader> pReader(builder.newCharReader());
+    static const std::unique_ptr<Json::CharReader> pReader = [] {
+        Json::CharReaderBuilder builder;
+        Json::CharReaderBuilder::strictMode(&builder.settings_);
+        builder["strictRoot"] = false;
+        return std::unique_ptr<Json::CharReader>(builder.newCharReader());
+    }();
     try {
         return pReader->parse(strText.data(), strText.data() + strText.size(), &jValue, nullptr);
     } catch (const Json::RuntimeError&) {
