@@ -42,44 +42,49 @@ Json::Int64 digits(const std::string& strText, Json::Int64 iLow, Json::Int64 iHi
     return static_cast<Json::Int64>(iValue);
 }
 
+// The text and what it is as JSON; behind a syntax error jsoncpp's reader leaves what it likes.
+struct Text {
+    std::string strText;
+    bool blJson;
+    Json::Value jParsed;
+};
+
 struct Expected {
     bool blReadable = true;
-    bool blKnown = true;  // otherwise what jsoncpp's reader leaves behind a syntax error
+    bool blKnown = true;
     Json::Value jValue;
 };
 
-Expected expected(const std::string& strWord, const std::string& strText)
+Expected expected(const std::string& strWord, const Text& in)
 {
-    if ("string" == strWord) return {true, true, strText};
+    if ("string" == strWord) return {true, true, in.strText};
     if ("int" == strWord || "unsigned int" == strWord)
-        return {true, true, static_cast<int>(digits(strText, INT32_MIN, INT32_MAX))};
-    const Json::Int64 iValue = digits(strText, INT64_MIN, INT64_MAX);
+        return {true, true, static_cast<int>(digits(in.strText, INT32_MIN, INT32_MAX))};
+    const Json::Int64 iValue = digits(in.strText, INT64_MIN, INT64_MAX);
     if ("long long" == strWord || "unsigned long long" == strWord) return {true, true, iValue};
     if ("bool" == strWord) return {true, true, 1 == iValue};
-    if (0 != strWord.rfind("Json::", 0)) return {false, true, {}};
-    Expected parsed;
-    parsed.blKnown = parseJson(strText, parsed.jValue);
-    return parsed;
+    if (0 == strWord.rfind("Json::", 0)) return {true, in.blJson, in.jParsed};
+    return {false, true, {}};
 }
 
 void requireRow(const Json::Value& jRow, bool blNull, const Expected& wanted,
                 const std::string& strWord)
 {
-    require(jRow["a"] == "x", strWord + ": the column in front is wrong");
-    require(blNull != jRow.isMember("b"), strWord + ": NULL");
-    require(blNull || !wanted.blKnown || jRow["b"] == wanted.jValue,
-            strWord + ": " + text(jRow["b"]) + " for " + text(wanted.jValue));
+    require(jRow["a"] == "x", strWord, ": the column in front is wrong");
+    require(blNull != jRow.isMember("b"), strWord, ": NULL");
+    require(blNull || !wanted.blKnown || jRow["b"] == wanted.jValue, strWord, ": ", jRow["b"],
+            " for ", wanted.jValue);
 }
 
-void list(FuzzTable& table, const std::string& strWord, const std::string& strText)
+void list(FuzzTable& table, const std::string& strWord, const Text& in)
 {
-    const Expected wanted = expected(strWord, strText);
+    const Expected wanted = expected(strWord, in);
     Json::Value jRequest;
     Json::Value jRows;
     const int iResult = table.api.recList(jRequest, jRows);
-    require(iResult == (wanted.blReadable ? 0 : -1), strWord + ": recList");
+    require(iResult == (wanted.blReadable ? 0 : -1), strWord, ": recList");
     // The rows in front of the first that cannot be read stay.
-    require((wanted.blReadable ? kRows : 1) == static_cast<int>(jRows.size()), strWord + ": rows");
+    require((wanted.blReadable ? kRows : 1) == static_cast<int>(jRows.size()), strWord, ": rows");
     for (int i = 0; i < static_cast<int>(jRows.size()); ++i)
         requireRow(jRows[i], 0 == i, wanted, strWord);
 }
@@ -97,11 +102,12 @@ void testInput(const std::string& strInput)
     for (int i = 1; i < kRows; ++i) database.insertText("t", strInput);
 
     // A text ends at its first NUL byte.
-    const std::string strText = strInput.c_str();
+    Text in{strInput.c_str(), false, {}};
+    in.blJson = parseJson(in.strText, in.jParsed);
     Json::Value& jCached = VORN_JSON_DB::recType(table.jDefinition, table.strName);
     for (const char* szWord : kWords) {
         jCached["b"]["cpptype"] = szWord;
-        list(table, szWord, strText);
+        list(table, szWord, in);
     }
     jCached.removeMember("b");
     Json::Value jRequest;

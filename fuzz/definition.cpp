@@ -94,7 +94,7 @@ void validate(VornJsonDbApi& api, const Json::Value& jTypes, const Json::Value& 
         const Json::Value& jMember = jTypes[strKey];
         const bool blDefault = jMember.isMember("cppDefaultValue");
         blComplete = blComplete && blDefault;
-        require(blDefault == jDefaults.isMember(strKey), "default of " + strKey);
+        require(blDefault == jDefaults.isMember(strKey), "default of ", strKey);
         require(!blDefault || jMember["cppDefaultValue"] == jDefaults[strKey], "a default differs");
     }
     require((blComplete ? 0 : -1) == api.fillDefaultValue(jDefaults, true), "check for members");
@@ -133,10 +133,10 @@ void operate(VornJsonDbApi& api, const Json::Value& jRecord)
     require(-1 == api.recDelete(jNone), "a request for nothing deleted");
     expect(INT_MAX, "recDeleteAll", [&] { return api.recDeleteAll(); });
     const std::string strMessage = api.getErrMsg();
-    require(strMessage.empty() || "DUPLICATE_PRIMARY_KEY" == strMessage, "message " + strMessage);
+    require(strMessage.empty() || "DUPLICATE_PRIMARY_KEY" == strMessage, "message ", strMessage);
     const std::string strText = text(jRecord);
     api.setErrMsg(strText);
-    require(strText == api.getErrMsg(), "message " + api.getErrMsg());
+    require(strText == api.getErrMsg(), "message ", api.getErrMsg());
 }
 
 }  // namespace
@@ -159,7 +159,7 @@ void testInput(const std::string& strInput)
     require(jCopy == jDefinition, "recType changed the definition");
     const Json::Value jWanted =
         strName.empty() ? Json::Value() : expectedTypes(jDefinition, strName);
-    require(jTypes == jWanted, "types " + text(jTypes) + " for " + text(jWanted));
+    require(jTypes == jWanted, "types ", jTypes, " for ", jWanted);
 
     const Sample record = sample(jTypes, jDefinition, strName);
     std::string strCreate =

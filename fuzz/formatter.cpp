@@ -85,5 +85,5 @@ void testInput(const std::string& strInput)
 
     std::string strWanted = strPrefix;
     if (describedList(members, strWanted))
-        require(strWanted == strList, "list " + strList + " for " + strWanted);
+        require(strWanted == strList, "list ", strList, " for ", strWanted);
 }

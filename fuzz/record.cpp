@@ -38,10 +38,10 @@ void requireEnd(const Stored& expected, const Outcome& outcome, const std::strin
 {
     requireResult(outcome, 0, 0, strCall.c_str());
     if (Stored::End::kAny == expected.end) return;
-    require((Stored::End::kThrows == expected.end) == outcome.blThrew, strCall + ": exception");
+    require((Stored::End::kThrows == expected.end) == outcome.blThrew, strCall, ": exception");
     if (!outcome.blThrew)
-        require((Stored::End::kRow == expected.end) == (0 == outcome.iResult),
-                strCall + " gave " + std::to_string(outcome.iResult));
+        require((Stored::End::kRow == expected.end) == (0 == outcome.iResult), strCall, " gave ",
+                outcome.iResult);
 }
 
 // Runs one writing call and compares what it gives and what is fetched afterwards.
@@ -53,18 +53,17 @@ void write(FuzzDatabase& database, FuzzTable& table, const Stored& expected, con
     const std::string strBefore = Stored::End::kAny == expected.end ? "" : table.rows(database);
     const Outcome outcome = outcomeOf([&] { return call(jOut); });
     requireEnd(expected, outcome, strCall);
-    if (outcome.blThrew || 0 != outcome.iResult)
-        require(jOut == jIn, strCall + " wrote on failure");
+    if (outcome.blThrew || 0 != outcome.iResult) require(jOut == jIn, strCall, " wrote on failure");
     if (Stored::End::kThrows == expected.end)
-        require(strBefore == table.rows(database), strCall + " threw and stored");
+        require(strBefore == table.rows(database), strCall, " threw and stored");
     if (Stored::End::kRow != expected.end) return;
 
-    require(jOut == expected.jRow, strCall + ": " + text(jOut) + " for " + text(expected.jRow));
+    require(jOut == expected.jRow, strCall, ": ", jOut, " for ", expected.jRow);
     Json::Value jLast;
     jLast["vornSqlWhereFilter"] = "rowid == last_insert_rowid()";
     Json::Value jFetched;
-    require(1 == table.api.recGetOne(jLast, jFetched), strCall + ": not fetched");
-    require(jFetched == expected.jRow, strCall + ": fetched " + text(jFetched));
+    require(1 == table.api.recGetOne(jLast, jFetched), strCall, ": not fetched");
+    require(jFetched == expected.jRow, strCall, ": fetched ", jFetched);
 }
 
 // Each text and number of the stored record finds it again.
@@ -77,8 +76,8 @@ void findAgain(FuzzTable& table, const Stored& expected, const Json::Value& jRec
         Json::Value jRequest;
         jRequest[strKey] = jRecord[strKey];
         Json::Value jFetched;
-        require(1 == table.api.recGetOne(jRequest, jFetched), "not found by " + text(jRequest));
-        require(jFetched == expected.jRow, "found " + text(jFetched));
+        require(1 == table.api.recGetOne(jRequest, jFetched), "not found by ", jRequest);
+        require(jFetched == expected.jRow, "found ", jFetched);
     }
 }
 
@@ -91,7 +90,7 @@ void fillDefaults(FuzzTable& table, const Input& input, const Json::Value& jComp
                 "check for members");
         require(jFilled == jRecord, "a check changed the record");
         require(0 == table.api.fillDefaultValue(jFilled, false), "fillDefaultValue");
-        require(jFilled == jComplete, "defaults: " + text(jFilled) + " for " + text(jComplete));
+        require(jFilled == jComplete, "defaults: ", jFilled, " for ", jComplete);
     }
 }
 

@@ -53,7 +53,7 @@ public:
     {
         const Outcome outcome = outcomeOf([&] { return run(table_.api); });
         requireResult(outcome, 0, iHigh, szCall);
-        require(jRequest == input_.jRequest, std::string(szCall) + " changed the request");
+        require(jRequest == input_.jRequest, szCall, " changed the request");
         return outcome;
     }
 
@@ -179,8 +179,7 @@ void deleteListed(const Input& input)
         INT_MAX, "recDelete", [&](VornJsonDbApi& api) { return api.recDelete(session.jRequest); });
     if (mayBeSql(input.jRequest)) return;
     if (0 <= iListed && 0 <= deleted.iResult && !input.jRequest.isMember("limit"))
-        require(iListed == deleted.iResult, "listed " + std::to_string(iListed) + ", deleted " +
-                                                std::to_string(deleted.iResult));
+        require(iListed == deleted.iResult, "listed ", iListed, ", deleted ", deleted.iResult);
     session.database().requireOtherUntouched();
 }
 

@@ -95,7 +95,7 @@ std::string FuzzDatabase::value(const std::string& strSql)
     limit(false);
     const int iStatus = sqlite3_exec(pDb_, strSql.c_str(), keep, &strValue, nullptr);
     limit(true);
-    require(SQLITE_OK == iStatus, "the host's own statement failed: " + strSql);
+    require(SQLITE_OK == iStatus, "the host's own statement failed: ", strSql);
     return strValue;
 }
 

@@ -9,14 +9,36 @@
 // Defined once by each target.
 void testInput(const std::string& strInput);
 
-// Ends the process with the text when the condition does not hold: that is a finding.
-void require(bool blHolds, const std::string& strText);
+// Shows the text and ends the process.
+[[noreturn]] void finding(const std::string& strText);
 
 // The strict JSON of an input; false where it is none, or nested too deeply for jsoncpp's reader.
 bool parseJson(const std::string& strText, Json::Value& jValue);
 
 // The value as one compact line.
 std::string text(const Json::Value& jValue);
+
+inline std::string text(const char* szText)
+{
+    return szText;
+}
+
+inline std::string text(const std::string& strText)
+{
+    return strText;
+}
+
+inline std::string text(int iValue)
+{
+    return std::to_string(iValue);
+}
+
+// When the condition does not hold, that is a finding, told by the parts in a row.
+template <typename... Part>
+void require(bool blHolds, const Part&... part)
+{
+    if (!blHolds) finding((text(part) + ...));
+}
 
 // Outcome of a call of the library: its result, or the only exception that is promised.
 struct Outcome {
