@@ -99,7 +99,7 @@ void testInput(const std::string& strInput)
     jMembers["b"]["cpptype"] = "string";
     FuzzTable table(database, jMembers, "a,b");
     database.value("insert into t values ('x',null)");
-    for (int i = 1; i < kRows; ++i) database.insertText("t", strInput);
+    for (int i = 1; i < kRows; ++i) database.number("insert into t values ('x',?)", {strInput});
 
     // A text ends at its first NUL byte.
     Text in{strInput.c_str(), false, {}};

@@ -53,6 +53,7 @@ public:
     {
         const Outcome outcome = outcomeOf([&] { return run(table_.api); });
         requireResult(outcome, 0, iHigh, szCall);
+        require(!outcome.blThrew || jRequest.isObject() || jRecord.isObject(), szCall, " threw");
         require(jRequest == input_.jRequest, szCall, " changed the request");
         return outcome;
     }
@@ -170,11 +171,32 @@ void copyMembers(const Input& input)
     }
 }
 
+// The number of rows that a request of nothing but texts selects; -1 for other requests.
+int selectedByTexts(FuzzDatabase& database, const Json::Value& jRequest)
+{
+    if (!jRequest.isObject()) return -1;
+    std::string strSql = "select count(*) from t where 1";
+    std::vector<std::string> bound;
+    for (const std::string& strKey : jRequest.getMemberNames()) {
+        if (!jRequest[strKey].isString()) return -1;
+        if ("name" == strKey || "zip" == strKey) {
+            strSql += " and " + strKey + "=?";
+            // A text ends at its first NUL byte.
+            bound.emplace_back(jRequest[strKey].asCString());
+        } else if ("sort_by" != strKey && "sort_direction" != strKey) {
+            return -1;
+        }
+    }
+    return database.number(strSql, bound);
+}
+
 // Without SQL in the request, as many rows are deleted as are listed, and no other table is.
 void deleteListed(const Input& input)
 {
     Session session(input);
+    const int iSelected = selectedByTexts(session.database(), input.jRequest);
     const int iListed = list(session);
+    require(-1 == iSelected || iSelected == iListed, "listed ", iListed, " of ", iSelected);
     const Outcome deleted = session.call(
         INT_MAX, "recDelete", [&](VornJsonDbApi& api) { return api.recDelete(session.jRequest); });
     if (mayBeSql(input.jRequest)) return;

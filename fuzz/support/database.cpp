@@ -99,15 +99,22 @@ std::string FuzzDatabase::value(const std::string& strSql)
     return strValue;
 }
 
-void FuzzDatabase::insertText(const std::string& strTable, const std::string& strText)
+int FuzzDatabase::number(const std::string& strSql, const std::vector<std::string>& bound)
 {
-    const std::string strSql = "insert into " + strTable + " values ('x',?)";
     sqlite3_stmt* pStatement = nullptr;
+    limit(false);
     sqlite3_prepare_v2(pDb_, strSql.c_str(), -1, &pStatement, nullptr);
-    sqlite3_bind_text(pStatement, 1, strText.data(), static_cast<int>(strText.size()),
-                      SQLITE_STATIC);
-    require(SQLITE_DONE == sqlite3_step(pStatement), "the host cannot insert");
+    int iParameter = 0;
+    for (const std::string& strText : bound)
+        sqlite3_bind_text(pStatement, ++iParameter, strText.data(),
+                          static_cast<int>(strText.size()), SQLITE_STATIC);
+    const int iStep = sqlite3_step(pStatement);
+    require(SQLITE_ROW == iStep || SQLITE_DONE == iStep,
+            "the host's own statement failed: ", strSql);
+    const int iNumber = SQLITE_ROW == iStep ? sqlite3_column_int(pStatement, 0) : 0;
     sqlite3_finalize(pStatement);
+    limit(true);
+    return iNumber;
 }
 
 void FuzzDatabase::requireOtherUntouched()

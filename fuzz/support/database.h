@@ -6,6 +6,7 @@
 #include <sqlite3.h>
 
 #include <string>
+#include <vector>
 
 // Whoever reaches the connection with SQL of his own can neither leave it nor keep it busy: what an
 // input makes of the statements is limited in steps, lengths and kinds.
@@ -22,8 +23,9 @@ public:
 
     // The only column of the first row of the host's own query, past all limits.
     std::string value(const std::string& strSql);
-    // A row with the text of nText bytes as the column's value, bound and not composed.
-    void insertText(const std::string& strTable, const std::string& strText);
+    // The number in the first column of the first row, 0 without a row, of the host's own query
+    // with bound texts.
+    int number(const std::string& strSql, const std::vector<std::string>& bound);
 
     // Where no input is SQL.
     void requireOtherUntouched();

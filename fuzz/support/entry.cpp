@@ -3,7 +3,6 @@
 #include <VornJsonDbApi.h>
 
 #include <json/reader.h>
-#include <json/writer.h>
 #include <sqlite3.h>
 #include <syslog.h>
 #include <unistd.h>
@@ -88,15 +87,6 @@ bool parseJson(const std::string& strText, Json::Value& jValue)
     } catch (const Json::RuntimeError&) {
         return false;
     }
-}
-
-std::string text(const Json::Value& jValue)
-{
-    Json::StreamWriterBuilder builder;
-    builder["indentation"] = "";
-    builder["emitUTF8"] = true;
-    builder["useSpecialFloats"] = true;
-    return Json::writeString(builder, jValue);
 }
 
 void requireResult(const Outcome& outcome, int iLow, int iHigh, const char* szCall)

@@ -2,6 +2,8 @@
 // process afterwards.
 #pragma once
 
+#include "support/json_text.h"
+
 #include <json/value.h>
 
 #include <string>
@@ -14,9 +16,6 @@ void testInput(const std::string& strInput);
 
 // The strict JSON of an input; false where it is none, or nested too deeply for jsoncpp's reader.
 bool parseJson(const std::string& strText, Json::Value& jValue);
-
-// The value as one compact line.
-std::string text(const Json::Value& jValue);
 
 inline std::string text(const char* szText)
 {
