@@ -5,6 +5,7 @@
 #include "support/sql_roles.h"
 #include "support/target.h"
 
+#include <algorithm>
 #include <climits>
 #include <vector>
 
@@ -127,7 +128,10 @@ int list(Session& session)
         1, "recGetOne", [&](VornJsonDbApi& api) { return api.recGetOne(session.jRequest, jOut); });
     require(1 == got.iResult || jOut.isNull(), "recGetOne wrote without a row");
     if (listed.blThrew || 0 != listed.iResult) return -1;
-    return static_cast<int>(jRows.size());
+    const int iRows = static_cast<int>(jRows.size());
+    require(mayBeSql(session.jRequest) || got.iResult == std::min(1, iRows), "recGetOne gave ",
+            got.iResult, " of ", iRows);
+    return iRows;
 }
 
 std::vector<std::string> texts(const Json::Value& jValue)
