@@ -6,7 +6,7 @@ build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev 
                 iso-codes sqlite3)
 
 # The tests that run the whole suite in one process, and the hosts.
-whole_suite='^(in_memory|on_files|records|records_iso_codes|readme_host|header_host|header_host_runs|cxx11_host|malloc_host|plugin_host|crash|crash_check|guarded|guarded_tests|threads)$'
+whole_suite='^(in_memory|on_files|records|records_iso_codes|readme_host|header_host|header_host_runs|cxx11_host|malloc_host|plugin_host|crash|crash_check|guarded|guarded_tests|threads|fuzz_replay_[a-z]+)$'
 
 say() {
     printf '== %s\n' "$*"

@@ -1,7 +1,6 @@
 #include "support/database.h"
 
 #include <json/reader.h>
-#include <json/writer.h>
 
 #include <unistd.h>
 #include <cerrno>
@@ -22,15 +21,6 @@ Json::Value json(const std::string& strText)
     if (!pReader->parse(strText.data(), strText.data() + strText.size(), &jValue, &strError))
         ADD_FAILURE() << "no JSON: " << strText << ": " << strError;
     return jValue;
-}
-
-std::string text(const Json::Value& jValue)
-{
-    Json::StreamWriterBuilder builder;
-    builder["indentation"] = "";
-    builder["emitUTF8"] = true;
-    builder["useSpecialFloats"] = true;
-    return Json::writeString(builder, jValue);
 }
 
 std::string freshName()

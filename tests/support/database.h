@@ -2,6 +2,7 @@
 #pragma once
 
 #include "support/doubles.h"
+#include "support/json_text.h"
 #include "support/log.h"
 
 #include <VornJsonDbApi.h>
@@ -14,9 +15,6 @@
 
 // Parses JSON text; the test fails where it is none.
 Json::Value json(const std::string& strText);
-
-// The value as one compact line.
-std::string text(const Json::Value& jValue);
 
 // A table name of the test's own: member types are kept for the life of the process.
 std::string freshName();

@@ -1,0 +1,53 @@
+// A database in memory and a table of it, made afresh for each input.
+#pragma once
+
+#include <VornJsonDbApi.h>
+
+#include <sqlite3.h>
+
+#include <string>
+#include <vector>
+
+// Whoever reaches the connection with SQL of his own can neither leave it nor keep it busy: what an
+// input makes of the statements is limited in steps, lengths and kinds.
+class FuzzDatabase {
+public:
+    // Has a table "other" that no operation under test is asked for.
+    FuzzDatabase();
+    // Looks at the connection: no statement is open, no transaction, and it can be closed.
+    ~FuzzDatabase();
+    FuzzDatabase(const FuzzDatabase&) = delete;
+    FuzzDatabase& operator=(const FuzzDatabase&) = delete;
+
+    sqlite3* get() const { return pDb_; }
+
+    // The only column of the first row of the host's own query, past all limits.
+    std::string value(const std::string& strSql);
+    // The number in the first column of the first row, 0 without a row, of the host's own query
+    // with bound texts.
+    int number(const std::string& strSql, const std::vector<std::string>& bound);
+
+    // Where no input is SQL.
+    void requireOtherUntouched();
+
+private:
+    static int step(void* arg);
+    void limit(bool blOn);
+
+    sqlite3* pDb_ = nullptr;
+    int iSteps_ = 0;
+};
+
+// A table and its handle. The cache of member types, which never forgets, is told of each new
+// definition through the entry that recType hands out, so that all inputs share one name.
+struct FuzzTable {
+    // strColumns is what stands between the parentheses of the CREATE statement.
+    FuzzTable(FuzzDatabase& database, const Json::Value& jMembers, const std::string& strColumns);
+
+    std::string rows(FuzzDatabase& database) const;
+
+    std::string strName = "t";
+    Json::Value jDefinition;
+    std::string strCreate;
+    VornJsonDbApi api;
+};

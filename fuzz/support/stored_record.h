@@ -1,0 +1,22 @@
+// What becomes of a record, said once more and without the library: the judge of the record target.
+#pragma once
+
+#include <json/value.h>
+
+#include <string>
+
+struct Stored {
+    // kAny: a "%" stands before another value, so that the statement may become anything.
+    enum class End { kRow, kFails, kThrows, kAny };
+
+    End end = End::kFails;
+    Json::Value jRow;
+};
+
+// What recSave makes of the record in a table whose columns have no type.
+Stored storedRecord(const Json::Value& jMembers, const Json::Value& jRecord);
+
+// The record with the default of each member that it lacks.
+Json::Value withDefaults(const Json::Value& jMembers, Json::Value jRecord);
+
+bool passesTypeCheck(const Json::Value& jMembers, const Json::Value& jRecord);

@@ -1,0 +1,12 @@
+#include "support/json_text.h"
+
+#include <json/writer.h>
+
+std::string text(const Json::Value& jValue)
+{
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "";
+    builder["emitUTF8"] = true;
+    builder["useSpecialFloats"] = true;
+    return Json::writeString(builder, jValue);
+}

@@ -1,0 +1,9 @@
+// JSON as the tests and the fuzz targets show it.
+#pragma once
+
+#include <json/value.h>
+
+#include <string>
+
+// The value as one compact line.
+std::string text(const Json::Value& jValue);
