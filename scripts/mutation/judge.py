@@ -120,7 +120,8 @@ class Judge:
             objects[command[output]] = target
             command[output] = target
             copy = os.path.join(self.folder, source)
-            command[command.index("-c") + 1] = copy if os.path.exists(copy) else os.path.join(self.build.project, source)
+            if os.path.exists(copy):
+                command[command.index("-c") + 1] = copy
             command.insert(1, "-I" + os.path.join(self.folder, "src"))
             if not self.succeeds(command):
                 return False

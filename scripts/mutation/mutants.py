@@ -149,7 +149,8 @@ def statements(source):
         elif ";" == token.text:
             first, last = source.tokens[begin].begin, token.end
             statement = source.text[first:last]
-            if begin < i and enclosing and not DECLARATION.match(statement):
+            is_declaration = DECLARATION.match(statement) or source.text_of(i - 1) in ("delete", "default")
+            if begin < i and enclosing and not is_declaration:
                 yield first, last, ";" + "\n" * statement.count("\n")
             begin = i + 1
         i += 1

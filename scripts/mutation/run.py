@@ -97,7 +97,7 @@ def judge_all(pending, state, build, workers, paths):
 def listed_survivors():
     """(file, line of code, change) of each survivor that is known, with the reason."""
     reasons = {}
-    place = None
+    where = None
     waiting = []
     with open(LISTED) as file:
         for line in file:
@@ -105,17 +105,21 @@ def listed_survivors():
             if not text or text.startswith("# "):
                 continue
             if line.startswith("    "):
-                reasons.update({(*place, change): text for change in waiting})
+                reasons.update({(*where, change): text for change in waiting})
                 waiting = []
             elif line.startswith("  "):
                 waiting.append(text)
             else:
-                place = tuple(text.split(": ", 1))
+                where = tuple(text.split(": ", 1))
     return reasons
 
 
-def report(chosen, guards, state):
-    """Prints the tables; true when every survivor is listed with its reason."""
+def place(mutant):
+    return mutant.path, mutant.code, mutant.change
+
+
+def report(chosen, found, guards, state):
+    """Prints the tables; true when the list names exactly the survivors."""
     results = {mutant.key: state.result(mutant) for mutant in chosen}
     valid = [mutant for mutant in chosen if results[mutant.key] not in (None, "invalid")]
     survivors = [mutant for mutant in valid if "survived" == results[mutant.key]]
@@ -133,18 +137,19 @@ def report(chosen, guards, state):
     reasons = listed_survivors()
     print("\nsurvivors:")
     for mutant in survivors:
-        reason = reasons.get((mutant.path, mutant.code, mutant.change), "NOT LISTED")
+        reason = reasons.get(place(mutant), "NOT LISTED")
         print(f"{mutant.path}:{mutant.line}:{mutant.column}: {mutant.change}\n    {mutant.code}\n    {reason}")
-    places = {(mutant.path, mutant.code, mutant.change) for mutant in survivors}
-    judged = {(mutant.path, mutant.code, mutant.change) for mutant in chosen if results[mutant.key]}
-    stale = [place for place in reasons if place in judged - places]
-    for place in stale:
-        print(f"listed, but killed: {place[0]}: {place[1]}: {place[2]}")
+    alive = {place(mutant) for mutant in survivors}
+    # A sample does not tell about the others.
+    unknown = {place(mutant) for of_file in found.values() for mutant in of_file if results.get(mutant.key) is None}
+    stale = [listed for listed in reasons if listed[0] in found and listed not in alive | unknown]
+    for listed in stale:
+        print("listed, but no survivor: " + ": ".join(listed))
     score = 100 * (len(valid) - len(survivors)) / len(valid) if valid else 0
     print(f"figure: mutation, mutants = {len(valid)}")
     print(f"figure: mutation, survivors = {len(survivors)}")
     print(f"figure: mutation, score = {score:.1f}")
-    return places <= set(reasons) and not stale
+    return alive <= set(reasons) and not stale
 
 
 def main():
@@ -171,7 +176,7 @@ def main():
     pending = [mutant for mutant in chosen if state.result(mutant) is None]
     if pending and not options.report:
         judge_all(pending, state, Build(PROJECT, os.path.join(FOLDER, "build"), texts), options.workers, paths)
-    if not report(chosen, guards, state):
+    if not report(chosen, found, guards, state):
         raise SystemExit(1)
 
 
