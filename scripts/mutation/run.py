@@ -97,20 +97,19 @@ def judge_all(pending, state, build, workers, paths):
 def listed_survivors():
     """(file, line of code, change) of each survivor that is known, with the reason."""
     reasons = {}
-    where = None
-    waiting = []
+    places, changes = [], []
     with open(LISTED) as file:
         for line in file:
             text = line.strip()
             if not text or text.startswith("# "):
-                continue
-            if line.startswith("    "):
-                reasons.update({(*where, change): text for change in waiting})
-                waiting = []
+                places, changes = [], []
+            elif line.startswith("    "):
+                reasons.update({(*where, change): text for where in places for change in changes})
+                changes = []
             elif line.startswith("  "):
-                waiting.append(text)
+                changes.append(text)
             else:
-                where = tuple(text.split(": ", 1))
+                places.append(text.split(": ", 1))
     return reasons
 
 
