@@ -146,6 +146,13 @@ TEST_F(DefaultValues, AreNoneWhereTheTypesAreAList)
     }
 }
 
+TEST_F(DefaultValues, OfANamelessMemberAreLostInAList)
+{
+    Table table(database_, R"({"":{"cpptype":"int"}})", "a");
+    EXPECT_EQ(Lines{error("lost data member=")}, lost(table, "[1]"));
+    EXPECT_EQ(Lines{error("lost data member=")}, lost(table, "{}"));
+}
+
 TEST_F(DefaultValues, AreNoneInATableWithoutMembers)
 {
     Table table(database_, "{}", "a");
