@@ -6,7 +6,7 @@ build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev 
                 iso-codes sqlite3)
 
 # The tests that run the whole suite in one process, and the hosts.
-whole_suite='^(in_memory|on_files|records|records_iso_codes|readme_host|header_host|header_host_runs|cxx11_host|malloc_host|plugin_host)$'
+whole_suite='^(in_memory|on_files|records|records_iso_codes|readme_host|header_host|header_host_runs|cxx11_host|malloc_host|plugin_host|crash|crash_check)$'
 
 say() {
     printf '== %s\n' "$*"
@@ -55,4 +55,10 @@ run_whole_suite() {
         return 1
     fi
     grep 'tests passed' "$1/tests.log"
+}
+
+# figures FILE...: what test programs printed as lines "figure: NAME = NUMBER", as one table.
+figures() {
+    say "figures"
+    awk -F ' = ' '/^figure: / && !seen[$0]++ { printf "%-60s %15s\n", substr($1, 9), $2 }' "$@"
 }

@@ -5,6 +5,7 @@ import re
 TOKEN = re.compile(r"""
     (?P<comment>//[^\n]*|/\*.*?\*/)
   | (?P<directive>(?m:^)[ \t]*\#(?:[^\n\\]|\\.|\\\n)*)
+  | (?P<attribute>__attribute__\(\((?:[^()]|\([^()]*\))*\)\))
   | (?P<string>"(?:[^"\\\n]|\\.)*")
   | (?P<char>'(?:[^'\\\n]|\\.)*')
   | (?P<number>\d[\w.]*)
@@ -24,12 +25,12 @@ class Token:
 
 
 class Source:
-    """A file's text, its tokens without comments and directives, and each bracket's partner."""
+    """A file's text, its tokens without comments, directives and attributes, and each bracket's partner."""
 
     def __init__(self, text):
         self.text = text
         found = [Token(match) for match in TOKEN.finditer(text)]
-        self.tokens = [token for token in found if token.kind not in ("comment", "directive")]
+        self.tokens = [token for token in found if token.kind not in ("comment", "directive", "attribute")]
         self.partner = {}
         opened = []
         for i, token in enumerate(self.tokens):

@@ -49,22 +49,26 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
         return -1;
     }
 
-    Json::Value::Members jmFieldName = memberNames(jRecParam);
+    MemberWalk types(jType);
     bool blWritten = false;
-    for (std::size_t i = 0; i < jmFieldName.size(); ++i) {
-        const bool blRawFilter = kRawFilterKey == jmFieldName[i];
-        if (!blRawFilter && !hasMember(jType, jmFieldName[i])) continue;
+    for (auto it = jRecParam.begin(), end = jRecParam.end(); it != end; ++it) {
+        std::string strField(memberName(it));
+        const bool blRawFilter = kRawFilterKey == strField;
+        if (nullptr == types.find(strField) && !blRawFilter) continue;
         strSqlWhereOut += blWritten ? pJoiner->szBetween : pJoiner->szBefore;
-        Json::Value& jTmp = jRecParam[jmFieldName[i]];
+        Json::Value& jTmp = *it;
         // Kept: a table that declares a member of the raw filter's name cannot be asked by it.
         if (blRawFilter) {
-            if (FAILED(!jRecParam[jmFieldName[i]].isString())) return -1;
+            if (FAILED_AS(!jTmp.isString(), "!jRecParam[jmFieldName[i]].isString()")) return -1;
             strSqlWhereOut.append(" ").append(jTmp.asString()).append(" ");
         } else if (jTmp.isArray()) {
-            if (FAILED(0 > SqlMakeByListField(jmFieldName[i].c_str(), jTmp, strSqlWhereOut)))
+            if (FAILED_AS(0 > SqlMakeByListField(strField.c_str(), jTmp, strSqlWhereOut),
+                          "0 > SqlMakeByListField(jmFieldName[i].c_str(), jTmp, strSqlWhereOut)"))
                 return -1;
         } else {
-            if (FAILED(0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut))) return -1;
+            if (FAILED_AS(0 > SqlMakeByMatchField(strField, jTmp, strSqlWhereOut),
+                          "0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut)"))
+                return -1;
         }
         blWritten = true;
     }
@@ -100,9 +104,7 @@ int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jPara
         if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
         break;
     }
-    std::string strTerm = strField;
-    strTerm.append("=").append(szQuote).append(szSql).append(szQuote);
-    out += strTerm;
+    out.append(strField).append("=").append(szQuote).append(szSql).append(szQuote);
     return 0;
 }
 

@@ -25,11 +25,15 @@
 
 #include <algorithm>
 #include <cstring>
+#include <stdexcept>
 #include <utility>
 
 namespace {
 
 constexpr unsigned kMaxField = 4096;
+
+// Bytes that most value lists find enough.
+constexpr std::size_t kUsualList = 256;
 
 enum class TypeKind {
     kEnd,
@@ -120,38 +124,42 @@ Conversion readConversion(const char*& szText)
     return conversion;
 }
 
-// A lack of memory ends in std::logic_error, as constructing a string from SQLite's null does.
+// Formats the argument and appends it. A lack of memory ends in std::logic_error, as constructing a
+// string from SQLite's null does.
 template <typename Argument>
-std::string format(const char* szFormat, Argument argument)
+void append(std::string& strOut, const char* szFormat, Argument argument)
 {
     const SqliteText szText(sqlite3_mprintf(szFormat, argument));
-    return std::string(static_cast<const char*>(szText));
+    if (!szText) throw std::logic_error("no memory for a formatted text");
+    strOut += szText;
 }
 
-std::string formatInteger(const Conversion& conversion, long long iValue)
+void appendInteger(std::string& strOut, const Conversion& conversion, long long iValue)
 {
     const char* szFormat = conversion.strFormat.c_str();
-    if (TypeKind::kCharacter == conversion.type) return format(szFormat, static_cast<int>(iValue));
+    if (TypeKind::kCharacter == conversion.type)
+        return append(strOut, szFormat, static_cast<int>(iValue));
     if (TypeKind::kPointer == conversion.type || 2 == conversion.iLongs)
-        return format(szFormat, iValue);
-    if (1 == conversion.iLongs) return format(szFormat, static_cast<long>(iValue));
-    return format(szFormat, static_cast<int>(iValue));
+        return append(strOut, szFormat, iValue);
+    if (1 == conversion.iLongs) return append(strOut, szFormat, static_cast<long>(iValue));
+    return append(strOut, szFormat, static_cast<int>(iValue));
 }
 
-std::string formatConversion(const Conversion& conversion, const FormatArgument& argument)
+void appendConversion(std::string& strOut, const Conversion& conversion,
+                      const FormatArgument& argument)
 {
+    const char* szFormat = conversion.strFormat.c_str();
     switch (conversion.type) {
     case TypeKind::kSigned:
     case TypeKind::kUnsigned:
     case TypeKind::kPointer:
-    case TypeKind::kCharacter: return formatInteger(conversion, argument.iValue);
-    case TypeKind::kFloat: return format(conversion.strFormat.c_str(), argument.dValue);
-    case TypeKind::kText: return format(conversion.strFormat.c_str(), argument.szValue);
-    case TypeKind::kPercent: return format(conversion.strFormat.c_str(), 0);
+    case TypeKind::kCharacter: return appendInteger(strOut, conversion, argument.iValue);
+    case TypeKind::kFloat: return append(strOut, szFormat, argument.dValue);
+    case TypeKind::kText: return append(strOut, szFormat, argument.szValue);
+    case TypeKind::kPercent: return append(strOut, szFormat, 0);
     case TypeKind::kLength:
     case TypeKind::kEnd: break;
     }
-    return std::string();
 }
 
 // Formats a text that holds conversions.
@@ -171,21 +179,20 @@ std::string formatText(const char* szText, FormatArgument value)
         for (int i = 0; i < conversion.iStars; ++i) takeSlot();
         const FormatArgument argument =
             TypeKind::kPercent == conversion.type ? FormatArgument() : takeSlot();
-        strOut += formatConversion(conversion, argument);
+        appendConversion(strOut, conversion, argument);
         // The character with the code 0 ends the text.
         if (TypeKind::kCharacter == conversion.type && 0 == static_cast<int>(argument.iValue))
             return strOut;
     }
 }
 
-std::string formatValue(const char* szConversion, const FormatArgument& argument)
+void appendFormatted(std::string& strOut, const char* szConversion, const FormatArgument& argument)
 {
     switch (argument.kind) {
-    case FormatArgument::Kind::kInteger: return format(szConversion, argument.iValue);
-    case FormatArgument::Kind::kFloat: return format(szConversion, argument.dValue);
-    case FormatArgument::Kind::kText: break;
+    case FormatArgument::Kind::kInteger: return append(strOut, szConversion, argument.iValue);
+    case FormatArgument::Kind::kFloat: return append(strOut, szConversion, argument.dValue);
+    case FormatArgument::Kind::kText: return append(strOut, szConversion, argument.szValue);
     }
-    return format(szConversion, argument.szValue);
 }
 
 bool isPlain(const std::string& strText)
@@ -198,6 +205,7 @@ bool isPlain(const std::string& strText)
 FormattedText::FormattedText(std::string strText)
     : strText_(std::move(strText)), blPlain_(isPlain(strText_))
 {
+    strText_.reserve(strText_.size() + kUsualList);
 }
 
 void FormattedText::appendValue(const char* szConversion, const FormatArgument& argument)
@@ -207,7 +215,7 @@ void FormattedText::appendValue(const char* szConversion, const FormatArgument& 
         blPlain_ = isPlain(strText_);
         return;
     }
-    const std::string strValue = formatValue(szConversion, argument);
-    strText_ += strValue;
-    blPlain_ = std::string::npos == strValue.find('%');
+    const std::size_t nBefore = strText_.size();
+    appendFormatted(strText_, szConversion, argument);
+    blPlain_ = std::string::npos == strText_.find('%', nBefore);
 }

@@ -5,6 +5,8 @@
 
 #include <VornJsonDbApi.h>
 
+#include <utility>
+
 using VORN_JSON_DB::jsonCopyMember;
 
 // SELECT a,b FROM t  WHERE  (a='x' ) order by 'a' LIMIT 1;
@@ -27,9 +29,8 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
     if (FAILED(0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
     if (FAILED(0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit))) return fail();
     if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();  // Guard: always 0
-    strSqlPrefix.append(" FROM ").append(strName).append(" ");
-
-    strSqlRun = strSqlPrefix;
+    strSqlRun = std::move(strSqlPrefix);
+    strSqlRun.append(" FROM ").append(strName).append(" ");
     // Kept: two blanks stand before WHERE.
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun.append(strSqlLimit).append(";");

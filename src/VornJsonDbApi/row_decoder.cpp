@@ -27,8 +27,7 @@ std::string& strCurJsonName = *new std::string;
 // What was thrown in the row callback; nothing may unwind through SQLite's own frames.
 std::exception_ptr& pThrownInCallback = *new std::exception_ptr;
 
-// The member types of that table, once a row of the running statement has asked for them and they
-// are an object.
+// The member types of that table, once a row has asked for them: the entry stays where it is.
 const Json::Value* pjMemberTypes = nullptr;
 
 // What a column of the result becomes. Kept for the next statement, which checks it once.
@@ -48,16 +47,17 @@ struct Prototype {
 };
 Prototype& prototype = *new Prototype;
 
-// Rows of the running statement that were filled by name. One is the rule, and needs no prototype.
-int iRowsByName = 0;
+// Whether a row that is filled by name has met a column for the first time, or with another type.
+bool blNewColumn = false;
 
 const Json::Value& memberTypes()
 {
-    if (nullptr != pjMemberTypes) return *pjMemberTypes;
-    Json::Value jTableDef;
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strCurJsonName);
-    if (jType.isObject()) pjMemberTypes = &jType;
-    return jType;
+    // What is no object is asked for again, which logs.
+    if (nullptr == pjMemberTypes || !pjMemberTypes->isObject()) {
+        Json::Value jTableDef;
+        pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, strCurJsonName);
+    }
+    return *pjMemberTypes;
 }
 
 // A copy of the name that is never released, so that all records can share it as their key.
@@ -80,6 +80,7 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strName)")) return nullptr;
     std::string strType = typeWordOf(*pjMember);
     if (!blSameName || strType != column.strType) {
+        blNewColumn = true;
         column.blChecked = false;
         prototype.order.clear();
         column.szName = sharedName(szName);
@@ -98,13 +99,15 @@ int saturatedToInt(const char* szText)
 // Sets the member from the text of its column.
 void decode(Decode way, const char* szValue, Json::Value& jMember)
 {
+    // Cheaper than an assignment, which moves comments and offsets too.
+    const auto set = [&jMember](Json::Value jValue) { jMember.swapPayload(jValue); };
     switch (way) {
-    case Decode::kText: jMember = szValue; break;
+    case Decode::kText: set(szValue); break;
     // Kept: unsigned words too are read through the signed conversions and saturate there.
-    case Decode::kInt32: jMember = saturatedToInt(szValue); break;
-    case Decode::kInt64: jMember = Json::Int64(strtoll(szValue, nullptr, 10)); break;
+    case Decode::kInt32: set(saturatedToInt(szValue)); break;
+    case Decode::kInt64: set(Json::Int64(strtoll(szValue, nullptr, 10))); break;
     case Decode::kJson: fromString(szValue, jMember); break;
-    case Decode::kBool: jMember = 1 == strtol(szValue, nullptr, 10); break;
+    case Decode::kBool: set(1 == strtol(szValue, nullptr, 10)); break;
     case Decode::kNo: break;  // Guard: the caller has refused it
     }
 }
@@ -165,44 +168,66 @@ void makePrototype(std::size_t nColumns)
     prototype.order.swap(order);
 }
 
-// Whether the row has the prototype's columns, each with a value that can be decoded.
-bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name)
+// Whether the columns still have the types that they had in an earlier statement. Logs nothing: in
+// doubt the row is filled by name, which does.
+bool haveSameTypes()
 {
-    if (prototype.order.size() != nColumns || nullptr == column_name || nullptr == column_value)
-        return false;
-    for (std::size_t i = 0; i < nColumns; ++i) {
-        const Column& column = columns[i];
-        if (!column.blChecked || Decode::kNo == column.decode || nullptr == column_value[i] ||
-            nullptr == column_name[i] || 0 != strcmp(column.szName, column_name[i]))
+    if (nullptr == pjMemberTypes) return false;
+    MemberWalk types(*pjMemberTypes);
+    std::string strBuffer;
+    for (std::size_t i : prototype.order) {
+        Column& column = columns[i];
+        const Json::Value* pjMember = types.find(column.szName);
+        if (nullptr == pjMember || typeWordView(*pjMember, strBuffer) != column.strType)
             return false;
+        column.blChecked = true;
     }
     return true;
 }
 
-void fillFromPrototype(Json::Value& jRec, char** column_value)
+// Whether the row has the prototype's columns, each with a value that can be decoded.
+bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name)
 {
-    jRec = prototype.jRecord;
+    if (prototype.order.empty() || prototype.order.size() != nColumns || nullptr == column_name ||
+        nullptr == column_value)
+        return false;
+    bool blChecked = true;
+    for (std::size_t i = 0; i < nColumns; ++i) {
+        const Column& column = columns[i];
+        if (Decode::kNo == column.decode || nullptr == column_value[i] ||
+            nullptr == column_name[i] || 0 != strcmp(column.szName, column_name[i]))
+            return false;
+        blChecked = blChecked && column.blChecked;
+    }
+    return blChecked || haveSameTypes();
+}
+
+Json::Value recordFromPrototype(char** column_value)
+{
+    Json::Value jRec = prototype.jRecord;
     auto it = jRec.begin();
     for (std::size_t i : prototype.order) {
         decode(columns[i].decode, column_value[i], *it);
         ++it;
     }
+    return jRec;
 }
 
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
 {
-    Json::Value jTmp(Json::objectValue);
     if (FAILED(!pjRecArray)) return -1;
     if (FAILED(pjRecArray->type() != Json::arrayValue && pjRecArray->type() != Json::nullValue))
         return -1;
     const auto nColumns = static_cast<std::size_t>(std::max(0, n_column));
-    if (0 < n_column && fitsPrototype(nColumns, column_value, column_name)) {
-        fillFromPrototype(jTmp, column_value);
-    } else {
-        if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
-        if (1 < ++iRowsByName && prototype.order.empty()) makePrototype(nColumns);
+    if (fitsPrototype(nColumns, column_value, column_name)) {
+        pjRecArray->append(recordFromPrototype(column_value));
+        return 0;
     }
+    Json::Value jTmp(Json::objectValue);
+    blNewColumn = false;
+    if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
     pjRecArray->append(std::move(jTmp));
+    if (!blNewColumn && prototype.order.empty()) makePrototype(nColumns);
     return 0;
 }
 
@@ -220,9 +245,10 @@ int DbCallBackFillList(void* arg, int n_column, char** column_value, char** colu
 
 void beginStatement(const std::string& strTable)
 {
-    strCurJsonName = strTable;
-    pjMemberTypes = nullptr;
-    iRowsByName = 0;
+    if (strCurJsonName != strTable) {
+        pjMemberTypes = nullptr;
+        strCurJsonName = strTable;
+    }
     for (Column& column : columns) column.blChecked = false;
 }
 

@@ -27,7 +27,7 @@ int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     if (!jType.isObject()) return 0;
     MemberWalk present(jParam);
-    for (auto it = jType.begin(); it != jType.end(); ++it) {
+    for (auto it = jType.begin(), end = jType.end(); it != end; ++it) {
         const std::string_view strKey = memberName(it);
         if (nullptr != present.find(strKey)) continue;
         if (blCheckOnly) {
@@ -47,7 +47,8 @@ int VornJsonDbApi::checkJsonType(Json::Value& jRecParam)
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     if (FAILED(!jRecParam.isObject())) return -1;
     MemberWalk types(jType);
-    for (auto it = jRecParam.begin(); it != jRecParam.end(); ++it) {
+    const Json::Value& jRec = jRecParam;
+    for (auto it = jRec.begin(), end = jRec.end(); it != end; ++it) {
         const std::string_view strKey = memberName(it);
         const Json::Value* pjMember = types.find(strKey);
         if (nullptr == pjMember) continue;

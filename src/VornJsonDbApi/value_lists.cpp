@@ -59,7 +59,7 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
     const Json::Value& jMembers = declaredMembers(jTableDef, strName);
     MemberWalk values(nullptr == rec ? Json::Value::nullSingleton() : *rec);
     Json::ArrayIndex nLeft = jMembers.size();
-    for (auto it = jMembers.begin(); it != jMembers.end(); ++it) {
+    for (auto it = jMembers.begin(); 0 < nLeft; ++it) {
         --nLeft;
         const std::string_view strKey = memberName(it);
         if (nullptr != rec && nullptr == values.find(strKey)) continue;
@@ -79,7 +79,7 @@ int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
     MemberWalk types(jType);
     MemberWalk values(rec);
     Json::ArrayIndex nLeft = jMembers.size();
-    for (auto it = jMembers.begin(); it != jMembers.end(); ++it) {
+    for (auto it = jMembers.begin(); 0 < nLeft; ++it) {
         --nLeft;
         const std::string_view strKey = memberName(it);
         const Json::Value* pjMember = types.find(strKey);

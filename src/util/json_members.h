@@ -23,11 +23,6 @@ inline bool hasMember(const Json::Value& jValue, std::string_view strKey)
     return nullptr != findMember(jValue, strKey);
 }
 
-inline Json::Value::Members memberNames(const Json::Value& jValue)
-{
-    return jValue.isObject() ? jValue.getMemberNames() : Json::Value::Members();
-}
-
 // The name at an iterator over an object.
 inline std::string_view memberName(const Json::Value::const_iterator& it)
 {
@@ -36,36 +31,66 @@ inline std::string_view memberName(const Json::Value::const_iterator& it)
     return {szName, static_cast<std::size_t>(szEnd - szName)};
 }
 
-// Finds members of a value that are asked for in ascending order of their names (the order in which
-// jsoncpp holds them) in one walk.
+// Finds members of a value that are asked for once each, in ascending order of their names (the
+// order in which jsoncpp holds them), in one walk.
 class MemberWalk {
 public:
     explicit MemberWalk(const Json::Value& jValue)
     {
         if (!jValue.isObject()) return;
         it_ = jValue.begin();
-        end_ = jValue.end();
+        nLeft_ = jValue.size();
     }
 
     // The member, or null where there is none.
     const Json::Value* find(std::string_view strKey)
     {
-        for (; it_ != end_; ++it_) {
+        for (; 0 < nLeft_; --nLeft_, ++it_) {
             const int iOrder = memberName(it_).compare(strKey);
-            if (0 == iOrder) return &*it_;
             if (0 < iOrder) break;
+            if (0 == iOrder) return next();
         }
         return nullptr;
     }
 
 private:
+    const Json::Value* next()
+    {
+        const Json::Value& jMember = *it_;
+        ++it_;
+        --nLeft_;
+        return &jMember;
+    }
+
     Json::Value::const_iterator it_;
-    Json::Value::const_iterator end_;
+    Json::ArrayIndex nLeft_ = 0;
 };
 
-// The type word of a member as the cache of member types holds it, as text.
+// "cpptype" of a member as the cache of member types holds it, or null where there is none. It is
+// the last by name, as far as the library fills the cache, and is looked at before a search.
+inline const Json::Value* typeWordValue(const Json::Value& jMember)
+{
+    if (!jMember.isObject() || 0 == jMember.size()) return nullptr;
+    auto last = jMember.end();
+    --last;
+    return "cpptype" == memberName(last) ? &*last : findMember(jMember, "cpptype");
+}
+
+// The type word of a member, empty where there is none. A host may have put something else than a
+// text there: its text is then in strBuffer.
+inline std::string_view typeWordView(const Json::Value& jMember, std::string& strBuffer)
+{
+    const Json::Value* pjWord = typeWordValue(jMember);
+    if (nullptr == pjWord) return {};
+    const char* szBegin = nullptr;
+    const char* szEnd = nullptr;
+    if (pjWord->getString(&szBegin, &szEnd))
+        return {szBegin, static_cast<std::size_t>(szEnd - szBegin)};
+    return strBuffer = pjWord->asString();
+}
+
 inline std::string typeWordOf(const Json::Value& jMember)
 {
-    const Json::Value* pjWord = findMember(jMember, "cpptype");
-    return nullptr == pjWord ? std::string() : pjWord->asString();
+    std::string strBuffer;
+    return std::string(typeWordView(jMember, strBuffer));
 }

@@ -11,9 +11,17 @@
 
 namespace {
 
+// Bytes that most texts find enough.
+constexpr std::size_t kUsualText = 128;
+
 // Collects what a stream writes in a string.
 class StringBuffer : public std::streambuf {
 public:
+    void start()
+    {
+        strText_.clear();
+        strText_.reserve(kUsualText);
+    }
     std::string take() { return std::exchange(strText_, std::string()); }
 
 protected:
@@ -46,7 +54,7 @@ public:
 
     std::string text(const Json::Value& jValue)
     {
-        buffer_.take();
+        buffer_.start();
         stream_.clear();
         pWriter_->write(jValue, &stream_);
         return buffer_.take();

@@ -54,20 +54,32 @@ bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jT
     return !FAILED(jType == Json::nullValue || !jType.isMember(strJsonName));
 }
 
+// The entry that was asked for last: an operation asks for the same one several times.
+struct LastEntry {
+    std::string strName;
+    Json::Value* pjEntry = nullptr;
+};
+
 }  // namespace
 
 Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonName)
 {
     // Never destroyed: references to its entries stay valid until the process ends.
     static Json::Value& jType = *new Json::Value;
+    static LastEntry& last = *new LastEntry;
+    if (nullptr != last.pjEntry && last.strName == strJsonName && last.pjEntry->isObject())
+        return *last.pjEntry;
 
     Json::Value* pjEntry = findMember(jType, strJsonName);
     if (nullptr == pjEntry && fillEntry(jTableDef, strJsonName, jType))
         pjEntry = findMember(jType, strJsonName);
     if (nullptr != pjEntry &&
         !FAILED_AS(pjEntry->type() != Json::objectValue,
-                                         "jType[strJsonName].type() != Json::objectValue"))
+                                         "jType[strJsonName].type() != Json::objectValue")) {
+        last.strName = strJsonName;
+        last.pjEntry = pjEntry;
         return *pjEntry;
+    }
 
     LOG_PLAIN("strJsonName=%s", strJsonName.c_str());
     LOG_PLAIN("jTableDef=%s", toString(jTableDef).c_str());

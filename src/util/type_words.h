@@ -60,10 +60,6 @@ inline const TypeWord& typeWord(std::string_view strWord)
 // The row of a member's type word as the cache of member types holds it.
 inline const TypeWord& typeWordRow(const Json::Value& jMember)
 {
-    const Json::Value* pjWord = findMember(jMember, "cpptype");
-    const char* szBegin = nullptr;
-    const char* szEnd = nullptr;
-    if (nullptr == pjWord || !pjWord->getString(&szBegin, &szEnd))
-        return typeWord(typeWordOf(jMember));
-    return typeWord({szBegin, static_cast<std::size_t>(szEnd - szBegin)});
+    std::string strBuffer;
+    return typeWord(typeWordView(jMember, strBuffer));
 }

@@ -1,0 +1,224 @@
+// Kills writers at random moments and checks after each kill what is left in their database.
+//
+//     crash KILLS [FOLDER]
+//
+// In FOLDER the count is kept, and a run that was interrupted goes on with it, on a new database.
+// VORN_CRASH_SEED repeats what the writers do and the moments at which they are killed, as far as a
+// machine can; the seed of a run is printed.
+
+#include "crash/expected.h"
+#include "crash/victim.h"
+
+#include <unistd.h>
+#include <chrono>
+#include <cmath>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iostream>
+
+namespace {
+
+namespace fs = std::filesystem;
+using Figures = std::map<std::string, long long>;
+
+constexpr unsigned kMostAcknowledged = 12;
+constexpr double kLongestMicroseconds = 10000;
+constexpr const char* kFiles[] = {"", "-journal", "-wal", "-shm"};
+constexpr const char* kNames[] = {"kills",
+                                  "kills while the next one opens",
+                                  "acknowledged operations",
+                                  "killed between operations",
+                                  "killed in an operation, absent",
+                                  "killed in an operation, whole",
+                                  "hot journals left",
+                                  "lost or wrong",
+                                  "corrupt",
+                                  "writers that failed"};
+
+Figures load(const fs::path& file)
+{
+    Figures figures;
+    std::ifstream in(file);
+    std::string strName;
+    for (long long iValue; std::getline(in, strName, '=') && in >> iValue >> std::ws;)
+        figures[strName] = iValue;
+    return figures;
+}
+
+void save(const Figures& figures, const fs::path& file)
+{
+    const fs::path part = file.string() + ".part";
+    std::ofstream out(part);
+    for (const auto& [strName, iValue] : figures) out << strName << '=' << iValue << '\n';
+    out.close();
+    fs::rename(part, file);
+}
+
+unsigned seed()
+{
+    const char* szSeed = std::getenv("VORN_CRASH_SEED");
+    if (nullptr != szSeed) return static_cast<unsigned>(std::strtoul(szSeed, nullptr, 10));
+    return std::random_device()();
+}
+
+using Clock = std::chrono::steady_clock;
+using Span = std::chrono::duration<double, std::micro>;
+
+// Either somewhere within the time that an operation takes, or from one microsecond to ten
+// milliseconds, short ones as likely as long ones. Busy, as a sleep is not that exact.
+void passSomeTime(Span operation, std::mt19937& random)
+{
+    const bool blWithin = 0 == random() % 2;
+    const double dPart = std::uniform_real_distribution<double>(0, 1)(random);
+    const Span span = blWithin ? operation * dPart : Span(std::pow(kLongestMicroseconds, dPart));
+    const auto begin = Clock::now();
+    while (Clock::now() - begin < span) {
+    }
+}
+
+class Run {
+public:
+    Run(fs::path folder, Figures& figures) : folder_(std::move(folder)), figures_(figures)
+    {
+        for (const char* szEnd : kFiles) fs::remove(database() + szEnd);
+    }
+
+    // One kill, or two. False when something is not as it has to be.
+    bool round(unsigned uSeed)
+    {
+        const long long iRound = figures_["kills"];
+        std::seed_seq sequence{uSeed, static_cast<unsigned>(iRound)};
+        std::mt19937 random(sequence);
+        const std::string strMode = 0 == iRound % 2 ? "delete" : "wal";
+        const bool blKilled = killWriter(strMode, random);
+        if (hotJournal()) ++figures_["hot journals left"];
+        if (!blKilled || (0 == random() % 3 && !killOpening(strMode, random))) {
+            ++figures_["writers that failed"];
+            return false;
+        }
+        return judge();
+    }
+
+    // Out of the way of a later run.
+    std::string keepDatabase()
+    {
+        std::string strKept = folder_ / ("fault-" + std::to_string(figures_["kills"]) + ".db");
+        for (const char* szEnd : kFiles)
+            if (fs::exists(database() + szEnd)) fs::rename(database() + szEnd, strKept + szEnd);
+        return strKept;
+    }
+
+private:
+    std::string database() const { return folder_ / "crash.db"; }
+
+    // Some time after a number of acknowledgements, mostly counted from where the next operation
+    // begins.
+    bool killWriter(const std::string& strMode, std::mt19937& random)
+    {
+        Victim writer({VORN_CRASH_WRITER, database(), strMode, std::to_string(random()),
+                       std::to_string(expected_.iLastRevision)});
+        const long long iBefore = expected_.iAcknowledged;
+        const long long iUntil = iBefore + static_cast<int>(random() % (kMostAcknowledged + 1));
+        bool blGood = true;
+        const bool blWithin = 0 != random() % 4;
+        std::string strLine;
+        const auto begin = Clock::now();
+        do {
+            blGood = writer.line(strLine) && expected_.take(strLine);
+        } while (blGood && (expected_.iAcknowledged < iUntil || (blWithin && !expected_.pending)));
+        if (iBefore < iUntil) operation_ = (Clock::now() - begin) / (iUntil - iBefore);
+        passSomeTime(operation_, random);
+        blGood = writer.kill() && blGood;
+        while (blGood && writer.line(strLine)) blGood = expected_.take(strLine);
+        figures_["acknowledged operations"] += expected_.iAcknowledged - iBefore;
+        ++figures_["kills"];
+        return blGood;
+    }
+
+    // While it recovers what the killed one left, or not yet, or no more.
+    bool killOpening(const std::string& strMode, std::mt19937& random)
+    {
+        Victim opener({VORN_CRASH_WRITER, database(), strMode});
+        std::string strLine;
+        const bool blGood = opener.line(strLine);
+        passSomeTime(operation_, random);
+        ++figures_["kills while the next one opens"];
+        return opener.kill() && blGood;
+    }
+
+    // A rollback journal that has to be played back: its header is not wiped.
+    bool hotJournal() const
+    {
+        std::ifstream journal(database() + "-journal", std::ios::binary);
+        return 0 < journal.get();
+    }
+
+    bool judge()
+    {
+        const Verdict verdict = check(database(), expected_);
+        if (!verdict.strWrong.empty()) ++figures_["lost or wrong"];
+        if (!verdict.strCorrupt.empty()) ++figures_["corrupt"];
+        for (const std::string& strFault : {verdict.strWrong, verdict.strCorrupt})
+            if (!strFault.empty())
+                std::cout << "kill " << figures_["kills"] << ": " << strFault << '\n';
+        switch (verdict.pending) {
+        case Verdict::kNone: ++figures_["killed between operations"]; break;
+        case Verdict::kAbsent: ++figures_["killed in an operation, absent"]; break;
+        case Verdict::kWhole:
+            ++figures_["killed in an operation, whole"];
+            expected_.state = after(expected_.state, *expected_.pending);
+            break;
+        }
+        expected_.pending.reset();
+        return verdict.strWrong.empty() && verdict.strCorrupt.empty();
+    }
+
+    fs::path folder_;
+    Figures& figures_;
+    Expected expected_;
+    Span operation_{1000};
+};
+
+fs::path temporaryFolder()
+{
+    std::string strFolder = "crash-XXXXXX";
+    if (nullptr == mkdtemp(strFolder.data())) std::abort();
+    return strFolder;
+}
+
+// The numbers of faults come last; a fault of an earlier part of the run counts too.
+bool show(Figures& figures)
+{
+    for (const char* szName : kNames)
+        std::cout << "figure: crash, " << szName << " = " << figures[szName] << '\n';
+    return 0 == figures["lost or wrong"] + figures["corrupt"] + figures["writers that failed"];
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    const long long iKills = 1 < argc ? std::strtoll(argv[1], nullptr, 10) : 0;
+    if (1 > iKills) {
+        std::cerr << "usage: crash KILLS [FOLDER]\n";
+        return 2;
+    }
+    const bool blKept = 2 < argc;
+    const fs::path folder = blKept ? fs::path(argv[2]) : temporaryFolder();
+    fs::create_directories(folder);
+    Figures figures = load(folder / "progress");
+    figures.emplace("seed", seed());
+    const auto uSeed = static_cast<unsigned>(figures["seed"]);
+    std::cout << "VORN_CRASH_SEED=" << uSeed << ", from kill " << figures["kills"] << std::endl;
+
+    bool blGood = true;
+    for (Run run(folder, figures); blGood && figures["kills"] < iKills;) {
+        blGood = run.round(uSeed);
+        save(figures, folder / "progress");
+        if (!blGood) std::cout << "see " << run.keepDatabase() << '\n';
+    }
+    const bool blSound = show(figures);
+    if (!blKept && blSound) fs::remove_all(folder);
+    return blSound ? 0 : 1;
+}

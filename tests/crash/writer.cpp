@@ -1,0 +1,59 @@
+// A host that writes until it is killed. It tells its parent on kReport what it is about to do, and
+// that it is done, and ends by itself only when something fails.
+//
+//     crash_writer DATABASE JOURNAL_MODE SEED LAST_REVISION    writes
+//     crash_writer DATABASE JOURNAL_MODE                       opens the database and lists it
+
+#include "crash/expected.h"
+
+#include <unistd.h>
+#include <cstdlib>
+
+namespace {
+
+void report(std::string strLine)
+{
+    strLine += '\n';
+    if (static_cast<ssize_t>(strLine.size()) != write(kReport, strLine.data(), strLine.size()))
+        std::exit(4);
+}
+
+bool prepare(Store& store, const std::string& strMode)
+{
+    // Little room, so that pages reach the database and its log before a transaction ends.
+    return strMode == store.value("pragma journal_mode=" + strMode) &&
+           store.run("pragma cache_size=8; pragma wal_autocheckpoint=20");
+}
+
+bool load(Store& store, State& state)
+{
+    Json::Value jRecords;
+    if (!store.list(jRecords)) return false;
+    for (const Json::Value& jRecord : jRecords)
+        state[jRecord["id"].asInt()] = jRecord["rev"].asInt();
+    return true;
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    if (3 != argc && 5 != argc) return 1;
+    report("open");
+    Store store(argv[1]);
+    State state;
+    if (!prepare(store, argv[2]) || !load(store, state)) return 2;
+    report("ready");
+    if (3 == argc)
+        for (;;) pause();
+
+    std::mt19937 random(static_cast<unsigned>(std::strtoul(argv[3], nullptr, 10)));
+    int iRevision = static_cast<int>(std::strtol(argv[4], nullptr, 10));
+    for (;;) {
+        const Operation operation = plan(state, random, iRevision);
+        report("begin " + toLine(operation));
+        if (!perform(store, operation)) return 3;
+        report("done");
+        state = after(state, operation);
+    }
+}
