@@ -44,4 +44,20 @@ TEST_F(NamelessColumn, WithAnEmptyTypeWordIsOfNoType)
     EXPECT_EQ(linesBehind(error("type error, strType="), 80), refused(table, 80));
 }
 
+class OtherColumns : public TableTest {};
+
+TEST_F(OtherColumns, OfTheNextNameAreNotTakenForTheOnesBefore)
+{
+    Table table(database_, R"({"a":{"cpptype":"string"},"b":{"cpptype":"string"}})", "a");
+    for (const char* szName : {"a", "b", "a"}) {
+        const std::string strName = szName;
+        for (int i = 0; i < 3; ++i) {
+            Json::Value jRows;
+            EXPECT_EQ(0,
+                      table.api.runSqlEx("select 'x' as " + strName, rowCallback(table), &jRows));
+            EXPECT_EQ("[{\"" + strName + "\":\"x\"}]", text(jRows));
+        }
+    }
+}
+
 }  // namespace
