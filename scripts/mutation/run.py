@@ -35,10 +35,11 @@ class State:
                     self.results[entry["key"]] = entry
 
     def result(self, mutant):
+        return self.results.get(mutant.key, {}).get("result")
+
+    def is_pending(self, mutant):
         entry = self.results.get(mutant.key)
-        if entry is None or ("survived" == entry["result"] and entry["tests"] != self.tests):
-            return None
-        return entry["result"]
+        return entry is None or ("survived" == entry["result"] and entry["tests"] != self.tests)
 
     def keep(self, mutant, result):
         entry = {"key": mutant.key, "result": result, "tests": self.tests}
@@ -172,7 +173,7 @@ def main():
 
     tests = "".join(texts_of("tests/**/*.cpp").values()) + "".join(texts_of("tests/**/*.h").values())
     state = State(os.path.join(FOLDER, "results.jsonl"), hashlib.sha256(tests.encode()).hexdigest())
-    pending = [mutant for mutant in chosen if state.result(mutant) is None]
+    pending = [mutant for mutant in chosen if state.is_pending(mutant)]
     if pending and not options.report:
         judge_all(pending, state, Build(PROJECT, os.path.join(FOLDER, "build"), texts), options.workers, paths)
     if not report(chosen, found, guards, state):
