@@ -240,6 +240,7 @@ TEST_F(Create, FindsTheDuplicateAnywhereInTheErrorText)
         {"trigger: UNIQUE constraint failed: t.a, t.b", kDuplicate},
         {"unique constraint failed: t.a", ""},
         {"UNIQUE constraint", ""},
+        {"UNIQUE constraint faile", ""},
         {"", ""},
         {"PRIMARY KEY must be unique", ""},
     };

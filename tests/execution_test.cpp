@@ -173,6 +173,7 @@ TEST_F(Execution, ReportsAFailureOnce)
           {SQLITE_BUSY, "Database is locked", "Database is locked"},
           {SQLITE_LOCKED, "database table is locked", "database table is locked"},
           {-1, "database is  locked", "database is  locked"},
+          {SQLITE_BUSY, "database is locke", "database is locke"},
           {SQLITE_ERROR, "%n%s%d", "%n%s%d"}}) {
         for (bool blDebug : {false, true}) {
             SCOPED_TRACE(row.szShown);
@@ -189,6 +190,21 @@ TEST_F(Execution, ReportsAFailureOnce)
         }
     }
     EXPECT_TRUE(state().sleeps.empty());
+}
+
+TEST_F(Execution, RunsATextOfOneCharacter)
+{
+    EXPECT_EQ(0, table_.api.runSqlEx(";", countRow, nullptr));
+    EXPECT_EQ(std::vector<std::string>{";"}, takeStatements());
+    EXPECT_EQ(Lines(), takeLog());
+}
+
+TEST_F(Execution, ReportsTheNearestNegativeCount)
+{
+    state().changes = [] { return -1; };
+    state().exec = execOfStatus(SQLITE_OK, nullptr);
+    EXPECT_EQ(-1, run("a text"));
+    EXPECT_EQ(Lines{failureLine("Unknow Error!!", "a text")}, takeLog());
 }
 
 TEST_F(Execution, ReportsANegativeCount)

@@ -134,6 +134,12 @@ TEST_F(GetOne, ARowOfNullsLeavesANullOutput)
     jOut_ = json(R"({"mine":1})");
     EXPECT_EQ(1, table.api.recGetOne(jRequest_, jOut_));
     EXPECT_EQ(R"({"mine":1})", text(jOut_));
+
+    // The rows behind it make no difference.
+    database_.run("insert into " + table.strName + " values ('x')");
+    jOut_ = Json::nullValue;
+    EXPECT_EQ(1, table.api.recGetOne(jRequest_, jOut_));
+    EXPECT_TRUE(jOut_.isNull());
 }
 
 TEST_F(GetOne, RefusesAnOutputOfAnotherKindAfterTheListing)

@@ -62,6 +62,28 @@ TEST_F(StrangeRows, WithoutNamesOrValuesAreRefused)
     }
 }
 
+TEST_F(StrangeRows, WithoutNamesOrValuesBehindGoodOnesAreRefused)
+{
+    for (bool blNames : {false, true}) {
+        state().exec = [blNames](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
+                                 char** errText) {
+            std::string strName = "i";
+            std::string strValue = "1";
+            char* names[] = {&strName[0]};
+            char* values[] = {&strValue[0]};
+            for (int i = 0; i < 3; ++i) EXPECT_EQ(0, callback(arg, 1, values, names));
+            EXPECT_EQ(-1, callback(arg, 1, blNames ? nullptr : values, blNames ? names : nullptr));
+            *errText = doubles::errorText("query aborted");
+            return SQLITE_ABORT;
+        };
+        rows_ = Json::nullValue;
+        EXPECT_EQ(-1, run(&rows_));
+        EXPECT_EQ(stopped({failed("NULL == column_name || NULL == column_value"), failed(kRecord)}),
+                  takeLog());
+        EXPECT_EQ(R"([{"i":1},{"i":1},{"i":1}])", text(rows_));
+    }
+}
+
 TEST_F(StrangeRows, WithoutAFirstNameAreRefused)
 {
     state().exec = execOfRow({{nullptr, "i"}, {"7", "1"}});

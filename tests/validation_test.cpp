@@ -134,6 +134,25 @@ TEST_F(DefaultValues, AreReportedAsLostByTheFirstName)
     }
 }
 
+// A host may change what recType refers to.
+TEST_F(DefaultValues, AreNoneWhereTheTypesAreAList)
+{
+    VORN_JSON_DB::recType(abc_.jDefinition, abc_.strName) = json(R"([{"cppDefaultValue":5}])");
+    for (bool blCheckOnly : {false, true}) {
+        Json::Value jRecord(Json::objectValue);
+        EXPECT_EQ(0, abc_.api.fillDefaultValue(jRecord, blCheckOnly));
+        EXPECT_EQ("{}", text(jRecord));
+        EXPECT_EQ(utilFailed("jType[strJsonName].type() != Json::objectValue"), takeLog()[0]);
+    }
+}
+
+TEST_F(DefaultValues, OfANamelessMemberAreLostInAList)
+{
+    Table table(database_, R"({"":{"cpptype":"int"}})", "a");
+    EXPECT_EQ(Lines{error("lost data member=")}, lost(table, "[1]"));
+    EXPECT_EQ(Lines{error("lost data member=")}, lost(table, "{}"));
+}
+
 TEST_F(DefaultValues, AreNoneInATableWithoutMembers)
 {
     Table table(database_, "{}", "a");
