@@ -3,7 +3,7 @@ set -euo pipefail
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
 build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev libgtest-dev
-                iso-codes sqlite3)
+                iso-codes pkg-config sqlite3)
 
 # The tests that run the whole suite in one process, the hosts, and what fails, locks and kills.
 whole_suite='^(in_memory|on_files|records|records_iso_codes|[a-z0-9]+_host|header_host_runs|guarded|guarded_tests|crash|crash_check|threads|locks|faults_[a-z_]+|fuzz_replay_[a-z]+)$'

@@ -1,0 +1,38 @@
+# What is installed: the library with its links, the header, a package for find_package and one for
+# pkg-config, the guides and the licence. Both packages can be moved with what they belong to.
+include(GNUInstallDirs)
+include(CMakePackageConfigHelpers)
+
+set(header_folder ${CMAKE_INSTALL_INCLUDEDIR}/vornjsondb)
+set(package_folder ${CMAKE_INSTALL_LIBDIR}/cmake/VornJsonDb)
+
+install(TARGETS vornjsondb EXPORT VornJsonDb
+  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT vornjsondb_runtime
+    NAMELINK_COMPONENT vornjsondb_development
+  INCLUDES DESTINATION ${header_folder})
+install(FILES include/VornJsonDbApi.h DESTINATION ${header_folder}
+  COMPONENT vornjsondb_development)
+
+install(EXPORT VornJsonDb NAMESPACE VornJsonDb:: FILE VornJsonDbTargets.cmake
+  DESTINATION ${package_folder} COMPONENT vornjsondb_development)
+configure_package_config_file(cmake/VornJsonDbConfig.cmake.in VornJsonDbConfig.cmake
+  INSTALL_DESTINATION ${package_folder}
+  NO_SET_AND_CHECK_MACRO)
+write_basic_package_version_file(VornJsonDbConfigVersion.cmake COMPATIBILITY SameMajorVersion)
+install(FILES
+  ${CMAKE_CURRENT_BINARY_DIR}/VornJsonDbConfig.cmake
+  ${CMAKE_CURRENT_BINARY_DIR}/VornJsonDbConfigVersion.cmake
+  DESTINATION ${package_folder} COMPONENT vornjsondb_development)
+
+# Relative to the file itself, which stands in LIBDIR/pkgconfig.
+file(RELATIVE_PATH prefix_from_pc
+  ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+string(REGEX REPLACE "/$" "" prefix_from_pc "${prefix_from_pc}")
+configure_file(cmake/vornjsondb.pc.in vornjsondb.pc @ONLY)
+install(FILES ${CMAKE_CURRENT_BINARY_DIR}/vornjsondb.pc
+  DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT vornjsondb_development)
+
+install(FILES README.md LICENSE CHANGELOG.md SECURITY.md DESTINATION ${CMAKE_INSTALL_DOCDIR}
+  COMPONENT vornjsondb_documentation)
+install(DIRECTORY docs/ DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs
+  COMPONENT vornjsondb_documentation FILES_MATCHING PATTERN "*.md")
