@@ -74,6 +74,17 @@ TEST_F(KeptColumns, RefuseAWordThatIsNotDecoded)
     EXPECT_EQ(Lines(), takeLog());
 }
 
+// The columns are looked at in the order of the row.
+TEST_F(KeptColumns, RefuseTheFirstOfTwoBadWords)
+{
+    warmUp();
+    types()["s"]["cpptype"] = "double";
+    types()["i"]["cpptype"] = json("[]");
+    EXPECT_EQ("null", answer());
+    EXPECT_EQ(-1, iResult_);
+    EXPECT_EQ(error("type error, strType=double"), takeLog()[0]);
+}
+
 TEST_F(KeptColumns, RefuseAMemberThatIsGone)
 {
     warmUp();

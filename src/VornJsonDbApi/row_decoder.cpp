@@ -179,18 +179,22 @@ void makePrototype(std::size_t nColumns)
     prototype.order.swap(order);
 }
 
-// Whether the columns still have the types that they had in an earlier statement. Logs nothing: in
-// doubt the row is filled by name, which does.
+bool hasTypeWord(const Json::Value* pjMember, const std::string& strType)
+{
+    if (nullptr == pjMember) return false;
+    const Json::Value* pjWord = typeWordValue(*pjMember);
+    return nullptr != pjWord && pjWord->isString() && textOf(*pjWord) == strType;
+}
+
+// Whether the columns still have the types that they had in an earlier statement. Neither logs nor
+// throws: in doubt the row is filled by name, which does.
 bool haveSameTypes()
 {
     if (nullptr == pjMemberTypes) return false;
     MemberWalk types(*pjMemberTypes);
-    std::string strBuffer;
     for (std::size_t i : prototype.order) {
         Column& column = columns[i];
-        const Json::Value* pjMember = types.find(column.szName);
-        if (nullptr == pjMember || typeWordView(*pjMember, strBuffer) != column.strType)
-            return false;
+        if (!hasTypeWord(types.find(column.szName), column.strType)) return false;
         column.blChecked = true;
     }
     return true;

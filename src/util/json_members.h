@@ -66,6 +66,15 @@ private:
     Json::ArrayIndex nLeft_ = 0;
 };
 
+// The text of a JSON string.
+inline std::string_view textOf(const Json::Value& jString)
+{
+    const char* szBegin = nullptr;
+    const char* szEnd = nullptr;
+    jString.getString(&szBegin, &szEnd);
+    return {szBegin, static_cast<std::size_t>(szEnd - szBegin)};
+}
+
 // "cpptype" of a member as the cache of member types holds it, or null where there is none. It is
 // the last by name, as far as the library fills the cache, and is looked at before a search.
 inline const Json::Value* typeWordValue(const Json::Value& jMember)
@@ -82,10 +91,7 @@ inline std::string_view typeWordView(const Json::Value& jMember, std::string& st
 {
     const Json::Value* pjWord = typeWordValue(jMember);
     if (nullptr == pjWord) return {};
-    const char* szBegin = nullptr;
-    const char* szEnd = nullptr;
-    if (pjWord->getString(&szBegin, &szEnd))
-        return {szBegin, static_cast<std::size_t>(szEnd - szBegin)};
+    if (pjWord->isString()) return textOf(*pjWord);
     return strBuffer = pjWord->asString();
 }
 
