@@ -104,8 +104,8 @@ int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jPara
         if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
         break;
     }
-    std::string strTerm = strField;
-    strTerm.append("=").append(szQuote).append(szSql).append(szQuote);
+    std::string strTerm = strField + '=';
+    strTerm.append(szQuote).append(szSql).append(szQuote);
     out += strTerm;
     return 0;
 }

@@ -30,10 +30,10 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
     if (FAILED(0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit))) return fail();
     if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();  // Guard: always 0
     strSqlRun = std::move(strSqlPrefix);
-    strSqlRun.append(" FROM ").append(strName).append(" ");
+    strSqlRun.append(" FROM ").append(strName) += ' ';
     // Kept: two blanks stand before WHERE.
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
-    strSqlRun.append(strSqlLimit).append(";");
+    strSqlRun.append(strSqlLimit) += ';';
     if (FAILED(0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut))) return fail();
     return 0;
 }
@@ -44,8 +44,9 @@ int VornJsonDbApi::recGetOne(Json::Value& jRecParam, Json::Value& jRecOut)
     if (FAILED(0 > recList(jRecParam, jRecArray))) return -1;
     if (jRecArray.empty()) return 0;
     // The row may be moved where nothing has to be merged.
-    if (jRecOut.empty() && !jRecOut.isArray() && !jRecArray[0].empty())
-        jRecOut.swapPayload(jRecArray[0]);
+    Json::Value& jRow = *jRecArray.begin();
+    if (jRecOut.empty() && !jRecOut.isArray() && !jRow.empty())
+        jRecOut.swapPayload(jRow);
     else if (FAILED(0 > jsonCopyMember(jRecOut, jRecArray[0], true)))
         return -1;
     return 1;

@@ -14,6 +14,7 @@
 #include <cstring>
 #include <set>
 #include <string>
+#include <string_view>
 #include <system_error>
 #include <utility>
 #include <vector>
@@ -34,7 +35,7 @@ const Json::Value* pjMemberTypes = nullptr;
 
 // What a column of the result becomes. Kept for the next statement, which checks it once.
 struct Column {
-    const char* szName = "";
+    std::string_view name = "";  // ends in a NUL byte
     std::string strType;
     Decode decode = Decode::kNo;
     bool blChecked = false;
@@ -63,11 +64,11 @@ const Json::Value& memberTypes()
 }
 
 // A copy of the name that is never released, so that all records can share it as their key.
-const char* sharedName(const char* szName)
+std::string_view sharedName(const char* szName)
 {
     static auto& names = *new std::set<std::string, std::less<>>;
     const auto it = names.find(std::string_view(szName));
-    return (names.end() == it ? names.emplace(szName).first : it)->c_str();
+    return *(names.end() == it ? names.emplace(szName).first : it);
 }
 
 // The column at idx, or null, after the failed check's line, when the table has no such member.
@@ -75,7 +76,7 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
 {
     if (columns.size() <= idx) columns.resize(idx + 1);
     Column& column = columns[idx];
-    const bool blSameName = 0 == strcmp(column.szName, szName);
+    const bool blSameName = 0 == strcmp(column.name.data(), szName);
     if (blSameName && column.blChecked) return &column;
 
     const Json::Value* pjMember = findMember(memberTypes(), szName);
@@ -85,7 +86,7 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
         blNewColumn = true;
         column.blChecked = false;
         prototype.order.clear();
-        column.szName = sharedName(szName);
+        column.name = sharedName(szName);
         column.decode = typeWord(strType).decode;
         column.strType = std::move(strType);
     }
@@ -140,7 +141,7 @@ int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_val
         LOG_ERROR("type error, strType=%s", pColumn->strType.c_str());
         return -1;
     }
-    decode(pColumn->decode, szValue, jRec[Json::StaticString(pColumn->szName)]);
+    decode(pColumn->decode, szValue, jRec[Json::StaticString(pColumn->name.data())]);
     return 0;
 }
 
@@ -168,13 +169,12 @@ void makePrototype(std::size_t nColumns)
     Json::Value jRecord(Json::objectValue);
     std::vector<std::size_t> order;
     for (std::size_t i = 0; i < nColumns; ++i) {
-        jRecord[Json::StaticString(columns[i].szName)] = Json::nullValue;
+        jRecord[Json::StaticString(columns[i].name.data())] = Json::nullValue;
         order.push_back(i);
     }
     if (jRecord.size() != nColumns) return;
-    std::sort(order.begin(), order.end(), [](std::size_t i, std::size_t j) {
-        return 0 > strcmp(columns[i].szName, columns[j].szName);
-    });
+    std::sort(order.begin(), order.end(),
+              [](std::size_t i, std::size_t j) { return columns[i].name < columns[j].name; });
     prototype.jRecord.swap(jRecord);
     prototype.order.swap(order);
 }
@@ -194,7 +194,7 @@ bool haveSameTypes()
     MemberWalk types(*pjMemberTypes);
     for (std::size_t i : prototype.order) {
         Column& column = columns[i];
-        if (!hasTypeWord(types.find(column.szName), column.strType)) return false;
+        if (!hasTypeWord(types.find(column.name), column.strType)) return false;
         column.blChecked = true;
     }
     return true;
@@ -210,7 +210,7 @@ bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name
     for (std::size_t i = 0; i < nColumns; ++i) {
         const Column& column = columns[i];
         if (Decode::kNo == column.decode || nullptr == column_value[i] ||
-            nullptr == column_name[i] || 0 != strcmp(column.szName, column_name[i]))
+            nullptr == column_name[i] || 0 != strcmp(column.name.data(), column_name[i]))
             return false;
         blChecked = blChecked && column.blChecked;
     }

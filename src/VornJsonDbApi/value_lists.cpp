@@ -66,7 +66,7 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
         sql += strKey;
         // Kept: the place in the definition decides, so a record without the last member ends in
         // ",".
-        if (0 < nLeft) sql += ",";
+        if (0 < nLeft) sql += ',';
     }
     return 0;
 }

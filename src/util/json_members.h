@@ -79,7 +79,7 @@ inline std::string_view textOf(const Json::Value& jString)
 // the last by name, as far as the library fills the cache, and is looked at before a search.
 inline const Json::Value* typeWordValue(const Json::Value& jMember)
 {
-    if (!jMember.isObject() || 0 == jMember.size()) return nullptr;
+    if (0 == jMember.size()) return nullptr;
     auto last = jMember.end();
     --last;
     return "cpptype" == memberName(last) ? &*last : findMember(jMember, "cpptype");
