@@ -95,6 +95,7 @@ runs "$work/host"
 # One example alone, as examples/README.md has it.
 mkdir "$work/alone"
 ln -s "$source/examples" "$work/alone/examples"
+# shellcheck disable=SC2016 # the marks of a block
 sed -n '/^```sh$/,/^```$/ { /^```/d; p }' "$source/examples/README.md" >"$work/alone/build.sh"
 (cd "$work/alone" && PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig bash -e build.sh)
 LD_LIBRARY_PATH=$work/moved/$libdir \
