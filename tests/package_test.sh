@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # package_test.sh SOURCE WORK HOST EXPECTED: installs the library as the README says, moves what was
-# installed, and builds the README's host against it in every way that the README names.
+# installed, and builds the README's host against it in every way that the README names, and the
+# small examples.
 set -euo pipefail
 source=$1 work=$2 host=$3 expected=$4
 
@@ -63,15 +64,19 @@ for name in sqlite3 jsoncpp stdc++ c; do
     grep -qx "lib$name" "$work/needed" || fail "it does not need $name"
 done
 
-# Found by CMake, twice, after the host's own jsoncpp.
-host_project found -DCMAKE_PREFIX_PATH="$work/moved" <<'PROJECT'
+# Found by CMake, twice, after the host's own jsoncpp; the examples with it.
+host_project found -DCMAKE_PREFIX_PATH="$work/moved" <<PROJECT
 find_package(jsoncpp REQUIRED)
 find_package(SQLite3 REQUIRED)
 find_package(VornJsonDb 6 CONFIG REQUIRED)
 find_package(VornJsonDb 6 CONFIG REQUIRED)
 add_executable(host host.cpp)
 target_link_libraries(host PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
+enable_testing()
+include($source/examples/programs.cmake)
 PROJECT
+ctest --test-dir "$work/found/build" --no-tests=error --output-on-failure >"$work/found/log" ||
+    { cat "$work/found/log"; fail "an example against the installed library"; }
 
 # Of the version that was asked for.
 for version in 5 7 6.99; do
@@ -86,6 +91,15 @@ flags=$(PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig pkg-config --cflags --libs
 # shellcheck disable=SC2086 # several flags
 c++ -std=c++17 "$host" $flags -Wl,-rpath,"$work/moved/$libdir" -o "$work/host"
 runs "$work/host"
+
+# One example alone, as examples/README.md has it.
+mkdir "$work/alone"
+ln -s "$source/examples" "$work/alone/examples"
+# shellcheck disable=SC2016 # the marks of a block
+sed -n '/^```sh$/,/^```$/ { /^```/d; p }' "$source/examples/README.md" >"$work/alone/build.sh"
+(cd "$work/alone" && PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig bash -e build.sh)
+LD_LIBRARY_PATH=$work/moved/$libdir \
+    bash "$source/tests/example_test.sh" "$source/examples/expected/first_steps.txt" "$work/alone/first_steps"
 
 # Part of the host's own build.
 host_project part <<PROJECT
