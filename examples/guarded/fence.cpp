@@ -14,9 +14,10 @@ struct Limit {
 };
 
 constexpr Limit kLimits[] = {
-    {SQLITE_LIMIT_LENGTH, kMaxBytes},        {SQLITE_LIMIT_SQL_LENGTH, kMaxBytes},
-    {SQLITE_LIMIT_COMPOUND_SELECT, 1},       {SQLITE_LIMIT_EXPR_DEPTH, 20},
-    {SQLITE_LIMIT_LIKE_PATTERN_LENGTH, 100}, {SQLITE_LIMIT_ATTACHED, 0},
+    {SQLITE_LIMIT_LENGTH, kMaxBytes},
+    {SQLITE_LIMIT_SQL_LENGTH, kMaxBytes},
+    {SQLITE_LIMIT_COMPOUND_SELECT, 1},
+    {SQLITE_LIMIT_EXPR_DEPTH, 20},
 };
 
 void setLimits(sqlite3* pDb)
@@ -55,8 +56,7 @@ Fence::~Fence()
 
 int Fence::run(Access access, const std::function<int()>& work)
 {
-    // The lock of a writer is taken here, where a locked database is an answer and not a wait.
-    if (!transaction(Access::kRead == access ? "begin" : "begin immediate")) return -1;
+    if (!begin(access)) return -1;
     const int iChanges = sqlite3_total_changes(pDb_);
     int iResult = -1;
     access_ = access;
@@ -67,7 +67,7 @@ int Fence::run(Access access, const std::function<int()>& work)
         throw;
     }
     const bool blMany = 1 < sqlite3_total_changes(pDb_) - iChanges;
-    if (0 <= iResult && !blMany && transaction("commit")) return iResult;
+    if (0 <= iResult && !blMany && execute(Access::kTransaction, "commit")) return iResult;
     rollBack();
     return -1;
 }
@@ -90,9 +90,8 @@ int Fence::authorize(void* pFence, int iAction, const char* szFirst, const char*
 
 bool Fence::allows(int iAction, const std::string& strFirst, const std::string& strSecond) const
 {
-    if (Access::kNothing == access_) return false;
-    if (Access::kTransaction == access_) return SQLITE_TRANSACTION == iAction;
     switch (iAction) {
+    case SQLITE_TRANSACTION: return Access::kTransaction == access_;
     case SQLITE_SELECT: return Access::kRead == access_ || Access::kInsert == access_;
     case SQLITE_READ: return strTable_ == strFirst;
     case SQLITE_INSERT: return Access::kInsert == access_ && strTable_ == strFirst;
@@ -104,19 +103,28 @@ bool Fence::allows(int iAction, const std::string& strFirst, const std::string& 
     }
 }
 
-// Does one statement of the fence's own.
-bool Fence::transaction(const char* szSql)
+// The lock is taken here, where a locked database is an answer and not a wait.
+bool Fence::begin(Access access)
 {
-    iTicks_ = 0;
-    access_ = Access::kTransaction;
-    const int iStatus = sqlite3_exec(pDb_, szSql, nullptr, nullptr, nullptr);
-    access_ = Access::kNothing;
-    return SQLITE_OK == iStatus;
+    if (Access::kRead != access) return execute(Access::kTransaction, "begin immediate");
+    if (!execute(Access::kTransaction, "begin")) return false;
+    if (execute(access, "select 1 from main." + strTable_ + " limit 1")) return true;
+    rollBack();
+    return false;
 }
 
+// Fails where SQLite has rolled back itself.
 void Fence::rollBack()
 {
-    // SQLite may have rolled back itself.
-    if (0 == sqlite3_get_autocommit(pDb_)) transaction("rollback");
+    execute(Access::kTransaction, "rollback");
+}
+
+// Does one statement of the fence's own.
+bool Fence::execute(Access access, const std::string& strSql)
+{
+    iTicks_ = 0;
+    access_ = access;
+    const int iStatus = sqlite3_exec(pDb_, strSql.c_str(), nullptr, nullptr, nullptr);
     access_ = Access::kNothing;
+    return SQLITE_OK == iStatus;
 }

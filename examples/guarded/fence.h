@@ -22,7 +22,8 @@ public:
 
     // Does the work in a transaction of its own, with no more than that access. The work counts
     // only when its result is not negative and it changed at most one row; otherwise, also when it
-    // throws, everything is as before. Returns the result of the work, or -1.
+    // throws, everything is as before. Returns the result of the work, or -1, which is also the
+    // answer where another connection holds a lock.
     int run(Access access, const std::function<int()>& work);
 
 private:
@@ -30,8 +31,9 @@ private:
                          const char* szDatabase, const char* szTrigger);
     static int countSteps(void* pFence);
     bool allows(int iAction, const std::string& strFirst, const std::string& strSecond) const;
-    bool transaction(const char* szSql);
+    bool begin(Access access);
     void rollBack();
+    bool execute(Access access, const std::string& strSql);
 
     sqlite3* pDb_;
     std::string strTable_;

@@ -69,15 +69,20 @@ TEST_F(FenceTest, GivesNoneMore)
     const char* kInsert = "insert into note (id) values (3)";
     const char* kUpdate = "update note set text='z' where id=1";
     const char* kDelete = "delete from note where id=1";
+    const char* kRowid = "select last_insert_rowid() from note";
     const struct {
         Access access;
         std::vector<std::string> statements;
     } cases[] = {
-        {Access::kRead, {kInsert, kUpdate, kDelete, "select count(*) from note"}},
+        {Access::kRead, {kInsert, kUpdate, kDelete, "select count(*) from note", kRowid}},
         {Access::kInsert, {kUpdate, kDelete, "select length(text) from note"}},
-        {Access::kUpdate, {kSelect, kInsert, kDelete, "update note set text=hex(text)"}},
-        {Access::kDelete, {kSelect, kInsert, kUpdate, "delete from note where hex(text)=''"}},
-        {Access::kNothing, {kSelect, kInsert, kUpdate, kDelete, "begin"}},
+        {Access::kUpdate,
+         {kSelect, kInsert, kDelete, "update note set text=hex(text)",
+          "update note set text=last_insert_rowid() where id=1"}},
+        {Access::kDelete,
+         {kSelect, kInsert, kUpdate, "delete from note where hex(text)=''",
+          "delete from note where id=last_insert_rowid()"}},
+        {Access::kNothing, {kSelect, kInsert, kUpdate, kDelete, kRowid, "begin"}},
     };
     for (const auto& row : cases)
         for (const std::string& strSql : row.statements) expectNotAuthorized(row.access, strSql);
@@ -106,6 +111,16 @@ TEST_F(FenceTest, GivesNothingToTriggers)
         "begin insert into note values (9,'x'); end");
     pFence_ = std::make_unique<Fence>(database_.get(), "note");
     expectNotAuthorized(Access::kInsert, "insert into note values (3,'c')");
+    EXPECT_EQ("1a,2b", notes());
+}
+
+TEST_F(FenceTest, GivesNothingBetweenTwoCalls)
+{
+    for (const Access access : {Access::kRead, Access::kInsert}) {
+        for (const char* szSql : {"select id from note", "nonsense"}) run(access, szSql);
+        for (const char* szSql : {"select id from note", "begin", "savepoint x"})
+            EXPECT_EQ(kRefused, execute(szSql)) << szSql;
+    }
     EXPECT_EQ("1a,2b", notes());
 }
 
@@ -141,16 +156,97 @@ TEST_F(FenceTest, KnowsNoUnion)
     EXPECT_EQ(SQLITE_ERROR, iStatus_);
 }
 
-TEST_F(FenceTest, LimitsTheSizeOfStatementsAndTexts)
+TEST_F(FenceTest, LimitsTheSizeOfStatements)
 {
-    const std::string strText(600 * 1024, 'x');
-    EXPECT_EQ(kRefused, run(Access::kInsert, "insert into note values (3,'" + strText + "')"));
+    const std::string strSelect = "select id from note where id=1";
+    EXPECT_EQ(0, run(Access::kRead, strSelect + std::string(500 * 1024, ' ')));
+    EXPECT_EQ(kRefused, run(Access::kRead, strSelect + std::string(600 * 1024, ' ')));
     EXPECT_EQ(SQLITE_TOOBIG, iStatus_);
-    EXPECT_EQ(512 * 1024, sqlite3_limit(database_.get(), SQLITE_LIMIT_LENGTH, -1));
+}
+
+TEST_F(FenceTest, LimitsTheSizeOfTexts)
+{
+    const std::string strText(200 * 1024, 'x');
+    EXPECT_EQ(0, run(Access::kInsert, "insert into note values (3,'" + strText + "')"));
+    EXPECT_EQ(0, run(Access::kUpdate, "update note set text=text||text where id=3"));
+    EXPECT_EQ(kRefused, run(Access::kUpdate, "update note set text=text||text where id=3"));
+    EXPECT_EQ(SQLITE_TOOBIG, iStatus_);
+}
+
+TEST_F(FenceTest, LimitsTheDepthOfConditions)
+{
+    const auto select = [](int iDepth) {
+        std::string strSql = "select id from note where ";
+        while (0 < iDepth--) strSql += "not ";
+        return strSql + "id";
+    };
+    EXPECT_EQ(0, run(Access::kRead, select(15)));
+    EXPECT_EQ(kRefused, run(Access::kRead, select(25)));
+    EXPECT_EQ(SQLITE_ERROR, iStatus_);
+    EXPECT_NE(std::string::npos, strError_.find("maximum depth")) << strError_;
+}
+
+TEST_F(FenceTest, TakesNoNameForAText)
+{
+    EXPECT_EQ(0, run(Access::kRead, "select id from note where text='none'"));
+    EXPECT_EQ(kRefused, run(Access::kRead, "select id from note where text=\"none\""));
+    EXPECT_EQ("no such column: none", strError_);
+}
+
+TEST_F(FenceTest, StopsNobodyWhenItIsGone)
+{
+    pFence_.reset();
+    database_.run(
+        "insert into note values (3,'c'),(4,'d'),(5,'e'),(6,'f'),(7,'g'),(8,'h'),(9,'i')");
+    const std::string strAll = "note a, note b, note c, note d, note e, note f";
+    EXPECT_EQ("531441", database_.value("select count(*) from " + strAll));
+}
+
+// The authorizer refuses first what this would.
+TEST_F(FenceTest, IsDefensive)
+{
     int iDefensive = 0;
     sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_DEFENSIVE, -1, &iDefensive);
     EXPECT_EQ(1, iDefensive);
-    EXPECT_EQ("1a,2b", notes());
+}
+
+// Whoever can write a CHECK into the file calls the host's own functions with it, and the
+// authorizer is not asked about those.
+TEST_F(FenceTest, DoesNotTrustTheSchema)
+{
+    pFence_.reset();
+    const auto one = [](sqlite3_context* pContext, int, sqlite3_value**) {
+        sqlite3_result_int(pContext, 1);
+    };
+    sqlite3_create_function(database_.get(), "one", 0, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
+                            one, nullptr, nullptr);
+    sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_TRUSTED_SCHEMA, 1, nullptr);
+    database_.run(
+        "drop table note; create table note (id integer primary key, text text check (one()));"
+        "insert into note values (1,'a')");
+    pFence_ = std::make_unique<Fence>(database_.get(), "note");
+    EXPECT_EQ(kRefused, run(Access::kInsert, "insert into note values (3,'c')"));
+    EXPECT_EQ("unsafe use of one()", strError_);
+    EXPECT_EQ("1a", notes());
+}
+
+// Another table of that name, of the connection or of an attached file, is not the host's.
+TEST_F(FenceTest, KnowsTheMainDatabaseOnly)
+{
+    pFence_.reset();
+    database_.run(
+        "attach ':memory:' as x; create table x.note (id integer primary key, text text)");
+    pFence_ = std::make_unique<Fence>(database_.get(), "note");
+    EXPECT_EQ(0, run(Access::kRead, "select * from note"));
+    expectNotAuthorized(Access::kRead, "select * from x.note");
+    expectNotAuthorized(Access::kInsert, "insert into x.note values (1,'x')");
+
+    pFence_.reset();
+    database_.run("create temp table note (id integer primary key, text text)");
+    pFence_ = std::make_unique<Fence>(database_.get(), "note");
+    EXPECT_EQ(0, run(Access::kRead, "select * from main.note"));
+    expectNotAuthorized(Access::kRead, "select * from note");
+    expectNotAuthorized(Access::kDelete, "delete from note where id=1");
 }
 
 // The guard lets these through: they are good requests, but for the size of the table.
@@ -167,20 +263,66 @@ TEST_F(HostTest, FencedScansOfALargeTableEnd)
     world.stop();
 }
 
-// The library alone would try 500 times.
-TEST_F(HostTest, FencedCallsDoNotWaitForALock)
+// Each call has all its steps.
+TEST_F(HostTest, FencedScansOfAMediumSizeGoOnForEver)
 {
-    Database database(Database::Place::kFile);
-    Host host(database.get());
-    sqlite3* pOther = nullptr;
-    ASSERT_EQ(SQLITE_OK, sqlite3_open(database.path().c_str(), &pOther));
-    ASSERT_EQ(SQLITE_OK, doubles::realExec(pOther, "begin exclusive", nullptr, nullptr, nullptr));
-    const std::string strLine = R"({"op":"create","record":{"id":1}})";
-    EXPECT_EQ(R"({"error":"failed"})", text(host.answer(strLine)));
+    World world(World::Layers::kBoth, 10000);
+    for (int i = 0; i < 10; ++i) world.send(R"({"op":"list","request":{"offset":9000,"limit":1}})");
+    for (const Json::Value& jAnswer : world.answers) EXPECT_EQ(1U, jAnswer["records"].size());
+    world.stop();
+}
+
+// A host on a file, beside another connection to it.
+class FencedFile : public HostTest {
+protected:
+    FencedFile() { EXPECT_EQ(SQLITE_OK, sqlite3_open(database_.path().c_str(), &pOther_)); }
+    ~FencedFile() override { EXPECT_EQ(SQLITE_OK, sqlite3_close(pOther_)); }
+
+    void other(const char* szSql)
+    {
+        EXPECT_EQ(SQLITE_OK, doubles::realExec(pOther_, szSql, nullptr, nullptr, nullptr));
+    }
+    std::string answer(const char* szLine) { return text(host_.answer(szLine)); }
+
+    Database database_{Database::Place::kFile};
+    Host host_{database_.get()};
+    sqlite3* pOther_ = nullptr;
+};
+
+constexpr char kCreate[] = R"({"op":"create","record":{"id":1}})";
+constexpr char kList[] = R"({"op":"list","request":{"id":1}})";
+constexpr char kFailed[] = R"({"error":"failed"})";
+constexpr char kNone[] = R"({"records":null,"result":0})";
+
+// The library alone would try 500 times.
+TEST_F(FencedFile, DoesNotWaitForALock)
+{
+    other("begin exclusive");
+    EXPECT_EQ(kFailed, answer(kCreate));
+    EXPECT_EQ(kFailed, answer(kList));
     EXPECT_EQ(0U, doubles::state().sleeps.size());
-    EXPECT_EQ(SQLITE_OK, sqlite3_close(pOther));
-    EXPECT_EQ(0, host.answer(strLine)["result"].asInt());
-    EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", text(host.answer(strLine)));
+    other("commit");
+    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
+    EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", answer(kCreate));
+}
+
+TEST_F(FencedFile, ReadsBesideAWriter)
+{
+    other("begin immediate");
+    EXPECT_EQ(kFailed, answer(kCreate));
+    EXPECT_EQ(kNone, answer(kList));
+    other("commit");
+}
+
+// A reader of the other connection keeps the commit from the file.
+TEST_F(FencedFile, TakesBackWhatCannotBeCommitted)
+{
+    other("begin; select * from note");
+    EXPECT_EQ(kFailed, answer(kCreate));
+    EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
+    EXPECT_EQ(kNone, answer(kList));
+    other("commit");
+    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
 }
 
 }  // namespace
