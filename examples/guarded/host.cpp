@@ -85,6 +85,7 @@ Json::Value Host::answer(const std::string& strLine)
         jAnswer["refused"] = refused.what();
     } catch (const Json::Exception&) {
         // A value of the wrong kind. What it says is for the log, not for strangers.
+        jAnswer.clear();
         jAnswer["error"] = "failed";
     }
     return jAnswer;

@@ -91,6 +91,7 @@ TEST_F(Guard, RefusesWithAReason)
         {R"({"op":"list","request":{"limit":-1}})", strPage},
         {R"({"op":"list","request":{"limit":"1"}})", strPage},
         {R"({"op":"list","request":{"limit":1.5}})", strPage},
+        {R"({"op":"list","request":{"limit":1.0}})", strPage},
         {R"({"op":"list","request":{"limit":[1]}})", strPage},
         {R"({"op":"list","request":{"offset":2147483648}})", strPage},
         {R"({"op":"list","request":{"limit":101}})", "\"limit\" is too large"},
@@ -131,6 +132,22 @@ TEST_F(Guard, CountsLevels)
     world.send(nested(guard::kMaxDepth));
     EXPECT_EQ(0, world.answers.at(0)["result"].asInt());
     EXPECT_FALSE(world.answers.at(0)["record"]["topics"].isNull());
+}
+
+// A default of the wrong kind, which is the host's own mistake.
+TEST_F(Guard, IsNotAskedAboutDefaults)
+{
+    World world(World::Layers::kBoth);
+    Json::Value jNone;
+    std::string strTable = "note";
+    Json::Value& jDefault = VORN_JSON_DB::recType(jNone, strTable)["done"]["cppDefaultValue"];
+    jDefault = "no";
+    const std::string strLine = R"({"op":"save","record":{"id":7}})";
+    world.send(strLine);
+    jDefault = false;
+    EXPECT_EQ(R"({"error":"failed"})", text(world.answers.at(0)));
+    world.send(strLine);
+    EXPECT_EQ(0, world.answers.at(1)["result"].asInt());
 }
 
 TEST_F(Guard, ReadsLineByLine)
