@@ -42,9 +42,15 @@
 /// the wrong kind, such as a text under an integer member in recSave(), its Json::LogicError
 /// reaches the host; records and result arrays are then as they were, and a text that an SQL
 /// builder was appending to keeps what was appended before, except where the builder says that it
-/// is unchanged. When memory runs out, std::bad_alloc, jsoncpp's Json::RuntimeError or (in a value
-/// list) std::logic_error reaches the host; a list then keeps the records that it had appended, and
-/// a write may have been made. After each of them handle and connection are sound.
+/// is unchanged. After each of them handle and connection are sound.
+///
+/// Memory: when it runs out, a call may return -1, or std::bad_alloc, jsoncpp's Json::RuntimeError
+/// or (in a value list) std::logic_error reaches the host; either way a write may have been made,
+/// and handle and connection are sound. Outputs are after -1 as each function says. Where one of
+/// these is thrown, they are as before, but for those that are made step by step, which may be
+/// anywhere between before and after: the array of recList(), the records of fillDefaultValue(),
+/// VORN_JSON_DB::jsonCopyMember(), VectorParamToJson() and, where it merges, recGetOne(), and the
+/// texts of SqlExpandMemberName(), SqlExpandMemberList() and SqlFilterConditionFromJson().
 ///
 /// Ownership: the host owns the connection and every argument. A handle copies the name, the
 /// definition and the CREATE statement; it neither opens nor closes the connection, which has to
@@ -102,9 +108,9 @@ namespace VORN_JSON_DB {
 VORN_JSON_DB_EXPORT Json::Value& recType(Json::Value& jTableDef, std::string& strJsonName);
 
 /// Copies the members of the object @p jSubSet, which must not be a member of @p jIn, into @p jIn,
-/// which is an object or null: those that
-/// @p jIn lacks, and with @p blOverwrite also those that it has. Members are copied whole, not
-/// merged. Returns 0, or -1 with @p jIn unchanged when one of the two is of another kind.
+/// which is an object or null: those that @p jIn lacks, and with @p blOverwrite also those that it
+/// has. Members are copied whole, not merged. Returns 0, or -1 with @p jIn unchanged when one of
+/// the two is of another kind.
 VORN_JSON_DB_EXPORT int jsonCopyMember(Json::Value& jIn, Json::Value& jSubSet, bool blOverwrite);
 
 /// Sets @p now to the seconds since the epoch plus @p offsetSecond. Returns 0.
@@ -219,7 +225,8 @@ public:
     /// Terms are joined by "and". Members that the table does not declare are ignored. A member
     /// that is NULL in the row is left out of its record.
     ///
-    /// Returns 0 for any number of records, or -1; records decoded before the failure then stay.
+    /// Returns 0 for any number of records, or -1; records decoded before the failure then stay,
+    /// the last of them perhaps without members for which there was no memory.
     int recList(Json::Value& jRecParam, Json::Value& jRecArrayOut);
 
     /// Copies the first record that recList() gives for @p jRecParam into @p jRecOut, an object or

@@ -3,7 +3,6 @@
 #include "support/limits.h"
 
 #include <algorithm>
-#include <set>
 
 namespace {
 
@@ -280,31 +279,4 @@ TEST_F(Limits, LogLinesCarryWholeRecords)
     jRecord["text"] = "c2VjcmV0";  // as the host's cipher gives it
     EXPECT_EQ(-1, table_.api.recCreate(jRecord, jStored));
     EXPECT_EQ(0, logged("secret"));
-}
-
-// Every test that the page names is there, every test is on the page, and no section lacks one.
-TEST(LimitsPage, NamesEveryTestOnce)
-{
-    std::multiset<std::string> named;
-    const MarkdownPage page = readPage("limits.md");
-    const std::string strHead = "`Limits.";
-    for (const MarkdownSection& candidate : page) {
-        const std::string& strText = candidate.strText;
-        int iNamed = 0;
-        for (std::size_t i = 0; std::string::npos != (i = strText.find(strHead, i)); ++iNamed) {
-            i += strHead.size();
-            named.insert(strText.substr(i, strText.find('`', i) - i));
-        }
-        EXPECT_EQ("Limits" == candidate.strHeading ? 0 : 1, iNamed) << candidate.strHeading;
-    }
-    std::multiset<std::string> registered;
-    const testing::UnitTest& tests = *testing::UnitTest::GetInstance();
-    for (int i = 0; i < tests.total_test_suite_count(); ++i) {
-        const testing::TestSuite& suite = *tests.GetTestSuite(i);
-        if (std::string("Limits") != suite.name()) continue;
-        for (int j = 0; j < suite.total_test_count(); ++j)
-            registered.insert(suite.GetTestInfo(j)->name());
-    }
-    EXPECT_EQ(registered, named);
-    EXPECT_EQ(19U, named.size());
 }

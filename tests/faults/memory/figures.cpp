@@ -32,6 +32,7 @@ void Figures::print(const std::string& strName) const
     };
     const auto ended = [&](Ending ending) { return iEndings[static_cast<int>(ending)]; };
     line("points failed", iPoints);
+    line("findings", iFindings);
     line("absorbed", ended(Ending::kAsUndisturbed));
     line("result -1", ended(Ending::kRefused));
     line("std::bad_alloc", ended(Ending::kBadAlloc));
@@ -44,6 +45,7 @@ std::string failEach(const Case& row, Fault fault, AtPoint atPoint, Figures& fig
 {
     std::string strProblems;
     const auto report = [&](const std::string& strProblem) {
+        ++figures.iFindings;
         strProblems += std::string(row.szName) + ", " + nameOf(fault) + ", allocation " +
                        std::to_string(fault.iNth) + ": " + strProblem + "\n";
     };

@@ -7,6 +7,7 @@
 
 struct Figures {
     int iPoints = 0;
+    int iFindings = 0;
     int iEndings[static_cast<int>(Ending::kEndings)] = {};
 
     void add(const Point& point);
