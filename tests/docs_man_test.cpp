@@ -1,9 +1,8 @@
 // man/: the manual page of the class has every declaration of the header, and the other one says
 // the same as the guides, which are run.
 
+#include "support/database.h"
 #include "support/markdown.h"
-
-#include <gtest/gtest.h>
 
 #include <cctype>
 #include <fstream>
@@ -11,8 +10,6 @@
 #include <set>
 
 namespace {
-
-using Lines = std::vector<std::string>;
 
 Lines linesOf(const char* szPath)
 {
@@ -151,6 +148,18 @@ TEST(ManClassPage, ShowsTheHostOfTheReadme)
     strHost = std::regex_replace(strHost, std::regex(R"(\\e)"), "\\");
     const std::string strReadme = fence(readPage("../README.md"), "A host in 30 lines", "cpp");
     EXPECT_EQ(strReadme, strHost.substr(0, strReadme.size()));
+}
+
+TEST(ManGeneralPage, ShowsADefinitionThatIsRead)
+{
+    std::string strDefinition;
+    for (const std::string& strLine : generalPage())
+        if (0 == strLine.find('{') || 0 == strLine.find("    \"")) strDefinition += strLine;
+    Json::Value jDefinition = json(strDefinition);
+    std::string strName = "errand";
+    const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
+    EXPECT_EQ(jDefinition["errand"]["member"], jTypes);
+    EXPECT_EQ(2U, jTypes.size());
 }
 
 TEST(ManGeneralPage, SaysOfEveryTypeWordWhatTheGuideSays)
