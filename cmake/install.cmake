@@ -1,5 +1,6 @@
 # What is installed: the library with its links, the header, a package for find_package and one for
-# pkg-config, the guides and the licence. Both packages can be moved with what they belong to.
+# pkg-config, the manual pages, the guides and the licence. Both packages can be moved with what they
+# belong to.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
@@ -31,6 +32,11 @@ string(REGEX REPLACE "/$" "" prefix_from_pc "${prefix_from_pc}")
 configure_file(cmake/vornjsondb.pc.in vornjsondb.pc @ONLY)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/vornjsondb.pc
   DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT vornjsondb_development)
+
+install(FILES man/VornJsonDbApi.3 DESTINATION ${CMAKE_INSTALL_MANDIR}/man3
+  COMPONENT vornjsondb_development)
+install(FILES man/vornjsondb.7 DESTINATION ${CMAKE_INSTALL_MANDIR}/man7
+  COMPONENT vornjsondb_development)
 
 install(FILES README.md LICENSE CHANGELOG.md SECURITY.md DESTINATION ${CMAKE_INSTALL_DOCDIR}
   COMPONENT vornjsondb_documentation)
