@@ -85,6 +85,15 @@ TEST_F(KeptColumns, RefuseTheFirstOfTwoBadWords)
     EXPECT_EQ(error("type error, strType=double"), takeLog()[0]);
 }
 
+TEST_F(KeptColumns, RefuseAMemberWithoutAWord)
+{
+    warmUp();
+    types()["s"].removeMember("cpptype");
+    EXPECT_EQ("null", answer());
+    EXPECT_EQ(-1, iResult_);
+    EXPECT_EQ(error("type error, strType="), takeLog()[0]);
+}
+
 TEST_F(KeptColumns, RefuseAMemberThatIsGone)
 {
     warmUp();
