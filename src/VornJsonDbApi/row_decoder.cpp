@@ -35,7 +35,7 @@ const Json::Value* pjMemberTypes = nullptr;
 
 // What a column of the result becomes. Kept for the next statement, which checks it once.
 struct Column {
-    std::string_view name = "";  // ends in a NUL byte
+    std::string_view name = "";  // NOLINT(readability-redundant-string-init): NUL at its end
     std::string strType;
     Decode decode = Decode::kNo;
     bool blChecked = false;
