@@ -45,23 +45,18 @@ public:
     // The member, or null where there is none.
     const Json::Value* find(std::string_view strKey)
     {
-        for (; 0 < nLeft_; --nLeft_, ++it_) {
+        while (0 < nLeft_) {
             const int iOrder = memberName(it_).compare(strKey);
             if (0 < iOrder) break;
-            if (0 == iOrder) return next();
+            const Json::Value& jMember = *it_;
+            ++it_;
+            --nLeft_;
+            if (0 == iOrder) return &jMember;
         }
         return nullptr;
     }
 
 private:
-    const Json::Value* next()
-    {
-        const Json::Value& jMember = *it_;
-        ++it_;
-        --nLeft_;
-        return &jMember;
-    }
-
     Json::Value::const_iterator it_;
     Json::ArrayIndex nLeft_ = 0;
 };
