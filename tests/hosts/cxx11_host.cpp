@@ -1,5 +1,5 @@
-// A host in C++11 with hidden visibility: links, runs and creates records, the last one while the
-// process exits. The status tells which step failed.
+// A host in C++11, and as well in C++20, with hidden visibility: links, runs and creates records,
+// the last one while the process exits. The status tells which step failed.
 
 #include <VornJsonDbApi.h>
 #include <sqlite3.h>
