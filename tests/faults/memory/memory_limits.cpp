@@ -51,7 +51,9 @@ TEST(MemoryLimits, LastRecordOfAFailedListMayLackMembers)
 // In a process that has not asked for the local time yet.
 std::string localTime(bool blHostAskedForTheZone)
 {
-    if (blHostAskedForTheZone) tzset();
+    if (blHostAskedForTheZone) {
+#include "limits/FirstLocalTimeMayBeUtc.inc"
+    }
     std::string strTime;
     allocators::arm({Kind::kMalloc, 1, true});
     const int iResult = VORN_JSON_DB::convert2ReadableTime(0, strTime, 4);
