@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every block of code in the documentation is run by a test: this list says by which. A block that
 // is not on it is run by nobody.
 

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # Writes the C++ of docs/limits.md into files that the tests include: FOLDER/NAME.inc has the block of
 # the section whose test is NAME.
 /^```/ && inside { inside = 0; next }
