@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # What is installed: the library with its links, the header, a package for find_package and one for
 # pkg-config, the manual pages, the guides and the licence. Both packages can be moved with what they
 # belong to.
