@@ -1,0 +1,116 @@
+"""pages.py FOLDER: writes the guides into FOLDER as Doxygen has to read them.
+
+What is plain Markdown on a forge is not quite that to Doxygen: it takes "%s" and quotes in code for marks of its
+own, names headings otherwise and knows no link to a heading of another page. So code goes through it as HTML,
+every heading gets the name that a forge gives it, and links lead to the pages of the site. A file that is
+linked and is no guide, such as an example, becomes a page of its own."""
+
+import glob
+import html
+import os
+import re
+import sys
+
+PROJECT = os.path.abspath(os.path.join(os.path.dirname(__file__), "..", ".."))
+HEADER = "include/VornJsonDbApi.h"
+FENCE = re.compile(r"^(```.*?^```$)", re.MULTILINE | re.DOTALL)
+CODE = re.compile(r"(?<!`)(`+)(?!`)(.+?)(?<!`)\1(?!`)", re.DOTALL)
+HEADING = re.compile(r"^(#+) (.+)$", re.MULTILINE)
+LINK = re.compile(r"(!?)\[([^\]]*)\]\(([^)\s]+)\)")
+
+
+def guides():
+    first = ["README.md"]
+    last = ["examples/README.md", "SECURITY.md", "CONTRIBUTING.md", "CHANGELOG.md"]
+    return first + sorted(os.path.relpath(path, PROJECT) for path in glob.glob(PROJECT + "/docs/*.md")) + last
+
+
+def page_of(path):
+    """The name of the page without its ".html"."""
+    if path == "README.md":
+        return "index"
+    if path == HEADER:
+        return "VornJsonDbApi_8h"
+    if path == "examples/README.md":
+        return "examples_list"
+    if path.endswith(".md"):
+        return os.path.basename(path)[:-3].lower()
+    return re.sub(r"\W", "_", path)
+
+
+def anchor_of(heading):
+    return re.sub(r"[^\w\- ]", "", heading.lower()).replace(" ", "-")
+
+
+def read(path):
+    with open(os.path.join(PROJECT, path), encoding="utf-8") as file:
+        return file.read()
+
+
+class Guide:
+    def __init__(self, path):
+        self.path = path
+        self.files = []
+
+    def link(self, match):
+        image, text, target = match.groups()
+        if image or "://" in target:
+            return match.group()
+        path, _, anchor = target.partition("#")
+        path = os.path.normpath(os.path.join(os.path.dirname(self.path), path)) if path else self.path
+        if not os.path.isfile(os.path.join(PROJECT, path)):
+            sys.exit(f"{self.path}: no such file: {target}")
+        if not path.endswith(".md") and path != HEADER:
+            self.files.append(path)
+        line = re.fullmatch(r"L(\d+)", anchor)
+        anchor = f"l{int(line[1]):05}" if line else anchor
+        return f"[{text}]({page_of(path)}.html{'#' + anchor if anchor else ''})"
+
+    def heading(self, match):
+        marks, text = match.groups()
+        if marks == "#":
+            return f"# {text} {{#{'mainpage' if self.path == 'README.md' else page_of(self.path)}}}"
+        return f"@htmlonly<a id=\"{anchor_of(text)}\"></a>@endhtmlonly\n\n{match.group()}"
+
+    def text(self, text):
+        """What stands between two blocks of code."""
+        spans = []
+
+        def keep(match):
+            spans.append(html.escape(match[2].replace("\\|", "|"), quote=False).replace("|", "&#124;"))
+            return f"\0{len(spans) - 1}\0"
+
+        text = CODE.sub(keep, text)
+        text = re.sub(r"[%@\\](?=\w)", r"\\\g<0>", text)
+        text = HEADING.sub(self.heading, LINK.sub(self.link, text))
+        return re.sub("\0(\\d+)\0", lambda match: f"@htmlonly<code>{spans[int(match[1])]}</code>@endhtmlonly", text)
+
+    def page(self):
+        parts = FENCE.split(read(self.path))
+        return "".join(part if part.startswith("```") else self.text(part) for part in parts)
+
+
+def source_page(path):
+    command = "include{lineno}" if path.endswith((".cpp", ".h")) else "verbinclude"
+    return f"@page {page_of(path)} {path}\n@{command} {os.path.join(PROJECT, path)}\n"
+
+
+def write(folder, name, text):
+    with open(os.path.join(folder, name), "w", encoding="utf-8") as file:
+        file.write(text)
+
+
+def main():
+    folder = sys.argv[1]
+    files = []
+    for number, path in enumerate(guides()):
+        guide = Guide(path)
+        write(folder, f"{number:02}_{page_of(path)}.md", guide.page())
+        files += guide.files
+    files = sorted(set(files))
+    write(folder, "sources.md", "# Files shown here {#sources}\n\n" + "".join(f"- @subpage {page_of(path)}\n" for path in files))
+    for path in files:
+        write(folder, page_of(path) + ".dox", "/**\n" + source_page(path) + "*/\n")
+
+
+main()
