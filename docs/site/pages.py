@@ -82,6 +82,7 @@ class Guide:
 
         text = CODE.sub(keep, text)
         text = re.sub(r"[%@\\](?=\w)", r"\\\g<0>", text)
+        text = re.sub(r"\*\*(.+?)\*\*", r"<b>\1</b>", text, flags=re.DOTALL)
         text = HEADING.sub(self.heading, LINK.sub(self.link, text))
         return re.sub("\0(\\d+)\0", lambda match: f"@htmlonly<code>{spans[int(match[1])]}</code>@endhtmlonly", text)
 
