@@ -1,5 +1,5 @@
-"""check.py SITE: every link and every picture of the site leads to a file and an anchor that are there, and
-nothing is fetched from elsewhere."""
+"""check.py SITE: every link and every picture of the site leads to a file and an anchor that are there, nothing is
+fetched from elsewhere, and no mark of Markdown is left in a text."""
 
 import glob
 import html.parser
@@ -9,6 +9,8 @@ import sys
 import urllib.parse
 
 LINKS = ("href", "src", "data")
+CODE = re.compile(r"<(code|pre|script)\b.*?</\1>|<div class=\"fragment\">.*?<!-- fragment -->", re.DOTALL)
+MARK = re.compile(r"(?<!char )\*\*.{,20}|`.{,20}|\]\(.{,20}|[@\\]\w+only.{,20}")
 
 
 class Page(html.parser.HTMLParser):
@@ -17,7 +19,9 @@ class Page(html.parser.HTMLParser):
         self.anchors = set()
         self.links = []
         with open(path, encoding="utf-8") as file:
-            self.feed(file.read())
+            text = file.read()
+        self.feed(text)
+        self.marks = MARK.findall(CODE.sub("", text))
 
     def handle_starttag(self, tag, attrs):
         for name, value in attrs:
@@ -41,7 +45,7 @@ def main():
     links = {path: page.links for path, page in pages.items()}
     for path in glob.glob(site + "/**/*.js", recursive=True) + glob.glob(site + "/**/*.css", recursive=True):
         links[path] = links_of_text(path)
-    broken = []
+    broken = [f"{os.path.relpath(path, site)}: {mark}" for path, page in pages.items() for mark in page.marks]
     for path, found in links.items():
         for tag, link in found:
             parts = urllib.parse.urlsplit(link)

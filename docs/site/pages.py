@@ -1,14 +1,16 @@
-"""pages.py FOLDER: writes the guides into FOLDER as Doxygen has to read them.
+"""pages.py FOLDER SITE: writes the guides into FOLDER as Doxygen has to read them, and their pictures into SITE.
+pages.py HEADER: prints the header as Doxygen has to read it.
 
 What is plain Markdown on a forge is not quite that to Doxygen: it takes "%s" and quotes in code for marks of its
-own, names headings otherwise and knows no link to a heading of another page. So code goes through it as HTML,
-every heading gets the name that a forge gives it, and links lead to the pages of the site. A file that is
-linked and is no guide, such as an example, becomes a page of its own."""
+own, names headings otherwise and knows no link to a heading of another page. So code is escaped, every heading
+gets the name that a forge gives it, and links lead to the pages of the site. A file that is linked and is no
+guide, such as an example, becomes a page of its own."""
 
 import glob
 import html
 import os
 import re
+import shutil
 import sys
 
 PROJECT = os.path.abspath(os.path.join(os.path.dirname(__file__), "..", ".."))
@@ -42,24 +44,41 @@ def anchor_of(heading):
     return re.sub(r"[^\w\- ]", "", heading.lower()).replace(" ", "-")
 
 
+def code(text):
+    """That Doxygen shows as it stands."""
+    text = re.sub(r"[\\@#$%*_`|\[\]!]|::|--", r"\\\g<0>", html.escape(text, quote=False))
+    text = text.replace('"', "&quot;").replace("'", "&apos;").replace("  ", " &nbsp;")
+    return f"<code>{text}</code>"
+
+
 def read(path):
     with open(os.path.join(PROJECT, path), encoding="utf-8") as file:
         return file.read()
+
+
+def header(path):
+    """Line for line, with the code in its comments escaped."""
+    return re.sub(r"^ *///(?! {5}).*$", lambda line: CODE.sub(lambda match: code(match[2]), line[0]), read(path),
+                  flags=re.MULTILINE)
 
 
 class Guide:
     def __init__(self, path):
         self.path = path
         self.files = []
+        self.pictures = []
 
     def link(self, match):
         image, text, target = match.groups()
-        if image or "://" in target:
+        if "://" in target:
             return match.group()
         path, _, anchor = target.partition("#")
         path = os.path.normpath(os.path.join(os.path.dirname(self.path), path)) if path else self.path
         if not os.path.isfile(os.path.join(PROJECT, path)):
             sys.exit(f"{self.path}: no such file: {target}")
+        if image:
+            self.pictures.append(path)
+            return f'@htmlonly<img src="{os.path.basename(path)}" alt="{html.escape(text)}"/>@endhtmlonly'
         if not path.endswith(".md") and path != HEADER:
             self.files.append(path)
         line = re.fullmatch(r"L(\d+)", anchor)
@@ -77,14 +96,14 @@ class Guide:
         spans = []
 
         def keep(match):
-            spans.append(html.escape(match[2].replace("\\|", "|"), quote=False).replace("|", "&#124;"))
+            spans.append(code(match[2].replace("\\|", "|")))
             return f"\0{len(spans) - 1}\0"
 
         text = CODE.sub(keep, text)
         text = re.sub(r"[%@\\](?=\w)", r"\\\g<0>", text)
         text = re.sub(r"\*\*(.+?)\*\*", r"<b>\1</b>", text, flags=re.DOTALL)
         text = HEADING.sub(self.heading, LINK.sub(self.link, text))
-        return re.sub("\0(\\d+)\0", lambda match: f"@htmlonly<code>{spans[int(match[1])]}</code>@endhtmlonly", text)
+        return re.sub("\0(\\d+)\0", lambda match: spans[int(match[1])], text)
 
     def page(self):
         parts = FENCE.split(read(self.path))
@@ -102,12 +121,17 @@ def write(folder, name, text):
 
 
 def main():
-    folder = sys.argv[1]
+    if len(sys.argv) == 2:
+        print(header(sys.argv[1]), end="")
+        return
+    folder, site = sys.argv[1:]
     files = []
     for number, path in enumerate(guides()):
         guide = Guide(path)
         write(folder, f"{number:02}_{page_of(path)}.md", guide.page())
         files += guide.files
+        for picture in guide.pictures:
+            shutil.copy(os.path.join(PROJECT, picture), site)
     files = sorted(set(files))
     write(folder, "sources.md", "# Files shown here {#sources}\n\n" + "".join(f"- @subpage {page_of(path)}\n" for path in files))
     for path in files:
