@@ -57,14 +57,16 @@ def read(path):
 
 
 def header(path):
-    """Line for line, with the code in its comments escaped."""
-    return re.sub(r"^ *///(?! {5}).*$", lambda line: CODE.sub(lambda match: code(match[2]), line[0]), read(path),
+    """Line for line, with the code in its comments escaped; "@p name:" would take the colon for a part of the name."""
+    text = re.sub(r"^ *///(?! {5}).*$", lambda line: CODE.sub(lambda match: code(match[2]), line[0]), read(path),
                   flags=re.MULTILINE)
+    return re.sub(r"@p((?: |\n *///)+)(\w+)", r"\1<code>\2</code>", text)
 
 
 class Guide:
     def __init__(self, path):
         self.path = path
+        self.title = HEADING.search(read(path))[2]
         self.files = []
         self.pictures = []
 
@@ -110,9 +112,10 @@ class Guide:
         return "".join(part if part.startswith("```") else self.text(part) for part in parts)
 
 
-def source_page(path):
+def source_page(path, linked_in):
     command = "include{lineno}" if path.endswith((".cpp", ".h")) else "verbinclude"
-    return f"@page {page_of(path)} {path}\n@{command} {os.path.join(PROJECT, path)}\n"
+    guides = ", ".join(f"[{guide.title}]({page_of(guide.path)}.html)" for guide in linked_in)
+    return f"/**\n@page {page_of(path)} {path}\nSee {guides}.\n\n@{command} {os.path.join(PROJECT, path)}\n*/\n"
 
 
 def write(folder, name, text):
@@ -125,17 +128,18 @@ def main():
         print(header(sys.argv[1]), end="")
         return
     folder, site = sys.argv[1:]
-    files = []
+    linked_in = {}
     for number, path in enumerate(guides()):
         guide = Guide(path)
         write(folder, f"{number:02}_{page_of(path)}.md", guide.page())
-        files += guide.files
+        for file in sorted(set(guide.files)):
+            linked_in.setdefault(file, []).append(guide)
         for picture in guide.pictures:
             shutil.copy(os.path.join(PROJECT, picture), site)
-    files = sorted(set(files))
-    write(folder, "sources.md", "# Files shown here {#sources}\n\n" + "".join(f"- @subpage {page_of(path)}\n" for path in files))
-    for path in files:
-        write(folder, page_of(path) + ".dox", "/**\n" + source_page(path) + "*/\n")
+    subpages = "".join(f"- @subpage {page_of(path)}\n" for path in sorted(linked_in))
+    write(folder, "sources.md", f"# Files shown here {{#sources}}\n\n{subpages}")
+    for path, guides_of_it in linked_in.items():
+        write(folder, page_of(path) + ".dox", source_page(path, guides_of_it))
 
 
 main()

@@ -1,7 +1,8 @@
-"""screenshots.py SITE FOLDER: pictures of some pages at the width of a phone and of a desk, by chromium. Fails
-when a page is not laid out at that width or is wider than it."""
+"""screenshots.py SITE FOLDER: pictures of some pages at the width of a phone and of a desk, by chromium, from the
+top on. Fails when any page of the site is not laid out at that width or is wider than it."""
 
 import base64
+import glob
 import json
 import os
 import subprocess
@@ -12,9 +13,10 @@ import urllib.request
 
 PAGES = ("index", "classVornJsonDbApi", "limits", "types")
 WIDTHS = (390, 1280)
+HIGHEST = 6000
 CHROMIUM = ["--headless", "--no-sandbox", "--disable-gpu", "--disable-quic", "--no-first-run",
             "--disable-background-networking", "--disable-component-update", "--disable-sync", "--hide-scrollbars"]
-MEASURE = "return [document.documentElement.clientWidth, document.documentElement.scrollWidth]"
+MEASURE = "const all = document.documentElement; return [all.clientWidth, all.scrollWidth, all.scrollHeight]"
 PORT = 9595
 
 
@@ -40,21 +42,24 @@ def devtools(session, command, **parameters):
 
 
 def pictures(session, site, folder):
+    pages = sorted(os.path.relpath(path, site)[:-5] for path in glob.glob(site + "/*.html"))
     wrong = 0
     for width in WIDTHS:
         devtools(session, "Emulation.setDeviceMetricsOverride", width=width, height=844, deviceScaleFactor=1,
                  mobile=width < 800)
-        for page in PAGES:
+        for page in pages:
             ask(f"session/{session}/url", {"url": f"file://{site}/{page}.html"})
-            laid_out, needed = ask(f"session/{session}/execute/sync", {"script": MEASURE, "args": []})
-            picture = devtools(session, "Page.captureScreenshot", captureBeyondViewport=True)["data"]
-            path = os.path.join(folder, f"{page}-{width}.png")
-            with open(path, "wb") as file:
-                file.write(base64.b64decode(picture))
-            fine = laid_out == width and needed <= width
-            wrong += not fine
-            print(f"{path}: laid out at {laid_out} px, needs {needed} px{'' if fine else ': WRONG'}")
-    return wrong
+            laid_out, needed, height = ask(f"session/{session}/execute/sync", {"script": MEASURE, "args": []})
+            if laid_out != width or needed > width:
+                print(f"{page} at {width} px: laid out at {laid_out} px, needs {needed} px")
+                wrong += 1
+            if page in PAGES:
+                clip = {"x": 0, "y": 0, "width": width, "height": min(height, HIGHEST), "scale": 1}
+                picture = devtools(session, "Page.captureScreenshot", captureBeyondViewport=True, clip=clip)["data"]
+                with open(os.path.join(folder, f"{page}-{width}.png"), "wb") as file:
+                    file.write(base64.b64decode(picture))
+    print(f"{len(pages)} pages at {' and '.join(map(str, WIDTHS))} px, {wrong} wrong; pictures in {folder}")
+    return wrong or not pages
 
 
 def main():
