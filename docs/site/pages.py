@@ -90,7 +90,9 @@ class Guide:
     def heading(self, match):
         marks, text = match.groups()
         if marks == "#":
-            return f"# {text} {{#{'mainpage' if self.path == 'README.md' else page_of(self.path)}}}"
+            if self.path == "README.md":
+                return f"# {text} {{#mainpage}}"
+            return f"# {text} {{#{page_of(self.path)}}}\n\n[TOC]"
         return f"@htmlonly<a id=\"{anchor_of(text)}\"></a>@endhtmlonly\n\n{match.group()}"
 
     def text(self, text):
