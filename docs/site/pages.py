@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """pages.py FOLDER SITE: writes the guides into FOLDER as Doxygen has to read them, and their pictures into SITE.
 pages.py HEADER: prints the header as Doxygen has to read it.
 

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """screenshots.py SITE FOLDER: pictures of some pages at the width of a phone and of a desk, by chromium, from the
 top on. Fails when any page of the site is not laid out at that width or is wider than it."""
 
