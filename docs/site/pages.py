@@ -90,24 +90,25 @@ class Guide:
 
     def heading(self, match):
         marks, text = match.groups()
-        if marks == "#":
-            if self.path == "README.md":
-                return f"# {text} {{#mainpage}}"
-            return f"# {text} {{#{page_of(self.path)}}}\n\n[TOC]"
-        return f"@htmlonly<a id=\"{anchor_of(text)}\"></a>@endhtmlonly\n\n{match.group()}"
+        if marks != "#":
+            return f"\1{anchor_of(text)}\1\n\n{match.group()}"
+        if self.path == "README.md":
+            return f"# {text} {{#mainpage}}"
+        return f"# {text} {{#{page_of(self.path)}}}\n\n[TOC]"
 
     def text(self, text):
-        """What stands between two blocks of code."""
+        """What stands between two blocks of code. Code and anchors are put in last, so that nothing changes them."""
         spans = []
 
         def keep(match):
             spans.append(code(match[2].replace("\\|", "|")))
             return f"\0{len(spans) - 1}\0"
 
-        text = CODE.sub(keep, text)
+        text = CODE.sub(keep, HEADING.sub(self.heading, text))
         text = re.sub(r"[%@\\](?=\w)", r"\\\g<0>", text)
-        text = re.sub(r"\*\*(.+?)\*\*", r"<b>\1</b>", text, flags=re.DOTALL)
-        text = HEADING.sub(self.heading, LINK.sub(self.link, text))
+        text = re.sub(r"\*\*([^*]+)\*\*", r"<b>\1</b>", text)
+        text = LINK.sub(self.link, text)
+        text = re.sub("\1(.+?)\1", r'@htmlonly<a id="\1"></a>@endhtmlonly', text)
         return re.sub("\0(\\d+)\0", lambda match: spans[int(match[1])], text)
 
     def page(self):
