@@ -42,4 +42,5 @@ install(FILES man/vornjsondb.7 DESTINATION ${CMAKE_INSTALL_MANDIR}/man7
 install(FILES README.md LICENSE CHANGELOG.md SECURITY.md DESTINATION ${CMAKE_INSTALL_DOCDIR}
   COMPONENT vornjsondb_documentation)
 install(DIRECTORY docs/ DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs
-  COMPONENT vornjsondb_documentation FILES_MATCHING PATTERN "*.md")
+  COMPONENT vornjsondb_documentation FILES_MATCHING PATTERN "*.md" PATTERN "*.svg"
+  PATTERN site EXCLUDE)
