@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "contender.h"
 
 #include "contenders/all.h"

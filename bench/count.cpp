@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // bench_count CONTENDER OPERATION ROWS, run under
 //     valgrind --tool=callgrind --instr-atstart=no
 // counts the instructions of an operation's calls on a table of so many rows: what sets up the

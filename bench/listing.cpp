@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // bench_listing CONTENDER ROWS lists a table of so many rows, in a process of its own, and prints
 // the user CPU time and the growth of the peak memory for each listed row. Small tables are listed
 // again and again, each result dropped outside the measured time, so that the clock's steps do not

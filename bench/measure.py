@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Runs the benchmark programs and writes what they measured to a JSON file.
 
     measure.py BUILD-FOLDER RESULTS.json

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Plots as SVG text: bars side by side and lines on a logarithmic axis. Each function takes the figures
 and returns the whole file."""
 

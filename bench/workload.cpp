@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "workload.h"
 
 #include <json/reader.h>

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # What is installed: the library with its links, the header, a package for find_package and one for
 # pkg-config, the manual pages, the guides and the licence. Both packages can be moved with what they
 # belong to.
@@ -41,4 +42,5 @@ install(FILES man/vornjsondb.7 DESTINATION ${CMAKE_INSTALL_MANDIR}/man7
 install(FILES README.md LICENSE CHANGELOG.md SECURITY.md DESTINATION ${CMAKE_INSTALL_DOCDIR}
   COMPONENT vornjsondb_documentation)
 install(DIRECTORY docs/ DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs
-  COMPONENT vornjsondb_documentation FILES_MATCHING PATTERN "*.md")
+  COMPONENT vornjsondb_documentation FILES_MATCHING PATTERN "*.md" PATTERN "*.svg"
+  PATTERN site EXCLUDE)

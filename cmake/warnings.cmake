@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # vornjsondb_warnings(TARGET [FLAG...]): the warnings that the project is clean of, as errors when
 # VORNJSONDB_WERROR is on.
 option(VORNJSONDB_WERROR "Treat warnings as errors" OFF)

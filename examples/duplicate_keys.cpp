@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// Duplicate keys: how a host tells a record that is there already from one that failed otherwise.
 ///

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// JSON members: an object and an array are members of a record and come back as such. They are
 /// stored as JSON text, so that SQLite's JSON functions look into them.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// Nulls and raw filters: a column that is NULL is a member that the record lacks, and what a plain
 /// condition cannot say is said in SQL, under the key "vornSqlWhereFilter".

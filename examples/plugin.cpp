@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// A plugin that uses the library, in a program that does not: this is the program, and
 /// plugin_module.cpp is the plugin. The library looks for its two flags in the program, which has

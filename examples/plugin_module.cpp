@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// The plugin of plugin.cpp: one function, which stores a note. It is linked with the library and
 /// does not define the flags, because the program does.

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # The small examples: each is built against VornJsonDb::vornjsondb, the target of this project and of
 # the installed package, and a test compares what it prints with expected/NAME.txt.
 set(example_folder ${CMAKE_CURRENT_LIST_DIR})

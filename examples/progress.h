@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// A progress bar on standard error, where that is a terminal.
 #ifndef EXAMPLES_PROGRESS_H

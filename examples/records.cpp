@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// A complete host of libvornjsondb: it opens a database, binds one table and works with its
 /// records from the command line.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// Transactions: many records are stored together or not at all. They are the host's, who begins,
 /// commits and rolls back with statements of its own.

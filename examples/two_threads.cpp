@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// Two threads: the library is used from one thread at a time, all its handles together. A host of
 /// several threads holds a mutex of its own around every call: one mutex for the whole process.

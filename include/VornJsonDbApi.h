@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// JSON records in SQLite tables: the whole public interface of libvornjsondb.
 ///

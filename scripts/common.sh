@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # Shared by the scripts; sourced, not run. Leaves the shell in the project's top folder.
 set -euo pipefail
 cd "$(dirname "${BASH_SOURCE[0]}")/.."

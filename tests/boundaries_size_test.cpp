@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // How wide, long and deep records may be.
 
 #include "support/matrix.h"

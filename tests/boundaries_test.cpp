@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The bounds of 32 and 64 bits for every integer word: what is written, checked, asked for and
 // read.
 

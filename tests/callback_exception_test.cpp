@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is thrown in the library's row callback passes SQLite and reaches the host.
 
 #include "support/rows.h"

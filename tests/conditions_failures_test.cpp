@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // SqlExpandMemberList where it fails: results, lines and what stays in the text.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // SqlExpandMemberList: a request as WHERE terms or as the SET list of an UPDATE.
 
 #include "support/database.h"

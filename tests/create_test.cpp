@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // recCreate: copy, defaults, type check, insert, and the message for the host's user.
 
 #include "support/database.h"

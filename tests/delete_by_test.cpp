@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Deleting by one value or a list of values of a text member.
 
 #include "support/records.h"

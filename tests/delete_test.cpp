@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Deleting by a condition object, and everything.
 
 #include "support/records.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/design.md names the test of every kept behaviour, and the guards.
 
 #include <gtest/gtest.h>

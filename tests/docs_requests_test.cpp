@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/requests.md: every row of every table is run on the records that the page shows.
 
 #include "support/database.h"

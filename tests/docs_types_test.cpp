@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/types.md: every cell of every table is run on SQLite.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/upgrading.md: rows in every JSON layout that the page shows are read back as the same
 // record.
 

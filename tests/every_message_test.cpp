@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every text of data/messages.txt is logged by some test, except the guards. It can only be told
 // when the whole suite runs in one process.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // runSqlEx: results, error texts, log lines and callbacks. Waiting stands in retry_test.cpp.
 
 #include "support/rows.h"

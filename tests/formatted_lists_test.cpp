@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Percent signs in stored values: every later value of the same list formats the text again.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Value lists behind texts that hold conversions of SQLite's formatter: what a "%" in the text so
 // far makes of the values that follow.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Value lists against SQLite's own formatter.
 
 #include "support/formatter_oracle.h"

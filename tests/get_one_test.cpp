@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Fetching one record.
 
 #include "support/records.h"

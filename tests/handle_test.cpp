@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Construction, table creation and the host's message.
 
 #include "support/rows.h"

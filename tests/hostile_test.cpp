@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Hostile strings in every member and before members of every kind.
 
 #include "support/database.h"

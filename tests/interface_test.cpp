@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What a host compiles and links against.
 
 #include "support/database.h"

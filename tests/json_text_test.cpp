@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // JSON values as text: how they are stored, read back and logged.
 
 #include "support/database.h"

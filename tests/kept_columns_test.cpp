@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the decoder knows of a result's columns is kept for the next statement. A host that changes
 // member types through the reference of recType in between sees no difference.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/limits.md names its tests.
 
 #include "support/markdown.h"

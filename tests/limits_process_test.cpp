@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/limits.md, what reaches beyond one call: locks, retries, threads, definitions, the reader.
 
 #include "support/limits.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // docs/limits.md, requests and records: each limit, and its way around.
 
 #include "support/limits.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Listing: the failures of each step with their lines, and what stays in the array.
 
 #include "support/records.h"

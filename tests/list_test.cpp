@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Listing: the composed statement, what is appended, wrong kinds and exceptions.
 
 #include "support/records.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The memory that a log line takes while it is composed.
 
 #include "support/rows.h"

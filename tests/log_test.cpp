@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The log lines byte for byte, and what they leave alone.
 
 #include "support/rows.h"

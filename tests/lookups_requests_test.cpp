@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The look-ups of member types behind listing, fetching, updating and deleting, where the
 // definition lacks the table: every look-up happens and logs, and what a listing inserts shows
 // afterwards.

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The look-ups of member types behind recSave and recCreate, on definitions that have none or not
 // all: every look-up happens and logs, line by line.
 

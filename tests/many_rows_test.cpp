@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Rows behind the first ones of a statement are decoded in a shorter way; a host sees no
 // difference.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Each place of a table definition as every kind of JSON value: what recType makes of it, and what
 // a handle with such a definition can do.
 

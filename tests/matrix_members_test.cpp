@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A member of every type word as every kind of JSON value, in records, requests and lists: how each
 // call ends.
 

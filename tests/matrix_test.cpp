@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every JSON argument of every call as every kind of JSON value: how the call ends, that it leaves
 // its outputs and the table alone where it fails, and that handle and connection go on working.
 

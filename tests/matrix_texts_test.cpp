@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Null and empty for every text and pointer of every call: how the call ends.
 
 #include "support/matrix.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // jsonCopyMember: the members of one object into another.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is read of a table definition, and how it is kept.
 
 #include "support/database.h"

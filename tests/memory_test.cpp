@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A lack of memory while a statement is composed.
 
 #include "support/database.h"

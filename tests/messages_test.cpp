@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Hosts read the log by its texts: data/messages.txt holds each of them, and the library none else.
 // A formatter, a linter or a renaming that touches one is found here.
 

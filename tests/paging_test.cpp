@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // SqlFilterConditionFromJson: sorting and paging.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The languages and subdivisions of Debian's package iso-codes through every operation, each
 // record compared whole with its entry in the source file. Members that an entry lacks are absent
 // in the record too: no defaults are declared, and the columns are then NULL.

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-License-Identifier: MIT
 # Tests examples/records on the whole of iso_639-3.json and iso_3166-2.json from the package
 # iso-codes and compares every record with its source.
 #

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-License-Identifier: MIT
 # Tests examples/records as its user sees it: exit status, standard output and standard error, all
 # compared exactly, and what stands in the database file afterwards (read with the sqlite3 shell).
 #

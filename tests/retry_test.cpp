@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // runSqlEx while the database is locked. Nothing sleeps in earnest.
 
 #include "support/rows.h"

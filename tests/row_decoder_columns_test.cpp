@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Columns without a name, at places that no row of the process had before.
 
 #include "support/rows.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Result rows as records: every type word, and what stops a statement. Rows that SQLite itself
 // never hands out stand in strange_rows_test.cpp.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // recSave: the statement, the stored row, and every failure with its lines.
 
 #include "support/database.h"

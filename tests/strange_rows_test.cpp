@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Rows and arguments that SQLite or the library itself never hand to the row callback.
 
 #include "support/rows.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The term builders where they fail, and VectorParamToJson.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the terms and the paging clause select in SQLite.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // SqlMakeByMatchField and SqlMakeByListField: one term by type word and value.
 
 #include "support/database.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The time helpers over the whole range of a long.
 
 #include "support/database.h"

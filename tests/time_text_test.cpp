@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The time helpers. No test looks at the clock or the time zone of the machine.
 
 #include "support/database.h"

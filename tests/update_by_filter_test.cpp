@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Updating by a filter object.
 
 #include "support/filter_update.h"

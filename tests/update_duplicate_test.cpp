@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The duplicate message that comes with a failed update by filter.
 
 #include "support/filter_update.h"

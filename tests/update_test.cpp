@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Updating by a condition text.
 
 #include "support/records.h"

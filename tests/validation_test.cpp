@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Default values and the type check.
 
 #include "support/database.h"

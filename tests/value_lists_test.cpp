@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Column lists, and value lists of records that hold no percent sign.
 
 #include "support/database.h"

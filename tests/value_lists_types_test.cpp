@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Column and value lists where the definition and the process-wide member types disagree, or where
 // the definition lacks what is looked up.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every contender; the optional ones are missing where their library was not found. "Kept" prepares
 // its statements once, without it they are prepared for each call.
 #pragma once

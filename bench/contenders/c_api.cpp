@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A host written by hand on the C API: statements prepared once, values bound, columns read by
 // their types, jsoncpp with a reader and a writer that are kept.
 #include "contenders/all.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // jsoncpp's reader and writer as a host that cares keeps them: made once, without comments.
 #pragma once
 

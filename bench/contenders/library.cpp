@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // This library, called as its header says.
 #include "contenders/all.h"
 

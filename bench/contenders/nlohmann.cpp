@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The same host by hand on the C API, with nlohmann::json in place of jsoncpp.
 #include "contenders/all.h"
 #include "contenders/statement.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A host on Poco::Data, statements prepared once on variables that are bound to them, with
 // Poco::JSON.
 #include "contenders/all.h"

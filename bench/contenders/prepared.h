@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A statement of a C++ library: prepared once, as hosts do that care, or for each call, as the
 // libraries' own examples do.
 #pragma once

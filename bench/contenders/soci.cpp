@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A host on SOCI, its statements on variables that are bound to them, with jsoncpp as the host by
 // hand uses it.
 #include "contenders/all.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A host on SQLiteCpp, with jsoncpp as the host by hand uses it.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"

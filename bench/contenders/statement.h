@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the hosts written by hand on the C API share: thin owners of a database and of statements
 // that are prepared once.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "fence.h"
 
 #include <utility>

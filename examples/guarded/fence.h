@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// What SQLite itself can refuse while a command of a stranger runs, should a check before it fail.
 #ifndef EXAMPLES_GUARDED_FENCE_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// The checks of a host that takes commands from strangers, before it calls the library. They need
 /// nothing but the command and the member types of the table. Each refuses by throwing Refused.

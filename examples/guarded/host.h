@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// The host: a table of notes, and commands of strangers for it.
 ///

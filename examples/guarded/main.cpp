@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /// @file
 /// A host that takes records and requests from strangers: one command a line on standard input, one
 /// answer a line on standard output. SECURITY.md says what is checked where.

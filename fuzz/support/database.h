@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A database in memory and a table of it, made afresh for each input.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/target.h"
 
 #include <VornJsonDbApi.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/sql_roles.h"
 
 #include <string>

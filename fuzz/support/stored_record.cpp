@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/stored_record.h"
 
 #include "support/target.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What becomes of a record, said once more and without the library: the judge of the record target.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What every fuzz target stands on. entry.cpp hands each input to testInput() and looks at the
 // process afterwards.
 #pragma once

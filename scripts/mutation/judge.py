@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Builds the library with a mutant in it and lets the tests judge it."""
 
 import json

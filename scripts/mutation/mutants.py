@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """All mutants of a source file: each is one small change that leaves every line where it is."""
 
 import hashlib

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Mutation testing of src/: every mutant, or a sample of them, judged by the tests.
 
 What was found is kept beside the build, so that a run can be stopped and goes on where it was. A killed

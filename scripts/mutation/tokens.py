@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """C++ source text as tokens, with the brackets matched."""
 
 import re

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/row_decoder.h"
 #include "util/log.h"
 #include "util/sqlite_text.h"

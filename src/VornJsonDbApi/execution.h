@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the operations share beside runSqlEx.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The text so far is itself a format of sqlite3_mprintf. Its grammar there:
 //
 //     conversion = "%" flag* [width] ["." [precision]] ["l" | "ll"] type

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The text of a value list, which grows by one formatted value at a time.
 #pragma once
 

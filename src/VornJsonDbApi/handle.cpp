@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/execution.h"
 #include "util/log.h"
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/execution.h"
 #include "VornJsonDbApi/row_decoder.h"
 #include "util/json_text.h"

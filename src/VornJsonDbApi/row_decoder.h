@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Decodes the rows of a statement into records.
 #pragma once
 

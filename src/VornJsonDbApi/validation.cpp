@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/formatted_text.h"
 #include "util/json_members.h"
 #include "util/json_text.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Members of a JSON value that may be of any kind: what is not an object has none, where jsoncpp's
 // own calls would throw.
 #pragma once

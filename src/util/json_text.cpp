@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "util/json_text.h"
 
 #include <json/reader.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // JSON values as text and back.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "util/log.h"
 
 #include <VornJsonDbApi.h>

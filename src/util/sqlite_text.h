@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Owner of a text that SQLite allocated.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The vocabulary of "cpptype": one row a word, one column a consumer.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Kills writers at random moments and checks after each kill what is left in their database.
 //
 //     crash KILLS [FOLDER]

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "crash/expected.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What has to be in the database, by the reports of its writers, and the check that it is.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The check after a kill lets pass what it has to, and nothing else.
 
 #include "crash/expected.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the writer does in one go, as it plans it, tells it and does it.
 #pragma once
 

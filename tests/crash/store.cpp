@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "crash/store.h"
 
 // To the output of the test: nothing is logged unless an operation fails.

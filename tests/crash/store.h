@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The database that the killed writer and the checker share, and what stands in it.
 #pragma once
 

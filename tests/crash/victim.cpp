@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "crash/victim.h"
 
 #include "crash/expected.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A child process that reports in lines and is killed.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A host that writes until it is killed. It tells its parent on kReport what it is about to do, and
 // that it is done, and ends by itself only when something fails.
 //

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What an attack may have reached. Each looks at a world that was stopped.
 #pragma once
 

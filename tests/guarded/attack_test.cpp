@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every attack reaches its aim at a host without checks, and at the example it does not.
 
 #include "attacks.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "attacks.h"
 
 #include "aims.h"

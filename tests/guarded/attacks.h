@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What a stranger may send to the host of examples/guarded to reach more than he is given.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What SQLite refuses behind the fence, whatever the statement comes from.
 
 #include "world.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the guard lets through, and what it reads.
 
 #include "examples/guarded/guard.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // SECURITY.md: its trust table names the attacks and the functions that are there.
 
 #include "attacks.h"

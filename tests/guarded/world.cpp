@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "world.h"
 
 #include "examples/guarded/guard.h"

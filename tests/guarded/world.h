@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The example's tables, the table of somebody else beside them, and the host behind none, one or
 // both of its layers.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A host in C++11, and as well in C++20, with hidden visibility: links, runs and creates records,
 // the last one while the process exits. The status tells which step failed.
 

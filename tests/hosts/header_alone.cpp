@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The header as the only thing that a host includes.
 #include <VornJsonDbApi.h>
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Fails malloc, n-th call by n-th call, while a host creates and lists records: jsoncpp takes its
 // texts from malloc and throws Json::RuntimeError when there is none. After each the handle works
 // and no statement is open. Prints how each attempt ended; the status tells which check failed.

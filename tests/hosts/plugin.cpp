@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A plugin that works with the library; plugin_host loads it.
 
 #include <VornJsonDbApi.h>

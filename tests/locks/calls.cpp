@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "locks/calls.h"
 
 #include "support/records.h"

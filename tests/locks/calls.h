@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The operations of the library on a table of three records, with the log of their failures.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A second process holds a lock, for a while and for ever.
 
 #include "locks/calls.h"

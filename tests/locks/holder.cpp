@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "locks/holder.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A second process that holds a lock on a database file.
 #pragma once
 

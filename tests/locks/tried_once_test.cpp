@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Errors that waiting does not cure are tried once.
 
 #include "locks/calls.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/database.h"
 
 #include <json/reader.h>

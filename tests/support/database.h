@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A temporary database and a table handle on it.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The figures of a test program: what its loops reached, printed when it ends.
 #pragma once
 

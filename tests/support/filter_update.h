@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // An update by filter as its tests run it, and the lines that its failures end with.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/formatter_oracle.h"
 
 #include <sqlite3.h>

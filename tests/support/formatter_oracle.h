@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // SQLite's own formatter as the judge of value lists: wherever C defines what
 //
 //     sqlite3_mprintf(text + conversion, value)

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The second part of hostileStrings().
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the tests share that put every hostile string into a role.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/hostile_strings.h"
 
 #include "support/hostile_more.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Texts that something may trip over.
 #pragma once
 

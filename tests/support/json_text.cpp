@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/json_text.h"
 
 #include <json/writer.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // JSON as the tests and the fuzz targets show it.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the tests of docs/limits.md share: they take their examples from the page.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/log.h"
 
 #include "support/doubles.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The log as a test reads it.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/markdown.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The documentation as test data: sections, fenced blocks and tables of a Markdown page.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the matrix tests share: the kinds of JSON value, and how a call ends.
 #pragma once
 

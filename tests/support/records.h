@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the tests of listing, fetching, updating and deleting share: a table of three records, and
 // the log lines that several operations end with.
 #pragma once

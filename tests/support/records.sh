@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 # Shared by the tests of examples/records; sourced, not run, with their arguments: PROGRAM
 # TABLES-FOLDER WORK-FOLDER. Leaves the shell in the work folder, which is empty then.
 set -euo pipefail

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "support/rows.h"
 
 #include <utility>

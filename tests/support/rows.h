@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the tests of execution and decoding share: rows handed to a row callback, and the handle's
 // last SQL error.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The time zone of the process, for a while.
 #pragma once
 

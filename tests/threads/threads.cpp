@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Two threads, each with handles of its own, on one connection and on two, and the host's own mutex
 // around every call: every result is right. With --without-lock the mutex is left out, which only
 // ThreadSanitizer should be shown. The status is 0 when all is well.

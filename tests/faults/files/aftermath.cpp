@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "faults/files/aftermath.h"
 
 #include "faults/files/fault_vfs.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What must hold after an operation, whatever failed in it.
 #pragma once
 

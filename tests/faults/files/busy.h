@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the tests of held locks share: an operation on a connection that holds its pages in memory
 // already, so that it only has to lock the file.
 #pragma once

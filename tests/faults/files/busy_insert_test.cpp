@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The n-th lock of an INSERT with its re-selection is held by somebody else.
 
 #include "faults/files/busy.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The n-th lock of a list, and of every other operation, is held by somebody else.
 
 #include "faults/files/busy.h"

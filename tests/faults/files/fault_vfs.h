@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A VFS over the default one whose operations fail where a plan says so.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every operation of the disk fails once, and from then on, under every operation of the library.
 
 #include "faults/files/aftermath.h"

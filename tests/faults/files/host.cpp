@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "faults/files/host.h"
 
 #include "faults/files/fault_vfs.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "faults/files/operations.h"
 
 namespace {

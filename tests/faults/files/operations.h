@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every operation of the library that touches the disk.
 #pragma once
 

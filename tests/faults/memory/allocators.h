@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The three allocators of a host process, each with a fault that can be armed: SQLite's through
 // SQLITE_CONFIG_MALLOC, C++'s operator new, and malloc, calloc and realloc themselves. Each counts
 // its own allocations only: what SQLite and operator new take is no malloc of the program.

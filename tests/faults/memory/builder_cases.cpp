@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The SQL builders. Text that they append to begins with "begin (" in each case.
 
 #include "cases.h"

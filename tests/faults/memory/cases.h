@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Every operation of the library as a host calls it, a row per case: on success, on a failed check
 // and on a refused statement.
 #pragma once

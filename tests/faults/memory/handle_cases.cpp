@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The handle's lifetime, its messages, running SQL, validation, and the free functions.
 
 #include "cases.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the host process gives the library besides memory: the flags, the log, the clock, the wait.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // JSON of the tests' own, without the library's reader and writer.
 #pragma once
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Fails each allocation of each operation, alone and with all that follow, and looks after each
 // whether the call ended as it may, whether the connection is sound and whether the handle goes on.
 

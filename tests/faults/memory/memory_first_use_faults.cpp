@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The same faults while the library is used for the first time in a process: its reader and writer
 // of JSON text, its member types and the names of columns are made then. So each point is a process
 // of its own.

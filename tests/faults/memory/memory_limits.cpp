@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What docs/limits.md says of a host that runs out of memory.
 
 #include "allocators.h"

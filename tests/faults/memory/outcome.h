@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A call of a case with its outcome as JSON, which has the members that cases.h describes.
 #pragma once
 

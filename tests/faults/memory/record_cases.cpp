@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The record operations.
 
 #include "cases.h"
