@@ -27,6 +27,7 @@ const Blocks kRun = {
     // tests/install_ways.sh, by scripts/clean-root
     {{"README.md", "Install it", "sh"}, 1},
     {{"README.md", "By CMake", "sh"}, 2},
+    {{"README.md", "By Debian packages", "sh"}, 3},
     {{"README.md", "A host that finds it", "cmake"}, 1},
     {{"README.md", "A host that finds it", "sh"}, 2},
     {{"README.md", "As a part of the host's own build", "cmake"}, 2},

@@ -86,6 +86,19 @@ printed
 in_folder "$clone" "Install it, By CMake" 2
 nothing_left
 
+say "by Debian packages"
+in_folder "$clone" "Install it, By Debian packages" 1
+installed_files >"$work/before"
+in_folder "$clone" "Install it, By Debian packages" 2
+folder=$(host packaged)
+block "$finds" cmake 1 >"$folder/CMakeLists.txt"
+in_folder "$folder" "$finds" 1
+printed
+in_folder "$(host packaged_pkg_config)" "$finds" 2
+printed
+in_folder "$clone" "Install it, By Debian packages" 3
+nothing_left
+
 for number in 1 2; do
     say "as a part of the host's own build, $number"
     folder=$(host "part_$number")
