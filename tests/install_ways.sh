@@ -41,7 +41,7 @@ in_folder() {
     local text
     text=$(block "$2" sh "$3")
     sed 's/^/$ /' <<<"$text"
-    (cd "$1" && bash -euo pipefail -c "$text") >"$work/log" 2>&1 || { cat "$work/log"; fail "status $?"; }
+    (cd "$1" && bash -euo pipefail -c "$text") >"$work/log" 2>&1 || { cat "$work/log"; fail "a command failed"; }
 }
 
 # host NAME: the folder of a new host.
