@@ -313,6 +313,9 @@ public:
     int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
+    // recSave() from one value to another, or to the same.
+    int saveRow(Json::Value& jRecInOut, bool blCreate, Json::Value& jRow);
+
     sqlite3* pDb = nullptr;
     std::string strName;
     Json::Value jTableDef;

@@ -84,6 +84,20 @@ TEST_F(Create, TakesOneObjectAsRecordAndResult)
     // A failure leaves it alone as well.
     EXPECT_EQ(-1, table_.api.recCreate(jRecord, jRecord));
     EXPECT_EQ(R"({"id":1,"name":"unnamed"})", text(jRecord));
+    jRecord = json(R"({"id":2,"name":"x","other":true})");
+    EXPECT_EQ(0, table_.api.recCreate(jRecord, jRecord));
+    EXPECT_EQ(R"({"id":2,"name":"x"})", text(jRecord));
+}
+
+TEST_F(Create, TakesARecordThatIsPartOfTheResultAndTheOtherWayRound)
+{
+    Json::Value jResult = json(R"({"record":{"id":1,"name":"x"}})");
+    EXPECT_EQ(0, table_.api.recCreate(jResult["record"], jResult));
+    EXPECT_EQ(R"({"id":1,"name":"x"})", text(jResult));
+
+    Json::Value jRecord = json(R"({"id":2,"name":"y"})");
+    EXPECT_EQ(0, table_.api.recCreate(jRecord, jRecord["stored"]));
+    EXPECT_EQ(R"({"id":2,"name":"y","stored":{"id":2,"name":"y"}})", text(jRecord));
 }
 
 TEST_F(Create, RefusesAnEmptyRecord)

@@ -4,7 +4,11 @@
 
 #include "util/log.h"
 
+#include <cstddef>
 #include <string>
+
+// Bytes that most statements find enough.
+inline constexpr std::size_t kUsualStatement = 128;
 
 // The context line of a failed operation, when SQLite had something to say.
 inline void logSqlError(const std::string& strSqlError, const std::string& strSql)

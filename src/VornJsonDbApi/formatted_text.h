@@ -29,7 +29,7 @@ struct FormatArgument {
 // never passed where it does. The rules stand in formatted_text.cpp.
 class FormattedText {
 public:
-    explicit FormattedText(std::string strText);
+    explicit FormattedText(const std::string& strText);
 
     // Appends one conversion of sqlite3_mprintf ("%Q", "%lld", "%llu", "%f", "%lf") and formats the
     // text with the argument. Throws std::logic_error when SQLite finds no memory.

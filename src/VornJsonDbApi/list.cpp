@@ -13,7 +13,7 @@ using VORN_JSON_DB::jsonCopyMember;
 // SELECT a,b FROM t  WHERE  (a='x' ) order by 'a' LIMIT 1;
 int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
 {
-    std::string strSqlPrefix = "SELECT ";
+    std::string strSqlPrefix;
     std::string strSql;
     std::string strSqlLimit;
     std::string strSqlRun;
@@ -29,6 +29,8 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
         return fail();
     if (FAILED(0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
     if (FAILED(0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit))) return fail();
+    strSqlPrefix.reserve(kUsualStatement);
+    strSqlPrefix += "SELECT ";
     if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();  // Guard: always 0
     strSqlRun = std::move(strSqlPrefix);
     strSqlRun.append(" FROM ").append(strName) += ' ';

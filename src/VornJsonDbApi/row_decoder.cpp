@@ -184,7 +184,7 @@ bool hasTypeWord(const Json::Value* pjMember, const std::string& strType)
 {
     if (nullptr == pjMember) return false;
     const Json::Value* pjWord = typeWordValue(*pjMember);
-    return nullptr != pjWord && pjWord->isString() && textOf(*pjWord) == strType;
+    return nullptr != pjWord && textOf(*pjWord) == strType;
 }
 
 // Whether the columns still have the types that they had in an earlier statement. Neither logs nor

@@ -62,7 +62,7 @@ private:
     Json::ArrayIndex nLeft_ = 0;
 };
 
-// The text of a JSON string.
+// The text of a JSON string, empty where the value is none.
 inline std::string_view textOf(const Json::Value& jString)
 {
     const char* szBegin = nullptr;
