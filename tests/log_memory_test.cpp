@@ -36,6 +36,14 @@ extern "C" __attribute__((format(printf, 2, 0))) int vasprintf(char** pszText, c
     return iLength;
 }
 
+// With _FORTIFY_SOURCE it is this one.
+extern "C" __attribute__((format(printf, 3, 0))) int __vasprintf_chk(char** pszText, int /*iFlag*/,
+                                                                     const char* szFormat,
+                                                                     va_list arguments) noexcept
+{
+    return vasprintf(pszText, szFormat, arguments);
+}
+
 namespace {
 
 class LogMemory : public TableTest {
