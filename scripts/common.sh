@@ -25,7 +25,8 @@ need_packages() {
     [ ${#missing[@]} = 0 ] && return
     say "installing ${missing[*]}"
     as_root apt-get update -qq
-    as_root env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}" >/dev/null
+    as_root env DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=600 install -y -qq \
+        --no-install-recommends "${missing[@]}" >/dev/null
 }
 
 # build PRESET [OPTION...]: configures and builds build/PRESET; what a build says is shown when it fails.
