@@ -24,6 +24,8 @@ sqlite3 records.db 'delete from record where id = 7'
 expect '21|1|ok'
 sqlite3 records.db "update record set text = 'changed' where id = 21"
 expect '21|2|ok'
+echo '0.1 5 5' >>acknowledged
+expect '22|3|ok'
 sqlite3 records.db 'create index texts on record (text)' 'pragma writable_schema = on' \
     "update sqlite_schema set sql = 'create index texts on record (id)' where name = 'texts'"
 [[ $(judge records.db acknowledged) != *ok ]] || { echo 'a damaged index was not noticed'; exit 1; }
