@@ -24,17 +24,16 @@ namespace {
 // One owner for each file: it keeps the lock until it closes the file, and nobody else reads or
 // writes there. WAL is the cheapest way to commit, and with the exclusive lock it needs no memory
 // that is shared, which two machines do not have. The order counts.
-const char* const kSettings[] = {"pragma locking_mode=exclusive", "pragma journal_mode=wal"};
+const char* const kSettings = "pragma locking_mode=exclusive; pragma journal_mode=wal";
 
 struct Close {
     void operator()(sqlite3* pDb) const { sqlite3_close(pDb); }
 };
 using Database = std::unique_ptr<sqlite3, Close>;
 
-// The last column of the last row of what a setting has become.
-int keepText(void* pText, int iColumns, char** aszValues, char**)
+int keepText(void* pText, int, char** aszValues, char**)
 {
-    *static_cast<std::string*>(pText) = aszValues[iColumns - 1];
+    *static_cast<std::string*>(pText) = aszValues[0];
     return 0;
 }
 
@@ -43,10 +42,8 @@ Database openFile(const std::string& strPath)
     sqlite3* pDb = nullptr;
     int iStatus = sqlite3_open(strPath.c_str(), &pDb);
     Database database(pDb);
-    std::string strMode;
-    for (const char* szSetting : kSettings)
-        if (SQLITE_OK == iStatus)
-            iStatus = sqlite3_exec(pDb, szSetting, keepText, &strMode, nullptr);
+    std::string strMode;  // the last setting answers with what it has become
+    if (SQLITE_OK == iStatus) iStatus = sqlite3_exec(pDb, kSettings, keepText, &strMode, nullptr);
     if (SQLITE_OK != iStatus) throw std::runtime_error(strPath + ": " + sqlite3_errmsg(pDb));
     if ("wal" != strMode) throw std::runtime_error(strPath + ": the journal is " + strMode);
     return database;
