@@ -61,25 +61,39 @@ def spread(labels, least):
     return placed
 
 
-def lines(title, x_title, y_title, series, number):
-    """series: (name, label, [(x, y)]) on a logarithmic x axis and a y axis from 0."""
-    left, right, top, bottom = 70, 250, 64, 380
-    xs = sorted({x for _, _, points in series for x, _ in points})
-    highest = max(y for _, _, points in series for _, y in points)
+def even_steps(highest):
+    """The marks of an axis from 0."""
     unit = 10 ** math.floor(math.log10(highest))
     unit = next(u for u in (unit / 5, unit / 2, unit, unit * 2) if highest / u <= 8)
-    y_end = math.ceil(highest / unit) * unit
+    return [i * unit for i in range(math.ceil(highest / unit) + 1)]
+
+
+def decades(lowest, highest):
+    """The marks of a logarithmic axis."""
+    return [10.0 ** i for i in range(math.floor(math.log10(lowest)), math.ceil(math.log10(highest)) + 1)]
+
+
+def lines(title, x_title, y_title, series, number, logarithmic=False):
+    """series: (name, label, [(x, y)]) on a logarithmic x axis and a y axis from 0, or a logarithmic one."""
+    left, right, top, bottom = 70, 250, 64, 380
+    xs = sorted({x for _, _, points in series for x, _ in points})
+    ys = [y for _, _, points in series for _, y in points]
+    marks = decades(min(ys), max(ys)) if logarithmic else even_steps(max(ys))
+
+    def share(value, first, last, scale):
+        return (scale(value) - scale(first)) / max(scale(last) - scale(first), 1e-9)
 
     def place(x, y):
-        along = (math.log10(x) - math.log10(xs[0])) / max(math.log10(xs[-1]) - math.log10(xs[0]), 1e-9)
-        return left + along * (WIDTH - left - right), bottom - y / y_end * (bottom - top)
+        along = share(x, xs[0], xs[-1], math.log10)
+        up = share(y, marks[0], marks[-1], math.log10 if logarithmic else float)
+        return left + along * (WIDTH - left - right), bottom - up * (bottom - top)
 
     parts = [text(16, 48, y_title, fill=MUTED)]
-    for i in range(round(y_end / unit) + 1):
-        _, y = place(xs[0], i * unit)
-        parts += [line(left, y, WIDTH - right, y), text(left - 8, y + 4, number(i * unit), "end", MUTED)]
+    for mark in marks:
+        _, y = place(xs[0], mark)
+        parts += [line(left, y, WIDTH - right, y), text(left - 8, y + 4, number(mark), "end", MUTED)]
     for x in xs:
-        px, _ = place(x, 0)
+        px, _ = place(x, marks[0])
         parts += [line(px, bottom, px, bottom + 5, MUTED), text(px, bottom + 20, f"{x:,}", "middle", MUTED)]
     parts.append(text((left + WIDTH - right) / 2, bottom + 40, x_title, "middle", MUTED))
 

@@ -18,6 +18,10 @@ foreach(name IN ITEMS first_steps duplicate_keys nulls_and_raw_filters json_memb
   prints_expected(${name})
 endforeach()
 
+add_executable(example_sharded ${example_folder}/sharded.cpp)
+target_link_libraries(example_sharded PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
+prints_expected(sharded ${CMAKE_CURRENT_BINARY_DIR}/tenants)
+
 # The program has the flags and shows them to the plugin; of the library it needs the header alone.
 add_library(example_plugin_module MODULE ${example_folder}/plugin_module.cpp)
 target_link_libraries(example_plugin_module PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)

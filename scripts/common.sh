@@ -7,7 +7,7 @@ build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev 
                 iso-codes pkg-config sqlite3)
 
 # The tests that run the whole suite in one process, the hosts, and what fails, locks and kills.
-whole_suite='^(in_memory|on_files|records|records_iso_codes|[a-z0-9]+_host|example_[a-z_]+|header_host_runs|guarded|guarded_tests|crash|crash_check|threads|locks|faults_[a-z_]+|fuzz_replay_[a-z]+)$'
+whole_suite='^(in_memory|on_files|records|records_iso_codes|[a-z0-9]+_host|example_[a-z_]+|header_host_runs|sharded|guarded|guarded_tests|crash|crash_check|threads|locks|faults_[a-z_]+|fuzz_replay_[a-z]+)$'
 
 say() {
     printf '== %s\n' "$*"
@@ -26,7 +26,8 @@ need_packages() {
     [ ${#missing[@]} = 0 ] && return
     say "installing ${missing[*]}"
     as_root apt-get update -qq
-    as_root env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends -o DPkg::Lock::Timeout=600 "${missing[@]}" >/dev/null
+    as_root env DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=600 install -y -qq \
+        --no-install-recommends "${missing[@]}" >/dev/null
 }
 
 # build PRESET [OPTION...]: configures and builds build/PRESET; what a build says is shown when it fails.

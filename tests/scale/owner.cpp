@@ -1,0 +1,101 @@
+// SPDX-License-Identifier: MIT
+// The owner of a database, a host that writes records for some seconds and notes what was
+// acknowledged:
+//
+//     scale_owner DATABASE SETTINGS-SQL ACKNOWLEDGED SECONDS [ROWS]
+//
+// ROWS records make a transaction (1: none is begun). As soon as it is acknowledged, the file
+// ACKNOWLEDGED gets a line "SECONDS FIRST-ID LAST-ID": how long it took, and which records it
+// wrote. There is one transaction at least. The exit status is 0, 1 when something failed, 2 for
+// wrong arguments, 3 when the database belongs to another owner.
+#include <VornJsonDbApi.h>
+#include <sqlite3.h>
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <cstdlib>
+#include <iostream>
+
+bool blLogToStdout = true;
+bool blDebugOutput = false;
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+double secondsSince(Clock::time_point began)
+{
+    return std::chrono::duration<double>(Clock::now() - began).count();
+}
+
+int keepNumber(void* pNumber, int, char** aszValues, char**)
+{
+    *static_cast<int*>(pNumber) = std::atoi(aszValues[0]);
+    return 0;
+}
+
+bool write(VornJsonDbApi& records, int iFirst, int iLast)
+{
+    if (iFirst != iLast && 0 > records.runSqlEx("begin immediate")) return false;
+    for (int i = iFirst; i <= iLast; ++i) {
+        const std::string strNumber = std::to_string(i);
+        Json::Value jRecord;
+        Json::Value jStored;
+        jRecord["id"] = i;
+        jRecord["text"] = std::string(180 - strNumber.size(), '0') + strNumber;
+        if (0 > records.recCreate(jRecord, jStored)) return false;
+    }
+    return iFirst == iLast || 0 <= records.runSqlEx("commit");
+}
+
+// A line is in the file, for every reader, once write() has returned.
+bool acknowledge(int iFile, double dSeconds, int iFirst, int iLast)
+{
+    const std::string strLine = std::to_string(dSeconds) + ' ' + std::to_string(iFirst) + ' ' +
+                                std::to_string(iLast) + '\n';
+    return static_cast<ssize_t>(strLine.size()) == ::write(iFile, strLine.data(), strLine.size());
+}
+
+bool own(sqlite3* pDb, int iFile, double dSeconds, int iRows)
+{
+    std::string strName = "record";
+    std::string strCreate = "create table if not exists record (id integer primary key, text text)";
+    Json::Value jDefinition;
+    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["text"]["cpptype"] = "string";
+    VornJsonDbApi records(pDb, strName, jDefinition, strCreate);
+
+    int iLast = 0;
+    if (0 > records.runSqlEx("select ifnull(max(id), 0) from record", keepNumber, &iLast))
+        return false;
+    const auto began = Clock::now();
+    do {
+        const auto began1 = Clock::now();
+        const int iFirst = iLast + 1;
+        iLast += iRows;
+        if (!write(records, iFirst, iLast)) return false;
+        if (!acknowledge(iFile, secondsSince(began1), iFirst, iLast)) return false;
+    } while (secondsSince(began) < dSeconds);
+    return true;
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    const double dSeconds = 4 < argc ? std::atof(argv[4]) : -1;
+    const int iRows = 5 < argc ? std::atoi(argv[5]) : 1;
+    if (5 > argc || 6 < argc || 0 > dSeconds || 1 > iRows) return 2;
+
+    sqlite3* pDb = nullptr;
+    const int iFile = open(argv[3], O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0644);
+    int iStatus = sqlite3_open(argv[1], &pDb);
+    if (SQLITE_OK == iStatus) iStatus = sqlite3_exec(pDb, argv[2], nullptr, nullptr, nullptr);
+    const bool blDone = SQLITE_OK == iStatus && own(pDb, iFile, dSeconds, iRows);
+    if (!blDone) std::cerr << "scale_owner: " << argv[1] << ": " << sqlite3_errmsg(pDb) << '\n';
+    sqlite3_close(pDb);
+    if (SQLITE_BUSY == iStatus) return 3;
+    return blDone ? 0 : 1;
+}
