@@ -203,7 +203,7 @@ public:
     int recSave(Json::Value& jRecInOut, bool blCreate);
 
     /// Inserts the object @p jRecIn, completed by its defaults and type-checked, and sets @p
-    /// jRecOut to the row as it is stored. @p jRecIn is never changed.
+    /// jRecOut to the stored row. @p jRecIn is not changed; nor may SQL functions change it.
     ///
     /// Returns 0, or -1 with @p jRecOut unchanged. getErrMsg() is then "DUPLICATE_PRIMARY_KEY" when
     /// the last SQL failure of this handle was a violated UNIQUE constraint, even if this call
@@ -313,7 +313,7 @@ public:
     int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
-    // recSave() from one value to another, or to the same.
+    // recSave() with the stored row put into jRow, which may be the record itself.
     int saveRow(Json::Value& jRecInOut, bool blCreate, Json::Value& jRow);
 
     sqlite3* pDb = nullptr;

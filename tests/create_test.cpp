@@ -3,6 +3,8 @@
 
 #include "support/database.h"
 
+#include <algorithm>
+
 namespace {
 
 const char kDuplicate[] = "DUPLICATE_PRIMARY_KEY";
@@ -94,10 +96,34 @@ TEST_F(Create, TakesARecordThatIsPartOfTheResultAndTheOtherWayRound)
     Json::Value jResult = json(R"({"record":{"id":1,"name":"x"}})");
     EXPECT_EQ(0, table_.api.recCreate(jResult["record"], jResult));
     EXPECT_EQ(R"({"id":1,"name":"x"})", text(jResult));
+    jResult = json(R"({"record":{"id":1,"name":"x"}})");
+    EXPECT_EQ(-1, table_.api.recCreate(jResult["record"], jResult));
+    EXPECT_EQ(R"({"record":{"id":1,"name":"x"}})", text(jResult));
 
-    Json::Value jRecord = json(R"({"id":2,"name":"y"})");
+    Json::Value jRecord = json(R"({"id":2,"name":"y","stored":5})");
     EXPECT_EQ(0, table_.api.recCreate(jRecord, jRecord["stored"]));
     EXPECT_EQ(R"({"id":2,"name":"y","stored":{"id":2,"name":"y"}})", text(jRecord));
+    EXPECT_EQ(-1, table_.api.recCreate(jRecord, jRecord["stored"]));
+    EXPECT_EQ(R"({"id":2,"name":"y","stored":{"id":2,"name":"y"}})", text(jRecord));
+    jRecord = json(R"({"id":3,"name":"z"})");
+    EXPECT_EQ(0, table_.api.recCreate(jRecord, jRecord["name"]));
+    EXPECT_EQ(R"({"id":3,"name":{"id":3,"name":"z"}})", text(jRecord));
+}
+
+// A host may change what recType refers to. Each of the four look-ups logs its four lines.
+TEST_F(Create, LogsEveryLookUpWhereTheTypesAreAList)
+{
+    VORN_JSON_DB::recType(table_.jDefinition, table_.strName) = json("[1]");
+    const Lines lines = refused(table_, R"({"id":1,"name":"x"})");
+    EXPECT_EQ(4, std::count(lines.begin(), lines.end(),
+                            utilFailed("jType[strJsonName].type() != Json::objectValue")));
+    ASSERT_EQ(16U + 6U, lines.size());
+    EXPECT_EQ((Lines{failed("!jType.isMember(strKey)"),
+                     failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
+                     plain(R"(blCreate=1, jRecInOut={"id":1,"name":"x"})"), plain("jType=[1]"),
+                     failed("0 > recSave(jParam, true)"),
+                     plain(R"(call create rec, rec={"id":1,"name":"x"})")}),
+              Lines(lines.begin() + 16, lines.end()));
 }
 
 TEST_F(Create, RefusesAnEmptyRecord)
@@ -180,8 +206,11 @@ TEST_F(Create, FailsOnWordsThatTheCheckTakesAndTheListDoesNot)
 TEST_F(Create, TellsADuplicateKey)
 {
     table_.create(R"({"id":1})");
-    EXPECT_EQ(duplicateLog(), refused(table_, R"({"id":1})"));
-    EXPECT_EQ(kDuplicate, table_.api.getErrMsg());
+    for (const char* szRecord : {R"({"id":1})", R"({"id":1,"name":"unnamed"})"}) {
+        table_.api.setErrMsg("");
+        EXPECT_EQ(duplicateLog(), refused(table_, szRecord));
+        EXPECT_EQ(kDuplicate, table_.api.getErrMsg());
+    }
     EXPECT_EQ("1", database_.value("select count(*) from " + table_.strName));
 }
 
