@@ -5,7 +5,7 @@ set(example_folder ${CMAKE_CURRENT_LIST_DIR})
 
 # prints_expected(NAME [ARGUMENT...]): when it is run with the arguments.
 function(prints_expected name)
-  add_test(NAME example_${name} COMMAND bash ${example_folder}/../tests/example_test.sh
+  add_test(NAME example_${name} COMMAND bash ${example_folder}/example_test.sh
     ${example_folder}/expected/${name}.txt $<TARGET_FILE:example_${name}> ${ARGN})
 endfunction()
 

@@ -30,6 +30,16 @@ need_packages() {
         --no-install-recommends "${missing[@]}" >/dev/null
 }
 
+# need_committed_tree: fails when something is not committed.
+need_committed_tree() {
+    local changes
+    changes=$(git status --porcelain)
+    [ -z "$changes" ] && return
+    say "not committed:"
+    echo "$changes"
+    exit 1
+}
+
 # build PRESET [OPTION...]: configures and builds build/PRESET; what a build says is shown when it fails.
 build() {
     local preset=$1

@@ -100,7 +100,7 @@ ln -s "$source/examples" "$work/alone/examples"
 sed -n '/^```sh$/,/^```$/ { /^```/d; p }' "$source/examples/README.md" >"$work/alone/build.sh"
 (cd "$work/alone" && PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig bash -e build.sh)
 LD_LIBRARY_PATH=$work/moved/$libdir \
-    bash "$source/tests/example_test.sh" "$source/examples/expected/first_steps.txt" "$work/alone/first_steps"
+    bash "$source/examples/example_test.sh" "$source/examples/expected/first_steps.txt" "$work/alone/first_steps"
 
 # Part of the host's own build.
 host_project part <<PROJECT
