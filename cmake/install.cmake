@@ -1,7 +1,6 @@
 # SPDX-License-Identifier: MIT
 # What is installed: the library with its links, the header, a package for find_package and one for
-# pkg-config, the manual pages, the guides and the licence. Both packages can be moved with what they
-# belong to.
+# pkg-config, the manual pages and the licence. Both packages can be moved with what they belong to.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
@@ -30,6 +29,10 @@ install(FILES
 file(RELATIVE_PATH prefix_from_pc
   ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
 string(REGEX REPLACE "/$" "" prefix_from_pc "${prefix_from_pc}")
+foreach(folder IN ITEMS LIBDIR INCLUDEDIR)
+  set(pc_${folder} "\${prefix}")
+  cmake_path(APPEND pc_${folder} "${CMAKE_INSTALL_${folder}}")  # an absolute one replaces the prefix
+endforeach()
 configure_file(cmake/vornjsondb.pc.in vornjsondb.pc @ONLY)
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/vornjsondb.pc
   DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT vornjsondb_development)
@@ -39,8 +42,6 @@ install(FILES man/VornJsonDbApi.3 DESTINATION ${CMAKE_INSTALL_MANDIR}/man3
 install(FILES man/vornjsondb.7 DESTINATION ${CMAKE_INSTALL_MANDIR}/man7
   COMPONENT vornjsondb_development)
 
-install(FILES README.md LICENSE CHANGELOG.md SECURITY.md DESTINATION ${CMAKE_INSTALL_DOCDIR}
-  COMPONENT vornjsondb_documentation)
-install(DIRECTORY docs/ DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs
-  COMPONENT vornjsondb_documentation FILES_MATCHING PATTERN "*.md" PATTERN "*.svg"
-  PATTERN site EXCLUDE)
+# CMAKE_INSTALL_DOCDIR is the host's own, where this is a part of a host.
+install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/${PROJECT_NAME}
+  COMPONENT vornjsondb_runtime)

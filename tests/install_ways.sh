@@ -36,12 +36,13 @@ block() {
         END { exit !found }' || fail "the README has no block $name"
 }
 
-# in_folder FOLDER SECTION NUMBER: the shell block, as a user types it; what it says is shown when it fails.
+# in_folder FOLDER SECTION NUMBER [COMMAND...]: the shell block, as a user types it, run by COMMAND; what it says
+# is shown when it fails.
 in_folder() {
     local text
     text=$(block "$2" sh "$3")
     sed 's/^/$ /' <<<"$text"
-    (cd "$1" && bash -euo pipefail -c "$text") >"$work/log" 2>&1 || { cat "$work/log"; fail "a command failed"; }
+    (cd "$1" && "${@:4}" bash -euo pipefail -c "$text") >"$work/log" 2>&1 || { cat "$work/log"; fail "a command failed"; }
 }
 
 # host NAME: the folder of a new host.
@@ -62,10 +63,17 @@ installed_files() {
     find /usr /etc /opt ! -type d | LC_ALL=C sort
 }
 
-# nothing_left: everything is as it was before the way.
+# way NAME: begins one.
+way() {
+    say "$1"
+    way=$1 began=$SECONDS
+}
+
+# nothing_left: everything is as it was before the way, which ends here.
 nothing_left() {
     installed_files | diff "$work/before" - || fail "not everything was removed"
     say "removed"
+    echo "figure: seconds $way = $((SECONDS - began))"
 }
 
 finds="Install it, A host that finds it"
@@ -75,8 +83,8 @@ say "what it needs"
 in_folder "$clone" "Install it" 1
 installed_files >"$work/before"
 
-say "by CMake"
-in_folder "$clone" "Install it, By CMake" 1
+way "by CMake"
+in_folder "$clone" "Install it, By CMake" 1 unshare --net
 folder=$(host found)
 block "$finds" cmake 1 >"$folder/CMakeLists.txt"
 in_folder "$folder" "$finds" 1
@@ -86,7 +94,7 @@ printed
 in_folder "$clone" "Install it, By CMake" 2
 nothing_left
 
-say "by Debian packages"
+way "by Debian packages"
 in_folder "$clone" "Install it, By Debian packages" 1
 installed_files >"$work/before"
 in_folder "$clone" "Install it, By Debian packages" 2
@@ -100,7 +108,7 @@ in_folder "$clone" "Install it, By Debian packages" 3
 nothing_left
 
 for number in 1 2; do
-    say "as a part of the host's own build, $number"
+    way "as a part of the host's own build, $number"
     folder=$(host "part_$number")
     git clone --quiet "$clone" "$folder/vornjsondb"
     block "$part" cmake "$number" >"$folder/CMakeLists.txt"

@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: MIT
 # package_test.sh SOURCE WORK HOST EXPECTED: installs the library as the README says, moves what was
 # installed, and builds the README's host against it in every way that the README names, and the
-# small examples.
+# examples.
 set -euo pipefail
 source=$1 work=$2 host=$3 expected=$4
 
@@ -40,8 +40,24 @@ host_project() {
     runs "$work/$1/build/host"
 }
 
+# installed_files FOLDER: what is below it, with LIBDIR for the folder of the library.
+installed_files() {
+    local libdir
+    libdir=$(dirname "$(cd "$1" && find . -name libvornjsondb.so)")
+    (cd "$1" && find . ! -type d | sed "s|^$libdir/|LIBDIR/|; s|^\./||" | LC_ALL=C sort)
+}
+
+# part_alone FOLDER: a host that the library is a part of has not built its tests and examples.
+part_alone() {
+    for option in TESTS EXAMPLES; do
+        grep -qx "VORNJSONDB_$option:BOOL=OFF" "$1/build/CMakeCache.txt" || fail "$1 has VORNJSONDB_$option on"
+    done
+    if find "$1/build" -name tests -o -name examples | grep .; then fail "$1 has built more than the library"; fi
+}
+
 rm -rf "$work"
 mkdir -p "$work"
+[ "$(wc -l <"$host")" -le 30 ] || fail "the host has more than 30 lines"
 
 # The library alone, as it is shipped.
 cmake -S "$source" -B "$work/build" -DCMAKE_BUILD_TYPE=Release -DVORNJSONDB_TESTS=OFF \
@@ -51,7 +67,7 @@ DESTDIR=$work/stage cmake --install "$work/build" >>"$work/log"
 mv "$work/stage/usr" "$work/moved"
 
 libdir=$(dirname "$(cd "$work/moved" && find . -name libvornjsondb.so)")
-(cd "$work/moved" && find . ! -type d | sed "s|^$libdir/|LIBDIR/|; s|^\./||" | LC_ALL=C sort) >"$work/installed"
+installed_files "$work/moved" >"$work/installed"
 same "the list of installed files" "$source/tests/data/installed.txt" "$work/installed"
 if grep -rlF -e "$source" -e "$work" "$work/moved"; then fail "a path of the build was installed"; fi
 
@@ -75,9 +91,27 @@ add_executable(host host.cpp)
 target_link_libraries(host PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
 enable_testing()
 include($source/examples/programs.cmake)
+add_executable(records $source/examples/records.cpp)
+add_executable(guarded $source/examples/guarded/guard.cpp $source/examples/guarded/fence.cpp
+  $source/examples/guarded/host.cpp $source/examples/guarded/main.cpp)
+foreach(name IN ITEMS records guarded)
+  target_link_libraries(\${name} PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
+endforeach()
 PROJECT
 ctest --test-dir "$work/found/build" --no-tests=error --output-on-failure >"$work/found/log" ||
     { cat "$work/found/log"; fail "an example against the installed library"; }
+bash "$source/tests/records_test.sh" "$work/found/build/records" "$source/examples/tables" "$work/found/records_test" \
+    >"$work/found/log" 2>&1 || { cat "$work/found/log"; fail "records against the installed library"; }
+(cd "$source/examples/guarded" && "$work/found/build/guarded" :memory: <commands.txt >"$work/found/answers.txt")
+same "what guarded answers" "$source/examples/guarded/answers.txt" "$work/found/answers.txt"
+
+# Found by CMake, twice, and all that it needs with it.
+host_project found_alone -DCMAKE_PREFIX_PATH="$work/moved" <<PROJECT
+find_package(VornJsonDb 6 CONFIG REQUIRED)
+find_package(VornJsonDb 6 CONFIG REQUIRED)
+add_executable(host host.cpp)
+target_link_libraries(host PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
+PROJECT
 
 # Of the version that was asked for.
 for version in 5 7 6.99; do
@@ -93,6 +127,14 @@ flags=$(PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig pkg-config --cflags --libs
 c++ -std=c++17 "$host" $flags -Wl,-rpath,"$work/moved/$libdir" -o "$work/host"
 runs "$work/host"
 
+# In folders that are not below the prefix, pkg-config names them as they stand.
+cmake -S "$source" -B "$work/absolute" -DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXAMPLES=OFF \
+    -DCMAKE_INSTALL_PREFIX=/usr -DCMAKE_INSTALL_LIBDIR=/opt/lib -DCMAKE_INSTALL_INCLUDEDIR=/srv/include >>"$work/log"
+for variable in libdir=/opt/lib includedir=/srv/include; do
+    [ "$(pkg-config --variable="${variable%%=*}" "$work/absolute/vornjsondb.pc")" = "${variable#*=}" ] ||
+        fail "pkg-config has not $variable"
+done
+
 # One example alone, as examples/README.md has it.
 mkdir "$work/alone"
 ln -s "$source/examples" "$work/alone/examples"
@@ -102,13 +144,18 @@ sed -n '/^```sh$/,/^```$/ { /^```/d; p }' "$source/examples/README.md" >"$work/a
 LD_LIBRARY_PATH=$work/moved/$libdir \
     bash "$source/examples/example_test.sh" "$source/examples/expected/first_steps.txt" "$work/alone/first_steps"
 
-# Part of the host's own build.
-host_project part <<PROJECT
+# Part of the host's own build, and installed with it in the same places.
+host_project part -DCMAKE_INSTALL_PREFIX=/usr -DCMAKE_BUILD_TYPE=Release <<PROJECT
+include(GNUInstallDirs)
 add_subdirectory($source vornjsondb)
 find_package(SQLite3 REQUIRED)
 add_executable(host host.cpp)
 target_link_libraries(host PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
 PROJECT
+part_alone "$work/part"
+DESTDIR=$work/part/stage cmake --install "$work/part/build" >>"$work/log"
+installed_files "$work/part/stage/usr" >"$work/part/installed"
+same "the list of what a host installs" "$source/tests/data/installed.txt" "$work/part/installed"
 host_project fetched <<PROJECT
 include(FetchContent)
 FetchContent_Declare(vornjsondb SOURCE_DIR $source)
@@ -117,3 +164,4 @@ find_package(SQLite3 REQUIRED)
 add_executable(host host.cpp)
 target_link_libraries(host PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
 PROJECT
+part_alone "$work/fetched"

@@ -18,22 +18,26 @@ lowest() {
     sed -nE "s/^set\\(VORNJSONDB_$1 ([0-9.]+)\\)$/\\1/p" "$source/CMakeLists.txt"
 }
 
-# below VERSION: the version before it.
+# below VERSION: one before it.
 below() {
-    echo "${1%.*}.$((${1##*.} - 1))"
+    local major minor patch number
+    IFS=. read -r major minor patch <<<"$1"
+    number=$(((major * 1000 + minor) * 1000 + patch - 1))
+    echo "$((number / 1000000)).$((number / 1000 % 1000)).$((number % 1000))"
 }
 
-# configures JSONCPP SQLITE: with the installed packages, which claim these versions.
+# configures JSONCPP SQLITE [FOLDER]: the project, or the host in FOLDER, with the installed packages, which claim
+# these versions.
 configures() {
-    rm -rf "$work"
+    rm -rf "$work/build" "$work/include" "$work/jsoncpp"
     mkdir -p "$work/include" "$work/jsoncpp"
     echo "include($jsoncpp/jsoncppConfig.cmake)" >"$work/jsoncpp/jsoncppConfig.cmake"
     sed -E "s/[0-9]+\\.[0-9]+\\.[0-9]+/$1/" "$jsoncpp/jsoncppConfigVersion.cmake" \
         >"$work/jsoncpp/jsoncppConfigVersion.cmake"
     sed -E "s/(#define SQLITE_VERSION +\").*\"/\\1$2\"/" "$sqlite/sqlite3.h" >"$work/include/sqlite3.h"
-    cmake -S "$source" -B "$work/build" -Djsoncpp_DIR="$work/jsoncpp" -DSQLite3_INCLUDE_DIR="$work/include" \
+    cmake -S "${3:-$source}" -B "$work/build" -Djsoncpp_DIR="$work/jsoncpp" -DSQLite3_INCLUDE_DIR="$work/include" \
         -DCMAKE_FIND_USE_CMAKE_SYSTEM_PATH=OFF -DCMAKE_FIND_USE_SYSTEM_ENVIRONMENT_PATH=OFF \
-        -DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXAMPLES=OFF "${options[@]}" >"$work/log" 2>&1
+        -DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXAMPLES=OFF -DVornJsonDb_DIR="$work/package" "${options[@]}" >"$work/log" 2>&1
 }
 
 # refused NAME LOWER LOWEST
@@ -43,6 +47,15 @@ refused() {
     done
 }
 
+# host NAME: a host in a folder of this name, which finds jsoncpp before the line on standard input.
+host() {
+    mkdir -p "$work/$1"
+    { printf 'cmake_minimum_required(VERSION 3.22)\nproject(host LANGUAGES CXX)\nfind_package(jsoncpp REQUIRED)\n'; cat; } \
+        >"$work/$1/CMakeLists.txt"
+}
+
+[ "$(below 1.10.0)" = 1.9.999 ] || fail "another version is below 1.10.0"
+rm -rf "$work"
 jsoncpp_version=$(lowest JSONCPP)
 sqlite_version=$(lowest SQLITE)
 cmake_version=$(sed -nE 's/^cmake_minimum_required\(VERSION ([0-9.]+)\)$/\1/p' "$source/CMakeLists.txt")
@@ -50,9 +63,18 @@ grep -qF "jsoncpp ($jsoncpp_version or later), SQLite ($sqlite_version or later)
     "$source/README.md" || fail "the README has other versions"
 
 configures "$jsoncpp_version" "$sqlite_version" || { cat "$work/log"; fail "the lowest versions do not do"; }
+mkdir "$work/package"
+cp "$work"/build/VornJsonDbConfig*.cmake "$work/package"
 lower=$(below "$jsoncpp_version")
 if configures "$lower" "$sqlite_version"; then fail "jsoncpp $lower was taken"; fi
 refused jsoncpp "$lower" "$jsoncpp_version"
+host part <<<"add_subdirectory($source vornjsondb)"
+host found <<<"find_package(VornJsonDb CONFIG REQUIRED)"
+for name in part found; do
+    if configures "$lower" "$sqlite_version" "$work/$name"; then fail "the host's jsoncpp $lower was taken"; fi
+    refused jsoncpp "$lower" "$jsoncpp_version"
+done
+configures "$jsoncpp_version" "$sqlite_version" "$work/part" || { cat "$work/log"; fail "the host's lowest version does not do"; }
 lower=$(below "$sqlite_version")
 if configures "$jsoncpp_version" "$lower"; then fail "SQLite $lower was taken"; fi
 refused SQLite3 "$lower" "$sqlite_version"
