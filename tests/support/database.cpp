@@ -38,6 +38,9 @@ Database::Database(Place place)
         strPath_ =
             std::filesystem::temp_directory_path() /
             ("vornjsondb-" + std::to_string(getpid()) + "-" + std::to_string(++iCount) + ".db");
+        // A process that had this number may have been killed.
+        std::filesystem::remove(strPath_);
+        std::filesystem::remove(strPath_ + "-journal");
     }
     const std::string strTarget = strPath_.empty() ? ":memory:" : strPath_;
     if (SQLITE_OK != sqlite3_open(strTarget.c_str(), &pDb_)) ADD_FAILURE() << sqlite3_errmsg(pDb_);

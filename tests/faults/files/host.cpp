@@ -56,6 +56,7 @@ DiskFile::DiskFile(const Form& form)
                  ("vornjsondb-faults-" + std::to_string(getpid()) + "-" + std::to_string(++iCount));
     strFirstState_ = strFolder_ + "/first";
     strPath_ = strFolder_ + "/db";
+    fs::remove_all(strFolder_);  // of a process that had this number and was killed
     fs::create_directory(strFolder_);
     Database(strFirstState_, fault_vfs::name()).run(firstState(form));
     restore();

@@ -80,6 +80,8 @@ bool isMutexFree(sqlite3* pDb)
 Store::Store() : strPath_(path(".db"))
 {
     static const std::string& strFresh = *new std::string(freshFile());
+    // Of a process that had this number and was killed: SQLite would play it back.
+    std::filesystem::remove(strPath_ + "-journal");
     std::ofstream(strPath_, std::ios::binary) << strFresh;
     pDb_ = opened(strPath_);
     pOther_ = opened(strPath_);
