@@ -18,7 +18,17 @@ fails() {
     diff - err <<<"sharded: $2"
 }
 
+# whole TENANT...: their files hold the three invoices
+whole() {
+    local tenant
+    for tenant in "$@"; do
+        sqlite3 "tenants/tenant-$tenant.db" 'select id, customer from invoice order by id; pragma integrity_check' |
+            diff - <(printf '1|Ada\n2|Grace\n3|Hedy\nok\n')
+    done
+}
+
 "$program" | diff "$expected" -
+whole {1..8}
 "$program" tenants | diff "$expected" -
 
 echo 'no database' >file
@@ -26,6 +36,7 @@ fails file/tenants 'filesystem error: cannot create directories: Not a directory
 
 head -c 200 /dev/zero | tr '\0' x >tenants/tenant-3.db
 fails tenants 'tenants/tenant-3.db: file is not a database'
+whole 1 2 {4..8}
 rm tenants/tenant-3.db
 "$program" tenants | diff "$expected" -
 
@@ -36,5 +47,6 @@ until [ -e taken ]; do sleep 0.1; done
 fails tenants 'tenants/tenant-2.db: database is locked'
 echo >end
 wait
+whole {1..8}
 "$program" tenants | diff "$expected" -
-[ "$(sqlite3 tenants/tenant-2.db 'pragma integrity_check')" = ok ]
+whole {1..8}
