@@ -17,12 +17,18 @@ as_root() {
     if [ "$(id -u)" = 0 ]; then "$@"; else sudo "$@"; fi
 }
 
+# missing_packages NAME...: those that are not installed, a line each.
+missing_packages() {
+    local name
+    for name in "$@"; do
+        [ "$(dpkg-query -W -f '${db:Status-Status}' "$name" 2>/dev/null)" = installed ] || echo "$name"
+    done
+}
+
 # need_packages NAME...: installs those that are missing.
 need_packages() {
-    local missing=() name
-    for name in "$@"; do
-        [ "$(dpkg-query -W -f '${db:Status-Status}' "$name" 2>/dev/null)" = installed ] || missing+=("$name")
-    done
+    local missing
+    mapfile -t missing < <(missing_packages "$@")
     [ ${#missing[@]} = 0 ] && return
     say "installing ${missing[*]}"
     as_root apt-get update -qq
