@@ -19,11 +19,13 @@ const std::vector<ContenderEntry>& contenders()
         {"sqlitecpp-kept", "SQLiteCpp, jsoncpp, kept", makeSqliteCppKept},
 #endif
 #ifdef BENCH_SOCI
-        {"soci", "SOCI, jsoncpp", makeSoci},
+        {"soci", "SOCI, jsoncpp, by name", makeSoci},
+        {"soci-position", "SOCI, jsoncpp, by position", makeSociByPosition},
         {"soci-kept", "SOCI, jsoncpp, kept", makeSociKept},
 #endif
 #ifdef BENCH_POCO
-        {"poco", "Poco::Data, Poco::JSON", makePoco},
+        {"poco", "Poco::Data, Poco::JSON, by name", makePoco},
+        {"poco-position", "Poco::Data, Poco::JSON, by position", makePocoByPosition},
         {"poco-kept", "Poco::Data, Poco::JSON, kept", makePocoKept},
 #endif
         {"sqljson", "SQLite's JSON functions, jsoncpp, kept", makeSqlJson},

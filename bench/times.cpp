@@ -20,6 +20,7 @@ void pass(benchmark::State& state, const char* szContender, bench::Operation ope
         bench::run(contender->connection(), "BEGIN");
         state.ResumeTiming();
         for (int i = 0; i < calls; ++i) bench::call(*contender, operation, i);
+        contender->dropResult();
         state.PauseTiming();
         bench::run(contender->connection(), "COMMIT");
         contender.reset();

@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: MIT
-// A host on Poco::Data, statements prepared once on variables that are bound to them, with
-// Poco::JSON.
+// A host on Poco::Data with Poco::JSON. Columns are found in the result by name, or read into
+// variables that are bound by their position.
 #include "contenders/all.h"
 #include "contenders/prepared.h"
 
+#include <Poco/Data/RecordSet.h>
 #include <Poco/Data/SQLite/Connector.h>
 #include <Poco/Data/SQLite/Utility.h>
 #include <Poco/Data/Session.h>
@@ -17,6 +18,7 @@
 
 namespace bench {
 
+using Poco::Data::RecordSet;
 using Poco::Data::Keywords::into;
 using Poco::Data::Keywords::range;
 using Poco::Data::Keywords::use;
@@ -51,7 +53,7 @@ struct Row {
 
 class PocoHost : public JsonContender<Var> {
 public:
-    explicit PocoHost(Prepare when) : when_(when) {}
+    PocoHost(Members members, Prepare when) : members_(members), when_(when) {}
 
     sqlite3* connection() override { return Poco::Data::SQLite::Utility::dbHandle(session_); }
 
@@ -125,10 +127,12 @@ private:
 
     PocoStatement select(const std::string& strWhere)
     {
+        const std::string strSql = std::string("SELECT ") + kColumns + " FROM task" + strWhere;
+        if (Members::kByName == members_) return session_ << strSql;
         // One row for each execution, as long as there are some.
-        return (session_ << std::string("SELECT ") + kColumns + " FROM task" + strWhere,
-                into(out_.iDone), into(out_.strGrp), into(out_.iId), into(out_.strMeta),
-                into(out_.strName), into(out_.iQty), into(out_.strTags), range(0, 1));
+        return (session_ << strSql, into(out_.iDone), into(out_.strGrp), into(out_.iId),
+                into(out_.strMeta), into(out_.strName), into(out_.iQty), into(out_.strTags),
+                range(0, 1));
     }
 
     Object::Ptr row()
@@ -144,21 +148,43 @@ private:
         return rec;
     }
 
+    Object::Ptr row(RecordSet& columns)
+    {
+        out_.iDone = columns["done"].convert<int>();
+        out_.strGrp = columns["grp"].convert<std::string>();
+        out_.iId = columns["id"].convert<int>();
+        out_.strMeta = columns["meta"].convert<std::string>();
+        out_.strName = columns["name"].convert<std::string>();
+        out_.iQty = columns["qty"].convert<Poco::Int64>();
+        out_.strTags = columns["tags"].convert<std::string>();
+        return row();
+    }
+
     Var only(PocoStatement& statement)
     {
         must(1 == statement.execute(), "one row");
-        return row();
+        if (Members::kByPosition == members_) return row();
+        RecordSet columns(statement);
+        return row(columns);
     }
 
     Var all(PocoStatement& statement)
     {
         Array::Ptr rows = new Array;
+        if (Members::kByName == members_) {
+            statement.execute();
+            RecordSet columns(statement);
+            for (bool more = columns.moveFirst(); more; more = columns.moveNext())
+                rows->add(row(columns));
+            return rows;
+        }
         do {
             if (1 == statement.execute()) rows->add(row());
         } while (!statement.done());
         return rows;
     }
 
+    const Members members_;
     const Prepare when_;
     Poco::Data::Session session_ = opened();
     Row in_;
@@ -190,12 +216,17 @@ private:
 
 std::unique_ptr<Contender> makePoco()
 {
-    return std::make_unique<PocoHost>(Prepare::kEachCall);
+    return std::make_unique<PocoHost>(Members::kByName, Prepare::kEachCall);
+}
+
+std::unique_ptr<Contender> makePocoByPosition()
+{
+    return std::make_unique<PocoHost>(Members::kByPosition, Prepare::kEachCall);
 }
 
 std::unique_ptr<Contender> makePocoKept()
 {
-    return std::make_unique<PocoHost>(Prepare::kOnce);
+    return std::make_unique<PocoHost>(Members::kByPosition, Prepare::kOnce);
 }
 
 }  // namespace bench

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
-// A statement of a C++ library: prepared once, as hosts do that care, or for each call, as the
-// libraries' own examples do.
+// How a host uses a C++ library: its statements prepared once, as hosts do that care, or for each
+// call, as the libraries' own examples do; a record's members found by name, as a host does that
+// maps records to columns, or read and bound by their position.
 #pragma once
 
 #include <functional>
@@ -10,6 +11,7 @@
 namespace bench {
 
 enum class Prepare { kOnce, kEachCall };
+enum class Members { kByName, kByPosition };
 
 template <typename StatementType>
 class Prepared {

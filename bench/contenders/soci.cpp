@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A host on SOCI, its statements on variables that are bound to them, with jsoncpp as the host by
-// hand uses it.
+// A host on SOCI, with jsoncpp as the host by hand uses it. Records go in and out as an object
+// whose members SOCI finds by name, or as variables that are bound by their position.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
 #include "contenders/prepared.h"
@@ -11,8 +11,6 @@
 #include <utility>
 
 namespace bench {
-
-namespace {
 
 // What the statements read from and write to.
 struct Row {
@@ -25,9 +23,43 @@ struct Row {
     std::string strTags;
 };
 
+}  // namespace bench
+
+template <>
+struct soci::type_conversion<bench::Row> {
+    using base_type = values;
+
+    static void from_base(const values& columns, indicator, bench::Row& row)
+    {
+        row.iDone = columns.get<int>("done");
+        row.strGrp = columns.get<std::string>("grp");
+        row.iId = columns.get<int>("id");
+        row.strMeta = columns.get<std::string>("meta");
+        row.strName = columns.get<std::string>("name");
+        row.iQty = columns.get<long long>("qty");
+        row.strTags = columns.get<std::string>("tags");
+    }
+
+    static void to_base(const bench::Row& row, values& columns, indicator& state)
+    {
+        columns.set("done", row.iDone);
+        columns.set("grp", row.strGrp);
+        columns.set("id", row.iId);
+        columns.set("meta", row.strMeta);
+        columns.set("name", row.strName);
+        columns.set("qty", row.iQty);
+        columns.set("tags", row.strTags);
+        state = i_ok;
+    }
+};
+
+namespace bench {
+
+namespace {
+
 class Soci : public JsonContender<Json::Value> {
 public:
-    explicit Soci(Prepare when) : when_(when) {}
+    Soci(Members members, Prepare when) : members_(members), when_(when) {}
 
     sqlite3* connection() override
     {
@@ -79,12 +111,25 @@ public:
 private:
     using Statement = Prepared<soci::statement>;
 
-    soci::details::prepare_temp_type intoOut(const char* szWhere)
+    using Preparation = soci::details::prepare_temp_type;
+
+    Preparation insertIn()
     {
-        return (session_.prepare << std::string("SELECT ") + kColumns + " FROM task" + szWhere,
-                soci::into(out_.iDone), soci::into(out_.strGrp), soci::into(out_.iId),
-                soci::into(out_.strMeta), soci::into(out_.strName), soci::into(out_.iQty),
-                soci::into(out_.strTags));
+        const std::string strSql = std::string("INSERT INTO task (") + kColumns +
+                                   ") VALUES (:done,:grp,:id,:meta,:name,:qty,:tags)";
+        if (Members::kByName == members_) return (session_.prepare << strSql, soci::use(in_));
+        return (session_.prepare << strSql, soci::use(in_.iDone), soci::use(in_.strGrp),
+                soci::use(in_.iId), soci::use(in_.strMeta), soci::use(in_.strName),
+                soci::use(in_.iQty), soci::use(in_.strTags));
+    }
+
+    Preparation intoOut(const char* szWhere)
+    {
+        const std::string strSql = std::string("SELECT ") + kColumns + " FROM task" + szWhere;
+        if (Members::kByName == members_) return (session_.prepare << strSql, soci::into(out_));
+        return (session_.prepare << strSql, soci::into(out_.iDone), soci::into(out_.strGrp),
+                soci::into(out_.iId), soci::into(out_.strMeta), soci::into(out_.strName),
+                soci::into(out_.iQty), soci::into(out_.strTags));
     }
 
     Json::Value row()
@@ -116,7 +161,10 @@ private:
 
     static void makeTable(soci::session& session)
     {
-        const std::string strCreate = createStatement();
+        std::string strCreate = createStatement();
+        // What is found by name is of the column's declared type, and INTEGER is an int.
+        const std::string strQty = "qty INTEGER";
+        strCreate.replace(strCreate.find(strQty), strQty.size(), "qty BIGINT");
         const std::string::size_type end = strCreate.find(';');
         session << strCreate.substr(0, end);
         session << strCreate.substr(end + 1);
@@ -126,18 +174,12 @@ private:
         Session() : soci::session(soci::sqlite3, ":memory:") { makeTable(*this); }
     };
 
+    const Members members_;
     const Prepare when_;
     Session session_;
     Row in_;
     Row out_;
-    Statement insert_{
-        when_, [this]() -> soci::statement {
-            return (session_.prepare << std::string("INSERT INTO task (") + kColumns +
-                                            ") VALUES (:done,:grp,:id,:meta,:name,:qty,:tags)",
-                    soci::use(in_.iDone), soci::use(in_.strGrp), soci::use(in_.iId),
-                    soci::use(in_.strMeta), soci::use(in_.strName), soci::use(in_.iQty),
-                    soci::use(in_.strTags));
-        }};
+    Statement insert_{when_, [this]() -> soci::statement { return insertIn(); }};
     Statement stored_{when_, [this]() -> soci::statement {
                           return intoOut(" WHERE rowid = last_insert_rowid()");
                       }};
@@ -163,12 +205,17 @@ private:
 
 std::unique_ptr<Contender> makeSoci()
 {
-    return std::make_unique<Soci>(Prepare::kEachCall);
+    return std::make_unique<Soci>(Members::kByName, Prepare::kEachCall);
+}
+
+std::unique_ptr<Contender> makeSociByPosition()
+{
+    return std::make_unique<Soci>(Members::kByPosition, Prepare::kEachCall);
 }
 
 std::unique_ptr<Contender> makeSociKept()
 {
-    return std::make_unique<Soci>(Prepare::kOnce);
+    return std::make_unique<Soci>(Members::kByPosition, Prepare::kOnce);
 }
 
 }  // namespace bench
