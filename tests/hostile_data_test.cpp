@@ -4,6 +4,10 @@
 
 #include "support/hostile_roles.h"
 
+#include <algorithm>
+#include <climits>
+#include <cstdlib>
+
 namespace {
 
 class HostileData : public HostileRoleTest {
@@ -160,6 +164,73 @@ TEST_F(HostileData, SortKeyAndDirection)
         EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
         EXPECT_EQ(2U, jRecords.size());
     });
+}
+
+long long number(const std::string& strText)
+{
+    return strtoll(strText.c_str(), nullptr, 10);
+}
+
+Json::Value asText(const std::string& strText)
+{
+    return strText.c_str();
+}
+
+Json::Value asInt(const std::string& strText)
+{
+    return static_cast<int>(std::clamp<long long>(number(strText), INT_MIN, INT_MAX));
+}
+
+Json::Value asInt64(const std::string& strText)
+{
+    return Json::Int64(number(strText));
+}
+
+Json::Value asBool(const std::string& strText)
+{
+    return 1 == number(strText);
+}
+
+Json::Value asJson(const std::string& strText)
+{
+    return leftByReader(strText.c_str());
+}
+
+struct Word {
+    const char* szWord;
+    // What a stored text comes back as; null where no column can be decoded.
+    Json::Value (*value)(const std::string& strText);
+};
+
+const Word kWords[] = {
+    {"string", asText},      {"int", asInt},
+    {"unsigned int", asInt}, {"long long", asInt64},
+    {"bool", asBool},        {"unsigned long long", asInt64},
+    {"double", nullptr},     {"Json::objectValue", asJson},
+    {"unknown", nullptr},    {"Json::arrayValue", asJson},
+};
+
+// The text of a column, stored by somebody else.
+TEST_F(HostileData, StoredTextUnderEveryWord)
+{
+    for (const Word& word : kWords) {
+        SCOPED_TRACE(word.szWord);
+        Table stored(database_, std::string(R"({"v":{"cpptype":")") + word.szWord + R"("}})", "v");
+        forEachString([&](const std::string& strHostile) {
+            database_.run("delete from " + stored.strName);
+            database_.run("insert into " + stored.strName + " values ('" + doubled(strHostile) +
+                          "')");
+            const bool blDecoded = nullptr != word.value;
+            Json::Value jRequest;
+            Json::Value jRecords(Json::arrayValue);
+            EXPECT_EQ(blDecoded ? 0 : -1, stored.api.recList(jRequest, jRecords));
+            EXPECT_EQ(blDecoded, doubles::state().log.empty());
+            ASSERT_EQ(blDecoded ? 1U : 0U, jRecords.size());
+            if (blDecoded) {
+                EXPECT_EQ(text(word.value(strHostile)), text(jRecords[0]["v"]));
+            }
+        });
+    }
 }
 
 TEST_F(HostileData, MessageOfTheHost)

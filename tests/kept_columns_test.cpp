@@ -88,11 +88,14 @@ TEST_F(KeptColumns, RefuseTheFirstOfTwoBadWords)
 
 TEST_F(KeptColumns, RefuseAMemberWithoutAWord)
 {
-    warmUp();
-    types()["s"].removeMember("cpptype");
-    EXPECT_EQ("null", answer());
-    EXPECT_EQ(-1, iResult_);
-    EXPECT_EQ(error("type error, strType="), takeLog()[0]);
+    for (const char* szMember : {"{}", R"({"":"string"})", R"({"zzz":"string"})"}) {
+        warmUp();
+        types()["s"] = json(szMember);
+        EXPECT_EQ("null", answer()) << szMember;
+        EXPECT_EQ(-1, iResult_);
+        EXPECT_EQ(error("type error, strType="), takeLog()[0]);
+        types()["s"]["cpptype"] = "string";
+    }
 }
 
 TEST_F(KeptColumns, RefuseAMemberThatIsGone)

@@ -280,4 +280,22 @@ TEST_F(Limits, LogLinesCarryWholeRecords)
     jRecord["text"] = "c2VjcmV0";  // as the host's cipher gives it
     EXPECT_EQ(-1, table_.api.recCreate(jRecord, jStored));
     EXPECT_EQ(0, logged("secret"));
+
+    std::string strForged = "x\nroot logged in";
+    std::string strValue = "x";
+    std::vector<std::string> values = {strForged};
+    EXPECT_EQ(-1, table_.api.recDeleteByName(strForged, "none"));
+    EXPECT_LT(0, logged("strValue=" + strForged));
+    EXPECT_EQ(-1, table_.api.recDeleteByName(strValue, strForged.c_str()));
+    EXPECT_LT(0, logged("name=" + strForged));
+    EXPECT_EQ(-1, table_.api.recDeleteByArray(values, "none"));
+    EXPECT_LT(0, logged(strForged));
+    EXPECT_EQ(-1, table_.api.recDeleteByArray(values, strForged.c_str()));
+    EXPECT_LT(0, logged("name=" + strForged));
+    Table stored(database_, R"({"a":{"cpptype":"int"},"b":{"cpptype":"double"}})", "a, b");
+    database_.run("insert into " + stored.strName + " values (1, '" + strForged + "')");
+    Json::Value jRequest;
+    Json::Value jRecords;
+    EXPECT_EQ(-1, stored.api.recList(jRequest, jRecords));
+    EXPECT_LT(0, logged("column_value[1]=" + strForged));
 }

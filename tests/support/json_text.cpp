@@ -1,7 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include "support/json_text.h"
 
+#include <json/reader.h>
 #include <json/writer.h>
+
+#include <memory>
 
 std::string text(const Json::Value& jValue)
 {
@@ -10,4 +13,15 @@ std::string text(const Json::Value& jValue)
     builder["emitUTF8"] = true;
     builder["useSpecialFloats"] = true;
     return Json::writeString(builder, jValue);
+}
+
+Json::Value leftByReader(const std::string& strText)
+{
+    Json::CharReaderBuilder builder;
+    builder["collectComments"] = false;
+    builder["allowSpecialFloats"] = true;
+    const std::unique_ptr<Json::CharReader> pReader(builder.newCharReader());
+    Json::Value jLeft;
+    pReader->parse(strText.data(), strText.data() + strText.size(), &jLeft, nullptr);
+    return jLeft;
 }

@@ -108,7 +108,7 @@ protected:
             file.restore();
             {
                 Host host(file);
-                follow({kLock, onlyLock(nHeld)});
+                follow({kLock | kLockShared, onlyLock(nHeld)});
                 Json::Value jOutput = json(operation.szOutput);
                 const int iResult = operation.run(host, jOutput);
                 lift();

@@ -115,6 +115,7 @@ int mapShared(sqlite3_file* pFile, int iPage, int nBytes, int iExtend, void vola
 
 int lockShared(sqlite3_file* pFile, int iOffset, int n, int iFlags)
 {
+    if (0 != (iFlags & SQLITE_SHM_LOCK) && isDue(kLockShared)) return SQLITE_BUSY;
     return real(pFile)->pMethods->xShmLock(real(pFile), iOffset, n, iFlags);
 }
 

@@ -21,6 +21,7 @@ enum Kind : unsigned {
     kFileSize = 128,
     kMapShared = 256,
     kLock = 512,
+    kLockShared = 1024,  // a lock in WAL mode's shared memory
 };
 constexpr unsigned kEverythingButLocks = kLock - 1;
 
