@@ -19,14 +19,14 @@ const std::vector<ContenderEntry>& contenders()
         {"sqlitecpp-kept", "SQLiteCpp, jsoncpp, kept", makeSqliteCppKept},
 #endif
 #ifdef BENCH_SOCI
-        {"soci", "SOCI, jsoncpp, by name", makeSoci},
-        {"soci-position", "SOCI, jsoncpp, by position", makeSociByPosition},
-        {"soci-kept", "SOCI, jsoncpp, kept", makeSociKept},
+        {"soci", "SOCI, jsoncpp, mapped record", makeSoci},
+        {"soci-variables", "SOCI, jsoncpp, variables", makeSociVariables},
+        {"soci-kept", "SOCI, jsoncpp, variables, kept", makeSociKept},
 #endif
 #ifdef BENCH_POCO
-        {"poco", "Poco::Data, Poco::JSON, by name", makePoco},
-        {"poco-position", "Poco::Data, Poco::JSON, by position", makePocoByPosition},
-        {"poco-kept", "Poco::Data, Poco::JSON, kept", makePocoKept},
+        {"poco", "Poco::Data, Poco::JSON, record set", makePoco},
+        {"poco-variables", "Poco::Data, Poco::JSON, variables", makePocoVariables},
+        {"poco-kept", "Poco::Data, Poco::JSON, variables, kept", makePocoKept},
 #endif
         {"sqljson", "SQLite's JSON functions, jsoncpp, kept", makeSqlJson},
     };

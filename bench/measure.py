@@ -121,7 +121,7 @@ def main():
     lists = json.loads(programs.output("bench_check", "--lists"))
     names = [c["name"] for c in lists["contenders"]]
     # Long lists are taken of one host for each library; keeping statements makes no difference to them.
-    listed = [name for name in names if not name.endswith(("-kept", "-position"))]
+    listed = [name for name in names if not name.endswith(("-kept", "-variables"))]
     results = dict(lists)
     results["rows"] = ROWS
     results["counts"] = count_operations(programs, names, lists["operations"])

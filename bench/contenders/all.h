@@ -14,10 +14,10 @@ std::unique_ptr<Contender> makeNlohmann();
 std::unique_ptr<Contender> makeSqliteCpp();
 std::unique_ptr<Contender> makeSqliteCppKept();
 std::unique_ptr<Contender> makeSoci();
-std::unique_ptr<Contender> makeSociByPosition();
+std::unique_ptr<Contender> makeSociVariables();
 std::unique_ptr<Contender> makeSociKept();
 std::unique_ptr<Contender> makePoco();
-std::unique_ptr<Contender> makePocoByPosition();
+std::unique_ptr<Contender> makePocoVariables();
 std::unique_ptr<Contender> makePocoKept();
 std::unique_ptr<Contender> makeSqlJson();
 

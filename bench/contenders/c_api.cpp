@@ -68,16 +68,21 @@ private:
         statement.bind(i, pBegin, pEnd);
     }
 
+    static Json::Value textOf(std::string_view text)
+    {
+        return {text.data(), text.data() + text.size()};
+    }
+
     Json::Value row(Statement& statement)
     {
         Json::Value jRow(Json::objectValue);
         jRow["done"] = 1 == statement.integer(0);
-        jRow["grp"] = Json::Value(statement.text(1), statement.textEnd(1));
+        jRow["grp"] = textOf(statement.text(1));
         jRow["id"] = statement.integer(2);
-        text_.read(statement.text(3), statement.textEnd(3), jRow["meta"]);
-        jRow["name"] = Json::Value(statement.text(4), statement.textEnd(4));
+        text_.read(statement.text(3), jRow["meta"]);
+        jRow["name"] = textOf(statement.text(4));
         jRow["qty"] = Json::Int64(statement.integer64(5));
-        text_.read(statement.text(6), statement.textEnd(6), jRow["tags"]);
+        text_.read(statement.text(6), jRow["tags"]);
         return jRow;
     }
 

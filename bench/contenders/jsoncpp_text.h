@@ -10,6 +10,7 @@
 #include <memory>
 #include <sstream>
 #include <string>
+#include <string_view>
 
 namespace bench {
 
@@ -27,9 +28,9 @@ public:
         writer_.reset(writers.newStreamWriter());
     }
 
-    void read(const char* pBegin, const char* pEnd, Json::Value& jValue)
+    void read(std::string_view text, Json::Value& jValue)
     {
-        must(reader_->parse(pBegin, pEnd, &jValue, nullptr), pBegin);
+        must(reader_->parse(text.data(), text.data() + text.size(), &jValue, nullptr), "JSON text");
     }
 
     std::string write(const Json::Value& jValue)

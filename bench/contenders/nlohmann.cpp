@@ -77,12 +77,12 @@ private:
     {
         Nlohmann rec = Nlohmann::object();
         rec["done"] = 1 == statement.integer(0);
-        rec["grp"] = std::string(statement.text(1), statement.textEnd(1));
+        rec["grp"] = std::string(statement.text(1));
         rec["id"] = statement.integer(2);
-        rec["meta"] = Nlohmann::parse(statement.text(3), statement.textEnd(3));
-        rec["name"] = std::string(statement.text(4), statement.textEnd(4));
+        rec["meta"] = Nlohmann::parse(statement.text(3));
+        rec["name"] = std::string(statement.text(4));
         rec["qty"] = statement.integer64(5);
-        rec["tags"] = Nlohmann::parse(statement.text(6), statement.textEnd(6));
+        rec["tags"] = Nlohmann::parse(statement.text(6));
         return rec;
     }
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A host on Poco::Data with Poco::JSON. Columns are found in the result by name, or read into
-// variables that are bound by their position.
+// A host on Poco::Data with Poco::JSON. A record comes out of a record set, or of a variable for
+// each column.
 #include "contenders/all.h"
 #include "contenders/prepared.h"
 
@@ -53,7 +53,7 @@ struct Row {
 
 class PocoHost : public JsonContender<Var> {
 public:
-    PocoHost(Members members, Prepare when) : members_(members), when_(when) {}
+    PocoHost(Columns columns, Prepare when) : columns_(columns), when_(when) {}
 
     sqlite3* connection() override { return Poco::Data::SQLite::Utility::dbHandle(session_); }
 
@@ -128,7 +128,7 @@ private:
     PocoStatement select(const std::string& strWhere)
     {
         const std::string strSql = std::string("SELECT ") + kColumns + " FROM task" + strWhere;
-        if (Members::kByName == members_) return session_ << strSql;
+        if (Columns::kAsRecord == columns_) return session_ << strSql;
         // One row for each execution, as long as there are some.
         return (session_ << strSql, into(out_.iDone), into(out_.strGrp), into(out_.iId),
                 into(out_.strMeta), into(out_.strName), into(out_.iQty), into(out_.strTags),
@@ -163,7 +163,7 @@ private:
     Var only(PocoStatement& statement)
     {
         must(1 == statement.execute(), "one row");
-        if (Members::kByPosition == members_) return row();
+        if (Columns::kAsVariables == columns_) return row();
         RecordSet columns(statement);
         return row(columns);
     }
@@ -171,7 +171,7 @@ private:
     Var all(PocoStatement& statement)
     {
         Array::Ptr rows = new Array;
-        if (Members::kByName == members_) {
+        if (Columns::kAsRecord == columns_) {
             statement.execute();
             RecordSet columns(statement);
             for (bool more = columns.moveFirst(); more; more = columns.moveNext())
@@ -184,7 +184,7 @@ private:
         return rows;
     }
 
-    const Members members_;
+    const Columns columns_;
     const Prepare when_;
     Poco::Data::Session session_ = opened();
     Row in_;
@@ -216,17 +216,17 @@ private:
 
 std::unique_ptr<Contender> makePoco()
 {
-    return std::make_unique<PocoHost>(Members::kByName, Prepare::kEachCall);
+    return std::make_unique<PocoHost>(Columns::kAsRecord, Prepare::kEachCall);
 }
 
-std::unique_ptr<Contender> makePocoByPosition()
+std::unique_ptr<Contender> makePocoVariables()
 {
-    return std::make_unique<PocoHost>(Members::kByPosition, Prepare::kEachCall);
+    return std::make_unique<PocoHost>(Columns::kAsVariables, Prepare::kEachCall);
 }
 
 std::unique_ptr<Contender> makePocoKept()
 {
-    return std::make_unique<PocoHost>(Members::kByPosition, Prepare::kOnce);
+    return std::make_unique<PocoHost>(Columns::kAsVariables, Prepare::kOnce);
 }
 
 }  // namespace bench

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A host on SOCI, with jsoncpp as the host by hand uses it. Records go in and out as an object
-// whose members SOCI finds by name, or as variables that are bound by their position.
+// A host on SOCI, with jsoncpp as the host by hand uses it. A record goes in and out as an object
+// that SOCI maps to the columns, or as a variable for each column.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
 #include "contenders/prepared.h"
@@ -59,7 +59,7 @@ namespace {
 
 class Soci : public JsonContender<Json::Value> {
 public:
-    Soci(Members members, Prepare when) : members_(members), when_(when) {}
+    Soci(Columns columns, Prepare when) : columns_(columns), when_(when) {}
 
     sqlite3* connection() override
     {
@@ -117,7 +117,7 @@ private:
     {
         const std::string strSql = std::string("INSERT INTO task (") + kColumns +
                                    ") VALUES (:done,:grp,:id,:meta,:name,:qty,:tags)";
-        if (Members::kByName == members_) return (session_.prepare << strSql, soci::use(in_));
+        if (Columns::kAsRecord == columns_) return (session_.prepare << strSql, soci::use(in_));
         return (session_.prepare << strSql, soci::use(in_.iDone), soci::use(in_.strGrp),
                 soci::use(in_.iId), soci::use(in_.strMeta), soci::use(in_.strName),
                 soci::use(in_.iQty), soci::use(in_.strTags));
@@ -126,7 +126,7 @@ private:
     Preparation intoOut(const char* szWhere)
     {
         const std::string strSql = std::string("SELECT ") + kColumns + " FROM task" + szWhere;
-        if (Members::kByName == members_) return (session_.prepare << strSql, soci::into(out_));
+        if (Columns::kAsRecord == columns_) return (session_.prepare << strSql, soci::into(out_));
         return (session_.prepare << strSql, soci::into(out_.iDone), soci::into(out_.strGrp),
                 soci::into(out_.iId), soci::into(out_.strMeta), soci::into(out_.strName),
                 soci::into(out_.iQty), soci::into(out_.strTags));
@@ -138,10 +138,10 @@ private:
         jRow["done"] = 1 == out_.iDone;
         jRow["grp"] = out_.strGrp;
         jRow["id"] = out_.iId;
-        text_.read(out_.strMeta.data(), out_.strMeta.data() + out_.strMeta.size(), jRow["meta"]);
+        text_.read(out_.strMeta, jRow["meta"]);
         jRow["name"] = out_.strName;
         jRow["qty"] = Json::Int64(out_.iQty);
-        text_.read(out_.strTags.data(), out_.strTags.data() + out_.strTags.size(), jRow["tags"]);
+        text_.read(out_.strTags, jRow["tags"]);
         return jRow;
     }
 
@@ -174,7 +174,7 @@ private:
         Session() : soci::session(soci::sqlite3, ":memory:") { makeTable(*this); }
     };
 
-    const Members members_;
+    const Columns columns_;
     const Prepare when_;
     Session session_;
     Row in_;
@@ -205,17 +205,17 @@ private:
 
 std::unique_ptr<Contender> makeSoci()
 {
-    return std::make_unique<Soci>(Members::kByName, Prepare::kEachCall);
+    return std::make_unique<Soci>(Columns::kAsRecord, Prepare::kEachCall);
 }
 
-std::unique_ptr<Contender> makeSociByPosition()
+std::unique_ptr<Contender> makeSociVariables()
 {
-    return std::make_unique<Soci>(Members::kByPosition, Prepare::kEachCall);
+    return std::make_unique<Soci>(Columns::kAsVariables, Prepare::kEachCall);
 }
 
 std::unique_ptr<Contender> makeSociKept()
 {
-    return std::make_unique<Soci>(Members::kByPosition, Prepare::kOnce);
+    return std::make_unique<Soci>(Columns::kAsVariables, Prepare::kOnce);
 }
 
 }  // namespace bench

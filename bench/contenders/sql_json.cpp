@@ -63,7 +63,7 @@ private:
     Json::Value row(Statement& statement)
     {
         Json::Value jRow;
-        text_.read(statement.text(0), statement.textEnd(0), jRow);
+        text_.read(statement.text(0), jRow);
         return jRow;
     }
 

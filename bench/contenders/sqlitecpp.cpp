@@ -82,28 +82,27 @@ private:
         return database;
     }
 
-    static Json::Value textOf(const SQLite::Column& column)
+    static std::string_view textOf(const SQLite::Column& column)
     {
-        const char* pBegin = column.getText();
-        return {pBegin, pBegin + column.getBytes()};
+        const char* szText = column.getText();
+        return {szText, static_cast<std::size_t>(column.getBytes())};
     }
 
-    void read(const SQLite::Column& column, Json::Value& jValue)
+    static Json::Value jsonOf(std::string_view text)
     {
-        const char* pBegin = column.getText();
-        text_.read(pBegin, pBegin + column.getBytes(), jValue);
+        return {text.data(), text.data() + text.size()};
     }
 
     Json::Value row(SQLite::Statement& statement)
     {
         Json::Value jRow(Json::objectValue);
         jRow["done"] = 1 == statement.getColumn(0).getInt();
-        jRow["grp"] = textOf(statement.getColumn(1));
+        jRow["grp"] = jsonOf(textOf(statement.getColumn(1)));
         jRow["id"] = statement.getColumn(2).getInt();
-        read(statement.getColumn(3), jRow["meta"]);
-        jRow["name"] = textOf(statement.getColumn(4));
+        text_.read(textOf(statement.getColumn(3)), jRow["meta"]);
+        jRow["name"] = jsonOf(textOf(statement.getColumn(4)));
         jRow["qty"] = Json::Int64(statement.getColumn(5).getInt64());
-        read(statement.getColumn(6), jRow["tags"]);
+        text_.read(textOf(statement.getColumn(6)), jRow["tags"]);
         return jRow;
     }
 

@@ -8,6 +8,7 @@
 #include <sqlite3.h>
 
 #include <string>
+#include <string_view>
 
 namespace bench {
 
@@ -51,11 +52,11 @@ public:
 
     int integer(int i) { return sqlite3_column_int(pStatement_, i); }
     long long integer64(int i) { return sqlite3_column_int64(pStatement_, i); }
-    const char* text(int i)
+    std::string_view text(int i)
     {
-        return reinterpret_cast<const char*>(sqlite3_column_text(pStatement_, i));
+        const auto* szText = reinterpret_cast<const char*>(sqlite3_column_text(pStatement_, i));
+        return {szText, static_cast<std::size_t>(sqlite3_column_bytes(pStatement_, i))};
     }
-    const char* textEnd(int i) { return text(i) + sqlite3_column_bytes(pStatement_, i); }
 
 private:
     sqlite3_stmt* pStatement_ = nullptr;
