@@ -4,10 +4,10 @@
 //
 //     scale_owner DATABASE SETTINGS-SQL ACKNOWLEDGED SECONDS [ROWS]
 //
-// ROWS records make a transaction (1: none is begun). As soon as it is acknowledged, the file
-// ACKNOWLEDGED gets a line "SECONDS FIRST-ID LAST-ID": how long it took, and which records it
-// wrote. There is one transaction at least. The exit status is 0, 1 when something failed, 2 for
-// wrong arguments, 3 when the database belongs to another owner.
+// ROWS records make a transaction (1: none is begun, and no other owner may be there). As soon as
+// it is acknowledged, the file ACKNOWLEDGED gets a line "SECONDS FIRST-ID LAST-ID": how long it
+// took, and which records it wrote. There is one transaction at least. The exit status is 0, 1 when
+// something failed, 2 for wrong arguments, 3 when the database belongs to another owner.
 #include <VornJsonDbApi.h>
 #include <sqlite3.h>
 
@@ -36,18 +36,25 @@ int keepNumber(void* pNumber, int, char** aszValues, char**)
     return 0;
 }
 
-bool write(VornJsonDbApi& records, int iFirst, int iLast)
+bool findLast(VornJsonDbApi& records, int& iLast)
 {
-    if (iFirst != iLast && 0 > records.runSqlEx("begin immediate")) return false;
-    for (int i = iFirst; i <= iLast; ++i) {
-        const std::string strNumber = std::to_string(i);
+    return 0 <= records.runSqlEx("select ifnull(max(id), 0) from record", keepNumber, &iLast);
+}
+
+// Those after iLast. In a transaction another owner may have moved it before.
+bool write(VornJsonDbApi& records, int iRows, int& iLast)
+{
+    if (1 != iRows && (0 > records.runSqlEx("begin immediate") || !findLast(records, iLast)))
+        return false;
+    for (int i = 0; i < iRows; ++i) {
+        const std::string strNumber = std::to_string(++iLast);
         Json::Value jRecord;
         Json::Value jStored;
-        jRecord["id"] = i;
+        jRecord["id"] = iLast;
         jRecord["text"] = std::string(180 - strNumber.size(), '0') + strNumber;
         if (0 > records.recCreate(jRecord, jStored)) return false;
     }
-    return iFirst == iLast || 0 <= records.runSqlEx("commit");
+    return 1 == iRows || 0 <= records.runSqlEx("commit");
 }
 
 // A line is in the file, for every reader, once write() has returned.
@@ -68,15 +75,12 @@ bool own(sqlite3* pDb, int iFile, double dSeconds, int iRows)
     VornJsonDbApi records(pDb, strName, jDefinition, strCreate);
 
     int iLast = 0;
-    if (0 > records.runSqlEx("select ifnull(max(id), 0) from record", keepNumber, &iLast))
-        return false;
+    if (!findLast(records, iLast)) return false;
     const auto began = Clock::now();
     do {
         const auto began1 = Clock::now();
-        const int iFirst = iLast + 1;
-        iLast += iRows;
-        if (!write(records, iFirst, iLast)) return false;
-        if (!acknowledge(iFile, secondsSince(began1), iFirst, iLast)) return false;
+        if (!write(records, iRows, iLast)) return false;
+        if (!acknowledge(iFile, secondsSince(began1), iLast - iRows + 1, iLast)) return false;
     } while (secondsSince(began) < dSeconds);
     return true;
 }
