@@ -50,8 +50,8 @@ refused other.db acknowledged 'no such table: record'
 refused records.db missing 'cannot open "missing"'
 
 # Two owners that compete: each continues after the other.
-"$owner" both.db '' both 1 2 &
-"$owner" both.db '' both 1 2
+"$owner" both.db '' both 1 2 20 &
+"$owner" both.db '' both 1 2 20
 wait $!
 [[ $(judge both.db both) = [1-9]*'|0|'*'|ok' ]] || { judge both.db both; exit 1; }
 

@@ -2,12 +2,13 @@
 // The owner of a database, a host that writes records for some seconds and notes what was
 // acknowledged:
 //
-//     scale_owner DATABASE SETTINGS-SQL ACKNOWLEDGED SECONDS [ROWS]
+//     scale_owner DATABASE SETTINGS-SQL ACKNOWLEDGED SECONDS [ROWS [PAUSE]]
 //
 // ROWS records make a transaction (1: none is begun, and no other owner may be there). As soon as
 // it is acknowledged, the file ACKNOWLEDGED gets a line "SECONDS FIRST-ID LAST-ID": how long it
-// took, and which records it wrote. There is one transaction at least. The exit status is 0, 1 when
-// something failed, 2 for wrong arguments, 3 when the database belongs to another owner.
+// took, and which records it wrote. Then another owner can have its turn for PAUSE milliseconds.
+// There is one transaction at least. The exit status is 0, 1 when something failed, 2 for wrong
+// arguments, 3 when the database belongs to another owner.
 #include <VornJsonDbApi.h>
 #include <sqlite3.h>
 
@@ -17,6 +18,7 @@
 #include <chrono>
 #include <cstdlib>
 #include <iostream>
+#include <thread>
 
 bool blLogToStdout = true;
 bool blDebugOutput = false;
@@ -65,7 +67,7 @@ bool acknowledge(int iFile, double dSeconds, int iFirst, int iLast)
     return static_cast<ssize_t>(strLine.size()) == ::write(iFile, strLine.data(), strLine.size());
 }
 
-bool own(sqlite3* pDb, int iFile, double dSeconds, int iRows)
+bool own(sqlite3* pDb, int iFile, double dSeconds, int iRows, int iPause)
 {
     std::string strName = "record";
     std::string strCreate = "create table if not exists record (id integer primary key, text text)";
@@ -81,6 +83,7 @@ bool own(sqlite3* pDb, int iFile, double dSeconds, int iRows)
         const auto began1 = Clock::now();
         if (!write(records, iRows, iLast)) return false;
         if (!acknowledge(iFile, secondsSince(began1), iLast - iRows + 1, iLast)) return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(iPause));
     } while (secondsSince(began) < dSeconds);
     return true;
 }
@@ -91,13 +94,14 @@ int main(int argc, char** argv)
 {
     const double dSeconds = 4 < argc ? std::atof(argv[4]) : -1;
     const int iRows = 5 < argc ? std::atoi(argv[5]) : 1;
-    if (5 > argc || 6 < argc || 0 > dSeconds || 1 > iRows) return 2;
+    const int iPause = 6 < argc ? std::atoi(argv[6]) : 0;
+    if (5 > argc || 7 < argc || 0 > dSeconds || 1 > iRows) return 2;
 
     sqlite3* pDb = nullptr;
     const int iFile = open(argv[3], O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0644);
     int iStatus = sqlite3_open(argv[1], &pDb);
     if (SQLITE_OK == iStatus) iStatus = sqlite3_exec(pDb, argv[2], nullptr, nullptr, nullptr);
-    const bool blDone = SQLITE_OK == iStatus && own(pDb, iFile, dSeconds, iRows);
+    const bool blDone = SQLITE_OK == iStatus && own(pDb, iFile, dSeconds, iRows, iPause);
     if (!blDone) std::cerr << "scale_owner: " << argv[1] << ": " << sqlite3_errmsg(pDb) << '\n';
     sqlite3_close(pDb);
     if (SQLITE_BUSY == iStatus) return 3;

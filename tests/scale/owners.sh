@@ -82,7 +82,7 @@ all_ended() {
 one_file() {
     local name="two machines write one file for 20 s" machine pids=()
     for machine in "$a" "$b"; do
-        "$owner" "$machine/one-file.db" "$defaults" "$work/one-file" 20 2 >>"$work/owners.said" 2>&1 &
+        "$owner" "$machine/one-file.db" "$defaults" "$work/one-file" 20 2 20 >>"$work/owners.said" 2>&1 &
         pids+=($!)
     done
     all_ended "$name" "${pids[@]}"
