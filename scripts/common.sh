@@ -36,14 +36,27 @@ need_packages() {
         --no-install-recommends "${missing[@]}" >/dev/null
 }
 
-# need_committed_tree: fails when something is not committed.
+# need_committed_tree [PATHSPEC...]: fails when something is not committed.
 need_committed_tree() {
     local changes
-    changes=$(git status --porcelain)
+    changes=$(git status --porcelain -- "$@")
     [ -z "$changes" ] && return
     say "not committed:"
     echo "$changes"
     exit 1
+}
+
+# within SECONDS WHAT COMMAND...: repeats the command until it succeeds; WHAT is the message when it does not.
+within() {
+    local end=$((SECONDS + $1)) what=$2
+    shift 2
+    until "$@"; do
+        if ((SECONDS >= end)); then
+            say "FAILED: $what"
+            return 1
+        fi
+        sleep 0.2
+    done
 }
 
 # build PRESET [OPTION...]: configures and builds build/PRESET; what a build says is shown when it fails.
@@ -61,6 +74,22 @@ build_in() {
     mkdir -p "$folder"
     if ! { cmake --preset "$preset" -B "$folder" "$@" && cmake --build "$folder"; } >"$folder/build.log" 2>&1; then
         cat "$folder/build.log"
+        return 1
+    fi
+}
+
+# build_package FOLDER COMMIT [OPTION...]: clones the commit into FOLDER/vornjsondb, with a folder build as a
+# developer has it, and builds the Debian packages beside it; what the build says last is shown when it fails.
+build_package() {
+    local folder=$1 commit=$2
+    shift 2
+    say "building the packages in $folder"
+    git clone --quiet --no-checkout . "$folder/vornjsondb"
+    git -C "$folder/vornjsondb" checkout --quiet "$commit"
+    mkdir "$folder/vornjsondb/build"
+    : >"$folder/vornjsondb/build/left"
+    if ! (cd "$folder/vornjsondb" && dpkg-buildpackage -us -uc "$@") >"$folder.log" 2>&1; then
+        tail -n 200 "$folder.log"
         return 1
     fi
 }

@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: MIT
 # sharded_test.sh PROGRAM EXPECTED WORK: what examples/sharded says where a tenant's file is no database,
 # belongs to another owner or cannot be made, and that the other files are as they were.
-set -euo pipefail
+. "$(dirname "${BASH_SOURCE[0]}")/../scripts/common.sh"
 program=$1 expected=$2 work=$3
 
 rm -rf "$work"
@@ -42,8 +42,8 @@ rm tenants/tenant-3.db
 
 mkfifo end
 sqlite3 tenants/tenant-2.db 'pragma locking_mode=exclusive; begin immediate' \
-    '.shell : >taken; read line <end' >mode &
-until [ -e taken ]; do sleep 0.1; done
+    '.shell : >taken; timeout 60 cat end' >mode &
+within 60 'the lock is not taken' test -e taken
 fails tenants 'tenants/tenant-2.db: database is locked'
 echo >end
 wait

@@ -79,7 +79,7 @@ Several records in a transaction, WAL and exclusive locking (median):
 
 {table(("records", "local file, ms", "replicated, ms", "local file, records/s", "replicated, records/s"), batches(work))}
 
-![What a record costs by the records in its transaction]({picture})
+![What a commit costs by the records in it, on a local file and replicated]({picture})
 
 {machine(work)}
 {END}"""
@@ -91,11 +91,11 @@ def main():
         before, rest = file.read().split(BEGIN)
     picture = os.path.join(os.path.splitext(page)[0], "commit-cost.svg")
     os.makedirs(os.path.dirname(picture), exist_ok=True)
-    cost = lambda name: [(rows, milliseconds(work, name, rows) / rows) for rows in ROWS]
+    cost = lambda name: [(rows, milliseconds(work, name, rows)) for rows in ROWS]
     with open(picture, "w", encoding="utf-8") as file:
         file.write(plot.lines(
-            "What a record costs by the records in its transaction", "records in a transaction",
-            "milliseconds for each record", [("", "replicated", cost("store")), ("", "local file", cost("local"))],
+            "What a commit costs by the records in it", "records in a transaction",
+            "milliseconds for the transaction", [("", "replicated", cost("store")), ("", "local file", cost("local"))],
             lambda value: f"{value:g}", logarithmic=True))
     with open(page, "w", encoding="utf-8") as file:
         file.write(before + measured(work, os.path.relpath(picture, os.path.dirname(page))) + rest.split(END)[1])
