@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: MIT
 # Shared by the scripts; sourced, not run. Leaves the shell in the project's top folder.
 set -euo pipefail
-cd "$(dirname "${BASH_SOURCE[0]}")/.."
+cd -P "$(dirname "${BASH_SOURCE[0]}")/.."
 
 build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev libgtest-dev
                 iso-codes pkg-config sqlite3)

@@ -11,7 +11,7 @@ exclusive_wal='pragma locking_mode=exclusive; pragma journal_mode=wal'
 judge() {
     sqlite3 -bail "file:$1?mode=rw" "$exclusive_wal" \
         'create temp table acknowledged (seconds real, first int, last int)' \
-        '.separator " "' ".import $2 acknowledged" '.separator |' \
+        '.separator " "' ".import '$2' acknowledged" '.separator |' \
         "with recursive wanted (id, last) as (
              select first, last from acknowledged union all select id + 1, last from wanted where id < last)
          select count(*), count(*) filter (where record.text is not printf('%0180d', wanted.id))

@@ -51,17 +51,23 @@ next_owner() {
     return "$status"
 }
 
-# owner_ended CASE FILE END THAW BACK: END ends the owner on one machine, and the next one takes over on the
-# other. Then, after THAW, the first has to fail, and BACK brings its machine back.
+# owner_ended CASE FILE END LEAST MOST THAW BACK: END ends the owner on one machine, and the next one takes over on
+# the other after LEAST to MOST seconds. Then, after THAW, the first has to fail, and BACK brings its machine back.
 owner_ended() {
-    local case=$1 file=$2 end=$3 thaw=$4 back=$5
+    local case=$1 file=$2 end=$3 least=$4 most=$5 thaw=$6 back=$7
     "$owner" "$a/$file.db" "$exclusive_wal" "$work/$file" 600 >"$work/$file.said" 2>&1 &
     owner_pid=$!
     sleep 10
+    ! gone "$owner_pid" || failed "$case: the owner ended too soon: $(tail -n 3 "$work/$file.said")"
+    [ -s "$work/$file" ] || failed "$case: the owner wrote nothing"
     "$end"
     timed next_owner "$b/$file.db" "$work/$file" || failed "$case: $(tail -n 3 "$work/said")"
+    awk "BEGIN { exit !($least <= $seconds && $seconds <= $most) }" ||
+        failed "$case: the next owner after $seconds s, wanted: $least to $most"
     "$thaw"
     ! ended "$owner_pid" 60 || failed "$case: the owner did not fail"
+    [ "$thaw" = true ] || grep -E 'disk I/O error|malformed' "$work/$file.said" | tail -n 1 | grep . ||
+        failed "$case: what the owner was told: $(tail -n 3 "$work/$file.said")"
     "$back"
     judged "$case" "$seconds" "$file"
 }
@@ -105,19 +111,21 @@ many() {
 
 # cost NAME FOLDER SETTINGS ROWS: commits for some seconds
 cost() {
-    "$owner" "$2/cost-$1-$4.db" "$3" "$work/cost/$1-$4" 3 "$4" || failed "cost: $1, $4"
+    "$owner" "$2/$1-$4.db" "$3" "$work/$1-$4" 3 "$4" || failed "cost: $1, $4"
 }
 
 # In turns, so that what else the machine does meets both.
 costs() {
     local round rows
+    cut -d ' ' -f 1 /proc/loadavg >"$work/load"
     for round in 1 2 3; do
         say "measuring the cost of a commit: $round of 3"
-        cost local-rollback "$work" "$defaults" 1
+        cost local-rollback "$work/local" "$defaults" 1
         cost store-rollback "$a" "$defaults" 1
         for rows in 1 10 100 1000 10000; do
-            cost local "$work" "$exclusive_wal" "$rows"
+            cost local "$work/local" "$exclusive_wal" "$rows"
             cost store "$a" "$exclusive_wal" "$rows"
         done
     done
+    judged "the commits whose cost is measured" '' store-rollback-1 store-{1,10,100,1000,10000}
 }

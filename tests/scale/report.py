@@ -33,7 +33,7 @@ def cases(work):
 
 def milliseconds(work, name, rows):
     """The median of a transaction."""
-    with open(os.path.join(work, "cost", f"{name}-{rows}")) as file:
+    with open(os.path.join(work, f"{name}-{rows}")) as file:
         return 1000 * statistics.median(float(line.split()[0]) for line in file)
 
 
@@ -63,8 +63,8 @@ def machine(work):
     versions = output("dpkg-query", "-W", "-f", "${Package} ${Version}, ", "ceph-osd", "libsqlite3-0")
     return textwrap.fill(
         f"Measured on {datetime.date.today()} on one machine that ran the store, both mounts and the owners: "
-        f"{processor}, {os.cpu_count()} cores, {gibibytes:.0f} GiB, one virtual disk; {versions.rstrip(', ')}. "
-        f"Its load average was {load} before.", 115)
+        f"{processor}, {os.cpu_count()} cores, {gibibytes:.0f} GiB; {versions.rstrip(', ')}. "
+        f"Its load average was {load} before the commits were measured.", 115)
 
 
 def measured(work, picture):
