@@ -2,55 +2,12 @@
 // The look-ups of member types behind recSave and recCreate, on definitions that have none or not
 // all: every look-up happens and logs, line by line.
 
-#include "support/database.h"
+#include "support/lookups.h"
 
 namespace {
 
-class LookUps : public TableTest {
+class LookUps : public LookUpsTest {
 protected:
-    // The text with every "$" replaced by the table's name.
-    std::string named(std::string strText) const
-    {
-        for (std::size_t i = 0; std::string::npos != (i = strText.find('$', i));)
-            strText.replace(i, 1, strName_);
-        return strText;
-    }
-
-    Lines named(Lines lines) const
-    {
-        for (std::string& strLine : lines) strLine = named(strLine);
-        return lines;
-    }
-
-    // The log. A dump of all tables' types is reduced to the entry of this table.
-    Lines takeOwnLog()
-    {
-        const std::string strDump = utilPlain("jType=");
-        Lines lines = takeLog();
-        for (std::string& strLine : lines) {
-            if (0 != strLine.compare(0, strDump.size(), strDump)) continue;
-            const Json::Value jTypes = json(strLine.substr(strDump.size()));
-            const bool blKnown = jTypes.isObject() && jTypes.isMember(strName_);
-            strLine = strDump + (blKnown ? text(jTypes[strName_]) : "-");
-        }
-        return lines;
-    }
-
-    // Four lines of a failed look-up.
-    static Lines lookUp(const std::string& strCondition, const std::string& strDefinition,
-                        const std::string& strEntry)
-    {
-        return {utilFailed(strCondition), utilPlain("strJsonName=$"),
-                utilPlain("jTableDef=" + strDefinition), utilPlain("jType=" + strEntry)};
-    }
-
-    static Lines join(std::initializer_list<Lines> parts)
-    {
-        Lines lines;
-        for (const Lines& part : parts) lines.insert(lines.end(), part.begin(), part.end());
-        return lines;
-    }
-
     // What a save logs after its look-ups when its lists are empty.
     static Lines emptyLists(const std::string& strVerb, const std::string& strRecord)
     {
@@ -86,35 +43,7 @@ protected:
         return iResult;
     }
 
-    std::string strName_ = freshName();
     std::string strCreate_ = "create table if not exists " + strName_ + " (a, b)";
-};
-
-const char kPoisoned[] = "jType[strJsonName].type() != Json::objectValue";
-
-struct BadDefinition {
-    const char* szName;
-    const char* szDefinition;
-    const char* szLater;  // after the column list looked up its members
-    const char* szCondition;
-};
-
-const BadDefinition kBadDefinitions[] = {
-    {"null", "null", R"({"$":{"member":null}})", "jTableDef.empty()"},
-    {"empty object", "{}", R"({"$":{"member":null}})", "jTableDef.empty()"},
-    {"empty array", "[]", "[]", "jTableDef.empty()"},
-    {"array", R"(["$"])", R"(["$"])", "!jTableDef.isMember(strJsonName)"},
-    {"another table", R"({"-":{}})", R"({"-":{},"$":{"member":null}})",
-     "!jTableDef.isMember(strJsonName)"},
-    {"null table", R"({"$":null})", R"({"$":{"member":null}})",
-     "!jTableDef[strJsonName].isObject()"},
-    {"text table", R"({"$":"member"})", R"({"$":"member"})", "!jTableDef[strJsonName].isObject()"},
-    {"no member", R"({"$":{"x":1}})", R"({"$":{"member":null,"x":1}})",
-     R"(!jTableDef[strJsonName].isMember("member"))"},
-    {"member an array", R"({"$":{"member":["a"]}})", R"({"$":{"member":["a"]}})",
-     R"(!jTableDef[strJsonName]["member"].isObject())"},
-    {"member empty", R"({"$":{"member":{}}})", R"({"$":{"member":{}}})",
-     "jType == Json::nullValue || !jType.isMember(strJsonName)"},
 };
 
 TEST_F(LookUps, OfASaveWithABadDefinition)
@@ -176,8 +105,6 @@ TEST_F(LookUps, OfACreateWithABadDefinition)
     }
 }
 
-const char kNoWord[] = R"(!jTableDef[strJsonName]["member"][strKey].isMember("cpptype"))";
-
 TEST_F(LookUps, OfASaveWithoutAnyWord)
 {
     const char szDefinition[] = R"({"$":{"member":{"a":{},"b":{"cpptype":"int"}}}})";
@@ -205,7 +132,7 @@ TEST_F(LookUps, OfARecordWithPartialTypes)
         {"{}", kNoWord},
         {"\"int\"", kNoWord},
         {"null", kNoWord},
-        {R"({"cpptype":5})", R"(!jTableDef[strJsonName]["member"][strKey]["cpptype"].isString())"},
+        {R"({"cpptype":5})", kWordIsNoText},
     };
     const std::string strEntry = R"({"a":{"cppDefaultValue":7,"cpptype":"int"}})";
     for (const auto& c : cases) {
