@@ -71,12 +71,6 @@ struct Case {
 };
 using Cases = std::vector<Case>;
 
-Lines operator+(Lines lines, const Lines& more)
-{
-    lines.insert(lines.end(), more.begin(), more.end());
-    return lines;
-}
-
 // The lines of a look-up and a check that fails.
 Lines lookedUp(const std::string& strLine)
 {

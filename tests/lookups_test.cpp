@@ -58,15 +58,15 @@ TEST_F(LookUps, OfASaveWithABadDefinition)
 
         // recSave's own look-up, then the value list's, which finds what the first has left.
         EXPECT_EQ(-1, save(api, true, R"({"a":1})"));
-        EXPECT_EQ(named(join({lookUp(bad.szCondition, bad.szDefinition, "-"),
-                              lookUp(kPoisoned, bad.szLater, "null"),
-                              emptyLists("INSERT", R"({"a":1})")})),
-                  takeOwnLog());
+        EXPECT_EQ(
+            named(lookUp(bad.szCondition, bad.szDefinition, "-") +
+                  lookUp(kPoisoned, bad.szLater, "null") + emptyLists("INSERT", R"({"a":1})")),
+            takeOwnLog());
         EXPECT_EQ(-1, save(api, false, R"({"a":1})"));
-        EXPECT_EQ(named(join({lookUp(kPoisoned, bad.szLater, "null"),
-                              lookUp(kPoisoned, bad.szLater, "null"),
-                              emptyLists("REPLACE", R"({"a":1})")})),
-                  takeOwnLog());
+        EXPECT_EQ(
+            named(lookUp(kPoisoned, bad.szLater, "null") + lookUp(kPoisoned, bad.szLater, "null") +
+                  emptyLists("REPLACE", R"({"a":1})")),
+            takeOwnLog());
     }
 }
 
@@ -82,25 +82,24 @@ TEST_F(LookUps, OfACreateWithABadDefinition)
 
         // Defaults, type check, recSave and the value list look up once each.
         EXPECT_EQ(-1, create(api, R"({"a":1})"));
-        EXPECT_EQ(named(join({lookUp(bad.szCondition, bad.szDefinition, "-"),
-                              lookUp(kPoisoned, bad.szDefinition, "null"),
-                              lookUp(kPoisoned, bad.szDefinition, "null"),
-                              lookUp(kPoisoned, bad.szLater, "null"),
-                              emptyLists("INSERT", R"({"a":1})"), createFailed(R"({"a":1})")})),
+        EXPECT_EQ(named(lookUp(bad.szCondition, bad.szDefinition, "-") +
+                        lookUp(kPoisoned, bad.szDefinition, "null") +
+                        lookUp(kPoisoned, bad.szDefinition, "null") +
+                        lookUp(kPoisoned, bad.szLater, "null") +
+                        emptyLists("INSERT", R"({"a":1})") + createFailed(R"({"a":1})")),
                   takeOwnLog());
         EXPECT_EQ(-1, create(api, R"({"a":1})"));
         const Lines again = lookUp(kPoisoned, bad.szLater, "null");
-        EXPECT_EQ(named(join({again, again, again, again, emptyLists("INSERT", R"({"a":1})"),
-                              createFailed(R"({"a":1})")})),
+        EXPECT_EQ(named(again + again + again + again + emptyLists("INSERT", R"({"a":1})") +
+                        createFailed(R"({"a":1})")),
                   takeOwnLog());
         // No look-up is reached by an empty record, two by one that is no object.
         EXPECT_EQ(-1, create(api, "{}"));
         EXPECT_EQ((Lines{failed("jRecIn.empty()"), plain("call create rec, rec={}")}), takeLog());
         EXPECT_EQ(-1, create(api, "[1]"));
-        EXPECT_EQ(named(join({again,
-                              again,
-                              {failed("!jRecParam.isObject()"), failed("0 > checkJsonType(jParam)"),
-                               plain("call create rec, rec=[1]")}})),
+        EXPECT_EQ(named(again + again +
+                        Lines{failed("!jRecParam.isObject()"), failed("0 > checkJsonType(jParam)"),
+                              plain("call create rec, rec=[1]")}),
                   takeOwnLog());
     }
 }
@@ -114,12 +113,12 @@ TEST_F(LookUps, OfASaveWithoutAnyWord)
                            failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
                            plain(R"(blCreate=1, jRecInOut={"a":1,"b":2})"), plain("jType=null")};
     EXPECT_EQ(-1, save(api, true, R"({"a":1,"b":2})"));
-    EXPECT_EQ(named(join({lookUp(kNoWord, szDefinition, "-"),
-                          lookUp(kPoisoned, szDefinition, "null"), failure})),
+    EXPECT_EQ(named(lookUp(kNoWord, szDefinition, "-") + lookUp(kPoisoned, szDefinition, "null") +
+                    failure),
               takeOwnLog());
     EXPECT_EQ(-1, create(api, R"({"a":1,"b":2})"));
     const Lines again = lookUp(kPoisoned, szDefinition, "null");
-    EXPECT_EQ(named(join({again, again, again, again, failure, createFailed(R"({"a":1,"b":2})")})),
+    EXPECT_EQ(named(again + again + again + again + failure + createFailed(R"({"a":1,"b":2})")),
               takeOwnLog());
 }
 
@@ -153,11 +152,11 @@ TEST_F(LookUps, OfARecordWithPartialTypes)
         };
         // The first look-up fails half-way and is the only one that says so.
         EXPECT_EQ(-1, create(api, R"({"b":1,"c":2})"));
-        EXPECT_EQ(named(join({first, failure(R"({"a":7,"b":1,"c":2})"),
-                              createFailed(R"({"a":7,"b":1,"c":2})")})),
+        EXPECT_EQ(named(first + failure(R"({"a":7,"b":1,"c":2})") +
+                        createFailed(R"({"a":7,"b":1,"c":2})")),
                   takeOwnLog());
         EXPECT_EQ(-1, create(api, R"({"x":1})"));
-        EXPECT_EQ(named(join({failure(R"({"a":7,"x":1})"), createFailed(R"({"a":7,"x":1})")})),
+        EXPECT_EQ(named(failure(R"({"a":7,"x":1})") + createFailed(R"({"a":7,"x":1})")),
                   takeOwnLog());
         EXPECT_EQ(-1, save(api, true, R"({"a":1})"));
         EXPECT_EQ(named(failure(R"({"a":1})")), takeOwnLog());

@@ -68,19 +68,14 @@ private:
         statement.bind(i, pBegin, pEnd);
     }
 
-    static Json::Value textOf(std::string_view text)
-    {
-        return {text.data(), text.data() + text.size()};
-    }
-
     Json::Value row(Statement& statement)
     {
         Json::Value jRow(Json::objectValue);
         jRow["done"] = 1 == statement.integer(0);
-        jRow["grp"] = textOf(statement.text(1));
+        jRow["grp"] = jsonOf(statement.text(1));
         jRow["id"] = statement.integer(2);
         text_.read(statement.text(3), jRow["meta"]);
-        jRow["name"] = textOf(statement.text(4));
+        jRow["name"] = jsonOf(statement.text(4));
         jRow["qty"] = Json::Int64(statement.integer64(5));
         text_.read(statement.text(6), jRow["tags"]);
         return jRow;

@@ -14,6 +14,11 @@
 
 namespace bench {
 
+inline Json::Value jsonOf(std::string_view text)
+{
+    return {text.data(), text.data() + text.size()};
+}
+
 class JsoncppText {
 public:
     JsoncppText()

@@ -88,11 +88,6 @@ private:
         return {szText, static_cast<std::size_t>(column.getBytes())};
     }
 
-    static Json::Value jsonOf(std::string_view text)
-    {
-        return {text.data(), text.data() + text.size()};
-    }
-
     Json::Value row(SQLite::Statement& statement)
     {
         Json::Value jRow(Json::objectValue);

@@ -4,7 +4,6 @@
 
 #include "support/database.h"
 
-#include <initializer_list>
 #include <string>
 
 inline constexpr char kPoisoned[] = "jType[strJsonName].type() != Json::objectValue";
@@ -37,6 +36,12 @@ inline constexpr BadDefinition kBadDefinitions[] = {
     {"member empty", R"({"$":{"member":{}}})", R"({"$":{"member":{}}})",
      "jType == Json::nullValue || !jType.isMember(strJsonName)"},
 };
+
+inline Lines operator+(Lines lines, const Lines& more)
+{
+    lines.insert(lines.end(), more.begin(), more.end());
+    return lines;
+}
 
 class LookUpsTest : public TableTest {
 protected:
@@ -77,13 +82,6 @@ protected:
     {
         return {utilFailed(strCondition), utilPlain("strJsonName=$"),
                 utilPlain("jTableDef=" + strDefinition), utilPlain("jType=" + strEntry)};
-    }
-
-    static Lines join(std::initializer_list<Lines> parts)
-    {
-        Lines lines;
-        for (const Lines& part : parts) lines.insert(lines.end(), part.begin(), part.end());
-        return lines;
     }
 
     std::string strName_ = freshName();
