@@ -76,10 +76,14 @@ const Decoded kDecoded[] = {
     {"ui", "-7", R"({"ui":-7})"},
     {"ui", "2147483648", R"({"ui":2147483647})"},
     {"ui", "4294967295", R"({"ui":2147483647})"},
+    {"ll", "999999999999999999", R"({"ll":999999999999999999})"},
+    {"ll", "1000000000000000000", R"({"ll":1000000000000000000})"},
     {"ll", "9223372036854775807", R"({"ll":9223372036854775807})"},
     {"ll", "'9223372036854775808'", R"({"ll":9223372036854775807})"},
     {"ll", "'-9223372036854775808'", R"({"ll":-9223372036854775808})"},
     {"ll", "'-9223372036854775809'", R"({"ll":-9223372036854775808})"},
+    {"ll", "'18446744073709551617'", R"({"ll":9223372036854775807})"},
+    {"ll", "'0000000000000000000000042'", R"({"ll":42})"},
     {"ll", "' 8 apples'", R"({"ll":8})"},
     {"ll", "'apples'", R"({"ll":0})"},
     {"ull", "4294967296", R"({"ull":4294967296})"},
@@ -96,6 +100,7 @@ const Decoded kDecoded[] = {
     {"b", "19", R"({"b":false})"},
     {"b", "'1a'", R"({"b":true})"},
     {"b", "4294967297", R"({"b":false})"},
+    {"b", "'18446744073709551617'", R"({"b":false})"},
     {"j", "'5'", R"({"j":5})"},
     {"j", "'\"x\"'", R"({"j":"x"})"},
     {"j", "'null'", R"({"j":null})"},
@@ -109,12 +114,17 @@ const Decoded kDecoded[] = {
     {"ja", "'{}'", R"({"ja":{}})"},
 };
 
+// In the first rows of a column as in the later ones, which are decoded in another way.
 TEST_F(RowDecoder, ReadsEachTypeInItsOwnWay)
 {
-    for (const Decoded& row : kDecoded)
-        EXPECT_EQ("[" + std::string(row.szRow) + "]",
-                  rowsOf("select " + std::string(row.szSqlValue) + " as " + row.szColumn))
+    for (const Decoded& row : kDecoded) {
+        const std::string strAgain = " union all select " + std::string(row.szSqlValue);
+        const std::string strRow = row.szRow;
+        EXPECT_EQ("[" + strRow + "," + strRow + "," + strRow + "," + strRow + "]",
+                  rowsOf("select " + std::string(row.szSqlValue) + " as " + row.szColumn +
+                         strAgain + strAgain + strAgain))
             << row.szColumn << " " << row.szSqlValue;
+    }
 }
 
 TEST_F(RowDecoder, HoldsIntegersAsSignedOnes)
@@ -179,6 +189,7 @@ TEST_F(RowDecoder, TakesTheLaterOfTwoColumnsOfOneName)
 {
     EXPECT_EQ(R"([{"i":2}])", rowsOf("select 1 as i, 2 as i"));
     EXPECT_EQ(R"([{"i":1}])", rowsOf("select 1 as i, null as i"));
+    EXPECT_EQ(R"([{"b":false}])", rowsOf("select 1 as b, 0 as b"));
     EXPECT_EQ(R"([{"jo":[]}])", rowsOf("select '{\"k\":1}' as jo, '[]' as jo"));
 }
 

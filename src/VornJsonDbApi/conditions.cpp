@@ -35,6 +35,36 @@ const Joiner* joinerOf(int iType)
     }
 }
 
+// name='O''Brien', flag=1, id=5
+int appendMatch(std::string_view strField, const Json::Value& jMember, const Json::Value& jParam,
+                std::string& out)
+{
+    SqliteText szSql;
+    const char* szQuote = "'";
+    switch (typeWordRow(jMember).term) {
+    case Term::kText:
+        if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
+        break;
+    case Term::kJson:
+        if (FAILED_AS(NULL == (szSql = sqlite3_mprintf("%q", toString(jParam).c_str())),
+                      "NULL == (szSql = sqlite3_mprintf(\"%q\", jParam.toString().c_str()))"))
+            return -1;
+        break;
+    case Term::kBool:
+        szQuote = "";
+        if (FAILED(NULL == (szSql = sqlite3_mprintf("%d", jParam.asInt())))) return -1;
+        break;
+    case Term::kBare:
+        szQuote = "";
+        if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
+        break;
+    }
+    std::string strTerm(strField);
+    strTerm.append("=").append(szQuote).append(szSql).append(szQuote);
+    out += strTerm;
+    return 0;
+}
+
 }  // namespace
 
 //  (a='x' and b in ('1' ) and  x > 1  )
@@ -53,9 +83,10 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
     MemberWalk types(jType);
     bool blWritten = false;
     for (auto it = jRecParam.begin(), end = jRecParam.end(); it != end; ++it) {
-        std::string strField(memberName(it));
+        const std::string_view strField = memberName(it);
         const bool blRawFilter = kRawFilterKey == strField;
-        if (nullptr == types.find(strField) && !blRawFilter) continue;
+        const Json::Value* pjMember = types.find(strField);
+        if (nullptr == pjMember && !blRawFilter) continue;
         strSqlWhereOut += blWritten ? pJoiner->szBetween : pJoiner->szBefore;
         Json::Value& jTmp = *it;
         // Kept: a table that declares a member of the raw filter's name cannot be asked by it.
@@ -63,11 +94,12 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
             if (FAILED_AS(!jTmp.isString(), "!jRecParam[jmFieldName[i]].isString()")) return -1;
             strSqlWhereOut.append(" ").append(jTmp.asString()).append(" ");
         } else if (jTmp.isArray()) {
-            if (FAILED_AS(0 > SqlMakeByListField(strField.c_str(), jTmp, strSqlWhereOut),
+            const std::string strList(strField);
+            if (FAILED_AS(0 > SqlMakeByListField(strList.c_str(), jTmp, strSqlWhereOut),
                           "0 > SqlMakeByListField(jmFieldName[i].c_str(), jTmp, strSqlWhereOut)"))
                 return -1;
         } else {
-            if (FAILED_AS(0 > SqlMakeByMatchField(strField, jTmp, strSqlWhereOut),
+            if (FAILED_AS(0 > appendMatch(strField, *pjMember, jTmp, strSqlWhereOut),
                           "0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut)"))
                 return -1;
         }
@@ -78,37 +110,12 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
     return 0;
 }
 
-// name='O''Brien', flag=1, id=5
 int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jParam, std::string& out)
 {
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     const Json::Value* pjMember = findMember(jType, strField);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strField)")) return -1;
-
-    SqliteText szSql;
-    const char* szQuote = "'";
-    switch (typeWordRow(*pjMember).term) {
-    case Term::kText:
-        if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
-        break;
-    case Term::kJson:
-        if (FAILED_AS(NULL == (szSql = sqlite3_mprintf("%q", toString(jParam).c_str())),
-                      "NULL == (szSql = sqlite3_mprintf(\"%q\", jParam.toString().c_str()))"))
-            return -1;
-        break;
-    case Term::kBool:
-        szQuote = "";
-        if (FAILED(NULL == (szSql = sqlite3_mprintf("%d", jParam.asInt())))) return -1;
-        break;
-    case Term::kBare:
-        szQuote = "";
-        if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
-        break;
-    }
-    std::string strTerm = strField + '=';
-    strTerm.append(szQuote).append(szSql).append(szQuote);
-    out += strTerm;
-    return 0;
+    return appendMatch(strField, *pjMember, jParam, out);
 }
 
 // name in ('x' ), id in (5 )

@@ -25,7 +25,6 @@ std::string joined(const std::vector<std::string>& strVector)
 // DELETE FROM t  WHERE  (id=1 );
 int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
 {
-    const std::string strSqlPrefix = "DELETE FROM " + strName + " ";
     std::string strSql;
     std::string strSqlRun;
     int err = 0;
@@ -37,7 +36,8 @@ int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
     if (FAILED(jRecParam.type() != Json::objectValue)) return fail();
     if (FAILED(0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND))) return fail();
     if (!blDeleteAll && FAILED(strSql.empty())) return fail();
-    strSqlRun = strSqlPrefix;
+    strSqlRun.reserve(kUsualStatement);
+    strSqlRun.append("DELETE FROM ").append(strName).append(" ");
     // Kept: two blanks stand before WHERE.
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun += ";";

@@ -26,6 +26,7 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
 
     if (FAILED(strSqlWhere.empty())) return fail();
     if (FAILED(jRecIn.empty())) return fail();
+    strSql.reserve(kUsualStatement);
     strSql.append("UPDATE ").append(strName).append(" SET ");
     if (FAILED(0 > SqlExpandMemberList(jColumnList, strSql2, VORN_SQL_WHERE_TYPE_COMMA)))
         return fail();

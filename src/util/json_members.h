@@ -47,12 +47,13 @@ public:
     const Json::Value* find(std::string_view strKey)
     {
         while (0 < nLeft_) {
-            const int iOrder = memberName(it_).compare(strKey);
-            if (0 < iOrder) break;
+            const std::string_view strName = memberName(it_);
+            const bool blFound = strName == strKey;
+            if (!blFound && strName > strKey) break;
             const Json::Value& jMember = *it_;
             ++it_;
             --nLeft_;
-            if (0 == iOrder) return &jMember;
+            if (blFound) return &jMember;
         }
         return nullptr;
     }
@@ -75,9 +76,9 @@ inline std::string_view textOf(const Json::Value& jString)
 // the last by name, as far as the library fills the cache, and is looked at before a search.
 inline const Json::Value* typeWordValue(const Json::Value& jMember)
 {
-    if (0 == jMember.size()) return nullptr;
-    auto last = jMember.end();
-    --last;
+    const Json::ArrayIndex nMembers = jMember.size();
+    if (0 == nMembers) return nullptr;
+    const auto last = 1 == nMembers ? jMember.begin() : --jMember.end();
     return "cpptype" == memberName(last) ? &*last : findMember(jMember, "cpptype");
 }
 

@@ -80,14 +80,18 @@ private:
     std::unique_ptr<Json::StreamWriter> pWriter_;
 };
 
+// Inlined, its frame would burden every text that is parsed.
+[[gnu::noinline]] Json::CharReader* newReader()
+{
+    Json::CharReaderBuilder builder;
+    builder["collectComments"] = false;
+    builder["allowSpecialFloats"] = true;
+    return builder.newCharReader();
+}
+
 Json::CharReader& reader()
 {
-    static Json::CharReader* pReader = [] {
-        Json::CharReaderBuilder builder;
-        builder["collectComments"] = false;
-        builder["allowSpecialFloats"] = true;
-        return builder.newCharReader();
-    }();
+    static Json::CharReader* pReader = newReader();
     return *pReader;
 }
 
