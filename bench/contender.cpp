@@ -19,7 +19,7 @@ const std::vector<ContenderEntry>& contenders()
         {"sqlitecpp-kept", "SQLiteCpp, jsoncpp, kept", makeSqliteCppKept},
 #endif
 #ifdef BENCH_SOCI
-        {"soci", "SOCI, jsoncpp, mapped record", makeSoci},
+        {"soci", "SOCI, jsoncpp, row", makeSoci},
         {"soci-variables", "SOCI, jsoncpp, variables", makeSociVariables},
         {"soci-kept", "SOCI, jsoncpp, variables, kept", makeSociKept},
 #endif

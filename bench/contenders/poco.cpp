@@ -128,7 +128,7 @@ private:
     PocoStatement select(const std::string& strWhere)
     {
         const std::string strSql = std::string("SELECT ") + kColumns + " FROM task" + strWhere;
-        if (Columns::kAsRecord == columns_) return session_ << strSql;
+        if (Columns::kAsRow == columns_) return session_ << strSql;
         // One row for each execution, as long as there are some.
         return (session_ << strSql, into(out_.iDone), into(out_.strGrp), into(out_.iId),
                 into(out_.strMeta), into(out_.strName), into(out_.iQty), into(out_.strTags),
@@ -148,15 +148,16 @@ private:
         return rec;
     }
 
-    Object::Ptr row(RecordSet& columns)
+    Object::Ptr row(RecordSet& columns, std::size_t i)
     {
-        out_.iDone = columns["done"].convert<int>();
-        out_.strGrp = columns["grp"].convert<std::string>();
-        out_.iId = columns["id"].convert<int>();
-        out_.strMeta = columns["meta"].convert<std::string>();
-        out_.strName = columns["name"].convert<std::string>();
-        out_.iQty = columns["qty"].convert<Poco::Int64>();
-        out_.strTags = columns["tags"].convert<std::string>();
+        // What stands in a record set is of the column's declared type, and INTEGER is of 64 bits.
+        out_ = {static_cast<int>(columns.value<Poco::Int64>(0, i)),
+                columns.value<std::string>(1, i),
+                static_cast<int>(columns.value<Poco::Int64>(2, i)),
+                columns.value<std::string>(3, i),
+                columns.value<std::string>(4, i),
+                columns.value<Poco::Int64>(5, i),
+                columns.value<std::string>(6, i)};
         return row();
     }
 
@@ -165,17 +166,16 @@ private:
         must(1 == statement.execute(), "one row");
         if (Columns::kAsVariables == columns_) return row();
         RecordSet columns(statement);
-        return row(columns);
+        return row(columns, 0);
     }
 
     Var all(PocoStatement& statement)
     {
         Array::Ptr rows = new Array;
-        if (Columns::kAsRecord == columns_) {
+        if (Columns::kAsRow == columns_) {
             statement.execute();
             RecordSet columns(statement);
-            for (bool more = columns.moveFirst(); more; more = columns.moveNext())
-                rows->add(row(columns));
+            for (std::size_t i = 0; i < columns.rowCount(); ++i) rows->add(row(columns, i));
             return rows;
         }
         do {
@@ -216,7 +216,7 @@ private:
 
 std::unique_ptr<Contender> makePoco()
 {
-    return std::make_unique<PocoHost>(Columns::kAsRecord, Prepare::kEachCall);
+    return std::make_unique<PocoHost>(Columns::kAsRow, Prepare::kEachCall);
 }
 
 std::unique_ptr<Contender> makePocoVariables()

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A host on SOCI, with jsoncpp as the host by hand uses it. A record goes in and out as an object
-// that SOCI maps to the columns, or as a variable for each column.
+// A host on SOCI, with jsoncpp as the host by hand uses it. A record comes out of SOCI's row, or of
+// a variable for each column.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
 #include "contenders/prepared.h"
@@ -22,38 +22,6 @@ struct Row {
     long long iQty = 0;
     std::string strTags;
 };
-
-}  // namespace bench
-
-template <>
-struct soci::type_conversion<bench::Row> {
-    using base_type = values;
-
-    static void from_base(const values& columns, indicator, bench::Row& row)
-    {
-        row.iDone = columns.get<int>("done");
-        row.strGrp = columns.get<std::string>("grp");
-        row.iId = columns.get<int>("id");
-        row.strMeta = columns.get<std::string>("meta");
-        row.strName = columns.get<std::string>("name");
-        row.iQty = columns.get<long long>("qty");
-        row.strTags = columns.get<std::string>("tags");
-    }
-
-    static void to_base(const bench::Row& row, values& columns, indicator& state)
-    {
-        columns.set("done", row.iDone);
-        columns.set("grp", row.strGrp);
-        columns.set("id", row.iId);
-        columns.set("meta", row.strMeta);
-        columns.set("name", row.strName);
-        columns.set("qty", row.iQty);
-        columns.set("tags", row.strTags);
-        state = i_ok;
-    }
-};
-
-namespace bench {
 
 namespace {
 
@@ -117,7 +85,6 @@ private:
     {
         const std::string strSql = std::string("INSERT INTO task (") + kColumns +
                                    ") VALUES (:done,:grp,:id,:meta,:name,:qty,:tags)";
-        if (Columns::kAsRecord == columns_) return (session_.prepare << strSql, soci::use(in_));
         return (session_.prepare << strSql, soci::use(in_.iDone), soci::use(in_.strGrp),
                 soci::use(in_.iId), soci::use(in_.strMeta), soci::use(in_.strName),
                 soci::use(in_.iQty), soci::use(in_.strTags));
@@ -126,7 +93,7 @@ private:
     Preparation intoOut(const char* szWhere)
     {
         const std::string strSql = std::string("SELECT ") + kColumns + " FROM task" + szWhere;
-        if (Columns::kAsRecord == columns_) return (session_.prepare << strSql, soci::into(out_));
+        if (Columns::kAsRow == columns_) return (session_.prepare << strSql, soci::into(row_));
         return (session_.prepare << strSql, soci::into(out_.iDone), soci::into(out_.strGrp),
                 soci::into(out_.iId), soci::into(out_.strMeta), soci::into(out_.strName),
                 soci::into(out_.iQty), soci::into(out_.strTags));
@@ -134,6 +101,10 @@ private:
 
     Json::Value row()
     {
+        if (Columns::kAsRow == columns_)
+            out_ = {row_.get<int>(0),         row_.get<std::string>(1), row_.get<int>(2),
+                    row_.get<std::string>(3), row_.get<std::string>(4), row_.get<long long>(5),
+                    row_.get<std::string>(6)};
         Json::Value jRow(Json::objectValue);
         jRow["done"] = 1 == out_.iDone;
         jRow["grp"] = out_.strGrp;
@@ -162,7 +133,7 @@ private:
     static void makeTable(soci::session& session)
     {
         std::string strCreate = createStatement();
-        // What is found by name is of the column's declared type, and INTEGER is an int.
+        // What stands in a row is of the column's declared type, and INTEGER is an int.
         const std::string strQty = "qty INTEGER";
         strCreate.replace(strCreate.find(strQty), strQty.size(), "qty BIGINT");
         const std::string::size_type end = strCreate.find(';');
@@ -179,6 +150,7 @@ private:
     Session session_;
     Row in_;
     Row out_;
+    soci::row row_;
     Statement insert_{when_, [this]() -> soci::statement { return insertIn(); }};
     Statement stored_{when_, [this]() -> soci::statement {
                           return intoOut(" WHERE rowid = last_insert_rowid()");
@@ -205,7 +177,7 @@ private:
 
 std::unique_ptr<Contender> makeSoci()
 {
-    return std::make_unique<Soci>(Columns::kAsRecord, Prepare::kEachCall);
+    return std::make_unique<Soci>(Columns::kAsRow, Prepare::kEachCall);
 }
 
 std::unique_ptr<Contender> makeSociVariables()
