@@ -45,6 +45,15 @@ TEST_F(KeptColumns, TakeAnotherTypeWord)
     EXPECT_EQ(Lines(), takeLog());
 }
 
+TEST_F(KeptColumns, TakeAnotherTypeWordBehindOtherColumns)
+{
+    types()["t"]["cpptype"] = "string";
+    for (int i = 0; i < 3; ++i) EXPECT_EQ(R"([{"s":"7"}])", answer({{"s"}, {"7"}}));
+    EXPECT_EQ(R"([{"t":"7"}])", answer({{"t"}, {"7"}}));
+    types()["s"]["cpptype"] = "bool";
+    EXPECT_EQ(R"([{"s":false}])", answer({{"s"}, {"7"}}));
+}
+
 TEST_F(KeptColumns, TakeATypeWordBesideOtherMembers)
 {
     warmUp();
