@@ -155,10 +155,10 @@ that are prepared once and kept, as the contenders by hand do; SQLiteCpp, SOCI a
 statements that are prepared for each call, as in their own examples, and with kept ones. A host that keeps its
 statements saves the preparing, which is most of a small operation; this library's interface cannot.
 
-SOCI and Poco::Data are used in two ways: with the type that each has for rows whose columns are known at run time
-(`soci::row`, `Poco::Data::RecordSet`), and with a variable for each column. All columns are found by their position.
-The limits are for the first way, for this library too learns its columns at run time, from the definition. A host that
-is written for one table can take variables, as SQLiteCpp's host and those by hand do; what that saves is shown.
+SOCI and Poco::Data are used in two ways: with the type that each has for the rows of any table (`soci::row`,
+`Poco::Data::RecordSet`), and with variables that are bound to the columns. Columns are found by their position in
+both. The limits are for the first way, since this library serves any table too; what a host saves that is written for
+one table and binds variables stands beside it.
 
 ## Limits
 

@@ -221,6 +221,14 @@ TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
     }
 }
 
+TEST_F(RowDecoder, RefusesAValueBehindRowsOfNullsToo)
+{
+    EXPECT_EQ(-1, run("select null as d union all select null union all select null"
+                      " union all select 1.5 union all select 2.5"));
+    EXPECT_EQ(error("type error, strType=double"), takeLog()[0]);
+    EXPECT_EQ("[{},{},{}]", text(rows_));
+}
+
 TEST_F(RowDecoder, AppendsTheRowsOfEveryAttempt)
 {
     doubles::state().exec = [i = 0](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,

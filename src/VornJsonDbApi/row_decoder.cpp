@@ -53,7 +53,8 @@ struct Source {
 // members, without a search for any.
 struct Prototype {
     Json::Value jRecord;
-    std::vector<Source> sources;  // one for each member; empty while there is no prototype
+    std::vector<Source> sources;  // one for each column; empty until the columns are known
+    bool blUsable = false;        // unless a column cannot be decoded, or stands there twice
     bool blChecked = false;       // whether the columns have these types in the running statement
 };
 Prototype& prototype = *new Prototype;
@@ -94,6 +95,7 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
         blNewColumn = true;
         column.blChecked = false;
         prototype.sources.clear();
+        prototype.blUsable = false;
         column.name = sharedName(szName);
         column.decode = typeWord(strType).decode;
         column.strType = std::move(strType);
@@ -181,27 +183,27 @@ int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, cha
     return 0;
 }
 
-// For rows whose columns were all looked up under these names. There is none where a column cannot
-// be decoded, or stands there twice.
+// For rows whose columns were all looked up under these names.
 void makePrototype(std::size_t nColumns)
 {
     Json::Value jRecord(Json::objectValue);
     std::vector<Source> sources;
+    bool blDecoded = true;
     for (std::size_t i = 0; i < nColumns; ++i) {
         const Column& column = columns[i];
-        if (Decode::kNo == column.decode) return;
         const bool blFalse = Decode::kBool == column.decode;
         jRecord[Json::StaticString(column.name.data())] =
             blFalse ? Json::Value(false) : Json::Value();
         sources.push_back({i, column.name.data(), column.decode});
+        blDecoded = blDecoded && Decode::kNo != column.decode;
     }
-    if (jRecord.size() != nColumns) return;
     std::sort(sources.begin(), sources.end(), [](const Source& left, const Source& right) {
         return columns[left.iColumn].name < columns[right.iColumn].name;
     });
+    prototype.blUsable = blDecoded && jRecord.size() == nColumns;
+    prototype.blChecked = true;
     prototype.jRecord.swap(jRecord);
     prototype.sources.swap(sources);
-    prototype.blChecked = true;
 }
 
 bool hasTypeWord(const Json::Value* pjMember, const std::string& strType)
@@ -228,8 +230,8 @@ bool haveSameTypes()
 // Whether the row has the prototype's columns, each with a value.
 bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name)
 {
-    if (prototype.sources.empty() || prototype.sources.size() != nColumns ||
-        nullptr == column_name || nullptr == column_value)
+    if (!prototype.blUsable || prototype.sources.size() != nColumns || nullptr == column_name ||
+        nullptr == column_value)
         return false;
     for (const Source& source : prototype.sources) {
         const char* szName = column_name[source.iColumn];
