@@ -54,6 +54,24 @@ TEST_F(KeptColumns, TakeAnotherTypeWordBehindOtherColumns)
     EXPECT_EQ(R"([{"s":false}])", answer({{"s"}, {"7"}}));
 }
 
+// SQLite has no such rows; a host that calls the callback itself may.
+TEST_F(KeptColumns, AreNoneOfARowWithoutColumns)
+{
+    types()["t"]["cpptype"] = "string";
+    for (int i = 0; i < 3; ++i) {
+        warmUp();
+        EXPECT_EQ(R"([{"t":"7"}])", answer({{"t"}, {"7"}}));
+        state().exec = [](sqlite3*, const char*, doubles::RowCallback callback, void* arg, char**) {
+            char* none[] = {nullptr};
+            EXPECT_EQ(0, callback(arg, 0, none, none));
+            return SQLITE_OK;
+        };
+        Json::Value jRows;
+        EXPECT_EQ(0, table_.api.runSqlEx("a text", callback_, &jRows));
+        EXPECT_EQ("[{}]", text(jRows));
+    }
+}
+
 TEST_F(KeptColumns, TakeATypeWordBesideOtherMembers)
 {
     warmUp();
