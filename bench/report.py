@@ -157,8 +157,8 @@ statements saves the preparing, which is most of a small operation; this library
 
 SOCI and Poco::Data are used in two ways: with the type that each has for the rows of any table (`soci::row`,
 `Poco::Data::RecordSet`), and with variables that are bound to the columns. Columns are found by their position in
-both. The limits are for the first way, since this library serves any table too; what a host saves that is written for
-one table and binds variables stands beside it.
+both. The limits are for the first way, since this library serves any table too; the figures of a host that is written
+for one table and binds variables stand beside them.
 
 ## Limits
 

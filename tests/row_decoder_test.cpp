@@ -114,10 +114,12 @@ const Decoded kDecoded[] = {
     {"ja", "'{}'", R"({"ja":{}})"},
 };
 
-// In the first rows of a column as in the later ones, which are decoded in another way.
+// In the first rows behind another column as in the later ones, which are decoded in another way.
 TEST_F(RowDecoder, ReadsEachTypeInItsOwnWay)
 {
     for (const Decoded& row : kDecoded) {
+        const char* szOther = std::string("i") == row.szColumn ? "s" : "i";
+        EXPECT_EQ("[{}]", rowsOf(std::string("select null as ") + szOther));
         const std::string strAgain = " union all select " + std::string(row.szSqlValue);
         const std::string strRow = row.szRow;
         EXPECT_EQ("[" + strRow + "," + strRow + "," + strRow + "," + strRow + "]",

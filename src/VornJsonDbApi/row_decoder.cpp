@@ -269,7 +269,7 @@ int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** 
     blNewColumn = false;
     if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
     pjRecArray->append(std::move(jTmp));
-    if (!blNewColumn && prototype.sources.empty()) makePrototype(nColumns);
+    if (!blNewColumn && prototype.sources.size() != nColumns) makePrototype(nColumns);
     return 0;
 }
 
