@@ -203,7 +203,7 @@ public:
     int recSave(Json::Value& jRecInOut, bool blCreate);
 
     /// Inserts the object @p jRecIn, completed by its defaults and type-checked, and sets @p
-    /// jRecOut to the stored row. @p jRecIn is not changed; nor may SQL functions change it.
+    /// jRecOut to the stored row. @p jRecIn is not changed.
     ///
     /// Returns 0, or -1 with @p jRecOut unchanged. getErrMsg() is then "DUPLICATE_PRIMARY_KEY" when
     /// the last SQL failure of this handle was a violated UNIQUE constraint, even if this call
@@ -282,7 +282,9 @@ public:
     ///
     /// Text is escaped, integers and numbers (six decimals) are bare, objects and arrays become
     /// JSON text. A "%" in the text so far, earlier values included, is read as a conversion of
-    /// sqlite3_mprintf by every value that follows: such members are not written faithfully.
+    /// sqlite3_mprintf by every value that follows: such members are not written faithfully. A text
+    /// that is too long for sqlite3_mprintf (1,000,000,000 bytes by default) throws
+    /// std::logic_error.
     int SqlExpandMemberSymbol(std::string& sql, Json::Value& rec);
 
     /// Appends the terms of the request @p jRecParam, an object or null, to @p out, joined as
@@ -313,9 +315,6 @@ public:
     int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
-    // recSave() with the stored row put into jRow, which may be the record itself.
-    int saveRow(Json::Value& jRecInOut, bool blCreate, Json::Value& jRow);
-
     sqlite3* pDb = nullptr;
     std::string strName;
     Json::Value jTableDef;
