@@ -41,7 +41,7 @@ struct Source {
 struct Prototype {
     Json::Value jRecord;
     std::vector<Source> sources;  // one for each column; empty until the columns are known
-    bool blUsable = false;        // unless a column cannot be decoded, or is there twice
+    bool blUsable = false;        // unless a column cannot be decoded, or stands there twice
     bool blChecked = false;       // whether the columns have these types in the running statement
 };
 
