@@ -86,6 +86,7 @@ Json::Value parse(std::istream& stream, const std::string& strSource)
 {
     Json::CharReaderBuilder builder;
     Json::CharReaderBuilder::strictMode(&builder.settings_);
+    builder["stackLimit"] = 1000;  // as the library reads
     Json::Value jValue;
     std::string strErrors;
     if (Json::parseFromStream(builder, stream, &jValue, &strErrors)) return jValue;
