@@ -58,7 +58,7 @@ bool useUsers(sqlite3* pDb)
     std::string strCreate =
         "create table if not exists user (id integer primary key, mail text unique)";
     Json::Value jDefinition;
-    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
     jDefinition[strName]["member"]["mail"]["cpptype"] = "string";
     VornJsonDbApi user(pDb, strName, jDefinition, strCreate);
     if (0 > user.tableCreate()) return false;
