@@ -22,6 +22,15 @@ void listOther(sqlite3_context* pContext, int, sqlite3_value**)
     sqlite3_result_int(pContext, 1);
 }
 
+// SQL function of a host: makes a handle of another table while a statement runs.
+void makeHandle(sqlite3_context* pContext, int, sqlite3_value**)
+{
+    auto* pOther = static_cast<Table*>(sqlite3_user_data(pContext));
+    VornJsonDbApi(sqlite3_context_db_handle(pContext), pOther->strName, pOther->jDefinition,
+                  pOther->strCreate);
+    sqlite3_result_int(pContext, 1);
+}
+
 }  // namespace
 
 TEST_F(Limits, OneThread)
@@ -36,6 +45,17 @@ TEST_F(Limits, OneThread)
     jNested["vornSqlWhereFilter"] = "list_other()";
     EXPECT_EQ("-1", ids(jNested));
     EXPECT_EQ(failed("!jType.isMember(strName)"), takeLog().at(0));
+
+    // So are the rows that follow the making of a handle.
+    table_.create(R"({"id":2,"text":"x"})");
+    EXPECT_EQ(SQLITE_OK, sqlite3_create_function(database_.get(), "make_handle", 0, SQLITE_UTF8,
+                                                 &other, makeHandle, nullptr, nullptr));
+    jNested["vornSqlWhereFilter"] = "id = 1 or make_handle()";
+    Json::Value jFollowed;
+    EXPECT_EQ(-1, table_.api.recList(jNested, jFollowed));
+    EXPECT_EQ("[" + stored(1) + "]", text(jFollowed));
+    EXPECT_EQ(failed("!jType.isMember(strName)"), takeLog().at(0));
+    database_.run("delete from " + table_.strName + " where id = 2");
 
     // One after the other; two threads with one lock around every call.
     std::mutex vornMutex;
