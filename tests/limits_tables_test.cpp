@@ -3,10 +3,9 @@
 
 #include "support/limits.h"
 
-#include <unistd.h>
+#include <malloc.h>
 #include <cstdio>
 #include <cstdlib>
-#include <fstream>
 
 TEST_F(Limits, NamesAreNotQuoted)
 {
@@ -62,33 +61,38 @@ TEST_F(Limits, IntIdEndsAt2147483647)
 
 namespace {
 
-long residentBytes()
+long bytesInUse()
 {
-    std::ifstream file("/proc/self/statm");
-    long lTotal = 0;
-    long lResident = 0;
-    file >> lTotal >> lResident;
-    return lResident * sysconf(_SC_PAGESIZE);
+    return static_cast<long>(mallinfo2().uordblks);
+}
+
+// Whether these bytes are counted: a sanitizer or valgrind puts another allocator in the place of
+// the C library's.
+bool areCounted()
+{
+    const long lBefore = bytesInUse();
+    const std::vector<char> probe(10000);
+    return probe.size() <= static_cast<std::size_t>(bytesInUse() - lBefore);
 }
 
 // In a process of its own, which ends: what the tables of the page's shape leave in memory and in
 // the log.
 void useManyTables(const Json::Value& jMembers)
 {
-    constexpr long kTables = 5000;
+    constexpr long kTables = 1000;
     const auto use = [&jMembers](std::string strName) {
         Json::Value jDefinition;
         jDefinition[strName]["member"] = jMembers;
         VORN_JSON_DB::recType(jDefinition, strName);
     };
-    for (long i = 0; i < kTables; ++i) use("warm" + std::to_string(i));
-    const long lBefore = residentBytes();
+    use("first");
+    const long lBefore = bytesInUse();
     for (long i = 0; i < kTables; ++i) use("task" + std::to_string(i));
-    const long lTable = (residentBytes() - lBefore) / kTables;
-    EXPECT_LT(500, lTable);
-#if !defined(__SANITIZE_ADDRESS__) && !defined(__SANITIZE_THREAD__)  // they add to each block
-    EXPECT_GT(4000, lTable);
-#endif
+    const long lTable = (bytesInUse() - lBefore) / kTables;
+    if (areCounted())
+        EXPECT_TRUE(800 < lTable && 3000 > lTable) << lTable;
+    else
+        puts("The bytes of a table are not compared: another allocator is in use.");
     EXPECT_EQ(Lines(), takeLog());
 
     // A handle whose table the definition lacks.
@@ -105,7 +109,7 @@ void useManyTables(const Json::Value& jMembers)
     for (const std::string& strLine : takeLog()) {
         if (0 != strLine.find(utilPlain("jType="))) continue;
         ++nDumps;
-        EXPECT_LT(2 * kTables * text(jMembers).size(), strLine.size());
+        EXPECT_LT(kTables * text(jMembers).size(), strLine.size());
     }
     EXPECT_EQ(4U, nDumps);
 }
