@@ -170,7 +170,9 @@ public:
     void setErrMsg(std::string strMsg);
 
     /// The message for the host's user: empty in a new handle, "DUPLICATE_PRIMARY_KEY" after
-    /// recCreate() or recUpdateByFilter() met a violated UNIQUE or PRIMARY KEY constraint.
+    /// recCreate() or recUpdateByFilter() met a violated UNIQUE or PRIMARY KEY constraint. Where
+    /// other connections lock the database, a record may meet its own row, which an earlier attempt
+    /// of the same call has written; within a transaction of the host it does not.
     ///
     /// Nothing but setErrMsg() clears it. Look at it only after a result of -1, and call
     /// setErrMsg("") before the operation: a later failure of another kind leaves it in place.
