@@ -9,7 +9,7 @@
 ///
 ///     {"name": "task", "key": "id",
 ///      "create": "create table if not exists task (id integer primary key, name text)",
-///      "definition": {"task": {"member": {"id": {"cpptype": "int"},
+///      "definition": {"task": {"member": {"id": {"cpptype": "long long"},
 ///                                         "name": {"cpptype": "string"}}}}}
 ///
 /// "key" is this program's own and may be absent: the member that names a record in a message.
