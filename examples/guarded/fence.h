@@ -8,6 +8,7 @@
 
 #include <functional>
 #include <string>
+#include <string_view>
 
 // What the statements of a call may do with the table.
 enum class Access { kNothing, kTransaction, kRead, kInsert, kUpdate, kDelete };
@@ -31,13 +32,14 @@ private:
     static int authorize(void* pFence, int iAction, const char* szFirst, const char* szSecond,
                          const char* szDatabase, const char* szTrigger);
     static int countSteps(void* pFence);
-    bool allows(int iAction, const std::string& strFirst, const std::string& strSecond) const;
+    bool allows(int iAction, std::string_view first, std::string_view second) const;
     bool begin(Access access);
     void rollBack();
-    bool execute(Access access, const std::string& strSql);
+    bool execute(Access access, const char* szSql);
 
     sqlite3* pDb_;
     std::string strTable_;
+    std::string strRead_;
     Access access_ = Access::kNothing;
     int iTicks_ = 0;
 };

@@ -122,7 +122,6 @@ std::vector<Attack> numbers()
          {list(R"({"done":["1)); delete from vault; --"]})")},
          vaultIsEmpty,
          kStops},
-        {"number_out_of_range", {create(R"({"id":3000000000})")}, idIsAnother, kLetsThrough},
         {"number_beyond_64_bits",
          {create(R"({"id":18446744073709551615})")},
          hostIsThrownAt,
@@ -228,6 +227,68 @@ std::vector<Attack> shapes()
          {create(R"({"id":1,"text":"\nroot logged in"})")},
          logLineIsForged,
          kLetsThrough},
+        {"log_next_line",
+         {create(R"({"id":1,"text":"\u0085root logged in"})")},
+         logHasControls,
+         kLetsThrough},
+        {"log_line_separator",
+         {create(R"({"id":1,"text":"\u2028root logged in"})")},
+         logHasControls,
+         kLetsThrough},
+        {"log_direction",
+         {create(R"({"id":1,"text":"\u202enimda"})")},
+         logHasControls,
+         kLetsThrough},
+        {"log_escape_sequence",
+         {create(R"({"id":1,"text":"\u009b2J"})")},
+         logHasControls,
+         kLetsThrough},
+        {"not_utf8", {create("{\"author\":\"\xff\"}")}, authorIsNoUtf8, kLetsThrough},
+    };
+}
+
+// Each command is a good one by itself.
+std::vector<Attack> shares()
+{
+    const std::string strLater = create(R"({"text":"later"})");
+    std::vector<std::string> hundred(100,
+                                     create(R"({"text":")" + std::string(60000, 'x') + R"("})"));
+    hundred.push_back(list("{}"));
+    return {
+        {"create_with_id",
+         {create(R"({"id":2147483647})"), strLater},
+         laterIdsAreHuge,
+         kLetsThrough},
+        {"update_of_id",
+         {update(R"({"id":1})", R"({"id":2147483647})"), strLater},
+         laterIdsAreHuge,
+         kLetsThrough},
+        {"save_with_new_id",
+         {save(R"({"id":2147483647})"), strLater},
+         laterIdsAreHuge,
+         kLetsThrough},
+        {"update_of_author",
+         {update(R"({"id":1})", R"({"author":"Eve"})")},
+         noteIsEves,
+         kLetsThrough},
+        {"save_of_other_author", {save(R"({"id":1,"author":"Eve"})")}, noteIsEves, kLetsThrough},
+        {"notes_beyond_quota",
+         {create(R"({"author":"crowd"})")},
+         crowdGrows,
+         kLetsThrough,
+         Attack::Guard::kRefuses,
+         1000},
+        {"list_without_index",
+         {list(R"({"text":"none"})")},
+         tableIsScanned,
+         kStops,
+         Attack::Guard::kRefuses,
+         40000},
+        {"many_values",
+         {create(R"({"topics":[0)" + repeated(4000, ",0") + "]}")},
+         noteHasManyValues,
+         kLetsThrough},
+        {"huge_answer", hundred, answerIsHuge, kLetsThrough},
     };
 }
 
@@ -237,7 +298,7 @@ const std::vector<Attack>& attacks()
 {
     static const std::vector<Attack> all = [] {
         std::vector<Attack> made;
-        for (auto* part : {rawFilters, numbers, pages, percents, shapes})
+        for (auto* part : {rawFilters, numbers, pages, percents, shapes, shares})
             for (Attack& attack : part()) made.push_back(std::move(attack));
         return made;
     }();
