@@ -150,12 +150,14 @@ void checkRequest(const Json::Value& jTypes, const Json::Value& jRequest)
     }
 }
 
-// A condition on another member reads the whole table, unless it narrows one of these.
+// A condition on another member, and an order, reads the whole table unless one of these narrows
+// it.
 void checkIndexed(const Json::Value& jTypes, const Json::Value& jRequest)
 {
     if (jRequest.isMember("id") || jRequest.isMember("author")) return;
     for (const std::string& strKey : jRequest.getMemberNames())
-        refuseIf(jTypes.isMember(strKey), "a list asks for an id or an author");
+        refuseIf("sort_by" == strKey || jTypes.isMember(strKey),
+                 "a list asks for an id or an author");
 }
 
 // Without a limit the library reads the whole table.

@@ -100,9 +100,9 @@ bool hostIsThrownAt(World& world)
     return world.blThrown;
 }
 
-bool laterIdsAreHuge(World& world)
+bool idsAreUsedUp(World& world)
 {
-    return 2147483647 <= world.answers.at(1)["record"]["id"].asInt64();
+    return "2147483647" == world.value("select max(id) from note");
 }
 
 bool noteIsEves(World& world)

@@ -22,7 +22,8 @@ bool annIsImitated(World& world);
 bool annIsTold(World& world);
 bool authorIsAnother(World& world);
 bool hostIsThrownAt(World& world);
-bool laterIdsAreHuge(World& world);
+// The next id is beyond 32 bits.
+bool idsAreUsedUp(World& world);
 bool noteIsEves(World& world);
 bool crowdGrows(World& world);
 // The call succeeded, and the member is null.

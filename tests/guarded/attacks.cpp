@@ -58,6 +58,13 @@ std::string nested(unsigned uLevels)
 constexpr auto kStops = Attack::Fence::kStops;
 constexpr auto kLetsThrough = Attack::Fence::kLetsThrough;
 
+// A note that is there already, so that the call fails.
+Attack logged(const char* szName, const std::string& strText)
+{
+    return {
+        szName, {create(R"({"id":1,"text":")" + strText + "\"}")}, logHasControls, kLetsThrough};
+}
+
 std::vector<Attack> rawFilters()
 {
     return {
@@ -227,22 +234,10 @@ std::vector<Attack> shapes()
          {create(R"({"id":1,"text":"\nroot logged in"})")},
          logLineIsForged,
          kLetsThrough},
-        {"log_next_line",
-         {create(R"({"id":1,"text":"\u0085root logged in"})")},
-         logHasControls,
-         kLetsThrough},
-        {"log_line_separator",
-         {create(R"({"id":1,"text":"\u2028root logged in"})")},
-         logHasControls,
-         kLetsThrough},
-        {"log_direction",
-         {create(R"({"id":1,"text":"\u202enimda"})")},
-         logHasControls,
-         kLetsThrough},
-        {"log_escape_sequence",
-         {create(R"({"id":1,"text":"\u009b2J"})")},
-         logHasControls,
-         kLetsThrough},
+        logged("log_next_line", "\\u0085root logged in"),
+        logged("log_line_separator", "\\u2028root logged in"),
+        logged("log_direction", "\\u202enimda"),
+        logged("log_escape_sequence", "\\u009b2J"),
         {"not_utf8", {create("{\"author\":\"\xff\"}")}, authorIsNoUtf8, kLetsThrough},
     };
 }
@@ -250,23 +245,14 @@ std::vector<Attack> shapes()
 // Each command is a good one by itself.
 std::vector<Attack> shares()
 {
-    const std::string strLater = create(R"({"text":"later"})");
+    const char* kGreatest = R"({"id":2147483647})";
     std::vector<std::string> hundred(100,
                                      create(R"({"text":")" + std::string(60000, 'x') + R"("})"));
     hundred.push_back(list("{}"));
     return {
-        {"create_with_id",
-         {create(R"({"id":2147483647})"), strLater},
-         laterIdsAreHuge,
-         kLetsThrough},
-        {"update_of_id",
-         {update(R"({"id":1})", R"({"id":2147483647})"), strLater},
-         laterIdsAreHuge,
-         kLetsThrough},
-        {"save_with_new_id",
-         {save(R"({"id":2147483647})"), strLater},
-         laterIdsAreHuge,
-         kLetsThrough},
+        {"create_with_id", {create(kGreatest)}, idsAreUsedUp, kLetsThrough},
+        {"update_of_id", {update(R"({"id":1})", kGreatest)}, idsAreUsedUp, kLetsThrough},
+        {"save_with_new_id", {save(kGreatest)}, idsAreUsedUp, kLetsThrough},
         {"update_of_author",
          {update(R"({"id":1})", R"({"author":"Eve"})")},
          noteIsEves,
@@ -280,6 +266,12 @@ std::vector<Attack> shares()
          1000},
         {"list_without_index",
          {list(R"({"text":"none"})")},
+         tableIsScanned,
+         kStops,
+         Attack::Guard::kRefuses,
+         40000},
+        {"order_without_index",
+         {list(R"({"sort_by":"id"})")},
          tableIsScanned,
          kStops,
          Attack::Guard::kRefuses,

@@ -34,7 +34,8 @@ TEST_F(Guard, LetsThroughWhatTheTableCanHold)
             R"({"op":"list","request":{"author":"Ann","done":false,"id":[5],"text":["x"]}})",
             R"({"op":"list","request":{"author":"Ann","topics":[["a"]],"limit":100}})",
             R"({"op":"list","request":{"id":3000000000,"offset":2147483647}})",
-            R"({"op":"list","request":{"sort_by":"text","sort_direction":"asc","limit":0}})",
+            R"({"op":"list","request":{"author":"Ann","sort_by":"text","sort_direction":"asc"}})",
+            R"({"op":"list","request":{"id":1,"sort_by":"id","limit":0}})",
             R"({"op":"get","request":{"id":1}})",
             R"({"op":"update","request":{"id":1},"values":{"text":"x"}})",
             R"({"op":"delete","request":{"id":1}})",
@@ -114,6 +115,7 @@ TEST_F(Guard, RefusesWithAReason)
         {R"({"op":"list","request":{"done":false}})", strIndex},
         {R"({"op":"list","request":{"text":["x"],"limit":1}})", strIndex},
         {R"({"op":"list","request":{"topics":[["a"]]}})", strIndex},
+        {R"({"op":"list","request":{"sort_by":"id"}})", strIndex},
     };
     for (const auto& row : cases) EXPECT_EQ(row.strReason, refusal(row.szLine)) << row.szLine;
 }
