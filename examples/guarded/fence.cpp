@@ -42,10 +42,7 @@ std::string_view textOf(const char* szText)
 
 }  // namespace
 
-Fence::Fence(sqlite3* pDb, std::string strTable)
-    : pDb_(pDb),
-      strTable_(std::move(strTable)),
-      strRead_("select 1 from main." + strTable_ + " limit 1")
+Fence::Fence(sqlite3* pDb, std::string strTable) : pDb_(pDb), strTable_(std::move(strTable))
 {
     setLimits(pDb_);
     setDefenses(pDb_);
@@ -61,11 +58,11 @@ Fence::~Fence()
 
 int Fence::run(Access access, const std::function<int()>& work)
 {
-    if (!begin(access)) return -1;
     const int iChanges = sqlite3_total_changes(pDb_);
     int iResult = -1;
-    access_ = access;
     try {
+        if (!begin(access)) return -1;
+        access_ = access;
         iResult = work();
     } catch (...) {
         rollBack();
@@ -114,7 +111,7 @@ bool Fence::begin(Access access)
     if (0 == sqlite3_get_autocommit(pDb_)) rollBack();  // there was no memory for it
     if (Access::kRead != access) return execute(Access::kTransaction, "begin immediate");
     if (!execute(Access::kTransaction, "begin")) return false;
-    if (execute(access, strRead_.c_str())) return true;
+    if (execute(access, ("select 1 from main." + strTable_ + " limit 1").c_str())) return true;
     rollBack();
     return false;
 }

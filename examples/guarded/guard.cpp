@@ -9,9 +9,9 @@
 namespace guard {
 namespace {
 
-void refuseIf(bool blBad, const std::string& strReason)
+void refuseIf(bool blBad, const char* szReason)
 {
-    if (blBad) throw Refused(strReason);
+    if (blBad) throw Refused(szReason);
 }
 
 // The code point that begins there; moves on to the next one.
@@ -25,7 +25,7 @@ char32_t readCodePoint(const std::string& strText, std::size_t& uAt)
     const unsigned uMore = 0xf0 <= uLead ? 3 : 0xe0 <= uLead ? 2 : 1;
     char32_t c = uLead & (0x3fU >> uMore);
     for (unsigned u = 0; u < uMore; ++u, ++uAt) {
-        refuseIf(uAt >= strText.size() || 0x80 != (strText[uAt] & 0xc0), szWrong);
+        refuseIf(0x80 != (strText[uAt] & 0xc0), szWrong);  // so is the NUL at the end
         c = c << 6 | (strText[uAt] & 0x3f);
     }
     refuseIf(kLeast[uMore] > c || 0x10ffff < c || (0xd800 <= c && 0xdfff >= c), szWrong);
@@ -101,7 +101,7 @@ void checkRecord(const Json::Value& jTypes, const Json::Value& jRecord)
 // A new note gets its id from SQLite: the one after the greatest. Later it keeps id and author.
 void checkKept(const Json::Value& jRecord, const char* szName)
 {
-    refuseIf(jRecord.isMember(szName), std::string("\"") + szName + "\" cannot be set");
+    if (jRecord.isMember(szName)) throw Refused(std::string("\"") + szName + "\" cannot be set");
 }
 
 // The items of a list are written without a comma, so [1,2] is 12.

@@ -158,9 +158,10 @@ TEST_F(Guard, RefusesControlCharacters)
 TEST_F(Guard, RefusesWhatIsNotUtf8)
 {
     for (const char* szText : {
-             "\x80",   // begins in the middle
-             "\xc3",   // ends there
-             "\xc3(",  // goes on with something else
+             "\x80",
+             "\x85\x80",  // begins in the middle
+             "\xc3",      // ends there
+             "\xc3(",     // goes on with something else
              "\xe2\x82",
              "\xe2\x82(",
              "\xf0\x9f\x98",

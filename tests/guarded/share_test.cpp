@@ -66,6 +66,17 @@ protected:
     std::unique_ptr<Host> pHost_;
 };
 
+// Those that begin like one of these.
+void failStatements(const std::vector<std::string>& beginnings)
+{
+    doubles::state().exec = [beginnings](sqlite3* pDb, const char* szSql,
+                                         doubles::RowCallback callback, void* arg, char** errText) {
+        for (const std::string& strBeginning : beginnings)
+            if (0 == std::string(szSql).rfind(strBeginning, 0)) return SQLITE_NOMEM;
+        return doubles::realExec(pDb, szSql, callback, arg, errText);
+    };
+}
+
 constexpr char kCreate[] = R"({"op":"create","record":{"author":"Ann","text":"mine"}})";
 constexpr char kGet[] = R"({"op":"get","request":{"id":1}})";
 
@@ -172,12 +183,14 @@ TEST_F(Share, HostGoesOnAfterALackOfMemory)
         for (int iNth = 1; 1 == iNth || 0 == doubles::state().iFailNew; ++iNth) {
             ASSERT_GT(10000, iNth);
             Line line;
+            doubles::state().statements.clear();  // what records them has room already
             doubles::state().iFailNew = iNth;
             host().serve(strLine, line);
             if (0 != doubles::state().iFailNew) break;
             const bool blFailed = std::string(kFailed) + "\n" == line.text();
             EXPECT_TRUE(blFailed || strRight == line.text()) << iNth << ": " << line.text();
             iFailed += blFailed;
+            EXPECT_EQ(1, sqlite3_get_autocommit(database_.get())) << iNth;
             ASSERT_EQ(strNote, served(kGet)) << iNth;
         }
         doubles::state().iFailNew = 0;
@@ -185,16 +198,21 @@ TEST_F(Share, HostGoesOnAfterALackOfMemory)
     }
 }
 
+TEST_F(Share, HostGoesOnAfterALookUpThatFails)
+{
+    EXPECT_EQ(0, result(R"({"op":"list","request":{}})"));
+    failStatements({"SELECT"});
+    EXPECT_EQ(kFailed, text(answer(kCreate)));
+    doubles::state().exec = nullptr;
+    EXPECT_EQ(0, result(kCreate));
+    EXPECT_EQ(1, answer(kGet)["record"]["id"].asInt());
+}
+
 // Even the rollback may lack memory.
 TEST_F(Share, HostGoesOnAfterARollbackThatFails)
 {
     EXPECT_EQ(0, result(kCreate));
-    doubles::state().exec = [](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
-                               void* arg, char** errText) {
-        const std::string strSql = szSql;
-        const bool blFails = "commit" == strSql || "rollback" == strSql;
-        return blFails ? SQLITE_NOMEM : doubles::realExec(pDb, szSql, callback, arg, errText);
-    };
+    failStatements({"commit", "rollback"});
     EXPECT_EQ(kFailed, text(answer(R"({"op":"delete","request":{"id":1}})")));
     doubles::state().exec = nullptr;
     EXPECT_EQ("mine", answer(kGet)["record"]["text"].asString());
