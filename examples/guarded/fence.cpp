@@ -5,7 +5,7 @@
 
 namespace {
 
-constexpr int kMaxBytes = 512 * 1024;  // a command of guard::kMaxLine, escaped twice
+constexpr int kMaxBytes = 64 * 1024;  // a command of guard::kMaxLine, escaped twice
 constexpr int kStepsPerTick = 1000;
 constexpr int kMaxTicks = 100;
 
@@ -34,9 +34,10 @@ void setDefenses(sqlite3* pDb)
     sqlite3_db_config(pDb, SQLITE_DBCONFIG_DQS_DML, 0, nullptr);
 }
 
-std::string textOf(const char* szText)
+// No copy: SQLite calls, and a lack of memory must not be thrown through it.
+std::string_view textOf(const char* szText)
 {
-    return nullptr == szText ? std::string() : szText;
+    return nullptr == szText ? std::string_view() : szText;
 }
 
 }  // namespace
@@ -57,11 +58,11 @@ Fence::~Fence()
 
 int Fence::run(Access access, const std::function<int()>& work)
 {
-    if (!begin(access)) return -1;
     const int iChanges = sqlite3_total_changes(pDb_);
     int iResult = -1;
-    access_ = access;
     try {
+        if (!begin(access)) return -1;
+        access_ = access;
         iResult = work();
     } catch (...) {
         rollBack();
@@ -83,23 +84,23 @@ int Fence::authorize(void* pFence, int iAction, const char* szFirst, const char*
                      const char* szDatabase, const char* szTrigger)
 {
     const bool blPlain =
-        nullptr == szTrigger && (nullptr == szDatabase || std::string("main") == szDatabase);
+        nullptr == szTrigger && (nullptr == szDatabase || "main" == textOf(szDatabase));
     const Fence& fence = *static_cast<Fence*>(pFence);
     return blPlain && fence.allows(iAction, textOf(szFirst), textOf(szSecond)) ? SQLITE_OK
                                                                                : SQLITE_DENY;
 }
 
-bool Fence::allows(int iAction, const std::string& strFirst, const std::string& strSecond) const
+bool Fence::allows(int iAction, std::string_view first, std::string_view second) const
 {
     switch (iAction) {
     case SQLITE_TRANSACTION: return Access::kTransaction == access_;
     case SQLITE_SELECT: return Access::kRead == access_ || Access::kInsert == access_;
-    case SQLITE_READ: return strTable_ == strFirst;
-    case SQLITE_INSERT: return Access::kInsert == access_ && strTable_ == strFirst;
-    case SQLITE_UPDATE: return Access::kUpdate == access_ && strTable_ == strFirst;
-    case SQLITE_DELETE: return Access::kDelete == access_ && strTable_ == strFirst;
+    case SQLITE_READ: return strTable_ == first;
+    case SQLITE_INSERT: return Access::kInsert == access_ && strTable_ == first;
+    case SQLITE_UPDATE: return Access::kUpdate == access_ && strTable_ == first;
+    case SQLITE_DELETE: return Access::kDelete == access_ && strTable_ == first;
     // The library reads the row back that it inserted.
-    case SQLITE_FUNCTION: return Access::kInsert == access_ && "last_insert_rowid" == strSecond;
+    case SQLITE_FUNCTION: return Access::kInsert == access_ && "last_insert_rowid" == second;
     default: return false;
     }
 }
@@ -107,9 +108,10 @@ bool Fence::allows(int iAction, const std::string& strFirst, const std::string& 
 // The lock is taken here, where a locked database is an answer and not a wait.
 bool Fence::begin(Access access)
 {
+    if (0 == sqlite3_get_autocommit(pDb_)) rollBack();  // there was no memory for it
     if (Access::kRead != access) return execute(Access::kTransaction, "begin immediate");
     if (!execute(Access::kTransaction, "begin")) return false;
-    if (execute(access, "select 1 from main." + strTable_ + " limit 1")) return true;
+    if (execute(access, ("select 1 from main." + strTable_ + " limit 1").c_str())) return true;
     rollBack();
     return false;
 }
@@ -121,11 +123,11 @@ void Fence::rollBack()
 }
 
 // Does one statement of the fence's own.
-bool Fence::execute(Access access, const std::string& strSql)
+bool Fence::execute(Access access, const char* szSql)
 {
     iTicks_ = 0;
     access_ = access;
-    const int iStatus = sqlite3_exec(pDb_, strSql.c_str(), nullptr, nullptr, nullptr);
+    const int iStatus = sqlite3_exec(pDb_, szSql, nullptr, nullptr, nullptr);
     access_ = Access::kNothing;
     return SQLITE_OK == iStatus;
 }

@@ -8,6 +8,7 @@
 
 #include <functional>
 #include <string>
+#include <string_view>
 
 // What the statements of a call may do with the table.
 enum class Access { kNothing, kTransaction, kRead, kInsert, kUpdate, kDelete };
@@ -24,17 +25,18 @@ public:
     // Does the work in a transaction of its own, with no more than that access. The work counts
     // only when its result is not negative and it changed at most one row; otherwise, also when it
     // throws, everything is as before. Returns the result of the work, or -1, which is also the
-    // answer where another connection holds a lock.
+    // answer where another connection holds a lock. A transaction that is open is rolled back
+    // first.
     int run(Access access, const std::function<int()>& work);
 
 private:
     static int authorize(void* pFence, int iAction, const char* szFirst, const char* szSecond,
                          const char* szDatabase, const char* szTrigger);
     static int countSteps(void* pFence);
-    bool allows(int iAction, const std::string& strFirst, const std::string& strSecond) const;
+    bool allows(int iAction, std::string_view first, std::string_view second) const;
     bool begin(Access access);
     void rollBack();
-    bool execute(Access access, const std::string& strSql);
+    bool execute(Access access, const char* szSql);
 
     sqlite3* pDb_;
     std::string strTable_;

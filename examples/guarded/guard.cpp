@@ -9,18 +9,46 @@
 namespace guard {
 namespace {
 
-void refuseIf(bool blBad, const std::string& strReason)
+void refuseIf(bool blBad, const char* szReason)
 {
-    if (blBad) throw Refused(strReason);
+    if (blBad) throw Refused(szReason);
+}
+
+// The code point that begins there; moves on to the next one.
+char32_t readCodePoint(const std::string& strText, std::size_t& uAt)
+{
+    constexpr char32_t kLeast[] = {0, 0x80, 0x800, 0x10000};
+    const char* szWrong = "a text is not UTF-8";
+    const auto uLead = static_cast<unsigned char>(strText[uAt++]);
+    if (0x80 > uLead) return uLead;
+    refuseIf(0xc0 > uLead || 0xf8 <= uLead, szWrong);
+    const unsigned uMore = 0xf0 <= uLead ? 3 : 0xe0 <= uLead ? 2 : 1;
+    char32_t c = uLead & (0x3fU >> uMore);
+    for (unsigned u = 0; u < uMore; ++u, ++uAt) {
+        refuseIf(0x80 != (strText[uAt] & 0xc0), szWrong);  // so is the NUL at the end
+        c = c << 6 | (strText[uAt] & 0x3f);
+    }
+    refuseIf(kLeast[uMore] > c || 0x10ffff < c || (0xd800 <= c && 0xdfff >= c), szWrong);
+    return c;
+}
+
+// Control characters, separators of lines and what turns the direction of a line around.
+bool isControl(char32_t c)
+{
+    constexpr char32_t kControls[][2] = {{0, 0x1f},        {0x7f, 0x9f},     {0x61c, 0x61c},
+                                         {0x200e, 0x200f}, {0x2028, 0x202e}, {0x2066, 0x2069}};
+    return std::any_of(std::begin(kControls), std::end(kControls),
+                       [c](const char32_t(&range)[2]) { return range[0] <= c && range[1] >= c; });
 }
 
 // "%" is a conversion to the members that are formatted later, NUL cuts the text, and a newline
 // would begin a line of the log.
 void checkText(const std::string& strText)
 {
-    const auto isBad = [](char c) { return '%' == c || ('\0' <= c && ' ' > c) || '\x7f' == c; };
-    refuseIf(std::any_of(strText.begin(), strText.end(), isBad),
-             "\"%\" and control characters are not allowed");
+    for (std::size_t uAt = 0; uAt < strText.size();) {
+        const char32_t c = readCodePoint(strText, uAt);
+        refuseIf('%' == c || isControl(c), "\"%\" and control characters are not allowed");
+    }
 }
 
 // Every text in a value, the keys of objects included.
@@ -70,6 +98,12 @@ void checkRecord(const Json::Value& jTypes, const Json::Value& jRecord)
         checkKind(checkDeclared(jTypes, it.name()), *it);
 }
 
+// A new note gets its id from SQLite: the one after the greatest. Later it keeps id and author.
+void checkKept(const Json::Value& jRecord, const char* szName)
+{
+    if (jRecord.isMember(szName)) throw Refused(std::string("\"") + szName + "\" cannot be set");
+}
+
 // The items of a list are written without a comma, so [1,2] is 12.
 const Json::Value& checkList(const Json::Value& jCondition)
 {
@@ -116,6 +150,16 @@ void checkRequest(const Json::Value& jTypes, const Json::Value& jRequest)
     }
 }
 
+// A condition on another member, and an order, reads the whole table unless one of these narrows
+// it.
+void checkIndexed(const Json::Value& jTypes, const Json::Value& jRequest)
+{
+    if (jRequest.isMember("id") || jRequest.isMember("author")) return;
+    for (const std::string& strKey : jRequest.getMemberNames())
+        refuseIf("sort_by" == strKey || jTypes.isMember(strKey),
+                 "a list asks for an id or an author");
+}
+
 // Without a limit the library reads the whole table.
 void limitRows(Json::Value& jRequest)
 {
@@ -128,6 +172,14 @@ void checkOneRecord(const Json::Value& jTypes, const Json::Value& jRequest)
     checkRequest(jTypes, jRequest);
     refuseIf(Json::Value::Members{"id"} != jRequest.getMemberNames() || jRequest["id"].isArray(),
              "the request names one record by its id");
+}
+
+// Each takes some hundred bytes, however short its text is.
+std::size_t countValues(const Json::Value& jValue)
+{
+    std::size_t nValues = 1;
+    for (const Json::Value& jMember : jValue) nValues += countValues(jMember);
+    return nValues;
 }
 
 }  // namespace
@@ -157,6 +209,7 @@ Json::Value readCommand(const std::string& strLine)
         throw Refused("the command is nested too deep");
     }
     refuseIf(!blRead || !jCommand.isObject(), "the command is no JSON object");
+    refuseIf(kMaxValues < countValues(jCommand), "the command holds too many values");
     return jCommand;
 }
 
@@ -169,9 +222,11 @@ void checkCommand(const Json::Value& jTypes, Json::Value& jCommand)
     if ("create" == strOperation || "save" == strOperation) {
         refuseIf(Keys{"op", "record"} != keys, "the command holds a record");
         checkRecord(jTypes, jCommand["record"]);
+        if ("create" == strOperation) checkKept(jCommand["record"], "id");
     } else if ("list" == strOperation) {
         refuseIf(Keys{"op", "request"} != keys, "the command holds a request");
         checkRequest(jTypes, jCommand["request"]);
+        checkIndexed(jTypes, jCommand["request"]);
         limitRows(jCommand["request"]);
     } else if ("get" == strOperation || "delete" == strOperation) {
         refuseIf(Keys{"op", "request"} != keys, "the command holds a request");
@@ -181,6 +236,7 @@ void checkCommand(const Json::Value& jTypes, Json::Value& jCommand)
         refuseIf(Keys{"op", "request", "values"} != keys, "the command holds a request and values");
         checkOneRecord(jTypes, jCommand["request"]);
         checkRecord(jTypes, jCommand["values"]);
+        for (const char* szName : {"id", "author"}) checkKept(jCommand["values"], szName);
     }
 }
 

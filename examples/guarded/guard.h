@@ -13,7 +13,9 @@
 
 namespace guard {
 
-constexpr std::size_t kMaxLine = 64 * 1024;
+constexpr std::size_t kMaxLine = 8 * 1024;
+// What a command holds, in all: values of records and requests, the items of their arrays, itself.
+constexpr std::size_t kMaxValues = 1000;
 // The library reads back 1,000 levels.
 constexpr int kMaxDepth = 900;
 constexpr unsigned kMaxRows = 100;

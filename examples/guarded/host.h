@@ -2,8 +2,8 @@
 /// @file
 /// The host: a table of notes, and commands of strangers for it.
 ///
-///     {"op": "create", "record": {"id": 1, "text": "hello"}}
-///     {"op": "save",   "record": {"id": 1, "text": "hello again"}}
+///     {"op": "create", "record": {"author": "Ann", "text": "hello"}}
+///     {"op": "save",   "record": {"id": 1, "author": "Ann", "text": "hello again"}}
 ///     {"op": "list",   "request": {"author": "Ann", "limit": 10, "offset": 20}}
 ///     {"op": "get",    "request": {"id": 1}}
 ///     {"op": "update", "request": {"id": 1}, "values": {"done": true}}
@@ -18,13 +18,21 @@
 
 #include <VornJsonDbApi.h>
 
+#include <ostream>
 #include <string>
+
+// How many notes an author may have.
+constexpr int kMaxNotes = 1000;
 
 // The types of the notes' members, as the guard reads them.
 const Json::Value& noteTypes();
 
-// A handle for the table "note", which it creates.
+// A handle for the table "note", which it creates with an index on the author.
 VornJsonDbApi openNotes(sqlite3* pDb);
+
+// Checks what only the table tells about a command that the guard lets through. Refuses as that
+// does.
+void checkNote(VornJsonDbApi& notes, const Json::Value& jCommand);
 
 // Does the command as it stands, unchecked: what guard and fence stand around. Adds what it reads
 // to the answer and returns the library's result.
@@ -39,6 +47,9 @@ public:
 
     // Answers one line. Throws nothing but a lack of memory.
     Json::Value answer(const std::string& strLine);
+
+    // Writes the answer as a line, which says "failed" where memory is lacking. Throws nothing.
+    void serve(const std::string& strLine, std::ostream& stream);
 
 private:
     VornJsonDbApi notes_;

@@ -10,25 +10,11 @@
 #include "guard.h"
 #include "host.h"
 
-#include <json/writer.h>
-
 #include <iostream>
 
 // The log goes to syslog: standard output is for the answers.
 bool blLogToStdout = false;
 bool blDebugOutput = false;
-
-namespace {
-
-// In ASCII, so that an answer is one line whatever is in it.
-std::string toLine(const Json::Value& jValue)
-{
-    Json::StreamWriterBuilder builder;
-    builder["indentation"] = "";
-    return Json::writeString(builder, jValue) + "\n";
-}
-
-}  // namespace
 
 int main(int argc, char** argv)
 {
@@ -41,8 +27,7 @@ int main(int argc, char** argv)
     {
         Host host(pDb);
         std::string strLine;
-        while (guard::readLine(std::cin, strLine))
-            std::cout << toLine(host.answer(strLine)) << std::flush;
+        while (guard::readLine(std::cin, strLine)) host.serve(strLine, std::cout);
     }
     return SQLITE_OK == sqlite3_close(pDb) ? 0 : 1;
 }

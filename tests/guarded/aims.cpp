@@ -4,6 +4,17 @@
 #include <algorithm>
 
 namespace aims {
+namespace {
+
+bool isLogged(const char* szText)
+{
+    const auto& log = doubles::state().log;
+    return std::any_of(log.begin(), log.end(), [szText](const doubles::LogRecord& record) {
+        return std::string::npos != record.strText.find(szText);
+    });
+}
+
+}  // namespace
 
 bool vaultIsEmpty(World& world)
 {
@@ -89,9 +100,19 @@ bool hostIsThrownAt(World& world)
     return world.blThrown;
 }
 
-bool idIsAnother(World& world)
+bool idsAreUsedUp(World& world)
 {
-    return 2147483647 == world.answers.at(0)["record"]["id"].asInt64();
+    return "2147483647" == world.value("select max(id) from note");
+}
+
+bool noteIsEves(World& world)
+{
+    return "1" == world.value("select count(*) from note where id = 1 and author = 'Eve'");
+}
+
+bool crowdGrows(World& world)
+{
+    return "1001" == world.value("select count(*) from note where author = 'crowd'");
 }
 
 bool topicsAreLost(World& world)
@@ -106,12 +127,35 @@ bool noteIsHuge(World& world)
     return "1" == world.value("select count(*) from note where length(text || author) > 4000000");
 }
 
+bool noteHasManyValues(World& world)
+{
+    return 3000 < world.answers.at(0)["record"]["topics"].size();
+}
+
+bool answerIsHuge(World& world)
+{
+    return 5000000 < text(world.answers.back()).size();
+}
+
+bool authorIsNoUtf8(World& world)
+{
+    return "1" == world.value("select count(*) from note where hex(author) = 'FF'");
+}
+
 bool logLineIsForged(World&)
 {
-    const auto& log = doubles::state().log;
-    return std::any_of(log.begin(), log.end(), [](const doubles::LogRecord& record) {
-        return std::string::npos != record.strText.find("\nroot logged in");
-    });
+    return isLogged("\nroot logged in");
+}
+
+bool logHasControls(World&)
+{
+    return isLogged("\xc2\x85") || isLogged("\xc2\x9b") || isLogged("\xe2\x80\xa8") ||
+           isLogged("\xe2\x80\xae");
+}
+
+bool tableIsScanned(World& world)
+{
+    return 100 < world.iSteps;
 }
 
 bool sqliteIsBusy(World& world)

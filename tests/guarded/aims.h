@@ -22,11 +22,21 @@ bool annIsImitated(World& world);
 bool annIsTold(World& world);
 bool authorIsAnother(World& world);
 bool hostIsThrownAt(World& world);
-bool idIsAnother(World& world);
+// The next id is beyond 32 bits.
+bool idsAreUsedUp(World& world);
+bool noteIsEves(World& world);
+bool crowdGrows(World& world);
 // The call succeeded, and the member is null.
 bool topicsAreLost(World& world);
 bool noteIsHuge(World& world);
+bool noteHasManyValues(World& world);
+bool answerIsHuge(World& world);
+bool authorIsNoUtf8(World& world);
 bool logLineIsForged(World& world);
+// A character that a terminal or a log viewer obeys.
+bool logHasControls(World& world);
+// More steps than the fence would give a call.
+bool tableIsScanned(World& world);
 bool sqliteIsBusy(World& world);
 
 }  // namespace aims

@@ -73,10 +73,11 @@ TEST_P(Attacked, GuardedHostIsNotAndGoesOn)
     World world(Layers::kBoth, GetParam().uMoreNotes);
     for (const std::string& strLine : GetParam().lines) world.send(strLine);
     expectRefused(world);
-    world.send(R"({"op":"create","record":{"id":99,"text":"fine"}})");
+    world.send(R"({"op":"create","record":{"text":"fine"}})");
     EXPECT_EQ(0, world.answers.back()["result"].asInt()) << text(world.answers.back());
     EXPECT_EQ("fine", world.answers.back()["record"]["text"].asString());
-    world.send(R"({"op":"delete","request":{"id":99}})");
+    const std::string strId = text(world.answers.back()["record"]["id"]);
+    world.send(R"({"op":"delete","request":{"id":)" + strId + "}}");
     EXPECT_EQ(1, world.answers.back()["result"].asInt());
 
     world.stop();

@@ -58,6 +58,13 @@ std::string nested(unsigned uLevels)
 constexpr auto kStops = Attack::Fence::kStops;
 constexpr auto kLetsThrough = Attack::Fence::kLetsThrough;
 
+// A note that is there already, so that the call fails.
+Attack logged(const char* szName, const std::string& strText)
+{
+    return {
+        szName, {create(R"({"id":1,"text":")" + strText + "\"}")}, logHasControls, kLetsThrough};
+}
+
 std::vector<Attack> rawFilters()
 {
     return {
@@ -122,7 +129,6 @@ std::vector<Attack> numbers()
          {list(R"({"done":["1)); delete from vault; --"]})")},
          vaultIsEmpty,
          kStops},
-        {"number_out_of_range", {create(R"({"id":3000000000})")}, idIsAnother, kLetsThrough},
         {"number_beyond_64_bits",
          {create(R"({"id":18446744073709551615})")},
          hostIsThrownAt,
@@ -228,6 +234,53 @@ std::vector<Attack> shapes()
          {create(R"({"id":1,"text":"\nroot logged in"})")},
          logLineIsForged,
          kLetsThrough},
+        logged("log_next_line", "\\u0085root logged in"),
+        logged("log_line_separator", "\\u2028root logged in"),
+        logged("log_direction", "\\u202enimda"),
+        logged("log_escape_sequence", "\\u009b2J"),
+        {"not_utf8", {create("{\"author\":\"\xff\"}")}, authorIsNoUtf8, kLetsThrough},
+    };
+}
+
+// Each command is a good one by itself.
+std::vector<Attack> shares()
+{
+    const char* kGreatest = R"({"id":2147483647})";
+    std::vector<std::string> hundred(100,
+                                     create(R"({"text":")" + std::string(60000, 'x') + R"("})"));
+    hundred.push_back(list("{}"));
+    return {
+        {"create_with_id", {create(kGreatest)}, idsAreUsedUp, kLetsThrough},
+        {"update_of_id", {update(R"({"id":1})", kGreatest)}, idsAreUsedUp, kLetsThrough},
+        {"save_with_new_id", {save(kGreatest)}, idsAreUsedUp, kLetsThrough},
+        {"update_of_author",
+         {update(R"({"id":1})", R"({"author":"Eve"})")},
+         noteIsEves,
+         kLetsThrough},
+        {"save_of_other_author", {save(R"({"id":1,"author":"Eve"})")}, noteIsEves, kLetsThrough},
+        {"notes_beyond_quota",
+         {create(R"({"author":"crowd"})")},
+         crowdGrows,
+         kLetsThrough,
+         Attack::Guard::kRefuses,
+         1000},
+        {"list_without_index",
+         {list(R"({"text":"none"})")},
+         tableIsScanned,
+         kStops,
+         Attack::Guard::kRefuses,
+         40000},
+        {"order_without_index",
+         {list(R"({"sort_by":"id"})")},
+         tableIsScanned,
+         kStops,
+         Attack::Guard::kRefuses,
+         40000},
+        {"many_values",
+         {create(R"({"topics":[0)" + repeated(4000, ",0") + "]}")},
+         noteHasManyValues,
+         kLetsThrough},
+        {"huge_answer", hundred, answerIsHuge, kLetsThrough},
     };
 }
 
@@ -237,7 +290,7 @@ const std::vector<Attack>& attacks()
 {
     static const std::vector<Attack> all = [] {
         std::vector<Attack> made;
-        for (auto* part : {rawFilters, numbers, pages, percents, shapes})
+        for (auto* part : {rawFilters, numbers, pages, percents, shapes, shares})
             for (Attack& attack : part()) made.push_back(std::move(attack));
         return made;
     }();

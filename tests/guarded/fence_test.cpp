@@ -160,14 +160,14 @@ TEST_F(FenceTest, KnowsNoUnion)
 TEST_F(FenceTest, LimitsTheSizeOfStatements)
 {
     const std::string strSelect = "select id from note where id=1";
-    EXPECT_EQ(0, run(Access::kRead, strSelect + std::string(500 * 1024, ' ')));
-    EXPECT_EQ(kRefused, run(Access::kRead, strSelect + std::string(600 * 1024, ' ')));
+    EXPECT_EQ(0, run(Access::kRead, strSelect + std::string(63 * 1024, ' ')));
+    EXPECT_EQ(kRefused, run(Access::kRead, strSelect + std::string(65 * 1024, ' ')));
     EXPECT_EQ(SQLITE_TOOBIG, iStatus_);
 }
 
 TEST_F(FenceTest, LimitsTheSizeOfTexts)
 {
-    const std::string strText(200 * 1024, 'x');
+    const std::string strText(25 * 1024, 'x');
     EXPECT_EQ(0, run(Access::kInsert, "insert into note values (3,'" + strText + "')"));
     EXPECT_EQ(0, run(Access::kUpdate, "update note set text=text||text where id=3"));
     EXPECT_EQ(kRefused, run(Access::kUpdate, "update note set text=text||text where id=3"));
@@ -191,7 +191,9 @@ TEST_F(FenceTest, TakesNoNameForAText)
 {
     EXPECT_EQ(0, run(Access::kRead, "select id from note where text='none'"));
     EXPECT_EQ(kRefused, run(Access::kRead, "select id from note where text=\"none\""));
-    EXPECT_EQ("no such column: none", strError_);
+    // How the message goes on depends on the version of SQLite.
+    EXPECT_EQ(0U, strError_.find("no such column: ")) << strError_;
+    EXPECT_NE(std::string::npos, strError_.find("none")) << strError_;
 }
 
 TEST_F(FenceTest, StopsNobodyWhenItIsGone)
@@ -254,8 +256,7 @@ TEST_F(FenceTest, KnowsTheMainDatabaseOnly)
 TEST_F(HostTest, FencedScansOfALargeTableEnd)
 {
     World world(World::Layers::kBoth, 200000);
-    for (const char* szRequest :
-         {R"({"author":"nobody"})", R"({"offset":190000})", R"({"text":["none"]})"})
+    for (const char* szRequest : {R"({"offset":190000})", R"({"offset":190000,"limit":1})"})
         world.send(std::string(R"({"op":"list","request":)") + szRequest + "}");
     for (const Json::Value& jAnswer : world.answers)
         EXPECT_EQ(R"({"error":"failed"})", text(jAnswer));
@@ -290,7 +291,7 @@ protected:
     sqlite3* pOther_ = nullptr;
 };
 
-constexpr char kCreate[] = R"({"op":"create","record":{"id":1}})";
+constexpr char kCreate[] = R"({"op":"create","record":{"text":"once"}})";
 constexpr char kList[] = R"({"op":"list","request":{"id":1}})";
 constexpr char kFailed[] = R"({"error":"failed"})";
 constexpr char kNone[] = R"({"records":null,"result":0})";
@@ -304,7 +305,14 @@ TEST_F(FencedFile, DoesNotWaitForALock)
     EXPECT_EQ(0U, doubles::state().sleeps.size());
     other("commit");
     EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
+}
+
+TEST_F(FencedFile, TellsOfADuplicate)
+{
+    other("create unique index one on note (text)");
+    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
     EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", answer(kCreate));
+    EXPECT_EQ(kFailed, answer(R"({"op":"update","request":{"id":1},"values":{"topics":[1]}})"));
 }
 
 TEST_F(FencedFile, ReadsBesideAWriter)

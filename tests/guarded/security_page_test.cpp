@@ -50,7 +50,7 @@ std::set<std::string> functionsIn(const std::string& strText)
 TEST(SecurityPage, NamesEveryAttackOnceAndWhatStopsIt)
 {
     std::map<std::string, Attack::Fence> named;
-    for (const auto& row : table(securityPage(), "The trust table", 16).rows) {
+    for (const auto& row : table(securityPage(), "The trust table", 22).rows) {
         SCOPED_TRACE(row[0]);
         const auto stopped = attacksIn(row[3]);
         const auto letThrough = attacksIn(row[4]);
@@ -69,13 +69,14 @@ TEST(SecurityPage, NamesEveryAttackOnceAndWhatStopsIt)
 TEST(SecurityPage, LinksToTheFunctionOfEveryRow)
 {
     std::set<std::string> functions;
-    for (const auto& row : table(securityPage(), "The trust table", 16).rows) {
+    for (const auto& row : table(securityPage(), "The trust table", 22).rows) {
         const auto found = functionsIn(row[2]);
         EXPECT_FALSE(found.empty()) << row[0];
         functions.insert(found.begin(), found.end());
     }
-    EXPECT_EQ((std::set<std::string>{"checkDeclared", "checkKind", "checkList", "checkOneRecord",
-                                     "checkPaging", "checkRawFilter", "checkSorting", "checkText",
+    EXPECT_EQ((std::set<std::string>{"checkDeclared", "checkIndexed", "checkKept", "checkKind",
+                                     "checkList", "checkOneRecord", "checkPaging", "checkQuota",
+                                     "checkRawFilter", "checkSaved", "checkSorting", "checkText",
                                      "limitRows", "readCommand", "readLine"}),
               functions);
     for (const auto& row : table(securityPage(), "The fence", 5).rows)
@@ -99,6 +100,13 @@ const std::multimap<std::string, std::string>& reasons()
         {"readCommand", "the command is no JSON object"},
         {"readCommand", "the command is nested too deep"},
         {"readCommand", "the command is too long"},
+        {"readCommand", "the command holds too many values"},
+        {"checkText", "a text is not UTF-8"},
+        {"checkKept", "\"id\" cannot be set"},
+        {"checkKept", "\"author\" cannot be set"},
+        {"checkIndexed", "a list asks for an id or an author"},
+        {"checkSaved", "the author has no such note"},
+        {"checkQuota", "the author has too many notes"},
     };
     return all;
 }
@@ -114,7 +122,7 @@ std::string refusal(const Attack& attack)
 // The attack is refused by a function of its row and no other, or only limited.
 TEST(SecurityPage, LinksToTheFunctionThatRefuses)
 {
-    const MarkdownTable page = table(securityPage(), "The trust table", 16);
+    const MarkdownTable page = table(securityPage(), "The trust table", 22);
     for (const Attack& attack : attacks()) {
         SCOPED_TRACE(attack.strName);
         for (const auto& row : page.rows) {

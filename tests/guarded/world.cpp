@@ -77,6 +77,7 @@ Json::Value World::answer(const std::string& strLine)
     try {
         Json::Value jCommand = guard::readCommand(strLine);
         guard::checkCommand(noteTypes(), jCommand);
+        checkNote(*pNotes_, jCommand);
         return call(jCommand);
     } catch (const guard::Refused& refused) {
         Json::Value jAnswer;

@@ -1,0 +1,48 @@
+#!/usr/bin/env bash
+# SPDX-License-Identifier: MIT
+# memory_test.sh PROGRAM WORK: that examples/guarded, with any amount of memory that it starts with at all,
+# either lists the largest notes that strangers can make or says that it failed, and then goes on.
+. "$(dirname "${BASH_SOURCE[0]}")/../../scripts/common.sh"
+program=$1 work=$2
+
+most=100000 # KB of address space, more than enough
+step=2000
+list='{"op":"list","request":{}}'
+get='{"op":"get","request":{"id":100}}'
+
+rm -rf "$work"
+mkdir -p "$work"
+cd "$work"
+
+# repeated COUNT TEXT
+repeated() {
+    printf "$2%.0s" $(seq "$1")
+}
+
+# under KB COMMAND...: the answers
+under() {
+    (ulimit -v "$1" && printf '%s\n' "${@:2}" | "$program" notes.db 2>err)
+}
+
+topics="$(repeated 980 '0,')\"$(repeated 3000 é)\""
+text=$(repeated 4050 é)
+for id in $(seq 100); do
+    echo "{\"op\":\"create\",\"record\":{\"topics\":[$topics]}}"
+    echo "{\"op\":\"update\",\"request\":{\"id\":$id},\"values\":{\"text\":\"$text\"}}"
+done | "$program" notes.db >made
+[ "$(grep -c '"result":0' made)" = 200 ] || { echo "the notes were not made"; exit 1; }
+right_list=$(under unlimited "$list")
+right_get=$(under unlimited "$get")
+
+failed=0 went_on=0
+for ((limit = step; limit <= most; limit += step)); do
+    [ "$(under $limit "$get" 2>/dev/null)" = "$right_get" ] || continue # it does not start
+    under $limit "$list" "$get" >answers || { echo "$limit KB: exit status $?"; cat err; exit 1; }
+    { read -r first && read -r second; } <answers || { echo "$limit KB: no two answers"; exit 1; }
+    [ "$first" != "$right_list" ] || break
+    [ "$first" = '{"error":"failed"}' ] || { echo "$limit KB: ${first:0:200}"; exit 1; }
+    failed=$((failed + 1))
+    [ "$second" != "$right_get" ] || went_on=$((went_on + 1))
+done
+echo "enough: $limit KB; failed below: $failed times, answered then: $went_on"
+[ "$limit" -le "$most" ] && [ "$failed" -ge 5 ] && [ "$went_on" -ge 5 ]
