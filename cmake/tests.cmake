@@ -18,3 +18,8 @@ elseif(DEFINED BUILD_SHARED_LIBS AND NOT BUILD_SHARED_LIBS)
   vornjsondb_left_out("All tests" "they are for the shared library")
   set(VORNJSONDB_TESTS OFF)
 endif()
+
+find_program(VORNJSONDB_HARDENING_CHECK hardening-check)
+if(VORNJSONDB_TESTS AND NOT VORNJSONDB_HARDENING_CHECK)
+  vornjsondb_left_out("The test of the library with hardening-check" "it was not found")
+endif()

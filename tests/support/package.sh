@@ -2,11 +2,11 @@
 # Shared by the tests of what is installed; sourced, not run. They have the same arguments: SOURCE WORK HOST
 # EXPECTED, where HOST is the README's host, and EXPECTED what it prints.
 source=$1 work=$2 host=$3 expected=$4
-name=$(basename "$0" .sh)
+test_name=$(basename "$0" .sh)
 part=$source/tests/hosts
 
 fail() {
-    printf '%s: %s\n' "$name" "$*" >&2
+    printf '%s: %s\n' "$test_name" "$*" >&2
     exit 1
 }
 
