@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: MIT
-# What is installed: the library with its links, the header, a package for find_package and one for
+# What is installed: the library, a shared one with its links, the header, a package for find_package and one for
 # pkg-config, the manual pages and the licence. Both packages can be moved with what they belong to.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
@@ -7,9 +7,19 @@ include(CMakePackageConfigHelpers)
 set(header_folder ${CMAKE_INSTALL_INCLUDEDIR}/vornjsondb)
 set(package_folder ${CMAKE_INSTALL_LIBDIR}/cmake/VornJsonDb)
 
+# CMAKE_INSTALL_DOCDIR is the host's own, where this is a part of a host.
+set(licence_folder ${CMAKE_INSTALL_DATAROOTDIR}/doc/${PROJECT_NAME})
+
+# The folders that are made are noted beside the manifest of the files.
+set(folders ${header_folder} ${package_folder} ${CMAKE_INSTALL_LIBDIR}/pkgconfig
+  ${CMAKE_INSTALL_MANDIR}/man3 ${CMAKE_INSTALL_MANDIR}/man7 ${licence_folder})
+install(CODE "set(folders \"${folders}\")\nset(notes \"${CMAKE_BINARY_DIR}/install_folders.txt\")" ALL_COMPONENTS)
+install(SCRIPT cmake/note_folders.cmake ALL_COMPONENTS)
+
 install(TARGETS vornjsondb EXPORT VornJsonDb
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT vornjsondb_runtime
     NAMELINK_COMPONENT vornjsondb_development
+  ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT vornjsondb_development
   INCLUDES DESTINATION ${header_folder})
 install(FILES include/VornJsonDbApi.h DESTINATION ${header_folder}
   COMPONENT vornjsondb_development)
@@ -42,6 +52,5 @@ install(FILES man/VornJsonDbApi.3 DESTINATION ${CMAKE_INSTALL_MANDIR}/man3
 install(FILES man/vornjsondb.7 DESTINATION ${CMAKE_INSTALL_MANDIR}/man7
   COMPONENT vornjsondb_development)
 
-# CMAKE_INSTALL_DOCDIR is the host's own, where this is a part of a host.
-install(FILES LICENSE DESTINATION ${CMAKE_INSTALL_DATAROOTDIR}/doc/${PROJECT_NAME}
+install(FILES LICENSE DESTINATION ${licence_folder}
   COMPONENT vornjsondb_runtime)

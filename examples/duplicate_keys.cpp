@@ -9,7 +9,6 @@
 /// Prints what became of each user: stored, there already by its id or its mail address, or
 /// refused because of its type. Its last two lines show why the message has to be cleared first.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <iostream>
 

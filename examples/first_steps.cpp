@@ -6,8 +6,6 @@
 /// Prints each record as it is stored, on a line of JSON that begins with what was done. The first
 /// task is created with its title alone: the rest comes from its defaults and from SQLite.
 #include <VornJsonDbApi.h>
-#include <json/writer.h>
-#include <sqlite3.h>
 
 #include <iostream>
 

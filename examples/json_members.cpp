@@ -6,8 +6,6 @@
 /// Prints the cities that each filter selects, and between them the number of cities at each river,
 /// by a query of the host's own. At the end both members of one city have changed.
 #include <VornJsonDbApi.h>
-#include <json/writer.h>
-#include <sqlite3.h>
 
 #include <iostream>
 

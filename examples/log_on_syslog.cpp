@@ -6,7 +6,6 @@
 /// refused one line for each level of the call, the innermost first, then, with blDebugOutput, the
 /// trace of a call that does not fail.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 #include <syslog.h>
 
 #include <cerrno>

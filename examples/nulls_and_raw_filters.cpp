@@ -6,7 +6,6 @@
 /// Prints which books each filter selects, with the day on which a book that is lent is due. The
 /// book with a quote in its title is found by a text that could have come from outside.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <iostream>
 #include <memory>

@@ -3,7 +3,6 @@
 /// The plugin of plugin.cpp: one function, which stores a note. It is linked with the library and
 /// does not define the flags, because the program does.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <memory>
 

@@ -13,18 +13,17 @@ find_package(Threads REQUIRED)
 foreach(name IN ITEMS first_steps duplicate_keys nulls_and_raw_filters json_members transactions
                       two_threads log_on_syslog)
   add_executable(example_${name} ${example_folder}/${name}.cpp)
-  target_link_libraries(example_${name} PRIVATE
-    VornJsonDb::vornjsondb SQLite::SQLite3 Threads::Threads)
+  target_link_libraries(example_${name} PRIVATE VornJsonDb::vornjsondb Threads::Threads)
   prints_expected(${name})
 endforeach()
 
 add_executable(example_sharded ${example_folder}/sharded.cpp)
-target_link_libraries(example_sharded PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
+target_link_libraries(example_sharded PRIVATE VornJsonDb::vornjsondb)
 prints_expected(sharded ${CMAKE_CURRENT_BINARY_DIR}/tenants)
 
 # The program has the flags and shows them to the plugin; of the library it needs the header alone.
 add_library(example_plugin_module MODULE ${example_folder}/plugin_module.cpp)
-target_link_libraries(example_plugin_module PRIVATE VornJsonDb::vornjsondb SQLite::SQLite3)
+target_link_libraries(example_plugin_module PRIVATE VornJsonDb::vornjsondb)
 add_executable(example_plugin ${example_folder}/plugin.cpp)
 target_include_directories(example_plugin PRIVATE
   $<TARGET_PROPERTY:VornJsonDb::vornjsondb,INTERFACE_INCLUDE_DIRECTORIES>)

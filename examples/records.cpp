@@ -21,10 +21,6 @@
 
 #include <VornJsonDbApi.h>
 
-#include <json/reader.h>
-#include <json/writer.h>
-#include <sqlite3.h>
-
 #include <cerrno>
 #include <cstdint>
 #include <cstring>

@@ -9,7 +9,6 @@
 /// Stores three invoices for each of eight tenants and prints how many each tenant has, and all of
 /// them together. A second run replaces the invoices.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <filesystem>
 #include <iostream>

@@ -8,7 +8,6 @@
 /// the disk has the data, which takes longer than all the rest: one for a thousand records instead
 /// of a thousand is why one transaction is fast.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <iostream>
 

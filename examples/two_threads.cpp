@@ -6,7 +6,6 @@
 /// Prints how many messages each thread has stored through a handle of its own, and how many it
 /// found to be there already.
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <iostream>
 #include <memory>

@@ -6,7 +6,6 @@
 /// are JSON objects whose keys are column names:
 ///
 ///     #include <VornJsonDbApi.h>
-///     #include <sqlite3.h>
 ///     #include <cstdio>
 ///
 ///     bool blLogToStdout = false;  // the host defines both flags
@@ -64,15 +63,14 @@
 #ifndef VORNJSONDBAPI_H
 #define VORNJSONDBAPI_H
 
-#include <json/value.h>
+#include <json/json.h>
+#include <sqlite3.h>
 
 #include <string>
 #include <vector>
 
 /// Marks what the shared library exports.
 #define VORN_JSON_DB_EXPORT __attribute__((visibility("default")))
-
-struct sqlite3;
 
 /// The two flags that steer the log. The library only declares them: the host program defines both,
 /// in a source file that includes this header (which gives them the visibility they need, also

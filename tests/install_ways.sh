@@ -59,8 +59,9 @@ printed() {
     say "the host prints what the README says"
 }
 
-installed_files() {
-    find /usr /etc /opt ! -type d | LC_ALL=C sort
+# installed: files and folders.
+installed() {
+    find /usr /etc /opt | LC_ALL=C sort
 }
 
 # way NAME: begins one.
@@ -71,7 +72,7 @@ way() {
 
 # nothing_left: everything is as it was before the way, which ends here.
 nothing_left() {
-    installed_files | diff "$work/before" - || fail "not everything was removed"
+    installed | diff "$work/before" - || fail "not everything was removed"
     say "removed"
     echo "figure: seconds $way = $((SECONDS - began))"
 }
@@ -81,7 +82,7 @@ part="Install it, As a part of the host's own build"
 
 say "what it needs"
 in_folder "$clone" "Install it" 1
-installed_files >"$work/before"
+installed >"$work/before"
 
 way "by CMake"
 in_folder "$clone" "Install it, By CMake" 1 unshare --net
@@ -96,7 +97,7 @@ nothing_left
 
 way "by Debian packages"
 in_folder "$clone" "Install it, By Debian packages" 1
-installed_files >"$work/before"
+installed >"$work/before"
 in_folder "$clone" "Install it, By Debian packages" 2
 folder=$(host packaged)
 block "$finds" cmake 1 >"$folder/CMakeLists.txt"

@@ -1,14 +1,27 @@
 // SPDX-License-Identifier: MIT
-// The header as the only thing that a host includes.
+// The header as the only thing that a host includes: it brings what the host opens its connection
+// with, and what it reads and writes JSON with.
 #include <VornJsonDbApi.h>
 
 bool blLogToStdout = false;
 bool blDebugOutput = false;
 
-int useHeader(VornJsonDbApi& api);
+std::string useHeader(const std::string& strDefinition);
 
-int useHeader(VornJsonDbApi& api)
+std::string useHeader(const std::string& strDefinition)
 {
-    std::string strNames;
-    return api.SqlExpandMemberName(strNames) + api.runSqlEx("select 1");
+    sqlite3* pDb = nullptr;
+    if (SQLITE_OK != sqlite3_open(":memory:", &pDb)) return sqlite3_errmsg(pDb);
+
+    Json::Value jDefinition;
+    Json::CharReaderBuilder reader;
+    Json::CharReader* pReader = reader.newCharReader();
+    const char* szBegin = strDefinition.c_str();
+    pReader->parse(szBegin, szBegin + strDefinition.size(), &jDefinition, nullptr);
+    delete pReader;
+
+    std::string strName = "task";
+    std::string strCreate = "create table task (id integer primary key)";
+    VornJsonDbApi api(pDb, strName, jDefinition, strCreate);
+    return Json::writeString(Json::StreamWriterBuilder(), jDefinition);
 }
