@@ -181,9 +181,13 @@ TEST_F(TimeText, TheFirstAndTheLastYearOfTheCalendar)
     const TimeZone zone("UTC0");
     const long lFirst = static_cast<long>(-67768040609740800LL);
     const long lLast = static_cast<long>(67768036191676799LL);
+    const long lInt = static_cast<long>(67767976233532799LL);
     EXPECT_EQ("-2147481748-01-01 00:00:00", converted(lFirst, kUtc));
-    EXPECT_EQ("2147485547-12-31 23:59:59", converted(lLast, kUtc));
-    EXPECT_EQ("2147485547-12-31 23:59:59", converted(lLast, kLocal));
+    EXPECT_EQ("2147483647-12-31 23:59:59", converted(lInt, kUtc));
+    for (int iType : {kUtc, kLocal}) {
+        const std::string strLast = converted(lLast, iType);
+        EXPECT_EQ("-12-31 23:59:59", strLast.substr(strLast.size() - 15));
+    }
     expectFailure(lLast + 1, kUtc, {kNoUtc});
     expectFailure(lLast + 1, kLocal, {kNoLocal});
 }
