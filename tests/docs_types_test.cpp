@@ -253,14 +253,14 @@ TEST_F(DocsTypes, WhichWordToChoose)
     }
 }
 
-// Of a cell "`A`, from SQLite 3.53 on `B`" what the SQLite at hand does: A or B.
+// Of a cell "`A`, or `B` from SQLite 3.53 on" what the SQLite at hand does: A or B.
 std::string byVersion(const std::string& strCell)
 {
     std::smatch parts;
-    static const std::regex versions("`(.*)`, from SQLite 3\\.([0-9]+) on `(.*)`");
+    static const std::regex versions("`(.*)`, or `(.*)` from SQLite 3\\.([0-9]+) on");
     if (!std::regex_match(strCell, parts, versions)) return strCell;
-    const bool blBefore = sqlite3_libversion_number() < 3000000 + 1000 * std::stoi(parts[2]);
-    return blBefore ? parts[1] : parts[3];
+    const bool blBefore = sqlite3_libversion_number() < 3000000 + 1000 * std::stoi(parts[3]);
+    return blBefore ? parts[1] : parts[2];
 }
 
 TEST_F(DocsTypes, Traps)
