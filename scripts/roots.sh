@@ -61,11 +61,11 @@ fresh_root() {
     fi
 }
 
-# clone_into_root: what is committed, as /root/vornjsondb of the clean Debian.
+# clone_into_root: what is committed, as /home/vornjsondb of the clean Debian.
 clone_into_root() {
     rm -rf "$root.clone"
     git clone --quiet --no-checkout . "$root.clone"
     git -C "$root.clone" checkout --quiet "$(git rev-parse HEAD)"
-    as_root cp -r "$root.clone" "$root/root/vornjsondb"
+    as_root cp -r "$root.clone" "$root/home/vornjsondb"
     rm -rf "$root.clone"
 }
