@@ -2,6 +2,10 @@
 /// @file
 /// Duplicate keys: how a host tells a record that is there already from one that failed otherwise.
 ///
+/// Each call has a transaction around it. Otherwise a call that meets the lock of another
+/// connection after its INSERT runs that again, and reports as a duplicate the record it has just
+/// written.
+///
 /// Prints what became of each user: stored, there already by its id or its mail address, or
 /// refused because of its type. Its last two lines show why the message has to be cleared first.
 #include <VornJsonDbApi.h>
@@ -14,12 +18,18 @@ bool blDebugOutput = false;
 
 namespace {
 
-// Forgets earlier duplicates: the message, and the handle's last SQL error, which a statement that
-// succeeds clears. Without it a later failure of another kind would be called a duplicate, too.
-bool forgetDuplicates(VornJsonDbApi& user)
+// Begins a transaction, in which nobody else can lock the database, and forgets earlier duplicates:
+// the message, and the handle's last SQL error, which a statement that succeeds clears. Without it
+// a later failure of another kind would be called a duplicate, too.
+bool begin(VornJsonDbApi& user)
 {
     user.setErrMsg("");
-    return 0 <= user.runSqlEx("select 1");
+    return 0 <= user.runSqlEx("begin immediate");
+}
+
+bool end(VornJsonDbApi& user, int iResult)
+{
+    return 0 <= user.runSqlEx(0 <= iResult ? "commit" : "rollback");
 }
 
 const char* outcome(VornJsonDbApi& user, int iResult)
@@ -30,26 +40,26 @@ const char* outcome(VornJsonDbApi& user, int iResult)
 
 bool create(VornJsonDbApi& user, const Json::Value& jId, const char* szMail)
 {
-    if (!forgetDuplicates(user)) return false;
+    if (!begin(user)) return false;
     Json::Value jUser;
     Json::Value jStored;
     jUser["id"] = jId;
     jUser["mail"] = szMail;
     const int iResult = user.recCreate(jUser, jStored);
     std::cout << "create " << szMail << ": " << outcome(user, iResult) << '\n';
-    return true;
+    return end(user, iResult);
 }
 
 bool changeMail(VornJsonDbApi& user, int iId, const char* szMail)
 {
-    if (!forgetDuplicates(user)) return false;
+    if (!begin(user)) return false;
     Json::Value jFilter;
     Json::Value jValues;
     jFilter["id"] = iId;
     jValues["mail"] = szMail;
     const int iResult = user.recUpdateByFilter(jFilter, jValues);
     std::cout << "change to " << szMail << ": " << outcome(user, iResult) << '\n';
-    return true;
+    return end(user, iResult);
 }
 
 bool useUsers(sqlite3* pDb)
@@ -58,7 +68,7 @@ bool useUsers(sqlite3* pDb)
     std::string strCreate =
         "create table if not exists user (id integer primary key, mail text unique)";
     Json::Value jDefinition;
-    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
     jDefinition[strName]["member"]["mail"]["cpptype"] = "string";
     VornJsonDbApi user(pDb, strName, jDefinition, strCreate);
     if (0 > user.tableCreate()) return false;
@@ -76,7 +86,7 @@ bool useUsers(sqlite3* pDb)
     jUser["mail"] = "cleo@example.org";
     if (0 > user.recCreate(jUser, jStored)) return false;
     std::cout << "after a success: '" << user.getErrMsg() << "'\n";
-    if (!forgetDuplicates(user)) return false;
+    user.setErrMsg("");
     std::cout << "when cleared: '" << user.getErrMsg() << "'\n";
     return true;
 }

@@ -36,7 +36,7 @@ bool useTasks(sqlite3* pDb)
     Json::Value& jMember = jDefinition[strName]["member"];
     jMember["done"]["cpptype"] = "bool";
     jMember["done"]["cppDefaultValue"] = false;
-    jMember["id"]["cpptype"] = "int";
+    jMember["id"]["cpptype"] = "long long";
     jMember["title"]["cpptype"] = "string";
 
     // The constructor runs the statement and cannot tell how it went: ask once more.

@@ -23,7 +23,7 @@ bool useSensors(sqlite3* pDb)
     std::string strName = "sensor";
     std::string strCreate = "create table if not exists sensor (id integer primary key, name text)";
     Json::Value jDefinition;
-    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
     jDefinition[strName]["member"]["name"]["cpptype"] = "string";
     VornJsonDbApi sensor(pDb, strName, jDefinition, strCreate);
     if (0 > sensor.tableCreate()) return false;

@@ -70,7 +70,7 @@ bool useBooks(sqlite3* pDb)
         "create table if not exists book (id integer primary key, title text, due text)";
     Json::Value jDefinition;
     jDefinition[strName]["member"]["due"]["cpptype"] = "string";
-    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
     jDefinition[strName]["member"]["title"]["cpptype"] = "string";
     VornJsonDbApi book(pDb, strName, jDefinition, strCreate);
     return 0 <= book.tableCreate() && create(book, "Emma", nullptr) &&

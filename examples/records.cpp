@@ -9,7 +9,7 @@
 ///
 ///     {"name": "task", "key": "id",
 ///      "create": "create table if not exists task (id integer primary key, name text)",
-///      "definition": {"task": {"member": {"id": {"cpptype": "int"},
+///      "definition": {"task": {"member": {"id": {"cpptype": "long long"},
 ///                                         "name": {"cpptype": "string"}}}}}
 ///
 /// "key" is this program's own and may be absent: the member that names a record in a message.
@@ -86,6 +86,7 @@ Json::Value parse(std::istream& stream, const std::string& strSource)
 {
     Json::CharReaderBuilder builder;
     Json::CharReaderBuilder::strictMode(&builder.settings_);
+    builder["stackLimit"] = 1000;  // as the library reads
     Json::Value jValue;
     std::string strErrors;
     if (Json::parseFromStream(builder, stream, &jValue, &strErrors)) return jValue;

@@ -60,7 +60,7 @@ public:
             "create table if not exists invoice (id integer primary key, customer text)";
         Json::Value jDefinition;
         jDefinition[strName]["member"]["customer"]["cpptype"] = "string";
-        jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+        jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
         pInvoices_ =
             std::make_unique<VornJsonDbApi>(database_.get(), strName, jDefinition, strCreate);
         if (0 > pInvoices_->tableCreate())

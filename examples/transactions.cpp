@@ -60,7 +60,7 @@ bool useReadings(sqlite3* pDb)
     std::string strCreate =
         "create table if not exists reading (id integer primary key, value integer)";
     Json::Value jDefinition;
-    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
     jDefinition[strName]["member"]["value"]["cpptype"] = "int";
     VornJsonDbApi reading(pDb, strName, jDefinition, strCreate);
     if (0 > reading.tableCreate()) return false;

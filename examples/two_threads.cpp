@@ -61,7 +61,7 @@ std::unique_ptr<VornJsonDbApi> openTable(sqlite3* pDb, std::string strName)
     std::string strCreate =
         "create table if not exists " + strName + " (id integer primary key, text text)";
     Json::Value jDefinition;
-    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["id"]["cpptype"] = "long long";
     jDefinition[strName]["member"]["text"]["cpptype"] = "string";
     return locked([&] {
         auto pApi = std::make_unique<VornJsonDbApi>(pDb, strName, jDefinition, strCreate);

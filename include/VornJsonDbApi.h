@@ -20,7 +20,7 @@
 ///         std::string strCreate =
 ///             "create table if not exists task (id integer primary key, name text)";
 ///         Json::Value jDefinition;
-///         jDefinition["task"]["member"]["id"]["cpptype"] = "int";
+///         jDefinition["task"]["member"]["id"]["cpptype"] = "long long";
 ///         jDefinition["task"]["member"]["name"]["cpptype"] = "string";
 ///         jDefinition["task"]["member"]["name"]["cppDefaultValue"] = "unnamed";
 ///         {
@@ -28,7 +28,10 @@
 ///             Json::Value jRecord;
 ///             Json::Value jStored;
 ///             jRecord["id"] = 1;
-///             if (0 > task.recCreate(jRecord, jStored)) puts(task.getErrMsg().c_str());
+///             if (0 > task.recCreate(jRecord, jStored)) {
+///                 std::string strMessage = task.getErrMsg();
+///                 puts(strMessage.empty() ? "failed, see the log" : strMessage.c_str());
+///             }
 ///         }
 ///         sqlite3_close(pDb);
 ///     }
@@ -37,7 +40,9 @@
 /// the source text of its condition. Outputs are written only on success unless said otherwise.
 ///
 /// Threads: the library keeps process-wide state and takes no locks. Use it from one thread at a
-/// time, all handles together.
+/// time, all handles together; two at once corrupt the memory of the process. Do not call it while
+/// one of its statements runs, either: a handle that is constructed then takes over the table name
+/// for the rows that follow.
 ///
 /// Exceptions: the library throws nothing of its own. Where an accessor of jsoncpp meets a value of
 /// the wrong kind, such as a text under an integer member in recSave(), its Json::LogicError
@@ -92,26 +97,31 @@ namespace VORN_JSON_DB {
 ///
 /// @p jTableDef has the shape
 ///
-///     {"task": {"member": {"id":   {"cpptype": "int"},
+///     {"task": {"member": {"id":   {"cpptype": "long long"},
 ///                          "name": {"cpptype": "string", "cppDefaultValue": "unnamed"}}}}
 ///
 /// where "cppDefaultValue" may be any JSON value or be absent; other keys are ignored and one
 /// document may define several tables. The result holds, for each member of the table
 /// @p strJsonName, its "cpptype" and, where given, its "cppDefaultValue":
 ///
-///     {"id": {"cpptype": "int"}, "name": {"cpptype": "string", "cppDefaultValue": "unnamed"}}
+///     {"id":   {"cpptype": "long long"},
+///      "name": {"cpptype": "string", "cppDefaultValue": "unnamed"}}
 ///
 /// The first definition that is read under a table name wins for the whole process, also for other
 /// handles and databases. A definition without usable members is logged and leaves null under the
 /// name, or the members before the first that has no "cpptype" text; later calls return that entry
-/// again. The reference stays valid until the process ends; what a host changes through it holds
-/// from the next statement on.
+/// again. The cache of member types is never destroyed: the reference stays valid until the process
+/// ends.
+///
+/// A type word that a host changes through the reference holds from the next statement on. A member
+/// that a host has damaged there, without a "cpptype" or not even an object, is left as it is and
+/// has an unknown type word.
 VORN_JSON_DB_EXPORT Json::Value& recType(Json::Value& jTableDef, std::string& strJsonName);
 
-/// Copies the members of the object @p jSubSet, which must not be a member of @p jIn, into @p jIn,
-/// which is an object or null: those that @p jIn lacks, and with @p blOverwrite also those that it
-/// has. Members are copied whole, not merged. Returns 0, or -1 with @p jIn unchanged when one of
-/// the two is of another kind.
+/// Copies the members of the object @p jSubSet into @p jIn, which is an object or null: those that
+/// @p jIn lacks, and with @p blOverwrite also those that it has. Members are copied whole, not
+/// merged. @p jIn may lie inside @p jSubSet, but @p jSubSet must not lie anywhere inside @p jIn.
+/// Returns 0, or -1 with @p jIn unchanged when one of the two is of another kind.
 VORN_JSON_DB_EXPORT int jsonCopyMember(Json::Value& jIn, Json::Value& jSubSet, bool blOverwrite);
 
 /// Sets @p now to the seconds since the epoch plus @p offsetSecond. Returns 0.
@@ -160,7 +170,9 @@ public:
     void setErrMsg(std::string strMsg);
 
     /// The message for the host's user: empty in a new handle, "DUPLICATE_PRIMARY_KEY" after
-    /// recCreate() or recUpdateByFilter() met a violated UNIQUE or PRIMARY KEY constraint.
+    /// recCreate() or recUpdateByFilter() met a violated UNIQUE or PRIMARY KEY constraint. Where
+    /// other connections lock the database, a record may meet its own row, which an earlier attempt
+    /// of the same call has written; within a transaction of the host it does not.
     ///
     /// Nothing but setErrMsg() clears it. Look at it only after a result of -1, and call
     /// setErrMsg("") before the operation: a later failure of another kind leaves it in place.
@@ -203,7 +215,7 @@ public:
     int recSave(Json::Value& jRecInOut, bool blCreate);
 
     /// Inserts the object @p jRecIn, completed by its defaults and type-checked, and sets @p
-    /// jRecOut to the stored row. @p jRecIn is not changed; nor may SQL functions change it.
+    /// jRecOut to the stored row. @p jRecIn is not changed.
     ///
     /// Returns 0, or -1 with @p jRecOut unchanged. getErrMsg() is then "DUPLICATE_PRIMARY_KEY" when
     /// the last SQL failure of this handle was a violated UNIQUE constraint, even if this call
@@ -282,7 +294,9 @@ public:
     ///
     /// Text is escaped, integers and numbers (six decimals) are bare, objects and arrays become
     /// JSON text. A "%" in the text so far, earlier values included, is read as a conversion of
-    /// sqlite3_mprintf by every value that follows: such members are not written faithfully.
+    /// sqlite3_mprintf by every value that follows: such members are not written faithfully. A text
+    /// that is too long for sqlite3_mprintf (1,000,000,000 bytes by default) throws
+    /// std::logic_error.
     int SqlExpandMemberSymbol(std::string& sql, Json::Value& rec);
 
     /// Appends the terms of the request @p jRecParam, an object or null, to @p out, joined as
@@ -313,9 +327,6 @@ public:
     int SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out);
 
 private:
-    // recSave() with the stored row put into jRow, which may be the record itself.
-    int saveRow(Json::Value& jRecInOut, bool blCreate, Json::Value& jRow);
-
     sqlite3* pDb = nullptr;
     std::string strName;
     Json::Value jTableDef;

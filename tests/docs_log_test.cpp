@@ -211,6 +211,29 @@ TEST_F(DocsLogExamples, WhatSqliteSays)
     }
 }
 
+TEST_F(DocsLogExamples, AGapInTheStatement)
+{
+    for (const auto& row : table(page_, "A gap in the statement", 3).rows) {
+        SCOPED_TRACE(row[1]);
+        Json::Value jParam = json(row[1]);
+        Json::Value jOut;
+        const bool blSave = "recSave" == row[0];
+        EXPECT_TRUE(blSave || "recList" == row[0]);
+        EXPECT_EQ(-1, blSave ? api_.recSave(jParam, true) : api_.recList(jParam, jOut));
+        const std::string strLog = logged();
+        EXPECT_NE(std::string::npos, strLog.find("error=near \")\": syntax error, sql=")) << strLog;
+        EXPECT_NE(std::string::npos, strLog.find(row[2])) << strLog;
+        EXPECT_EQ(blSave ? 0 : -1, api_.recCreate(jParam, jOut));
+        logged();
+    }
+    for (const char* szRequest : {R"({"id":null,"who":"x"})", R"({"id":[],"who":"x"})"}) {
+        Json::Value jRequest = json(szRequest);
+        Json::Value jRecords;
+        EXPECT_EQ(-1, api_.recList(jRequest, jRecords));
+        EXPECT_NE(std::string::npos, logged().find("error=near \"and\": syntax error"));
+    }
+}
+
 // A table or block that the tests above do not know would be compared by nobody.
 TEST_F(DocsLog, HasNoOtherTableOrBlock)
 {
@@ -221,7 +244,7 @@ TEST_F(DocsLog, HasNoOtherTableOrBlock)
         for (const MarkdownTable& table : candidate.tables)
             nTables += "Line" != table.header.at(0) && "Text" != table.header.at(0);
     }
-    EXPECT_EQ(2U, nTables);
+    EXPECT_EQ(3U, nTables);
     EXPECT_EQ(6U, nBlocks);
 }
 

@@ -119,6 +119,26 @@ TEST_F(JsonText, HasNoCommentsOfTheHostsReader)
     EXPECT_EQ(plain(R"(call create rec, rec={"a":[1,2],"o":5})"), takeLog().back());
 }
 
+TEST_F(JsonText, LosesTheCommentsOfAStoredText)
+{
+    database_.run("insert into " + table_.strName +
+                  " values ('/* a */[/* b */1, 2 // c\n]', '{\"k\":/* d */1} // e')");
+    Json::Value jRequest;
+    Json::Value jRecords;
+    EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
+    ASSERT_EQ(1U, jRecords.size());
+    EXPECT_EQ(R"({"a":[1,2],"o":{"k":1}})", text(jRecords[0]));
+    for (const Json::Value* pjValue :
+         {&jRecords[0]["a"], &jRecords[0]["a"][0], &jRecords[0]["a"][1], &jRecords[0]["o"],
+          &jRecords[0]["o"]["k"]})
+        for (auto place : {Json::commentBefore, Json::commentAfterOnSameLine, Json::commentAfter})
+            EXPECT_FALSE(pjValue->hasComment(place)) << text(*pjValue) << ' ' << place;
+    Json::Value jRecord = jRecords[0];
+    EXPECT_EQ(0, table_.api.recSave(jRecord, true));
+    EXPECT_EQ((Rows{{"[1,2]", R"({"k":1})"}}),
+              database_.rows("select * from " + table_.strName + " where rowid = 2"));
+}
+
 TEST_F(JsonText, IsTheSameInTheLog)
 {
     Json::Value jRecord = json(R"({"b":"ž\n","a":[0.1,NaN,{"k":"%s%n"}]})");

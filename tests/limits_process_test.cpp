@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// docs/limits.md, what reaches beyond one call: locks, retries, threads, definitions, the reader.
+// docs/limits.md, what reaches beyond one call: threads, definitions, the reader.
 
 #include "support/limits.h"
 
@@ -12,113 +12,6 @@
 
 namespace {
 
-// A second connection to a database file.
-class Other {
-public:
-    explicit Other(const Database& database)
-    {
-        EXPECT_EQ(SQLITE_OK, sqlite3_open(database.path().c_str(), &pDb_));
-    }
-    ~Other() { EXPECT_EQ(SQLITE_OK, sqlite3_close(pDb_)); }
-    Other(const Other&) = delete;
-    Other& operator=(const Other&) = delete;
-
-    int run(const char* szSql) { return doubles::realExec(pDb_, szSql, nullptr, nullptr, nullptr); }
-
-private:
-    sqlite3* pDb_ = nullptr;
-};
-
-constexpr char kMembers[] = R"({"id":{"cpptype":"int"},"text":{"cpptype":"string"}})";
-constexpr char kColumns[] = "id integer primary key, text text";
-
-}  // namespace
-
-TEST_F(Limits, LockedCallBlocks)
-{
-    Database database(Database::Place::kFile);
-    Table table(database, kMembers, kColumns);
-    Other other(database);
-    EXPECT_EQ(SQLITE_OK, other.run("begin exclusive"));
-    Json::Value jRequest;
-    Json::Value jRecords;
-    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(std::vector<unsigned>(500, 10000), doubles::state().sleeps);
-
-    // What the host set to wait on the connection is asked in each attempt.
-    int iAsked = 0;
-    const auto giveUp = [](void* pAsked, int) {
-        ++*static_cast<int*>(pAsked);
-        return 0;
-    };
-    EXPECT_EQ(SQLITE_OK, sqlite3_busy_handler(database.get(), giveUp, &iAsked));
-    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(500, iAsked);
-
-    // The host's own attempt is answered at once, and what follows it does not wait.
-    doubles::state().sleeps.clear();
-    const auto begin = [&] {
-        return doubles::realExec(database.get(), sqlExample().c_str(), nullptr, nullptr, nullptr);
-    };
-    EXPECT_EQ(SQLITE_BUSY, begin());
-    EXPECT_EQ(SQLITE_OK, other.run("rollback"));
-    EXPECT_EQ(SQLITE_OK, begin());
-    EXPECT_NE(SQLITE_OK, other.run("begin exclusive"));
-    table.create(R"({"id":1,"text":"x"})");
-    EXPECT_LE(0, table.api.runSqlEx("commit"));
-
-    // In WAL mode a reader does not wait for a writer.
-    EXPECT_EQ("wal", database.value("pragma journal_mode=wal"));
-    EXPECT_EQ(SQLITE_OK, other.run(sqlExample().c_str()));
-    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(1U, jRecords.size());
-    EXPECT_EQ(std::vector<unsigned>(), doubles::state().sleeps);
-    EXPECT_EQ(SQLITE_OK, other.run("rollback"));
-}
-
-TEST_F(Limits, RetryRunsTheWholeTextAgain)
-{
-    Database database(Database::Place::kFile);
-    Table table(database, kMembers, kColumns);
-    Other other(database);
-    const std::string strCount = "select count(*) from " + table.strName;
-
-    // The first attempt of an INSERT: the other connection comes between it and the re-selection.
-    int iAttempts = 0;
-    int iOther = SQLITE_OK;
-    doubles::state().exec = [&](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
-                                void* arg, char** errText) {
-        const std::string strSql = szSql;
-        const std::size_t nInsert = strSql.find(";select") + 1;
-        if (0 == nInsert || 1 < ++iAttempts) {
-            if (0 != nInsert) other.run("rollback");
-            return doubles::realExec(pDb, szSql, callback, arg, errText);
-        }
-        const std::string strInsert = strSql.substr(0, nInsert);
-        EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strInsert.c_str(), nullptr, nullptr, nullptr));
-        iOther = other.run("begin exclusive");
-        return doubles::realExec(pDb, szSql + nInsert, callback, arg, errText);
-    };
-
-    Json::Value jRecord = jExample();
-    EXPECT_EQ(0, table.api.recSave(jRecord, true));
-    EXPECT_EQ(SQLITE_OK, iOther);
-    EXPECT_EQ(2, iAttempts);
-    EXPECT_EQ("2", database.value(strCount));
-
-    database.run("delete from " + table.strName);
-    iAttempts = 0;
-    EXPECT_LE(0, table.api.runSqlEx(sqlExample()));
-    jRecord = jExample();
-    EXPECT_EQ(0, table.api.recSave(jRecord, true));
-    EXPECT_LE(0, table.api.runSqlEx("commit"));
-    EXPECT_EQ(SQLITE_BUSY, iOther);
-    EXPECT_EQ(1, iAttempts);
-    EXPECT_EQ("1", database.value(strCount));
-}
-
-namespace {
-
 // SQL function of a host: lists another table while a statement runs.
 void listOther(sqlite3_context* pContext, int, sqlite3_value**)
 {
@@ -126,6 +19,15 @@ void listOther(sqlite3_context* pContext, int, sqlite3_value**)
     Json::Value jRequest;
     Json::Value jRecords;
     EXPECT_EQ(0, pOther->recList(jRequest, jRecords));
+    sqlite3_result_int(pContext, 1);
+}
+
+// SQL function of a host: makes a handle of another table while a statement runs.
+void makeHandle(sqlite3_context* pContext, int, sqlite3_value**)
+{
+    auto* pOther = static_cast<Table*>(sqlite3_user_data(pContext));
+    VornJsonDbApi(sqlite3_context_db_handle(pContext), pOther->strName, pOther->jDefinition,
+                  pOther->strCreate);
     sqlite3_result_int(pContext, 1);
 }
 
@@ -143,6 +45,17 @@ TEST_F(Limits, OneThread)
     jNested["vornSqlWhereFilter"] = "list_other()";
     EXPECT_EQ("-1", ids(jNested));
     EXPECT_EQ(failed("!jType.isMember(strName)"), takeLog().at(0));
+
+    // So are the rows that follow the making of a handle.
+    table_.create(R"({"id":2,"text":"x"})");
+    EXPECT_EQ(SQLITE_OK, sqlite3_create_function(database_.get(), "make_handle", 0, SQLITE_UTF8,
+                                                 &other, makeHandle, nullptr, nullptr));
+    jNested["vornSqlWhereFilter"] = "id = 1 or make_handle()";
+    Json::Value jFollowed;
+    EXPECT_EQ(-1, table_.api.recList(jNested, jFollowed));
+    EXPECT_EQ("[" + stored(1) + "]", text(jFollowed));
+    EXPECT_EQ(failed("!jType.isMember(strName)"), takeLog().at(0));
+    database_.run("delete from " + table_.strName + " where id = 2");
 
     // One after the other; two threads with one lock around every call.
     std::mutex vornMutex;

@@ -80,7 +80,13 @@ TEST_F(Limits, PercentBeforeOtherMembers)
 {
     EXPECT_EQ(R"({"id":1,"lang":"50[\"a\"]","text":"x"})", text(table_.create(text(jExample(0)))));
     EXPECT_EQ(Lines(), takeLog());
-    EXPECT_EQ(text(jExample(1)), text(table_.create(text(jExample(1)))));
+    // Six bytes become 4,096, and nothing more does.
+    const Json::Value jWide = jExample(1);
+    const std::size_t nBytes = jWide["lang"].asString().size();
+    EXPECT_EQ(nBytes / 6 * 4096, table_.create(text(jWide))["lang"].asString().size());
+    EXPECT_EQ(4096U,
+              table_.create(R"({"id":4,"lang":"%4097d","text":"x"})")["lang"].asString().size());
+    EXPECT_EQ(text(jExample(2)), text(table_.create(text(jExample(2)))));
 
     Json::Value jFilter = json(R"({"id":1})");
     Json::Value jValue = json(R"({"lang":"50%s"})");

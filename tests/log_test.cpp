@@ -3,6 +3,7 @@
 
 #include "support/rows.h"
 
+#include <sys/wait.h>
 #include <syslog.h>
 #include <unistd.h>
 #include <algorithm>
@@ -272,6 +273,54 @@ TEST_F(Log, HoldsTextsOfAnyLength)
         EXPECT_TRUE(strLine.substr(strLine.size() - strTail.size()) == strTail);
         state().log.clear();
     }
+}
+
+TEST_F(Log, HasANumberOfItsOwnInEachOperationThatNamesTheSqlError)
+{
+    database_.run("drop table " + table_.strName);
+    Json::Value jRecord = json(R"({"a":"x"})");
+    Json::Value jOut;
+    std::string strWhere = "1";
+    const struct {
+        const char* szFile;
+        std::function<int()> call;
+    } operations[] = {
+        {"save", [&] { return table_.api.recSave(jRecord, true); }},
+        {"list", [&] { return table_.api.recList(jRecord, jOut); }},
+        {"update", [&] { return table_.api.recUpdateByWhere(jRecord, strWhere); }},
+        {"delete", [&] { return table_.api.recDelete(jRecord); }},
+    };
+    for (const auto& operation : operations) {
+        EXPECT_EQ(-1, operation.call());
+        const std::string strLine =
+            lineOf("VornJsonDbApi/" + std::string(operation.szFile) + ".cpp", "LOG_SQL_ERROR(");
+        const std::string strStart =
+            "VornJsonDbApi:" + strLine + " " + strPid_ + "sql error, err=no such table: ";
+        errno = 0;
+        EXPECT_EQ(1, std::count_if(state().log.begin(), state().log.end(),
+                                   [&](const auto& record) {
+                                       return 0 ==
+                                              record.strText.compare(0, strStart.size(), strStart);
+                                   }))
+            << operation.szFile;
+        state().log.clear();
+    }
+}
+
+TEST_F(Log, NamesTheProcessThatWritesIt)
+{
+    const Lines lines = {failed("0 >= strSql.length()"),
+                         plain("i=0,errno=?, run sql failed, error=Unknow Error!!, sql=")};
+    EXPECT_EQ(-1, table_.api.runSqlEx(""));
+    EXPECT_EQ(lines, takeLog());
+    const pid_t child = fork();
+    if (0 == child) {
+        table_.api.runSqlEx("");
+        _exit(lines == takeLog() ? 0 : 1);
+    }
+    int iStatus = -1;
+    EXPECT_EQ(child, waitpid(child, &iStatus, 0));
+    EXPECT_EQ(0, iStatus);
 }
 
 TEST_F(Log, IsWrittenByNothingButTheDoubledCalls)

@@ -87,6 +87,40 @@ TEST_F(MemberCopy, FromAMemberOfTheDestination)
     }
 }
 
+TEST_F(MemberCopy, IntoADestinationInsideTheSource)
+{
+    struct Case {
+        const char* szSource;
+        std::vector<const char*> path;  // to the destination
+        const char* szFilled;
+        const char* szOverwritten;
+    };
+    const Case cases[] = {
+        {R"({"a":1,"o":{"a":2,"b":3}})",
+         {"o"},
+         R"({"a":1,"o":{"a":2,"b":3,"o":{"a":2,"b":3}}})",
+         R"({"a":1,"o":{"a":1,"b":3,"o":{"a":1,"b":3}}})"},
+        {R"({"a":1,"n":null})",
+         {"n"},
+         R"({"a":1,"n":{"a":1,"n":{"a":1}}})",
+         R"({"a":1,"n":{"a":1,"n":{"a":1}}})"},
+        {R"({"o":{"p":{"o":1}},"z":[2]})",
+         {"o", "p"},
+         R"({"o":{"p":{"o":1,"z":[2]}},"z":[2]})",
+         R"({"o":{"p":{"o":{"p":{"o":1}},"z":[2]}},"z":[2]})"},
+    };
+    for (const Case& row : cases)
+        for (bool blOverwrite : {false, true}) {
+            SCOPED_TRACE(std::string(row.szSource) + (blOverwrite ? ", overwriting" : ", filling"));
+            Json::Value jSource = json(row.szSource);
+            Json::Value* pjIn = &jSource;
+            for (const char* szName : row.path) pjIn = &(*pjIn)[szName];
+            EXPECT_EQ(0, jsonCopyMember(*pjIn, jSource, blOverwrite));
+            EXPECT_EQ(text(json(blOverwrite ? row.szOverwritten : row.szFilled)), text(jSource));
+            EXPECT_EQ(Lines(), takeLog());
+        }
+}
+
 const std::string kBadDestination =
     utilFailed("jIn.type() != Json::nullValue && jIn.type() != Json::objectValue");
 const std::string kBadSource = utilFailed("jSubSet.type() != Json::objectValue");

@@ -119,8 +119,10 @@ int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jPara
 }
 
 // name in ('x' ), id in (5 )
-int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jList, std::string& out)
+int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jHostList, std::string& out)
 {
+    // Only read: the other access by index would fill the holes of the host's array.
+    const Json::Value& jList = jHostList;
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     if (FAILED(!szField || !szField[0])) return -1;
     const Json::Value* pjMember = findMember(jType, szField);

@@ -29,7 +29,7 @@ int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
     std::string strSqlRun;
     int err = 0;
     const auto fail = [&] {
-        logSqlError(strSqlError, strSqlRun);
+        LOG_SQL_ERROR(strSqlError, strSqlRun);
         return -1;
     };
 

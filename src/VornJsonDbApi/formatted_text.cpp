@@ -33,6 +33,9 @@ namespace {
 
 constexpr unsigned kMaxField = 4096;
 
+// SQLite is asked about longer texts: half of the limit that it is built with by default.
+constexpr std::size_t kLongText = 500'000'000;
+
 // Bytes that most value lists find enough.
 constexpr std::size_t kUsualList = 256;
 
@@ -125,14 +128,20 @@ Conversion readConversion(const char*& szText)
     return conversion;
 }
 
-// Formats the argument and appends it. A lack of memory ends in std::logic_error, as constructing a
-// string from SQLite's null does.
+// A formatted text. Null, for a lack of memory or a text that is too long, ends in
+// std::logic_error, as constructing a string from it does.
+template <typename Argument>
+SqliteText formatted(const char* szFormat, Argument argument)
+{
+    char* szText = sqlite3_mprintf(szFormat, argument);
+    if (nullptr == szText) throw std::logic_error("SQLite cannot format a text");
+    return SqliteText(szText);
+}
+
 template <typename Argument>
 void append(std::string& strOut, const char* szFormat, Argument argument)
 {
-    const SqliteText szText(sqlite3_mprintf(szFormat, argument));
-    if (!szText) throw std::logic_error("no memory for a formatted text");
-    strOut += szText;
+    strOut += formatted(szFormat, argument);
 }
 
 void appendInteger(std::string& strOut, const Conversion& conversion, long long iValue)
@@ -211,12 +220,15 @@ FormattedText::FormattedText(const std::string& strText) : blPlain_(isPlain(strT
 
 void FormattedText::appendValue(const char* szConversion, const FormatArgument& argument)
 {
-    if (!blPlain_) {
+    if (blPlain_) {
+        const std::size_t nBefore = strText_.size();
+        appendFormatted(strText_, szConversion, argument);
+        blPlain_ = std::string::npos == strText_.find('%', nBefore);
+    } else {
         strText_ = formatText((strText_ + szConversion).c_str(), argument);
         blPlain_ = isPlain(strText_);
-        return;
     }
-    const std::size_t nBefore = strText_.size();
-    appendFormatted(strText_, szConversion, argument);
-    blPlain_ = std::string::npos == strText_.find('%', nBefore);
+    // The whole text is formatted for its length alone. The precision makes the formatter count
+    // beyond the 30 bits that it keeps of a length otherwise.
+    if (kLongText < strText_.size()) formatted("%.2147483647s", strText_.c_str());
 }

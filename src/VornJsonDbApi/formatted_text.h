@@ -32,7 +32,8 @@ public:
     explicit FormattedText(const std::string& strText);
 
     // Appends one conversion of sqlite3_mprintf ("%Q", "%lld", "%llu", "%f", "%lf") and formats the
-    // text with the argument. Throws std::logic_error when SQLite finds no memory.
+    // text with the argument. Throws std::logic_error when SQLite finds no memory, or the text too
+    // long.
     void appendValue(const char* szConversion, const FormatArgument& argument);
 
     // Appends text that holds neither "%" nor a NUL byte.

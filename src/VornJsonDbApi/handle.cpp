@@ -30,7 +30,7 @@ int VornJsonDbApi::tableCreate()
 {
     if (0 <= runSqlEx(strSqlCreate)) return 0;
     LOG_ERROR("create table failed, sql=%s", strSqlCreate.c_str());
-    logSqlError(strSqlError, strSqlCreate);
+    LOG_SQL_ERROR(strSqlError, strSqlCreate);
     return -1;
 }
 

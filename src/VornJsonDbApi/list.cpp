@@ -19,7 +19,7 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
     std::string strSqlRun;
     const auto fail = [&] {
         LOG_PLAIN("jRecParam=%s", toString(jRecParam).c_str());
-        logSqlError(strSqlError, strSqlRun);
+        LOG_SQL_ERROR(strSqlError, strSqlRun);
         return -1;
     };
 

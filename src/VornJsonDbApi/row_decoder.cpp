@@ -21,18 +21,6 @@
 
 namespace {
 
-// None of this is ever destroyed: a handle in a global variable of the host may still work while
-// the process exits.
-
-// The table whose statement is running: SQLite calls the row callback without a handle.
-std::string& strCurJsonName = *new std::string;
-
-// What was thrown in the row callback; nothing may unwind through SQLite's own frames.
-std::exception_ptr& pThrownInCallback = *new std::exception_ptr;
-
-// The member types of that table, once a row has asked for them: the entry stays where it is.
-const Json::Value* pjMemberTypes = nullptr;
-
 // What a column of the result becomes. Kept for the next statement, which checks it once.
 struct Column {
     std::string_view name = "";  // NOLINT(readability-redundant-string-init): NUL at its end
@@ -40,7 +28,6 @@ struct Column {
     Decode decode = Decode::kNo;
     bool blChecked = false;
 };
-std::vector<Column>& columns = *new std::vector<Column>;
 
 // Where a member of the prototype comes from.
 struct Source {
@@ -57,19 +44,33 @@ struct Prototype {
     bool blUsable = false;        // unless a column cannot be decoded, or stands there twice
     bool blChecked = false;       // whether the columns have these types in the running statement
 };
-Prototype& prototype = *new Prototype;
 
-// Whether a row that is filled by name has met a column for the first time, or with another type.
-bool blNewColumn = false;
+struct State {
+    // The table whose statement is running: SQLite calls the row callback without a handle.
+    std::string strCurJsonName;
+    // What was thrown in the row callback; nothing may unwind through SQLite's own frames.
+    std::exception_ptr pThrownInCallback;
+    // The member types of that table, once a row has asked for them: the entry stays where it is.
+    const Json::Value* pjMemberTypes = nullptr;
+    std::vector<Column> columns;
+    Prototype prototype;
+    // Whether a row that is filled by name has met a column for the first time, or with another
+    // type.
+    bool blNewColumn = false;
+};
+
+// Made by the first statement, before any row. Never destroyed, and without an initialiser of its
+// own: a host's global handle may work before main begins and after it has ended.
+State* pState = nullptr;
 
 const Json::Value& memberTypes()
 {
     // What is no object is asked for again, which logs.
-    if (nullptr == pjMemberTypes || !pjMemberTypes->isObject()) {
+    if (nullptr == pState->pjMemberTypes || !pState->pjMemberTypes->isObject()) {
         Json::Value jTableDef;
-        pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, strCurJsonName);
+        pState->pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, pState->strCurJsonName);
     }
-    return *pjMemberTypes;
+    return *pState->pjMemberTypes;
 }
 
 // A copy of the name that is never released, so that all records can share it as their key.
@@ -83,6 +84,7 @@ std::string_view sharedName(const char* szName)
 // The column at idx, or null, after the failed check's line, when the table has no such member.
 const Column* resolvedColumn(const char* szName, std::size_t idx)
 {
+    std::vector<Column>& columns = pState->columns;
     if (columns.size() <= idx) columns.resize(idx + 1);
     Column& column = columns[idx];
     const bool blSameName = 0 == strcmp(column.name.data(), szName);
@@ -92,10 +94,10 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strName)")) return nullptr;
     std::string strType = typeWordOf(*pjMember);
     if (!blSameName || strType != column.strType) {
-        blNewColumn = true;
+        pState->blNewColumn = true;
         column.blChecked = false;
-        prototype.sources.clear();
-        prototype.blUsable = false;
+        pState->prototype.sources.clear();
+        pState->prototype.blUsable = false;
         column.name = sharedName(szName);
         column.decode = typeWord(strType).decode;
         column.strType = std::move(strType);
@@ -186,6 +188,7 @@ int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, cha
 // For rows whose columns were all looked up under these names.
 void makePrototype(std::size_t nColumns)
 {
+    const std::vector<Column>& columns = pState->columns;
     Json::Value jRecord(Json::objectValue);
     std::vector<Source> sources;
     bool blDecoded = true;
@@ -197,9 +200,10 @@ void makePrototype(std::size_t nColumns)
         sources.push_back({i, column.name.data(), column.decode});
         blDecoded = blDecoded && Decode::kNo != column.decode;
     }
-    std::sort(sources.begin(), sources.end(), [](const Source& left, const Source& right) {
+    std::sort(sources.begin(), sources.end(), [&columns](const Source& left, const Source& right) {
         return columns[left.iColumn].name < columns[right.iColumn].name;
     });
+    Prototype& prototype = pState->prototype;
     prototype.blUsable = blDecoded && jRecord.size() == nColumns;
     prototype.blChecked = true;
     prototype.jRecord.swap(jRecord);
@@ -217,10 +221,11 @@ bool hasTypeWord(const Json::Value* pjMember, const std::string& strType)
 // throws: in doubt the row is filled by name, which does.
 bool haveSameTypes()
 {
-    if (nullptr == pjMemberTypes) return false;
-    MemberWalk types(*pjMemberTypes);
-    for (const Source& source : prototype.sources) {
-        Column& column = columns[source.iColumn];
+    State& state = *pState;
+    if (nullptr == state.pjMemberTypes) return false;
+    MemberWalk types(*state.pjMemberTypes);
+    for (const Source& source : state.prototype.sources) {
+        Column& column = state.columns[source.iColumn];
         if (!hasTypeWord(types.find(column.name), column.strType)) return false;
         column.blChecked = true;
     }
@@ -230,6 +235,7 @@ bool haveSameTypes()
 // Whether the row has the prototype's columns, each with a value.
 bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name)
 {
+    Prototype& prototype = pState->prototype;
     if (!prototype.blUsable || prototype.sources.size() != nColumns || nullptr == column_name ||
         nullptr == column_value)
         return false;
@@ -245,6 +251,7 @@ bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name
 
 Json::Value recordFromPrototype(char** column_value)
 {
+    const Prototype& prototype = pState->prototype;
     Json::Value jRec = prototype.jRecord;
     auto it = jRec.begin();
     const Source* pFirst = prototype.sources.data();
@@ -266,10 +273,11 @@ int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** 
         return 0;
     }
     Json::Value jTmp(Json::objectValue);
-    blNewColumn = false;
+    pState->blNewColumn = false;
     if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
     pjRecArray->append(std::move(jTmp));
-    if (!blNewColumn && prototype.sources.size() != nColumns) makePrototype(nColumns);
+    if (!pState->blNewColumn && pState->prototype.sources.size() != nColumns)
+        makePrototype(nColumns);
     return 0;
 }
 
@@ -280,22 +288,24 @@ int DbCallBackFillList(void* arg, int n_column, char** column_value, char** colu
     try {
         return fillList(static_cast<Json::Value*>(arg), n_column, column_value, column_name);
     } catch (...) {
-        pThrownInCallback = std::current_exception();
+        pState->pThrownInCallback = std::current_exception();
         return -1;
     }
 }
 
 void beginStatement(const std::string& strTable)
 {
-    if (strCurJsonName != strTable) {
-        pjMemberTypes = nullptr;
-        strCurJsonName = strTable;
+    if (nullptr == pState) pState = new State;
+    State& state = *pState;
+    if (state.strCurJsonName != strTable) {
+        state.pjMemberTypes = nullptr;
+        state.strCurJsonName = strTable;
     }
-    prototype.blChecked = false;
-    for (Column& column : columns) column.blChecked = false;
+    state.prototype.blChecked = false;
+    for (Column& column : state.columns) column.blChecked = false;
 }
 
 std::exception_ptr takeThrown()
 {
-    return std::exchange(pThrownInCallback, nullptr);
+    return std::exchange(pState->pThrownInCallback, nullptr);
 }

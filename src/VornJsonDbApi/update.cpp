@@ -20,7 +20,7 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
     Json::Value& jColumnList = jWithoutFilter.isNull() ? jRecIn : jWithoutFilter;
     const auto fail = [&] {
         LOG_PLAIN("jRecIn=%s", toString(jRecIn).c_str());
-        logSqlError(strSqlError, strSql);
+        LOG_SQL_ERROR(strSqlError, strSql);
         return -1;
     };
 

@@ -86,6 +86,8 @@ private:
     Json::CharReaderBuilder builder;
     builder["collectComments"] = false;
     builder["allowSpecialFloats"] = true;
+    // The default of some releases is lower: what was stored by another one would be lost.
+    builder["stackLimit"] = 1000;
     return builder.newCharReader();
 }
 

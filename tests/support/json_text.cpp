@@ -20,6 +20,7 @@ Json::Value leftByReader(const std::string& strText)
     Json::CharReaderBuilder builder;
     builder["collectComments"] = false;
     builder["allowSpecialFloats"] = true;
+    builder["stackLimit"] = 1000;
     const std::unique_ptr<Json::CharReader> pReader(builder.newCharReader());
     Json::Value jLeft;
     pReader->parse(strText.data(), strText.data() + strText.size(), &jLeft, nullptr);

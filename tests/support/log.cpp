@@ -35,12 +35,21 @@ std::vector<std::vector<std::string>> readSources(const std::string& strComponen
 {
     std::vector<std::vector<std::string>> files;
     for (const auto& entry : std::filesystem::directory_iterator(VORN_SOURCES "/" + strComponent)) {
+        // A line that is logged from a header would have the same number in every operation.
+        if (".cpp" != entry.path().extension()) continue;
         std::ifstream file(entry.path());
         std::vector<std::string> lines;
         for (std::string strLine; std::getline(file, strLine);) lines.push_back(strLine);
         files.push_back(lines);
     }
     return files;
+}
+
+const char* macroOf(const Parsed& parsed)
+{
+    if (parsed.blError) return "LOG_ERROR(";
+    return 0 == parsed.strMessage.compare(0, 15, "sql error, err=") ? "LOG_SQL_ERROR("
+                                                                    : "LOG_PLAIN(";
 }
 
 // Whether a source file of the component has the check or message at that line.
@@ -53,7 +62,7 @@ bool leadsToSource(const Parsed& parsed)
     const bool blFailed = 0 == parsed.strMessage.compare(0, 8, "Failed [");
     const std::string strWanted = blFailed && std::regex_search(parsed.strMessage, match, condition)
                                       ? squeezed(match[1])
-                                      : (parsed.blError ? "LOG_ERROR(" : "LOG_PLAIN(");
+                                      : macroOf(parsed);
     const auto iLine = static_cast<std::size_t>(parsed.iLine);
     for (const auto& file : "util" == parsed.strComponent ? util : api) {
         if (0 == iLine || file.size() < iLine) continue;

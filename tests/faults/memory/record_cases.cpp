@@ -2,6 +2,7 @@
 // The record operations.
 
 #include "cases.h"
+#include "store.h"
 
 namespace {
 
@@ -102,6 +103,10 @@ const Cases kSaveCases = {
      R"({"first": {"id": 4, "data": {"key": "a text that is not short"}}, "second": "before"})",
      R"({"second": {"data": {"key": "a text that is not short"}, "flag": true, "id": 4, "name": "somebody without a name of his own", "tags": [1, 2]},
          "rows": "1 Ann 1 {k:[x]} [1,true],2 Bob 0,3 O'Brien 1,4 somebody without a name of his own 1 {key:a text that is not short} [1,2]"})"},
+    {"recCreate of a long text", recCreate,
+     R"({"first": {"id": 4, "name": "Dora", "tags": )" LONG_LIST R"(}, "second": "before"})",
+     R"({"second": {"flag": true, "id": 4, "name": "Dora", "tags": )" LONG_LIST R"(},
+         "rows": "1 Ann 1 {k:[x]} [1,true],2 Bob 0,3 O'Brien 1,4 Dora 1 )" LONG_LIST R"("})"},
     {"recCreate of a record that lacks no default", recCreate,
      R"({"first": {"id": 4, "data": {"key": "a text that is not short"}, "name": "Dora", "tags": []}, "second": "before"})",
      R"({"second": {"data": {"key": "a text that is not short"}, "flag": true, "id": 4, "name": "Dora", "tags": []},
@@ -136,7 +141,7 @@ const Cases kListCases = {
      R"({"name": "plain", "first": {}, "second": [1]})",
      R"({"second": [1, {"data": {"n": 1}, "id": 1, "name": "the first of the rows alike"},
                     {"data": {"n": 2}, "id": 2, "name": "the second of the rows alike"},
-                    {"data": {"n": 3}, "id": 3, "name": "the third of the rows alike"}],
+                    {"data": {"n": )" LONG_LIST R"(}, "id": 3, "name": "the third of the rows alike"}],
          "grows": "refused"})"},
     {"recList by everything", recList,
      R"({"first": {"flag": true, "name": ["O'Brien"], "vornSqlWhereFilter": "id > 0 and id < 1000000",

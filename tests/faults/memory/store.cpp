@@ -21,7 +21,7 @@ constexpr char kSchema[] =
     "create table plain (data text, id integer primary key, name text);"
     "insert into plain values ('{\"n\":1}', 1, 'the first of the rows alike'),"
     " ('{\"n\":2}', 2, 'the second of the rows alike'),"
-    " ('{\"n\":3}', 3, 'the third of the rows alike');";
+    " ('{\"n\":" LONG_LIST "}', 3, 'the third of the rows alike');";
 
 constexpr char kRows[] =
     "select coalesce(group_concat(strRow), '') from (select id || ' ' || name || ' ' || flag"

@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: MIT
+// Value lists as long as SQLite's formatter allows, and one byte longer. Where the machine lacks
+// the memory for SQLite's own limit, a double of sqlite3_mprintf has a lower one.
+
+#include <VornJsonDbApi.h>
+#include <gtest/gtest.h>
+#include <sqlite3.h>
+
+#include <unistd.h>
+#include <cstdarg>
+#include <cstring>
+#include <stdexcept>
+
+bool blLogToStdout = false;
+bool blDebugOutput = false;
+
+namespace {
+
+bool hasMemory()
+{
+    constexpr long kGigabyte = 1L << 30;
+    return 4 < sizeof(void*) && 8 <= sysconf(_SC_PHYS_PAGES) / (kGigabyte / sysconf(_SC_PAGESIZE));
+}
+
+// The shortest text that is too long.
+const std::size_t nLimit = hasMemory() ? 1'000'000'000 : 510'000'000;
+
+}  // namespace
+
+extern "C" char* sqlite3_mprintf(const char* szFormat, ...)
+{
+    va_list arguments;
+    va_start(arguments, szFormat);
+    char* szText = sqlite3_vmprintf(szFormat, arguments);
+    va_end(arguments);
+    if (hasMemory() || nullptr == szText || strlen(szText) < nLimit) return szText;
+    sqlite3_free(szText);
+    return nullptr;
+}
+
+namespace {
+
+std::string text(const char* szStart, std::size_t nLetters, const char* szEnd)
+{
+    return std::string(szStart).append(nLetters, 'x').append(szEnd);
+}
+
+class LongTexts : public testing::Test {
+protected:
+    LongTexts()
+    {
+        jDefinition_["t"]["member"]["n"]["cpptype"] = "int";
+        jRecord_["n"] = 7;
+        sqlite3_open(":memory:", &pDb_);
+    }
+    ~LongTexts() override { sqlite3_close(pDb_); }
+
+    // The result for a statement of strStart and as many x; -2 for std::logic_error.
+    int expand(const char* szStart, std::size_t nLetters)
+    {
+        VornJsonDbApi api(pDb_, strName_, jDefinition_, strCreate_);
+        strSql_ = text(szStart, nLetters, "");
+        try {
+            return api.SqlExpandMemberSymbol(strSql_, jRecord_);
+        } catch (const std::logic_error&) {
+            return -2;
+        }
+    }
+
+    sqlite3* pDb_ = nullptr;
+    std::string strName_ = "t";
+    std::string strCreate_ = "create table t (n)";
+    std::string strSql_;
+    Json::Value jDefinition_;
+    Json::Value jRecord_;
+};
+
+TEST_F(LongTexts, AreWrittenUpToTheLimit)
+{
+    EXPECT_EQ(0, expand("", nLimit - 2));
+    EXPECT_TRUE(text("", nLimit - 2, "7) ") == strSql_);
+}
+
+TEST_F(LongTexts, BeyondTheLimitAreRefused)
+{
+    EXPECT_EQ(-2, expand("(", nLimit - 2));
+    EXPECT_TRUE(text("(", nLimit - 2, "") == strSql_);
+}
+
+TEST_F(LongTexts, WithAConversionAreWrittenUpToTheLimit)
+{
+    EXPECT_EQ(0, expand("%%", nLimit - 3));
+    EXPECT_TRUE(text("%", nLimit - 3, "7) ") == strSql_);
+}
+
+TEST_F(LongTexts, WithAConversionBeyondTheLimitAreRefused)
+{
+    EXPECT_EQ(-2, expand("%%", nLimit - 2));
+    EXPECT_TRUE(text("%%", nLimit - 2, "") == strSql_);
+}
+
+}  // namespace
