@@ -34,13 +34,16 @@ Json::Int64 digits(const std::string& strText, Json::Int64 iLow, Json::Int64 iHi
     if (std::string::npos == i) return 0;
     const bool blMinus = '-' == strText[i];
     if (blMinus || '+' == strText[i]) ++i;
-    __int128 iValue = 0;
+    Json::Int64 iValue = 0;
     for (; i < strText.size() && '0' <= strText[i] && strText[i] <= '9'; ++i) {
-        iValue = iValue * 10 + (blMinus ? '0' - strText[i] : strText[i] - '0');
+        const int iDigit = blMinus ? '0' - strText[i] : strText[i] - '0';
+        if (__builtin_mul_overflow(iValue, 10, &iValue) ||
+            __builtin_add_overflow(iValue, iDigit, &iValue))
+            return blMinus ? iLow : iHigh;
         if (iValue < iLow) return iLow;
         if (iHigh < iValue) return iHigh;
     }
-    return static_cast<Json::Int64>(iValue);
+    return iValue;
 }
 
 // The text and what it is as JSON; behind a syntax error jsoncpp's reader leaves what it likes.

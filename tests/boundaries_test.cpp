@@ -28,8 +28,12 @@ struct Written {
 // A number beyond what SQLite holds as an integer is read from the digits before its point.
 // clang-format off
 const Written kWritten[] = {
-    // jsoncpp's reader rounds to -2^63.
+    // jsoncpp's reader rounds to -2^63, a real number, which 1.9.8 no longer takes for an integer.
+#if JSONCPP_VERSION_HEXA < 0x01090800
     {"-9223372036854775809",   "-9223372036854775808", "T",  true,  "-9.2233720368547758e+18", "-2147483648", "-9223372036854775808", nullptr, nullptr},
+#else
+    {"-9223372036854775809",   "T",                    "T",  false, "-9.2233720368547758e+18", nullptr, nullptr, nullptr, nullptr},
+#endif
     {"-9223372036854775808",   "-9223372036854775808", "T",  true,  "-9223372036854775808",    "-2147483648", "-9223372036854775808", nullptr, nullptr},
     {"-4294967296",            "-4294967296",          "T",  true,  "-4294967296",             "-2147483648", "-4294967296",          nullptr, nullptr},
     {"-2147483649",            "-2147483649",          "T",  true,  "-2147483649",             "-2147483648", "-2147483649",          nullptr, nullptr},

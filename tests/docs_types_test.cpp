@@ -4,6 +4,8 @@
 #include "support/database.h"
 #include "support/markdown.h"
 
+#include <regex>
+
 namespace {
 
 // A table of its own for each row: the members id and m, m in a column of the type given.
@@ -251,6 +253,16 @@ TEST_F(DocsTypes, WhichWordToChoose)
     }
 }
 
+// Of a cell "`A`, or `B` from SQLite 3.53 on" what the SQLite at hand does: A or B.
+std::string byVersion(const std::string& strCell)
+{
+    std::smatch parts;
+    static const std::regex versions("`(.*)`, or `(.*)` from SQLite 3\\.([0-9]+) on");
+    if (!std::regex_match(strCell, parts, versions)) return strCell;
+    const bool blBefore = sqlite3_libversion_number() < 3000000 + 1000 * std::stoi(parts[3]);
+    return blBefore ? parts[1] : parts[2];
+}
+
 TEST_F(DocsTypes, Traps)
 {
     for (const auto& row : table(page_, "Traps", 15).rows) {
@@ -260,7 +272,7 @@ TEST_F(DocsTypes, Traps)
         EXPECT_EQ(row[3], sample.written(jValue));
         EXPECT_NE("", row[5]);
         sample.store(jValue);
-        EXPECT_EQ(row[4], sample.readBack());
+        EXPECT_EQ(byVersion(row[4]), sample.readBack());
     }
 }
 

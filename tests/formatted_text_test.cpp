@@ -169,12 +169,14 @@ TEST_F(FormattedValues, GiveTheFirstSlotToTheValueOnlyInItsOwnKind)
 
 TEST_F(FormattedValues, NarrowTheValueByItsLength)
 {
+    const bool blLong64 = 8 == sizeof(long);
     EXPECT_EQ("-1985229329,0", behindInteger("%d,"));
-    EXPECT_EQ("81985529216486895,0", behindInteger("%ld,"));
+    EXPECT_EQ(blLong64 ? "81985529216486895,0" : "-1985229329,0", behindInteger("%ld,"));
     EXPECT_EQ("81985529216486895,0", behindInteger("%lld,"));
     EXPECT_EQ("89abcdef,0", behindInteger("%x,"));
-    EXPECT_EQ("123456789abcdef,0", behindInteger("%lx,"));
-    EXPECT_EQ("123456789ABCDEF,0", behindInteger("%p,"));
+    EXPECT_EQ(blLong64 ? "123456789abcdef,0" : "89abcdef,0", behindInteger("%lx,"));
+    EXPECT_EQ("123456789abcdef,0", behindInteger("%llx,"));
+    EXPECT_EQ(8 == sizeof(void*) ? "123456789ABCDEF,0" : "89ABCDEF,0", behindInteger("%p,"));
     EXPECT_EQ("4294967295,0", behindInteger("%u,", -1));
     EXPECT_EQ("18446744073709551615,0", behindInteger("%llu,", -1));
     EXPECT_EQ("0,0", behindInteger("%d,", 0x100000000));

@@ -137,8 +137,8 @@ echo '[{"id": 1, "text": "2"}, {"id": 2, "text": "1"}]' >linked_in.json
 expect 0 '{"imported":2}' '' l.db linked.json import linked_in.json
 refused l.db "records: import: commit: $log" l.db linked.json import plain.json
 # One that SQLite rolls back by itself.
-notes_with 'create table if not exists notes (id, done, tags, text); create trigger if not exists
-    eleven before insert on notes when new.id = 11 begin select raise(rollback, ''eleven''); end' >raising.json
+notes_with "create table if not exists notes (id, done, tags, text); create trigger if not exists
+    eleven before insert on notes when new.id = 11 begin select raise(rollback, ''eleven''); end" >raising.json
 expect 0 '{"imported":1}' '' r.db raising.json import keyed.json records
 refused r.db "records: import: the record: $log" r.db raising.json import plain.json
 "$program" -v r.db raising.json import plain.json >out 2>err || true
@@ -283,8 +283,8 @@ turned delete-by "{\"vornSqlWhereFilter\":\"1\"}: $log" vornSqlWhereFilter 1
 turned delete-by "{\"id\":\"1\"}: $log" id 1
 # All values or none.
 turned delete-by "{\"text\":\"\"}: $log" text one five '' "O'Größe"
-notes_with 'create table if not exists notes (id, done, tags, text); create trigger if not exists
-    kept before delete on notes when old.id = 5 begin select raise(abort, ''kept''); end' >kept.json
+notes_with "create table if not exists notes (id, done, tags, text); create trigger if not exists
+    kept before delete on notes when old.id = 5 begin select raise(abort, ''kept''); end" >kept.json
 expect 0 '{"imported":5}' '' k.db kept.json import requests.json
 refused k.db "records: delete-by: {\"text\":\"five\"}: $log" k.db kept.json delete-by text one five
 refused k.db "records: delete: {\"done\":false}: $log" k.db kept.json delete '{"done": false}'

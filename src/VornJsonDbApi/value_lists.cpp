@@ -39,9 +39,12 @@ bool appendLiteral(FormattedText& text, const Json::Value& jMember, const Json::
         text.appendValue("%llu",
                          FormatArgument::integer(static_cast<long long>(jValue.asUInt64())));
         return true;
-    case Value::kFloat:
-        text.appendValue("%f", FormatArgument::floating(static_cast<double>(jValue.asFloat())));
+    case Value::kFloat: {
+        // Stored, since a function of i386 returns more digits than a float has.
+        const volatile float fValue = jValue.asFloat();
+        text.appendValue("%f", FormatArgument::floating(static_cast<double>(fValue)));
         return true;
+    }
     case Value::kDouble:
         text.appendValue("%lf", FormatArgument::floating(jValue.asDouble()));
         return true;

@@ -11,11 +11,15 @@ constexpr int kUtc = 1;
 constexpr int kGmtLayout = 2;
 constexpr int kNumericLayout = 4;
 
+// Where a long has 32 bits, a time_t may have 64.
+static_assert(sizeof(long) <= sizeof(time_t));
+
 }  // namespace
 
 int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, long& now)
 {
-    now = time(NULL) + offsetSecond;
+    // Beyond a long, as after 2038 where it has 32 bits, the sum wraps.
+    __builtin_add_overflow(time(NULL), offsetSecond, &now);
     return 0;
 }
 
@@ -23,10 +27,15 @@ int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, i
 {
     char szTime[1024] = {};
     struct tm sTime = {};
+    const time_t timeStamp = ullTimeStamp;
     if (iType & kUtc) {
-        if (FAILED(NULL == gmtime_r(&ullTimeStamp, &sTime))) return -1;
+        if (FAILED_AS(NULL == gmtime_r(&timeStamp, &sTime),
+                      "NULL == gmtime_r(&ullTimeStamp, &sTime)"))
+            return -1;
     } else {
-        if (FAILED(NULL == localtime_r(&ullTimeStamp, &sTime))) return -1;
+        if (FAILED_AS(NULL == localtime_r(&timeStamp, &sTime),
+                      "NULL == localtime_r(&ullTimeStamp, &sTime)"))
+            return -1;
     }
     if (iType & kGmtLayout) {
         // Kept: local time too is followed by the letters GMT.

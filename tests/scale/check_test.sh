@@ -29,8 +29,8 @@ echo '0.1 5 5' >>acknowledged
 expect '22|3|ok'
 : >nothing
 expect '0|0|ok' nothing
-sqlite3 records.db 'create index texts on record (text)' 'pragma writable_schema = on' \
-    "update sqlite_schema set sql = 'create index texts on record (id)' where name = 'texts'"
+sqlite3 records.db 'create index texts on record (text)' '.dbconfig defensive off' 'pragma writable_schema = on' \
+    "update sqlite_schema set sql = 'create index texts on record (id)' where name = 'texts'" >/dev/null
 [[ $(judge records.db acknowledged) != *ok ]] || { echo 'a damaged index was not noticed'; exit 1; }
 
 # refused DATABASE ACKNOWLEDGED MESSAGE: the judge fails and says nothing else

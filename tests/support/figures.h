@@ -13,17 +13,17 @@ public:
     Figures& operator=(const Figures&) = delete;
     ~Figures()
     {
-        for (const auto& [strName, lNumber] : numbers_)
-            std::cout << "figure: " << strName << " = " << lNumber << std::endl;
+        for (const auto& [strName, iNumber] : numbers_)
+            std::cout << "figure: " << strName << " = " << iNumber << std::endl;
     }
 
     // The number of that name, 0 at first.
-    static long& of(const std::string& strName)
+    static long long& of(const std::string& strName)
     {
         static Figures figures;
         return figures.numbers_[strName];
     }
 
 private:
-    std::map<std::string, long> numbers_;
+    std::map<std::string, long long> numbers_;
 };

@@ -1,10 +1,17 @@
 // SPDX-License-Identifier: MIT
-// The time zone of the process, for a while.
+// The time zone of the process, for a while, and which times can be asked for.
 #pragma once
 
+#include <climits>
 #include <cstdlib>
 #include <ctime>
 #include <string>
+
+// Whether the system's long holds the time.
+inline bool isLong(long long iTime)
+{
+    return LONG_MIN <= iTime && LONG_MAX >= iTime;
+}
 
 // A time zone for as long as the object lives.
 class TimeZone {

@@ -3,6 +3,8 @@
 
 #include "cases.h"
 
+#include <climits>
+
 namespace {
 
 int construct(Call& call)
@@ -103,10 +105,14 @@ int convertLocal(Call& call)
     return VORN_JSON_DB::convert2ReadableTime(0, call.strText, 2);
 }
 
-int convertBeyondTheCalendar(Call& call)
+int convertTheLastLong(Call& call)
 {
-    return VORN_JSON_DB::convert2ReadableTime(0x7fffffffffffffff, call.strText, 3);
+    return VORN_JSON_DB::convert2ReadableTime(LONG_MAX, call.strText, 3);
 }
+
+// A long of 64 bits goes beyond the calendar.
+const char* const kLastLong =
+    8 == sizeof(long) ? R"({"result": -1})" : R"({"text": "Tue, 19 Jan 2038 03:14:07 GMT"})";
 
 }  // namespace
 
@@ -214,9 +220,9 @@ const Cases kFreeCases = {
     {"convert2ReadableTime in local time", convertLocal,
      R"({"text": "before"})",
      R"({"text": "Thu, 01 Jan 1970 02:00:00 GMT"})"},
-    {"convert2ReadableTime beyond the calendar", convertBeyondTheCalendar,
+    {"convert2ReadableTime of the last long", convertTheLastLong,
      R"({"text": "before"})",
-     R"({"result": -1})"},
+     kLastLong},
 };
 // clang-format on
 
