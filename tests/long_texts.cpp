@@ -8,6 +8,7 @@
 
 #include <unistd.h>
 #include <cstdarg>
+#include <cstdio>
 #include <cstring>
 #include <stdexcept>
 
@@ -54,6 +55,11 @@ protected:
         sqlite3_open(":memory:", &pDb_);
     }
     ~LongTexts() override { sqlite3_close(pDb_); }
+
+    static void SetUpTestSuite()
+    {
+        if (!hasMemory()) printf("left out: texts of a gigabyte: they need 64 bits and 8 GiB\n");
+    }
 
     // The result for a statement of strStart and as many x; -2 for std::logic_error.
     int expand(const char* szStart, std::size_t nLetters)
