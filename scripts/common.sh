@@ -5,7 +5,8 @@ cd -P "$(dirname "${BASH_SOURCE[0]}")/.."
 
 build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev libgtest-dev
                 iso-codes pkg-config sqlite3)
-test_packages=("${build_packages[@]}" clang devscripts)
+# zlib is what the static SQLite of Debian stands on.
+test_packages=("${build_packages[@]}" clang devscripts zlib1g-dev)
 
 # The tests that run the whole suite in one process, the hosts, and what fails, locks and kills.
 whole_suite='^(in_memory|on_files|records|records_iso_codes|[a-z0-9]+_host|example_[a-z_]+|header_host_runs|sharded|guarded|guarded_tests|crash|crash_check|threads|locks|faults_[a-z_]+|fuzz_replay_[a-z]+)$'
