@@ -249,17 +249,17 @@ bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name
     return prototype.blChecked;
 }
 
+// The prototype has one column at least.
 Json::Value recordFromPrototype(char** column_value)
 {
     const Prototype& prototype = pState->prototype;
     Json::Value jRec = prototype.jRecord;
-    auto it = jRec.begin();
-    const Source* pFirst = prototype.sources.data();
-    for (const Source& source : prototype.sources) {
-        if (&source != pFirst) ++it;
-        decode(source.decode, column_value[source.iColumn], *it);
+    const Source* pSource = prototype.sources.data();
+    const Source* const pEnd = pSource + prototype.sources.size();
+    for (auto it = jRec.begin();; ++it) {
+        decode(pSource->decode, column_value[pSource->iColumn], *it);
+        if (++pSource == pEnd) return jRec;
     }
-    return jRec;
 }
 
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
