@@ -43,7 +43,8 @@
 /// one of its statements runs, either: a handle that is constructed then takes over the table name
 /// for the rows that follow.
 ///
-/// Exceptions: the library throws nothing of its own. Where an accessor of jsoncpp meets a value of
+/// Exceptions: the library throws nothing of its own but std::logic_error for a value list that is
+/// too long, from SqlExpandMemberSymbol(), recSave() and recCreate(). Where an accessor of jsoncpp meets a value of
 /// the wrong kind, such as a text under an integer member in recSave(), its Json::LogicError
 /// reaches the host; records and result arrays are then as they were, and a text that an SQL
 /// builder was appending to keeps what was appended before, except where the builder says that it
@@ -169,8 +170,8 @@ public:
 
     /// The message for the host's user: empty in a new handle, "DUPLICATE_PRIMARY_KEY" after
     /// recCreate() or recUpdateByFilter() met a violated UNIQUE or PRIMARY KEY constraint. Where
-    /// other connections lock the database, a record may meet its own row, which an earlier attempt
-    /// of the same call has written; within a transaction of the host it does not.
+    /// other connections lock the database, the duplicate may be the row that an earlier attempt of
+    /// the same call wrote; a transaction of the host prevents this.
     ///
     /// Nothing but setErrMsg() clears it. Look at it only after a result of -1, and call
     /// setErrMsg("") before the operation: a later failure of another kind leaves it in place.

@@ -232,6 +232,18 @@ TEST_F(DocsLogExamples, AGapInTheStatement)
         EXPECT_EQ(-1, api_.recList(jRequest, jRecords));
         EXPECT_NE(std::string::npos, logged().find("error=near \"and\": syntax error"));
     }
+    for (const char* szMembers : {"", R"("member":{})"}) {
+        std::string strName = freshName();
+        std::string strCreate = "create table " + strName + " (a)";
+        Json::Value jDefinition = json("{\"" + strName + "\":{" + szMembers + "}}");
+        VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
+        Json::Value jRecord = json(R"({"a":1})");
+        Json::Value jStored;
+        EXPECT_EQ(-1, api.recCreate(jRecord, jStored));
+        EXPECT_NE(std::string::npos,
+                  logged().find("error=near \")\": syntax error, sql=INSERT INTO " + strName +
+                                " () VALUES (;"));
+    }
 }
 
 // A table or block that the tests above do not know would be compared by nobody.

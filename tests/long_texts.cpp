@@ -23,6 +23,9 @@ bool hasMemory()
     return 4 < sizeof(void*) && 8 <= sysconf(_SC_PHYS_PAGES) / (kGigabyte / sysconf(_SC_PAGESIZE));
 }
 
+// How often SQLite has formatted.
+std::size_t nFormatted = 0;
+
 // The shortest text that is too long.
 const std::size_t nLimit = hasMemory() ? 1'000'000'000 : 510'000'000;
 
@@ -30,6 +33,7 @@ const std::size_t nLimit = hasMemory() ? 1'000'000'000 : 510'000'000;
 
 extern "C" char* sqlite3_mprintf(const char* szFormat, ...)
 {
+    ++nFormatted;
     va_list arguments;
     va_start(arguments, szFormat);
     char* szText = sqlite3_vmprintf(szFormat, arguments);
@@ -61,11 +65,12 @@ protected:
         if (!hasMemory()) printf("left out: texts of a gigabyte: they need 64 bits and 8 GiB\n");
     }
 
-    // The result for a statement of strStart and as many x; -2 for std::logic_error.
-    int expand(const char* szStart, std::size_t nLetters)
+    // The result for the statement; -2 for std::logic_error.
+    int expand(std::string strSql)
     {
         VornJsonDbApi api(pDb_, strName_, jDefinition_, strCreate_);
-        strSql_ = text(szStart, nLetters, "");
+        strSql_ = std::move(strSql);
+        nFormatted = 0;
         try {
             return api.SqlExpandMemberSymbol(strSql_, jRecord_);
         } catch (const std::logic_error&) {
@@ -83,26 +88,36 @@ protected:
 
 TEST_F(LongTexts, AreWrittenUpToTheLimit)
 {
-    EXPECT_EQ(0, expand("", nLimit - 2));
+    EXPECT_EQ(0, expand(text("", nLimit - 2, "")));
     EXPECT_TRUE(text("", nLimit - 2, "7) ") == strSql_);
 }
 
 TEST_F(LongTexts, BeyondTheLimitAreRefused)
 {
-    EXPECT_EQ(-2, expand("(", nLimit - 2));
+    EXPECT_EQ(-2, expand(text("(", nLimit - 2, "")));
     EXPECT_TRUE(text("(", nLimit - 2, "") == strSql_);
 }
 
 TEST_F(LongTexts, WithAConversionAreWrittenUpToTheLimit)
 {
-    EXPECT_EQ(0, expand("%%", nLimit - 3));
+    EXPECT_EQ(0, expand(text("%%", nLimit - 3, "")));
     EXPECT_TRUE(text("%", nLimit - 3, "7) ") == strSql_);
 }
 
 TEST_F(LongTexts, WithAConversionBeyondTheLimitAreRefused)
 {
-    EXPECT_EQ(-2, expand("%%", nLimit - 2));
+    EXPECT_EQ(-2, expand(text("%%", nLimit - 2, "")));
     EXPECT_TRUE(text("%%", nLimit - 2, "") == strSql_);
+}
+
+TEST_F(LongTexts, OfWideConversionsAreRefusedBeforeTheyAreWhole)
+{
+    constexpr std::size_t kWidth = 4096;
+    std::string strSql;
+    for (std::size_t i = 0; i < 4 * nLimit / kWidth; ++i) strSql += "%4096d";
+    EXPECT_EQ(-2, expand(strSql));
+    EXPECT_TRUE(strSql == strSql_);
+    EXPECT_GT(3 * nLimit / kWidth, nFormatted);
 }
 
 }  // namespace

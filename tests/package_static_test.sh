@@ -79,10 +79,19 @@ if cmake -S "$source" -B "$work/mixture" -DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXA
     fail "a shared library over a static SQLite was taken"
 fi
 refused
-if configured amalgamation <<PROJECT; then fail "a shared library over the host's static SQLite was taken"; fi
+# refused_target NAME: with SQLite's target as standard input makes it.
+refused_target() {
+    if { cat; echo "add_subdirectory($source vornjsondb)"; } | configured "$1"; then
+        fail "a shared library over a static SQLite was taken: $1"
+    fi
+    cp "$work/$1/log" "$work/log"
+    refused
+}
+refused_target amalgamation <<PROJECT
 add_library(amalgamation STATIC host.cpp)
 add_library(SQLite::SQLite3 ALIAS amalgamation)
-add_subdirectory($source vornjsondb)
 PROJECT
-cp "$work/amalgamation/log" "$work/log"
-refused
+refused_target wrapper <<PROJECT
+add_library(SQLite::SQLite3 INTERFACE IMPORTED)
+set_target_properties(SQLite::SQLite3 PROPERTIES INTERFACE_LINK_LIBRARIES $sqlite)
+PROJECT

@@ -172,10 +172,18 @@ void appendConversion(std::string& strOut, const Conversion& conversion,
     }
 }
 
+// Throws where SQLite's formatter finds the text too long. The precision makes it count beyond the
+// 30 bits that it keeps of a length otherwise.
+void refuseTooLong(const std::string& strText)
+{
+    formatted(strText.size() < (1U << 30) ? "%s" : "%.2147483647s", strText.c_str());
+}
+
 // Formats a text that holds conversions.
 std::string formatText(const char* szText, FormatArgument value)
 {
     std::string strOut;
+    std::size_t nLong = kLongText;
     const auto takeSlot = [&value] { return std::exchange(value, FormatArgument()); };
     for (;;) {
         const char* szPercent = strchr(szText, '%');
@@ -190,6 +198,10 @@ std::string formatText(const char* szText, FormatArgument value)
         const FormatArgument argument =
             TypeKind::kPercent == conversion.type ? FormatArgument() : takeSlot();
         appendConversion(strOut, conversion, argument);
+        if (nLong < strOut.size()) {
+            refuseTooLong(strOut);
+            nLong = 2 * strOut.size();
+        }
         // The character with the code 0 ends the text.
         if (TypeKind::kCharacter == conversion.type && 0 == static_cast<int>(argument.iValue))
             return strOut;
@@ -228,7 +240,5 @@ void FormattedText::appendValue(const char* szConversion, const FormatArgument& 
         strText_ = formatText((strText_ + szConversion).c_str(), argument);
         blPlain_ = isPlain(strText_);
     }
-    // The whole text is formatted for its length alone. The precision makes the formatter count
-    // beyond the 30 bits that it keeps of a length otherwise.
-    if (kLongText < strText_.size()) formatted("%.2147483647s", strText_.c_str());
+    if (kLongText < strText_.size()) refuseTooLong(strText_);
 }

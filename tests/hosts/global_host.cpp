@@ -29,6 +29,22 @@ struct Connection {
     Json::Value jDefinition;
 };
 
+// Older than the library's first use, so it is gone after whatever that use has made: what main
+// took is still there.
+struct Late {
+    ~Late()
+    {
+        if ("long long" != (*pjTypes)["id"]["cpptype"].asString()) std::_Exit(6);
+        Json::Value jNone;
+        if (pjTypes != &VORN_JSON_DB::recType(jNone, strName)) std::_Exit(7);
+    }
+
+    std::string strName = "first used in main";
+    const Json::Value* pjTypes = nullptr;
+};
+
+Late late;
+
 class Host {
 public:
     Host()
@@ -66,5 +82,8 @@ Host host;
 
 int main()
 {
+    Json::Value jDefinition;
+    jDefinition[late.strName]["member"]["id"]["cpptype"] = "long long";
+    late.pjTypes = &VORN_JSON_DB::recType(jDefinition, late.strName);
     return host.works(2) ? 0 : 5;
 }

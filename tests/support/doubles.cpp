@@ -88,6 +88,15 @@ int doubles::realExec(sqlite3* pDb, const char* szSql, RowCallback callback, voi
     return iStatus;
 }
 
+// jsoncpp's default limit of depth as its newest releases have it, whatever is below.
+void Json::CharReaderBuilder::setDefaults(Json::Value* pjSettings)
+{
+    static auto* const pReal =
+        real<void(Json::Value*)>("_ZN4Json17CharReaderBuilder11setDefaultsEPNS_5ValueE");
+    pReal(pjSettings);
+    (*pjSettings)["stackLimit"] = 256;
+}
+
 extern "C" {
 
 void __syslog_chk(int, int, const char*, ...) __attribute__((format(printf, 3, 4)));
