@@ -86,28 +86,25 @@ protected:
     Json::Value jRecord_;
 };
 
-TEST_F(LongTexts, AreWrittenUpToTheLimit)
+TEST_F(LongTexts, AreWrittenUpToTheLimitAndRefusedBeyondIt)
 {
-    EXPECT_EQ(0, expand(text("", nLimit - 2, "")));
-    EXPECT_TRUE(text("", nLimit - 2, "7) ") == strSql_);
-}
-
-TEST_F(LongTexts, BeyondTheLimitAreRefused)
-{
-    EXPECT_EQ(-2, expand(text("(", nLimit - 2, "")));
-    EXPECT_TRUE(text("(", nLimit - 2, "") == strSql_);
-}
-
-TEST_F(LongTexts, WithAConversionAreWrittenUpToTheLimit)
-{
-    EXPECT_EQ(0, expand(text("%%", nLimit - 3, "")));
-    EXPECT_TRUE(text("%", nLimit - 3, "7) ") == strSql_);
-}
-
-TEST_F(LongTexts, WithAConversionBeyondTheLimitAreRefused)
-{
-    EXPECT_EQ(-2, expand(text("%%", nLimit - 2, "")));
-    EXPECT_TRUE(text("%%", nLimit - 2, "") == strSql_);
+    const struct {
+        const char* szBefore;
+        std::size_t nLetters;
+        int iResult;
+        const char* szAfter;
+        const char* szEnd;
+    } cases[] = {
+        {"", nLimit - 2, 0, "", "7) "},
+        {"(", nLimit - 2, -2, "(", ""},
+        {"%%", nLimit - 3, 0, "%", "7) "},
+        {"%%", nLimit - 2, -2, "%%", ""},
+    };
+    for (const auto& row : cases) {
+        SCOPED_TRACE(std::string(row.szBefore) + " " + std::to_string(row.iResult));
+        EXPECT_EQ(row.iResult, expand(text(row.szBefore, row.nLetters, "")));
+        EXPECT_TRUE(text(row.szAfter, row.nLetters, row.szEnd) == strSql_);
+    }
 }
 
 TEST_F(LongTexts, OfWideConversionsAreRefusedBeforeTheyAreWhole)
