@@ -98,7 +98,7 @@ void checkRecord(const Json::Value& jTypes, const Json::Value& jRecord)
         checkKind(checkDeclared(jTypes, it.name()), *it);
 }
 
-// A new note gets its id from SQLite: the one after the greatest. Later it keeps id and author.
+// SQLite gives a new note its id: the one after the greatest ever. Later it keeps id and author.
 void checkKept(const Json::Value& jRecord, const char* szName)
 {
     if (jRecord.isMember(szName)) throw Refused(std::string("\"") + szName + "\" cannot be set");

@@ -88,9 +88,10 @@ const Json::Value& noteTypes()
 
 VornJsonDbApi openNotes(sqlite3* pDb)
 {
+    // Without autoincrement the id of a deleted note would be given to another author's.
     std::string strCreate =
-        "create table if not exists note (author text, done integer, id integer primary key, "
-        "text text, topics text); "
+        "create table if not exists note (author text, done integer, "
+        "id integer primary key autoincrement, text text, topics text); "
         "create index if not exists note_author on note (author)";
     return VornJsonDbApi(pDb, strTable, definition(), strCreate);
 }

@@ -34,8 +34,8 @@ VornJsonDbApi openNotes(sqlite3* pDb);
 // does.
 void checkNote(VornJsonDbApi& notes, const Json::Value& jCommand);
 
-// Does the command as it stands, unchecked: what guard and fence stand around. Adds what it reads
-// to the answer and returns the library's result.
+// Performs the command unchecked; guard and fence surround this call. Adds what it reads to the
+// answer and returns the library's result.
 int perform(VornJsonDbApi& notes, Json::Value& jCommand, Json::Value& jAnswer);
 
 // The access that the command needs.

@@ -27,6 +27,7 @@ int main(int argc, char** argv)
     {
         Host host(pDb);
         std::string strLine;
+        strLine.reserve(guard::kMaxLine + 1);  // what it holds at most: reading needs no more
         while (guard::readLine(std::cin, strLine)) host.serve(strLine, std::cout);
     }
     return SQLITE_OK == sqlite3_close(pDb) ? 0 : 1;

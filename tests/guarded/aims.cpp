@@ -110,6 +110,11 @@ bool noteIsEves(World& world)
     return "1" == world.value("select count(*) from note where id = 1 and author = 'Eve'");
 }
 
+bool newNoteIsChanged(World& world)
+{
+    return "1" == world.value("select count(*) from note where author = 'Eve' and text = 'Ann'");
+}
+
 bool crowdGrows(World& world)
 {
     return "1001" == world.value("select count(*) from note where author = 'crowd'");

@@ -25,6 +25,7 @@ bool hostIsThrownAt(World& world);
 // The next id is beyond 32 bits.
 bool idsAreUsedUp(World& world);
 bool noteIsEves(World& world);
+bool newNoteIsChanged(World& world);
 bool crowdGrows(World& world);
 // The call succeeded, and the member is null.
 bool topicsAreLost(World& world);

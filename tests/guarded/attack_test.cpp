@@ -22,16 +22,16 @@ protected:
         world.stop();
     }
 
-    static std::string contentsBefore()
+    static std::string contentsBefore(Layers layers)
     {
-        World world(Layers::kNone, GetParam().uMoreNotes);
+        World world(layers, GetParam().uMoreNotes);
         world.stop();
         return world.contents();
     }
 
     static void expectRefused(const World& world)
     {
-        if (Attack::Guard::kLimits == GetParam().guard) return;
+        if (Attack::Guard::kRefuses != GetParam().guard) return;
         EXPECT_TRUE(world.answers.at(0).isMember("refused")) << text(world.answers[0]);
     }
 };
@@ -45,7 +45,7 @@ TEST_P(Attacked, HostWithoutChecksIsHit)
 
 TEST_P(Attacked, HostWithTheGuardAloneIsNot)
 {
-    const std::string strBefore = contentsBefore();
+    const std::string strBefore = contentsBefore(Layers::kGuard);
     World world(Layers::kGuard, GetParam().uMoreNotes);
     attack(world);
     EXPECT_FALSE(GetParam().worked(world));
@@ -55,7 +55,7 @@ TEST_P(Attacked, HostWithTheGuardAloneIsNot)
 
 TEST_P(Attacked, HostWithTheFenceAloneIsHitOnlyWhereItIsSaid)
 {
-    const std::string strBefore = contentsBefore();
+    const std::string strBefore = contentsBefore(Layers::kFence);
     World world(Layers::kFence, GetParam().uMoreNotes);
     attack(world);
     const bool blStopped = Attack::Fence::kStops == GetParam().fence;
@@ -69,7 +69,7 @@ TEST_P(Attacked, HostWithTheFenceAloneIsHitOnlyWhereItIsSaid)
 
 TEST_P(Attacked, GuardedHostIsNotAndGoesOn)
 {
-    const std::string strBefore = contentsBefore();
+    const std::string strBefore = contentsBefore(Layers::kBoth);
     World world(Layers::kBoth, GetParam().uMoreNotes);
     for (const std::string& strLine : GetParam().lines) world.send(strLine);
     expectRefused(world);

@@ -258,6 +258,13 @@ std::vector<Attack> shares()
          noteIsEves,
          kLetsThrough},
         {"save_of_other_author", {save(R"({"id":1,"author":"Eve"})")}, noteIsEves, kLetsThrough},
+        // Ann goes on to change her note, which is gone.
+        {"delete_and_create",
+         {create(R"({"author":"Ann"})"), remove(R"({"id":13})"), create(R"({"author":"Eve"})"),
+          update(R"({"id":13})", R"({"text":"Ann"})"), remove(R"({"id":14})")},
+         newNoteIsChanged,
+         kLetsThrough,
+         Attack::Guard::kLetsThrough},
         {"notes_beyond_quota",
          {create(R"({"author":"crowd"})")},
          crowdGrows,

@@ -11,7 +11,7 @@ struct Attack {
     // Where it ends when only SQLite's own means stand around the call.
     enum class Fence { kStops, kLetsThrough };
     // What the guard makes of its first line.
-    enum class Guard { kRefuses, kLimits };
+    enum class Guard { kRefuses, kLimits, kLetsThrough };
 
     std::string strName;
     std::vector<std::string> lines;

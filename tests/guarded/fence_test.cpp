@@ -12,7 +12,7 @@ protected:
     FenceTest()
     {
         database_.run(
-            "create table note (id integer primary key, text text);"
+            "create table note (id integer primary key autoincrement, text text);"
             "create table vault (secret text);"
             "insert into note values (1,'a'),(2,'b'); insert into vault values ('s')");
         pFence_ = std::make_unique<Fence>(database_.get(), "note");
@@ -91,11 +91,26 @@ TEST_F(FenceTest, GivesNoneMore)
     for (const Access access :
          {Access::kRead, Access::kInsert, Access::kUpdate, Access::kDelete, Access::kNothing})
         for (const char* szSql :
-             {"select * from vault", "select count(*) from vault", "insert into vault values ('x')",
-              "update vault set secret=''", "delete from vault", "drop table vault",
-              "select * from sqlite_master", "create table x (a)", "create temp table note (a)",
-              "alter table vault add column b", "pragma user_version=1", "attach ':memory:' as x",
-              "commit", "savepoint x", "release x", "analyze",
+             {"select * from vault",
+              "select count(*) from vault",
+              "insert into vault values ('x')",
+              "update vault set secret=''",
+              "delete from vault",
+              "drop table vault",
+              "select * from sqlite_sequence",
+              "insert into sqlite_sequence values ('note',9)",
+              "update sqlite_sequence set seq=0",
+              "delete from sqlite_sequence",
+              "select * from sqlite_master",
+              "create table x (a)",
+              "create temp table note (a)",
+              "alter table vault add column b",
+              "pragma user_version=1",
+              "attach ':memory:' as x",
+              "commit",
+              "savepoint x",
+              "release x",
+              "analyze",
               "create trigger x after insert on note begin delete from vault; end"})
             expectNotAuthorized(access, szSql);
     EXPECT_EQ(kRefused, execute("select 1")) << "between two calls";

@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
 # memory_test.sh PROGRAM WORK: that examples/guarded, with any amount of memory that it starts with at all,
-# either lists the largest notes that strangers can make or says that it failed, and then goes on.
+# either lists the largest notes that strangers can make or says that it failed, and then goes on. Nor does a
+# long line end it.
 . "$(dirname "${BASH_SOURCE[0]}")/../../scripts/common.sh"
 program=$1 work=$2
 
@@ -44,5 +45,17 @@ for ((limit = step; limit <= most; limit += step)); do
     failed=$((failed + 1))
     [ "$second" != "$right_get" ] || went_on=$((went_on + 1))
 done
+
+# From the least memory with which it answers a short line at all.
+long="$get$(repeated 8000 ' ')"
+started=0
+for ((fine = step; fine <= most && started < 20; fine += 16)); do
+    under $fine "$get" >answers 2>/dev/null || continue
+    under $fine "$long" "$get" >answers || { echo "$fine KB, long line: exit status $?"; cat err; exit 1; }
+    [ "$(wc -l <answers)" = 2 ] || { echo "$fine KB, long line: no two answers"; exit 1; }
+    ! grep -vxF -e "$right_get" -e '{"error":"failed"}' answers || { echo "$fine KB, long line"; exit 1; }
+    started=$((started + 1))
+done
+[ "$started" = 20 ] || { echo "it started $started times of 20"; exit 1; }
 echo "enough: $limit KB; failed below: $failed times, answered then: $went_on"
 [ "$limit" -le "$most" ] && [ "$failed" -ge 5 ] && [ "$went_on" -ge 5 ]

@@ -50,7 +50,7 @@ std::set<std::string> functionsIn(const std::string& strText)
 TEST(SecurityPage, NamesEveryAttackOnceAndWhatStopsIt)
 {
     std::map<std::string, Attack::Fence> named;
-    for (const auto& row : table(securityPage(), "The trust table", 22).rows) {
+    for (const auto& row : table(securityPage(), "The trust table", 23).rows) {
         SCOPED_TRACE(row[0]);
         const auto stopped = attacksIn(row[3]);
         const auto letThrough = attacksIn(row[4]);
@@ -69,7 +69,7 @@ TEST(SecurityPage, NamesEveryAttackOnceAndWhatStopsIt)
 TEST(SecurityPage, LinksToTheFunctionOfEveryRow)
 {
     std::set<std::string> functions;
-    for (const auto& row : table(securityPage(), "The trust table", 22).rows) {
+    for (const auto& row : table(securityPage(), "The trust table", 23).rows) {
         const auto found = functionsIn(row[2]);
         EXPECT_FALSE(found.empty()) << row[0];
         functions.insert(found.begin(), found.end());
@@ -77,7 +77,7 @@ TEST(SecurityPage, LinksToTheFunctionOfEveryRow)
     EXPECT_EQ((std::set<std::string>{"checkDeclared", "checkIndexed", "checkKept", "checkKind",
                                      "checkList", "checkOneRecord", "checkPaging", "checkQuota",
                                      "checkRawFilter", "checkSaved", "checkSorting", "checkText",
-                                     "limitRows", "readCommand", "readLine"}),
+                                     "limitRows", "openNotes", "readCommand", "readLine"}),
               functions);
     for (const auto& row : table(securityPage(), "The fence", 5).rows)
         EXPECT_EQ(1U, functionsIn(row[1]).size()) << row[0];
@@ -119,16 +119,16 @@ std::string refusal(const Attack& attack)
     return world.answers.at(0)["refused"].asString();
 }
 
-// The attack is refused by a function of its row and no other, or only limited.
+// The attack is refused by a function of its row and no other, or its first line is not refused.
 TEST(SecurityPage, LinksToTheFunctionThatRefuses)
 {
-    const MarkdownTable page = table(securityPage(), "The trust table", 22);
+    const MarkdownTable page = table(securityPage(), "The trust table", 23);
     for (const Attack& attack : attacks()) {
         SCOPED_TRACE(attack.strName);
         for (const auto& row : page.rows) {
             if (0 == attacksIn(row[3] + "," + row[4]).count(attack.strName)) continue;
             const std::string strReason = refusal(attack);
-            bool blFound = Attack::Guard::kLimits == attack.guard && strReason.empty();
+            bool blFound = Attack::Guard::kRefuses != attack.guard && strReason.empty();
             for (const std::string& strFunction : functionsIn(row[2])) {
                 const auto range = reasons().equal_range(strFunction);
                 blFound = blFound || std::any_of(range.first, range.second, [&](const auto& pair) {
