@@ -44,11 +44,11 @@
 /// for the rows that follow.
 ///
 /// Exceptions: the library throws nothing of its own but std::logic_error for a value list that is
-/// too long, from SqlExpandMemberSymbol(), recSave() and recCreate(). Where an accessor of jsoncpp meets a value of
-/// the wrong kind, such as a text under an integer member in recSave(), its Json::LogicError
-/// reaches the host; records and result arrays are then as they were, and a text that an SQL
-/// builder was appending to keeps what was appended before, except where the builder says that it
-/// is unchanged. After each of them handle and connection are sound.
+/// too long, from SqlExpandMemberSymbol(), recSave() and recCreate(). Where an accessor of jsoncpp
+/// meets a value of the wrong kind, such as a text under an integer member in recSave(), its
+/// Json::LogicError reaches the host; records and result arrays are then as they were, and a text
+/// that an SQL builder was appending to keeps what was appended before, except where the builder
+/// says that it is unchanged. After each of them handle and connection are sound.
 ///
 /// Memory: when it runs out, a call may return -1, or std::bad_alloc, jsoncpp's Json::RuntimeError
 /// or (in a value list) std::logic_error reaches the host; either way a write may have been made,
