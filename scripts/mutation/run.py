@@ -19,7 +19,7 @@ from mutants import enumerators, mutants
 
 PROJECT = os.getcwd()
 FOLDER = os.path.join(PROJECT, "build", "mutation")
-LISTED = "tests/data/mutants.txt"
+LISTED = "scripts/mutation/survivors.txt"
 
 
 class State:

@@ -4,7 +4,7 @@
 # compared exactly, and what stands in the database file afterwards (read with the sqlite3 shell).
 #
 # usage: records_test.sh PROGRAM TABLES-FOLDER WORK-FOLDER
-. "$(dirname "${BASH_SOURCE[0]}")/support/records.sh"
+. "$(dirname "${BASH_SOURCE[0]}")/records.sh"
 
 cat >notes.json <<'EOF'
 {"name": "notes", "key": "id",

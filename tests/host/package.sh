@@ -3,7 +3,7 @@
 # EXPECTED, where HOST is the README's host, and EXPECTED what it prints.
 source=$1 work=$2 host=$3 expected=$4
 test_name=$(basename "$0" .sh)
-part=$source/tests/hosts
+part=$source/tests/host
 
 fail() {
     printf '%s: %s\n' "$test_name" "$*" >&2
@@ -40,10 +40,10 @@ installed() {
     libdir=$(dirname "$(cd "$2" && find . -name 'libvornjsondb.so' -o -name 'libvornjsondb.a')")
 }
 
-# lists FOLDER FILE: below the folder is what the file of tests/data names, with LIBDIR for that of the library.
+# lists FOLDER FILE: below the folder is what the file of tests/host names, with LIBDIR for that of the library.
 lists() {
     (cd "$1" && find . ! -type d | sed "s|^$libdir/|LIBDIR/|; s|^\./||" | LC_ALL=C sort) >"$work/installed"
-    same "the list of installed files" "$source/tests/data/$2" "$work/installed"
+    same "the list of installed files" "$source/tests/host/$2" "$work/installed"
     if grep -rlF -e "$source" -e "$work" "$1"; then fail "a path of the build was installed"; fi
 }
 

@@ -3,7 +3,7 @@
 # memory_test.sh PROGRAM WORK: that examples/guarded, with any amount of memory that it starts with at all,
 # either lists the largest notes that strangers can make or says that it failed, and then goes on. Nor does a
 # long line end it.
-. "$(dirname "${BASH_SOURCE[0]}")/../../scripts/common.sh"
+. "$(dirname "${BASH_SOURCE[0]}")/../../../scripts/common.sh"
 program=$1 work=$2
 
 most=100000 # KB of address space, more than enough

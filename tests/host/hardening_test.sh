@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
-# hardening_test.sh HARDENING-CHECK PREFIX: the library that tests/package_test.sh has installed there is hardened
+# hardening_test.sh HARDENING-CHECK PREFIX: the library that package_test.sh has installed there is hardened
 # as Debian's packages are.
 set -euo pipefail
 mapfile -t libraries < <(find "$2" -type f -name 'libvornjsondb.so.*')

@@ -4,7 +4,7 @@
 # iso-codes and compares every record with its source.
 #
 # usage: records_iso_codes_test.sh PROGRAM TABLES-FOLDER WORK-FOLDER
-. "$(dirname "${BASH_SOURCE[0]}")/support/records.sh"
+. "$(dirname "${BASH_SOURCE[0]}")/records.sh"
 
 iso_codes=/usr/share/iso-codes/json
 for needed in iso_639-3 iso_3166-2; do

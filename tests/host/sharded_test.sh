@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: MIT
 # sharded_test.sh PROGRAM EXPECTED WORK: what examples/sharded says where a tenant's file is no database,
 # belongs to another owner or cannot be made, and that the other files are as they were.
-. "$(dirname "${BASH_SOURCE[0]}")/../scripts/common.sh"
+. "$(dirname "${BASH_SOURCE[0]}")/../../scripts/common.sh"
 program=$1 expected=$2 work=$3
 
 rm -rf "$work"

@@ -4,7 +4,7 @@
 # installed, and builds the README's host against it in every way that the README names, and the
 # examples; then removes it. What was installed stays in WORK/moved.
 set -euo pipefail
-. "$(dirname "$0")/support/package.sh"
+. "$(dirname "$0")/package.sh"
 [ "$(wc -l <"$host")" -le 30 ] || fail "the host has more than 30 lines"
 
 built "$work/build"
@@ -46,7 +46,7 @@ PROJECT
 quietly "an example against the installed library" \
     ctest --test-dir "$work/found/build" --no-tests=error --output-on-failure
 quietly "records against the installed library" \
-    bash "$source/tests/records_test.sh" "$work/found/build/records" "$source/examples/tables" "$work/found/records_test"
+    bash "$source/tests/host/records_test.sh" "$work/found/build/records" "$source/examples/tables" "$work/found/records_test"
 (cd "$source/examples/guarded" && "$work/found/build/guarded" :memory: <commands.txt >"$work/found/answers.txt")
 same "what guarded answers" "$source/examples/guarded/answers.txt" "$work/found/answers.txt"
 

@@ -4,7 +4,7 @@
 # builds hosts with it: the README's, one with a global handle and one whose plugin has the library inside; and
 # the shared library is not built over a static SQLite.
 set -euo pipefail
-. "$(dirname "$0")/support/package.sh"
+. "$(dirname "$0")/package.sh"
 
 sqlite=$(find /usr/lib /usr/local/lib -name libsqlite3.a -print -quit)
 [ -n "$sqlite" ] || fail "there is no libsqlite3.a"
