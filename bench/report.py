@@ -141,7 +141,7 @@ def document(results, notes):
                if results.all["largest_skipped"] else "")
     return f"""# Performance
 
-Written by `scripts/bench` from what it measured; edit `bench/notes.md` and run it again.
+Written by `scripts/dev/bench` from what it measured; edit `bench/notes.md` and run it again.
 
 The work: a table `task` of seven members (two texts, one of them indexed in groups of ten, an integer key, a
 64-bit integer, a boolean, an array of two texts, an object of two members) in memory, the writes in one

@@ -2,7 +2,7 @@
 /// @file
 /// One database for each tenant: a folder of files, which are opened when they are needed. More
 /// load means more files, on more machines; the folder may lie on a replicated file system, about
-/// which see docs/scale-out.md.
+/// which see contrib/scale-out/scale-out.md.
 ///
 ///     sharded [FOLDER]
 ///

@@ -24,7 +24,7 @@ LINK = re.compile(r"(!?)\[([^\]]*)\]\(([^)\s]+)\)")
 
 def guides():
     first = ["README.md"]
-    last = ["examples/README.md", "SECURITY.md", "CONTRIBUTING.md", "CHANGELOG.md"]
+    last = ["contrib/scale-out/scale-out.md", "examples/README.md", "SECURITY.md", "CONTRIBUTING.md", "CHANGELOG.md"]
     return first + sorted(os.path.relpath(path, PROJECT) for path in glob.glob(PROJECT + "/docs/*.md")) + last
 
 

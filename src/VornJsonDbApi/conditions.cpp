@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: MIT
+#include "VornJsonDbApi/operation.h"
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
@@ -9,9 +10,9 @@
 
 #include <utility>
 
-namespace {
+using namespace vorn;
 
-constexpr char kRawFilterKey[] = "vornSqlWhereFilter";
+namespace {
 
 // How terms are put together: " (" a " and " b " )", or a " , " b.
 struct Joiner {
@@ -41,20 +42,20 @@ int appendMatch(std::string_view strField, const Json::Value& jMember, const Jso
 {
     SqliteText szSql;
     const char* szQuote = "'";
-    switch (typeWordRow(jMember).term) {
-    case Term::kText:
+    switch (TypeWord(jMember).forms().term) {
+    case TermForm::kText:
         if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
         break;
-    case Term::kJson:
+    case TermForm::kJson:
         if (FAILED_AS(NULL == (szSql = sqlite3_mprintf("%q", toString(jParam).c_str())),
                       "NULL == (szSql = sqlite3_mprintf(\"%q\", jParam.toString().c_str()))"))
             return -1;
         break;
-    case Term::kBool:
+    case TermForm::kBool:
         szQuote = "";
         if (FAILED(NULL == (szSql = sqlite3_mprintf("%d", jParam.asInt())))) return -1;
         break;
-    case Term::kBare:
+    case TermForm::kBare:
         szQuote = "";
         if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))) return -1;
         break;
@@ -86,10 +87,14 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
         const std::string_view strField = memberName(it);
         const bool blRawFilter = kRawFilterKey == strField;
         const Json::Value* pjMember = types.find(strField);
+        // Kept(Conditions.PassOverUndeclaredKeys): undeclared keys of a request are ignored
         if (nullptr == pjMember && !blRawFilter) continue;
+        // Kept(Conditions.WriteTheJoinerAroundAnEmptyArray): an empty list writes its joiner and no
+        // term
         strSqlWhereOut += blWritten ? pJoiner->szBetween : pJoiner->szBefore;
         Json::Value& jTmp = *it;
-        // Kept: a table that declares a member of the raw filter's name cannot be asked by it.
+        // Kept(Conditions.TakeTheRawFilterForAMemberOfItsName): the raw filter wins over a member
+        // of its name
         if (blRawFilter) {
             if (FAILED_AS(!jTmp.isString(), "!jRecParam[jmFieldName[i]].isString()")) return -1;
             strSqlWhereOut.append(" ").append(jTmp.asString()).append(" ");
@@ -127,24 +132,25 @@ int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jHostLis
     if (FAILED(!szField || !szField[0])) return -1;
     const Json::Value* pjMember = findMember(jType, szField);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(szField)")) return -1;
-    const Term term = typeWordRow(*pjMember).term;
+    const TermForm form = TypeWord(*pjMember).forms().term;
     if (FAILED(jList.type() != Json::arrayValue)) return -1;
     if (jList.empty()) return 0;
 
-    // Kept: nothing stands between the items, so that two texts read as one ('1''2').
+    // Kept(Terms.OfSeveralItemsGlueThem): several items of a list are written side by side without
+    // a comma
     std::string strTerm = std::string(szField) + " in (";
     for (Json::ArrayIndex i = 0; i < jList.size(); ++i) {
         SqliteText szSql;
         const char* szQuote = "'";
-        switch (term) {
-        case Term::kJson:
+        switch (form) {
+        case TermForm::kJson:
             if (FAILED_AS(NULL == (szSql = sqlite3_mprintf("%q", toString(jList[i]).c_str())),
                           "NULL == (szSql = sqlite3_mprintf(\"%q\", jList[i].toString().c_str()))"))
                 return -1;
             break;
-        case Term::kBool:
-        case Term::kBare: szQuote = ""; [[fallthrough]];
-        case Term::kText:
+        case TermForm::kBool:
+        case TermForm::kBare: szQuote = ""; [[fallthrough]];
+        case TermForm::kText:
             if (FAILED(NULL == (szSql = sqlite3_mprintf("%q", jList[i].asString().c_str()))))
                 return -1;
             break;

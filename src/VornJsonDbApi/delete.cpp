@@ -1,11 +1,14 @@
 // SPDX-License-Identifier: MIT
-#include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/operation.h"
 #include "util/json_members.h"
 #include "util/log.h"
+#include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
 
 #include <sstream>
+
+using namespace vorn;
 
 namespace {
 
@@ -38,14 +41,12 @@ int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
     if (!blDeleteAll && FAILED(strSql.empty())) return fail();
     strSqlRun.reserve(kUsualStatement);
     strSqlRun.append("DELETE FROM ").append(strName).append(" ");
-    // Kept: two blanks stand before WHERE.
+    // Two blanks, as in a listing.
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun += ";";
     if (FAILED(0 > (err = runSqlEx(strSqlRun)))) return fail();
-    if (!strSqlError.empty()) {                             // Guard: a run that succeeds empties it
-        LOG_ERROR("sql error, sql=%s", strSqlRun.c_str());  // Guard
-        return fail();                                      // Guard
-    }
+    // Cannot fail: a run that succeeds empties the error text.
+    if (GUARDED_SQL("sql error, sql=%s", strSqlRun.c_str())) return fail();
     if (blDebugOutput) LOG_PLAIN("delete rec number=%d", err);
     return err;
 }
@@ -71,11 +72,11 @@ int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const c
     if (FAILED(!szKey || !szKey[0])) return fail();
     const Json::Value* pjMember = findMember(jType, szKey);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(szKey)")) return fail();
-    if (FAILED_AS(typeWordOf(*pjMember) != "string",
+    if (FAILED_AS(TypeWord(*pjMember).text() != "string",
                   "jType[szKey][\"cpptype\"].asString() != \"string\""))
         return fail();
-    // Guard: object and key were looked at above.
-    if (FAILED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();  // Guard
+    // Cannot fail: object and key were checked before.
+    if (GUARDED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();
     if (FAILED(0 > (err = recDelete(jParam)))) return fail();
     return err;
 }

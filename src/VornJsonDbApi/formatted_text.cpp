@@ -29,6 +29,8 @@
 #include <stdexcept>
 #include <utility>
 
+namespace vorn {
+
 namespace {
 
 constexpr unsigned kMaxField = 4096;
@@ -39,7 +41,7 @@ constexpr std::size_t kLongText = 500'000'000;
 // Bytes that most value lists find enough.
 constexpr std::size_t kUsualList = 256;
 
-enum class TypeKind {
+enum class ConversionKind {
     kEnd,
     kSigned,
     kUnsigned,
@@ -55,34 +57,34 @@ struct Conversion {
     std::string strFormat;  // without its "*", with width and precision limited, "z" as "s"
     int iStars = 0;
     int iLongs = 0;
-    TypeKind type = TypeKind::kEnd;
+    ConversionKind type = ConversionKind::kEnd;
 };
 
-TypeKind typeKind(char cType)
+ConversionKind conversionKind(char cType)
 {
     switch (cType) {
     case 'd':
     case 'i':
-    case 'r': return TypeKind::kSigned;
+    case 'r': return ConversionKind::kSigned;
     case 'u':
     case 'x':
     case 'X':
-    case 'o': return TypeKind::kUnsigned;
-    case 'p': return TypeKind::kPointer;
-    case 'c': return TypeKind::kCharacter;
+    case 'o': return ConversionKind::kUnsigned;
+    case 'p': return ConversionKind::kPointer;
+    case 'c': return ConversionKind::kCharacter;
     case 'f':
     case 'e':
     case 'E':
     case 'g':
-    case 'G': return TypeKind::kFloat;
+    case 'G': return ConversionKind::kFloat;
     case 's':
     case 'z':
     case 'q':
     case 'Q':
-    case 'w': return TypeKind::kText;
-    case 'n': return TypeKind::kLength;
-    case '%': return TypeKind::kPercent;
-    default: return TypeKind::kEnd;
+    case 'w': return ConversionKind::kText;
+    case 'n': return ConversionKind::kLength;
+    case '%': return ConversionKind::kPercent;
+    default: return ConversionKind::kEnd;
     }
 }
 
@@ -91,7 +93,7 @@ bool isDigit(char c)
     return '0' <= c && c <= '9';
 }
 
-// Reads digits or a "*" at szText into the conversion and returns the first character behind them.
+// Reads digits or a "*" at szText into the conversion and returns the character that follows.
 const char* readField(const char* szText, Conversion& conversion)
 {
     if ('*' == *szText) {
@@ -106,7 +108,7 @@ const char* readField(const char* szText, Conversion& conversion)
     return szText;
 }
 
-// Reads the conversion behind a "%" and moves szText behind it.
+// Reads the conversion that follows a "%" and moves szText past it.
 Conversion readConversion(const char*& szText)
 {
     Conversion conversion;
@@ -121,8 +123,8 @@ Conversion readConversion(const char*& szText)
         conversion.strFormat += 'l';
         ++conversion.iLongs;
     }
-    conversion.type = typeKind(*szText);
-    if (TypeKind::kEnd == conversion.type) return conversion;
+    conversion.type = conversionKind(*szText);
+    if (ConversionKind::kEnd == conversion.type) return conversion;
     conversion.strFormat += 'z' == *szText ? 's' : *szText;
     ++szText;
     return conversion;
@@ -147,9 +149,9 @@ void append(std::string& strOut, const char* szFormat, Argument argument)
 void appendInteger(std::string& strOut, const Conversion& conversion, long long iValue)
 {
     const char* szFormat = conversion.strFormat.c_str();
-    if (TypeKind::kCharacter == conversion.type)
+    if (ConversionKind::kCharacter == conversion.type)
         return append(strOut, szFormat, static_cast<int>(iValue));
-    if (TypeKind::kPointer == conversion.type || 2 == conversion.iLongs)
+    if (ConversionKind::kPointer == conversion.type || 2 == conversion.iLongs)
         return append(strOut, szFormat, iValue);
     if (1 == conversion.iLongs) return append(strOut, szFormat, static_cast<long>(iValue));
     return append(strOut, szFormat, static_cast<int>(iValue));
@@ -160,15 +162,15 @@ void appendConversion(std::string& strOut, const Conversion& conversion,
 {
     const char* szFormat = conversion.strFormat.c_str();
     switch (conversion.type) {
-    case TypeKind::kSigned:
-    case TypeKind::kUnsigned:
-    case TypeKind::kPointer:
-    case TypeKind::kCharacter: return appendInteger(strOut, conversion, argument.iValue);
-    case TypeKind::kFloat: return append(strOut, szFormat, argument.dValue);
-    case TypeKind::kText: return append(strOut, szFormat, argument.szValue);
-    case TypeKind::kPercent: return append(strOut, szFormat, 0);
-    case TypeKind::kLength:
-    case TypeKind::kEnd: break;
+    case ConversionKind::kSigned:
+    case ConversionKind::kUnsigned:
+    case ConversionKind::kPointer:
+    case ConversionKind::kCharacter: return appendInteger(strOut, conversion, argument.iValue);
+    case ConversionKind::kFloat: return append(strOut, szFormat, argument.dValue);
+    case ConversionKind::kText: return append(strOut, szFormat, argument.szValue);
+    case ConversionKind::kPercent: return append(strOut, szFormat, 0);
+    case ConversionKind::kLength:
+    case ConversionKind::kEnd: break;
     }
 }
 
@@ -193,17 +195,17 @@ std::string formatText(const char* szText, FormatArgument value)
         if ('\0' == *szText) return strOut += '%';
 
         const Conversion conversion = readConversion(szText);
-        if (TypeKind::kEnd == conversion.type) return strOut;
+        if (ConversionKind::kEnd == conversion.type) return strOut;
         for (int i = 0; i < conversion.iStars; ++i) takeSlot();
         const FormatArgument argument =
-            TypeKind::kPercent == conversion.type ? FormatArgument() : takeSlot();
+            ConversionKind::kPercent == conversion.type ? FormatArgument() : takeSlot();
         appendConversion(strOut, conversion, argument);
         if (nLong < strOut.size()) {
             refuseTooLong(strOut);
             nLong = 2 * strOut.size();
         }
         // The character with the code 0 ends the text.
-        if (TypeKind::kCharacter == conversion.type && 0 == static_cast<int>(argument.iValue))
+        if (ConversionKind::kCharacter == conversion.type && 0 == static_cast<int>(argument.iValue))
             return strOut;
     }
 }
@@ -242,3 +244,5 @@ void FormattedText::appendValue(const char* szConversion, const FormatArgument& 
     }
     if (kLongText < strText_.size()) refuseTooLong(strText_);
 }
+
+}  // namespace vorn

@@ -5,6 +5,8 @@
 #include <string>
 #include <utility>
 
+namespace vorn {
+
 // A value and its kind, as SQLite's formatter takes it.
 struct FormatArgument {
     enum class Kind { kInteger, kFloat, kText };
@@ -19,14 +21,17 @@ struct FormatArgument {
     static FormatArgument text(const char* szValue) { return {Kind::kText, 0, 0, szValue}; }
 };
 
-// Kept: every value is appended as
+// Kept(FormattedLists.ReadAPercentSignAsAConversion): a `%` in a text is a conversion for every
+// later value
+//
+// Every value is appended as
 //
 //     text = sqlite3_mprintf(text + conversion, value)
 //
 // with the whole text so far, stored values included, as the format; so a "%" in an earlier value
 // is read as a conversion of its own by every later one. This class gives the same bytes wherever C
 // defines them, in linear time while the text holds no "%", and without reading arguments that were
-// never passed where it does. The rules stand in formatted_text.cpp.
+// never passed where it does. formatted_text.cpp has the rules.
 class FormattedText {
 public:
     explicit FormattedText(const std::string& strText);
@@ -45,3 +50,5 @@ private:
     std::string strText_;
     bool blPlain_;
 };
+
+}  // namespace vorn

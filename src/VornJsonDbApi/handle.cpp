@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/operation.h"
 #include "util/log.h"
 
 #include <VornJsonDbApi.h>
@@ -7,8 +7,7 @@
 #include <utility>
 
 // The constructor's argument checks are of the plain family, and construction goes on.
-#define REPORT(COND) \
-    if (COND) LOG_PLAIN("Failed [%s]", #COND)
+#define REPORT(COND) ((COND) ? LOG_PLAIN("Failed [%s]", #COND) : void())
 
 VornJsonDbApi::VornJsonDbApi(sqlite3* pDatabase, std::string& strTable, Json::Value& jDefinition,
                              std::string& strCreate)
@@ -39,6 +38,7 @@ void VornJsonDbApi::setErrMsg(std::string strMsg)
     strErrMsg = std::move(strMsg);
 }
 
+// Kept(Limits.DuplicateMessageStays): the duplicate message stays until the host clears it
 std::string VornJsonDbApi::getErrMsg()
 {
     return strErrMsg;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/operation.h"
 #include "VornJsonDbApi/row_decoder.h"
 #include "util/json_text.h"
 #include "util/log.h"
@@ -8,6 +8,7 @@
 
 #include <utility>
 
+using namespace vorn;
 using VORN_JSON_DB::jsonCopyMember;
 
 // SELECT a,b FROM t  WHERE  (a='x' ) order by 'a' LIMIT 1;
@@ -31,22 +32,25 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
     if (FAILED(0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit))) return fail();
     strSqlPrefix.reserve(kUsualStatement);
     strSqlPrefix += "SELECT ";
-    if (FAILED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();  // Guard: always 0
+    // Cannot fail: it always returns 0.
+    if (GUARDED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();
     strSqlRun = std::move(strSqlPrefix);
     strSqlRun.append(" FROM ").append(strName) += ' ';
-    // Kept: two blanks stand before WHERE.
+    // Kept(List.ComposesOneStatement, Delete.ComposesOneStatementAndCounts): there are two blanks
+    // before WHERE
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun.append(strSqlLimit) += ';';
     if (FAILED(0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut))) return fail();
     return 0;
 }
 
+// Kept(GetOne.ReadsEveryMatchAndDropsAllButTheFirst): a single fetch reads every match
 int VornJsonDbApi::recGetOne(Json::Value& jRecParam, Json::Value& jRecOut)
 {
     Json::Value jRecArray(Json::arrayValue);
     if (FAILED(0 > recList(jRecParam, jRecArray))) return -1;
     if (jRecArray.empty()) return 0;
-    // The row may be moved where nothing has to be merged.
+    // With nothing to merge, the row can be moved.
     Json::Value& jRow = *jRecArray.begin();
     if (jRecOut.empty() && !jRecOut.isArray() && !jRow.empty())
         jRecOut.swapPayload(jRow);

@@ -6,12 +6,14 @@
 
 #include <VornJsonDbApi.h>
 
+using namespace vorn;
+
 //  order by 'name' DESC LIMIT 10 OFFSET 20
 int VornJsonDbApi::SqlFilterConditionFromJson(Json::Value& jFilter, std::string& out)
 {
     if (FAILED(jFilter.type() != Json::objectValue && jFilter.type() != Json::nullValue)) return -1;
     if (const Json::Value* pjSortBy = findMember(jFilter, "sort_by")) {
-        // Kept: the key is written as a text literal, so that SQLite orders by a constant.
+        // Kept(Paging.WritesTheSortKeyAsATextLiteral): "sort_by" is a text literal
         const SqliteText szSql(sqlite3_mprintf(" order by '%q'", pjSortBy->asCString()));
         if (FAILED(!szSql)) return -1;
         out += szSql;

@@ -4,6 +4,7 @@
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/no_destructor.h"
 #include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
@@ -19,13 +20,15 @@
 #include <utility>
 #include <vector>
 
+namespace vorn {
+
 namespace {
 
 // What a column of the result becomes. Kept for the next statement, which checks it once.
 struct Column {
     std::string_view name = "";  // NOLINT(readability-redundant-string-init): NUL at its end
     std::string strType;
-    Decode decode = Decode::kNo;
+    RowForm form = RowForm::kNo;
     bool blChecked = false;
 };
 
@@ -33,7 +36,7 @@ struct Column {
 struct Source {
     std::size_t iColumn;
     const char* szName;
-    Decode decode;
+    RowForm form;
 };
 
 // A record with every column of the rows as a member, to be copied and filled in the order of its
@@ -41,7 +44,7 @@ struct Source {
 struct Prototype {
     Json::Value jRecord;
     std::vector<Source> sources;  // one for each column; empty until the columns are known
-    bool blUsable = false;        // unless a column cannot be decoded, or stands there twice
+    bool blUsable = false;        // unless a column cannot be decoded, or occurs twice
     bool blChecked = false;       // whether the columns have these types in the running statement
 };
 
@@ -59,24 +62,30 @@ struct State {
     bool blNewColumn = false;
 };
 
-// Made by the first statement, before any row. Never destroyed, and without an initialiser of its
-// own: a host's global handle may work before main begins and after it has ended.
-State* pState = nullptr;
+State& state()
+{
+    static NoDestructor<State> instance;
+    return *instance;
+}
 
 const Json::Value& memberTypes()
 {
-    // What is no object is asked for again, which logs.
-    if (nullptr == pState->pjMemberTypes || !pState->pjMemberTypes->isObject()) {
+    State& current = state();
+    // What is not an object is asked for again, which logs.
+    if (nullptr == current.pjMemberTypes || !current.pjMemberTypes->isObject()) {
+        // Kept(RowDecoder.SpoilsTheTypesOfATableThatNobodyAskedForBefore): a row that is decoded
+        // before anybody asked for the table's types poisons them
         Json::Value jTableDef;
-        pState->pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, pState->strCurJsonName);
+        current.pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, current.strCurJsonName);
     }
-    return *pState->pjMemberTypes;
+    return *current.pjMemberTypes;
 }
 
 // A copy of the name that is never released, so that all records can share it as their key.
 std::string_view sharedName(const char* szName)
 {
-    static auto& names = *new std::set<std::string, std::less<>>;
+    static NoDestructor<std::set<std::string, std::less<>>> instance;
+    auto& names = *instance;
     const auto it = names.find(std::string_view(szName));
     return *(names.end() == it ? names.emplace(szName).first : it);
 }
@@ -84,7 +93,8 @@ std::string_view sharedName(const char* szName)
 // The column at idx, or null, after the failed check's line, when the table has no such member.
 const Column* resolvedColumn(const char* szName, std::size_t idx)
 {
-    std::vector<Column>& columns = pState->columns;
+    State& current = state();
+    std::vector<Column>& columns = current.columns;
     if (columns.size() <= idx) columns.resize(idx + 1);
     Column& column = columns[idx];
     const bool blSameName = 0 == strcmp(column.name.data(), szName);
@@ -92,14 +102,14 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
 
     const Json::Value* pjMember = findMember(memberTypes(), szName);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strName)")) return nullptr;
-    std::string strType = typeWordOf(*pjMember);
+    std::string strType = TypeWord(*pjMember).text();
     if (!blSameName || strType != column.strType) {
-        pState->blNewColumn = true;
+        current.blNewColumn = true;
         column.blChecked = false;
-        pState->prototype.sources.clear();
-        pState->prototype.blUsable = false;
+        current.prototype.sources.clear();
+        current.prototype.blUsable = false;
         column.name = sharedName(szName);
-        column.decode = typeWord(strType).decode;
+        column.form = formsOf(strType).row;
         column.strType = std::move(strType);
     }
     column.blChecked = true;
@@ -127,29 +137,30 @@ int saturatedToInt(long long iValue)
 
 // Sets the member from the text of its column; a bool is false already. Inlined, since its call
 // costs as much as most of its ways.
-[[gnu::always_inline]] inline void decode(Decode way, const char* szValue, Json::Value& jMember)
+[[gnu::always_inline]] inline void decode(RowForm form, const char* szValue, Json::Value& jMember)
 {
     // Cheaper than an assignment, which moves comments and offsets too.
     const auto set = [&jMember](Json::Value jValue) { jMember.swapPayload(jValue); };
-    switch (way) {
-    case Decode::kText: set(szValue); break;
-    // Kept: unsigned words too are read through the signed conversions and saturate there.
-    case Decode::kInt32: set(saturatedToInt(integerOf(szValue))); break;
-    case Decode::kInt64: set(Json::Int64(integerOf(szValue))); break;
-    case Decode::kJson: fromString(szValue, jMember); break;
-    case Decode::kBool:
+    switch (form) {
+    case RowForm::kText: set(szValue); break;
+    // Kept(RowDecoder.HoldsIntegersAsSignedOnes): unsigned words are read through signed
+    // conversions and saturate
+    case RowForm::kInt32: set(saturatedToInt(integerOf(szValue))); break;
+    case RowForm::kInt64: set(Json::Int64(integerOf(szValue))); break;
+    case RowForm::kJson: fromString(szValue, jMember); break;
+    case RowForm::kBool:
+    case RowForm::kNo:  // which the caller has refused
         if (1 == integerOf(szValue)) set(true);
         break;
-    case Decode::kNo: break;  // Guard: the caller has refused it
     }
 }
 
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
 {
-    // Guard: the record is an object of our own.
-    if (FAILED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue))  // Guard
-        return -1;                                                                   // Guard
-    if (FAILED(0 > idx)) return -1;  // Guard: the loop begins at 0
+    // Cannot fail: the record is an object of our own.
+    if (GUARDED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue)) return -1;
+    // Cannot fail: the loop begins at 0.
+    if (GUARDED(0 > idx)) return -1;
     const Column* pColumn = resolvedColumn(column_name[idx], static_cast<std::size_t>(idx));
     if (nullptr == pColumn) return -1;
 
@@ -157,30 +168,33 @@ int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_val
     const char* szValue = column_value[idx];
     if (nullptr == szValue) return 0;
 
-    if (Decode::kNo == pColumn->decode) {
+    if (RowForm::kNo == pColumn->form) {
         LOG_ERROR("type error, strType=%s", pColumn->strType.c_str());
         return -1;
     }
     Json::Value& jMember = jRec[Json::StaticString(pColumn->name.data())];
-    if (Decode::kBool == pColumn->decode) jMember = false;
-    decode(pColumn->decode, szValue, jMember);
+    if (RowForm::kBool == pColumn->form) jMember = false;
+    decode(pColumn->form, szValue, jMember);
     return 0;
 }
 
 int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, char** column_name)
 {
     if (FAILED(NULL == column_name || NULL == column_value)) return -1;
+    const auto fail = [&](int i) {
+        // Kept(RowDecoder.ShowsTheFailedColumnUnlessItIsTheFirst): the first column of a bad row is
+        // not traced
+        if (0 < i) {
+            LOG_PLAIN("column_name[%d]=%s", i, column_name[i]);
+            LOG_PLAIN("column_value[%d]=%s", i, column_value[i]);
+        }
+        return -1;
+    };
     for (int i = 0; i < n_column; ++i) {
         int iTmp = 0;
-        if (FAILED(NULL == column_name[i]) ||
-                   FAILED(0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i)))) {
-            // Kept: the first column is not traced.
-            if (0 < i) {
-                LOG_PLAIN("column_name[%d]=%s", i, column_name[i]);
-                LOG_PLAIN("column_value[%d]=%s", i, column_value[i]);
-            }
-            return -1;
-        }
+        if (FAILED(NULL == column_name[i])) return fail(i);
+        if (FAILED(0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))))
+            return fail(i);
     }
     return 0;
 }
@@ -188,45 +202,39 @@ int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, cha
 // For rows whose columns were all looked up under these names.
 void makePrototype(std::size_t nColumns)
 {
-    const std::vector<Column>& columns = pState->columns;
+    const std::vector<Column>& columns = state().columns;
     Json::Value jRecord(Json::objectValue);
     std::vector<Source> sources;
     bool blDecoded = true;
     for (std::size_t i = 0; i < nColumns; ++i) {
         const Column& column = columns[i];
-        const bool blFalse = Decode::kBool == column.decode;
+        const bool blFalse = RowForm::kBool == column.form;
         jRecord[Json::StaticString(column.name.data())] =
             blFalse ? Json::Value(false) : Json::Value();
-        sources.push_back({i, column.name.data(), column.decode});
-        blDecoded = blDecoded && Decode::kNo != column.decode;
+        sources.push_back({i, column.name.data(), column.form});
+        blDecoded = blDecoded && RowForm::kNo != column.form;
     }
     std::sort(sources.begin(), sources.end(), [&columns](const Source& left, const Source& right) {
         return columns[left.iColumn].name < columns[right.iColumn].name;
     });
-    Prototype& prototype = pState->prototype;
+    Prototype& prototype = state().prototype;
     prototype.blUsable = blDecoded && jRecord.size() == nColumns;
     prototype.blChecked = true;
     prototype.jRecord.swap(jRecord);
     prototype.sources.swap(sources);
 }
 
-bool hasTypeWord(const Json::Value* pjMember, const std::string& strType)
-{
-    if (nullptr == pjMember) return false;
-    const Json::Value* pjWord = typeWordValue(*pjMember);
-    return nullptr != pjWord && textOf(*pjWord) == strType;
-}
-
 // Whether the columns still have the types that they had in an earlier statement. Neither logs nor
 // throws: in doubt the row is filled by name, which does.
 bool haveSameTypes()
 {
-    State& state = *pState;
-    if (nullptr == state.pjMemberTypes) return false;
-    MemberWalk types(*state.pjMemberTypes);
-    for (const Source& source : state.prototype.sources) {
-        Column& column = state.columns[source.iColumn];
-        if (!hasTypeWord(types.find(column.name), column.strType)) return false;
+    State& current = state();
+    if (nullptr == current.pjMemberTypes) return false;
+    MemberWalk types(*current.pjMemberTypes);
+    for (const Source& source : current.prototype.sources) {
+        Column& column = current.columns[source.iColumn];
+        const Json::Value* pjMember = types.find(column.name);
+        if (nullptr == pjMember || !TypeWord(*pjMember).is(column.strType)) return false;
         column.blChecked = true;
     }
     return true;
@@ -235,7 +243,7 @@ bool haveSameTypes()
 // Whether the row has the prototype's columns, each with a value.
 bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name)
 {
-    Prototype& prototype = pState->prototype;
+    Prototype& prototype = state().prototype;
     if (!prototype.blUsable || prototype.sources.size() != nColumns || nullptr == column_name ||
         nullptr == column_value)
         return false;
@@ -252,16 +260,18 @@ bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name
 // The prototype has one column at least.
 Json::Value recordFromPrototype(char** column_value)
 {
-    const Prototype& prototype = pState->prototype;
+    const Prototype& prototype = state().prototype;
     Json::Value jRec = prototype.jRecord;
     const Source* pSource = prototype.sources.data();
     const Source* const pEnd = pSource + prototype.sources.size();
     for (auto it = jRec.begin();; ++it) {
-        decode(pSource->decode, column_value[pSource->iColumn], *it);
+        decode(pSource->form, column_value[pSource->iColumn], *it);
         if (++pSource == pEnd) return jRec;
     }
 }
 
+// Kept(RowDecoder.AppendsTheRowsOfEveryAttempt, RowDecoder.KeepsTheRowsBeforeAFailure): arrays are
+// appended to, also by every retried attempt, and keep the rows before a failure
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
 {
     if (FAILED(!pjRecArray)) return -1;
@@ -272,11 +282,12 @@ int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** 
         pjRecArray->append(recordFromPrototype(column_value));
         return 0;
     }
+    State& current = state();
     Json::Value jTmp(Json::objectValue);
-    pState->blNewColumn = false;
+    current.blNewColumn = false;
     if (FAILED(0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name))) return -1;
     pjRecArray->append(std::move(jTmp));
-    if (!pState->blNewColumn && pState->prototype.sources.size() != nColumns)
+    if (!current.blNewColumn && current.prototype.sources.size() != nColumns)
         makePrototype(nColumns);
     return 0;
 }
@@ -288,24 +299,25 @@ int DbCallBackFillList(void* arg, int n_column, char** column_value, char** colu
     try {
         return fillList(static_cast<Json::Value*>(arg), n_column, column_value, column_name);
     } catch (...) {
-        pState->pThrownInCallback = std::current_exception();
+        state().pThrownInCallback = std::current_exception();
         return -1;
     }
 }
 
 void beginStatement(const std::string& strTable)
 {
-    if (nullptr == pState) pState = new State;
-    State& state = *pState;
-    if (state.strCurJsonName != strTable) {
-        state.pjMemberTypes = nullptr;
-        state.strCurJsonName = strTable;
+    State& current = state();
+    if (current.strCurJsonName != strTable) {
+        current.pjMemberTypes = nullptr;
+        current.strCurJsonName = strTable;
     }
-    state.prototype.blChecked = false;
-    for (Column& column : state.columns) column.blChecked = false;
+    current.prototype.blChecked = false;
+    for (Column& column : current.columns) column.blChecked = false;
 }
 
 std::exception_ptr takeThrown()
 {
-    return std::exchange(pState->pThrownInCallback, nullptr);
+    return std::exchange(state().pThrownInCallback, nullptr);
 }
+
+}  // namespace vorn

@@ -5,6 +5,8 @@
 #include <exception>
 #include <string>
 
+namespace vorn {
+
 // The row callback of sqlite3_exec: decodes the row into an object, typed by the member types of
 // the table whose statement is running, and appends it to the Json::Value array that arg points to.
 // Returns 0, or -1 to stop the statement. What is thrown inside is kept for takeThrown().
@@ -15,3 +17,5 @@ void beginStatement(const std::string& strTable);
 
 // What was thrown in the row callback since the last call, or null.
 std::exception_ptr takeThrown();
+
+}  // namespace vorn

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/operation.h"
 #include "VornJsonDbApi/row_decoder.h"
 #include "util/json_text.h"
 #include "util/log.h"
@@ -7,6 +7,8 @@
 #include <VornJsonDbApi.h>
 
 #include <utility>
+
+using namespace vorn;
 
 // INSERT INTO t (a,b) VALUES (1,'x') ;select * from t where rowid == last_insert_rowid();
 int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
@@ -23,16 +25,18 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
 
     strSql.reserve(kUsualStatement);
     strSql.append(blCreate ? "INSERT INTO " : "REPLACE INTO ").append(strName).append(" (");
-    if (FAILED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();  // Guard: always 0
+    // Cannot fail: it always returns 0.
+    if (GUARDED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();
     strSql += ") VALUES (";
     if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
     strSql.append(";select * from ").append(strName).append(" where rowid == last_insert_rowid();");
-    if (FAILED(strSql.empty())) return fail();  // Guard: it has its verb
+    // Cannot fail: the text begins with its verb.
+    if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp))) return fail();
-    if (!strSqlError.empty()) {                          // Guard: a run that succeeds empties it
-        LOG_ERROR("sql error, sql=%s", strSql.c_str());  // Guard
-        return fail();                                   // Guard
-    }
+    // Cannot fail: a run that succeeds empties the error text.
+    if (GUARDED_SQL("sql error, sql=%s", strSql.c_str())) return fail();
+    // Kept(Save.FailsWhereTheRowCannotBeReadThoughItIsWritten): a write whose row cannot be read
+    // back fails and stays written
     if (FAILED(0 == jArrayTmp.size())) return fail();
 
     jRecInOut = std::move(*jArrayTmp.begin());
@@ -43,7 +47,9 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
 {
     // What runs inside the statement may change or destroy the host's record: it is read no more.
     Json::Value jParam = jRecIn;
-    // Kept: the text of an earlier failure counts too, also where this call ran no SQL.
+    // Kept(Create.TellsAnEarlierDuplicateAgain,
+    // UpdateDuplicate.AnEarlierDuplicateCountsForEveryFailureWithoutSql): an earlier duplicate
+    // counts for a later failure without SQL
     const auto fail = [&] {
         LOG_PLAIN("call create rec, rec=%s", toString(jParam).c_str());
         if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;
@@ -51,7 +57,8 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
     };
 
     if (FAILED(jRecIn.empty())) return fail();
-    if (FAILED(0 > fillDefaultValue(jParam, false))) return fail();  // Guard: always 0
+    // Cannot fail: filling always returns 0.
+    if (GUARDED(0 > fillDefaultValue(jParam, false))) return fail();
     if (FAILED(0 > checkJsonType(jParam))) return fail();
     if (FAILED(0 > recSave(jParam, true))) return fail();
     jRecOut = std::move(jParam);

@@ -1,21 +1,23 @@
 // SPDX-License-Identifier: MIT
-#include "VornJsonDbApi/execution.h"
+#include "VornJsonDbApi/operation.h"
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
 
 #include <VornJsonDbApi.h>
 
+using namespace vorn;
+
 // UPDATE t SET a='x' , b=1 WHERE  (id=1 );
 int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWhere)
 {
     std::string strSql;
     std::string strSql2;
-    // A raw filter in the same object is no column.
+    // A raw filter in the same object is not a column.
     Json::Value jWithoutFilter;
-    if (hasMember(jRecIn, "vornSqlWhereFilter")) {
+    if (hasMember(jRecIn, kRawFilterKey)) {
         jWithoutFilter = jRecIn;
-        jWithoutFilter.removeMember("vornSqlWhereFilter");
+        jWithoutFilter.removeMember(kRawFilterKey);
     }
     Json::Value& jColumnList = jWithoutFilter.isNull() ? jRecIn : jWithoutFilter;
     const auto fail = [&] {
@@ -31,19 +33,18 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
     if (FAILED(0 > SqlExpandMemberList(jColumnList, strSql2, VORN_SQL_WHERE_TYPE_COMMA)))
         return fail();
     strSql.append(strSql2).append(" WHERE ").append(strSqlWhere).append(";");
-    if (FAILED(strSql.empty())) return fail();  // Guard: it has its verb
+    // Cannot fail: the text begins with its verb.
+    if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, NULL, NULL))) return fail();
-    if (!strSqlError.empty()) {  // Guard: a run that succeeds empties it
-        LOG_ERROR("sql error msg=%s, sql=%s", strSqlError.c_str(), strSql.c_str());  // Guard
-        return fail();                                                               // Guard
-    }
+    // Cannot fail: a run that succeeds empties the error text.
+    if (GUARDED_SQL("sql error msg=%s, sql=%s", strSqlError.c_str(), strSql.c_str())) return fail();
     return 0;
 }
 
 int VornJsonDbApi::recUpdateByFilter(Json::Value& jFilterIn, Json::Value& jParamIn)
 {
     std::string strSql;
-    // Kept: the text of an earlier failure counts too, also where this call ran no SQL.
+    // The text of an earlier failure counts too, as in recCreate.
     const auto fail = [&] {
         LOG_PLAIN("recUpdateByFilter failed, jParamIn=%s", toString(jParamIn).c_str());
         if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;

@@ -6,19 +6,21 @@
 
 #include <VornJsonDbApi.h>
 
+using namespace vorn;
+
 namespace {
 
-bool passes(Check check, const Json::Value& jValue)
+bool isOfKind(CheckedKind kind, const Json::Value& jValue)
 {
-    switch (check) {
-    case Check::kIntegral: return jValue.isIntegral();
-    case Check::kBool: return jValue.isBool();
-    case Check::kString: return jValue.isString();
-    case Check::kArray: return jValue.isArray();
-    case Check::kObject: return jValue.isObject();
-    case Check::kNo: break;  // Guard: asked of known words only
+    switch (kind) {
+    case CheckedKind::kIntegral: return jValue.isIntegral();
+    case CheckedKind::kBool: return jValue.isBool();
+    case CheckedKind::kString: return jValue.isString();
+    case CheckedKind::kArray: return jValue.isArray();
+    case CheckedKind::kObject: return jValue.isObject();
+    case CheckedKind::kNo: break;
     }
-    return false;  // Guard
+    return false;
 }
 
 }  // namespace
@@ -53,16 +55,14 @@ int VornJsonDbApi::checkJsonType(Json::Value& jRecParam)
         const std::string_view strKey = memberName(it);
         const Json::Value* pjMember = types.find(strKey);
         if (nullptr == pjMember) continue;
-        const Check check = typeWordRow(*pjMember).check;
-        if (Check::kNo == check) {
+        const CheckedKind kind = TypeWord(*pjMember).forms().checked;
+        if (isOfKind(kind, *it)) continue;
+        if (CheckedKind::kNo == kind)
             LOG_ERROR("type not found!!, key=%s", std::string(strKey).c_str());
-            return -1;
-        }
-        if (!passes(check, *it)) {
+        else
             LOG_ERROR("type failed, strKey=%s, jRecParam=%s", std::string(strKey).c_str(),
                       toString(jRecParam).c_str());
-            return -1;
-        }
+        return -1;
     }
     return 0;
 }

@@ -7,6 +7,8 @@
 
 #include <VornJsonDbApi.h>
 
+using namespace vorn;
+
 namespace {
 
 bool mayHoldMembers(const Json::Value& jValue)
@@ -14,8 +16,9 @@ bool mayHoldMembers(const Json::Value& jValue)
     return jValue.isNull() || jValue.isObject();
 }
 
-// The members that the definition declares for the table, an object or null. Kept: a table or
-// "member" that is missing is inserted as null, and later log lines show it.
+// The members that the definition declares for the table, an object or null.
+// Kept(ValueListTypes.InsertWhatTheDefinitionLacks): the list functions insert a missing table or
+// "member" into the handle's definition
 const Json::Value& declaredMembers(Json::Value& jTableDef, const std::string& strName)
 {
     if (!mayHoldMembers(jTableDef)) return Json::Value::nullSingleton();
@@ -28,30 +31,30 @@ const Json::Value& declaredMembers(Json::Value& jTableDef, const std::string& st
 // Appends one member's value as an SQL literal; false when its type word has none.
 bool appendLiteral(FormattedText& text, const Json::Value& jMember, const Json::Value& jValue)
 {
-    switch (typeWordRow(jMember).value) {
-    case Value::kText:
+    switch (TypeWord(jMember).forms().literal) {
+    case LiteralForm::kText:
         text.appendValue("%Q", FormatArgument::text(jValue.asString().c_str()));
         return true;
-    case Value::kSigned:
+    case LiteralForm::kSigned:
         text.appendValue("%lld", FormatArgument::integer(jValue.asInt64()));
         return true;
-    case Value::kUnsigned:
+    case LiteralForm::kUnsigned:
         text.appendValue("%llu",
                          FormatArgument::integer(static_cast<long long>(jValue.asUInt64())));
         return true;
-    case Value::kFloat: {
+    case LiteralForm::kFloat: {
         // Stored, since a function of i386 returns more digits than a float has.
         const volatile float fValue = jValue.asFloat();
         text.appendValue("%f", FormatArgument::floating(static_cast<double>(fValue)));
         return true;
     }
-    case Value::kDouble:
+    case LiteralForm::kDouble:
         text.appendValue("%lf", FormatArgument::floating(jValue.asDouble()));
         return true;
-    case Value::kJson:
+    case LiteralForm::kJson:
         text.appendValue("%Q", FormatArgument::text(toString(jValue).c_str()));
         return true;
-    case Value::kNo: break;
+    case LiteralForm::kNo: break;
     }
     return false;
 }
@@ -68,8 +71,8 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
         const std::string_view strKey = memberName(it);
         if (nullptr != rec && nullptr == values.find(strKey)) continue;
         sql += strKey;
-        // Kept: the place in the definition decides, so a record without the last member ends in
-        // ",".
+        // The place in the definition decides. Kept(Save.RefusesListsThatDoNotClose): a record
+        // without the last declared member gives a list that does not close
         if (0 < nLeft) sql += ',';
     }
     return 0;
@@ -92,7 +95,7 @@ int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
         if (nullptr == pjValue) continue;
 
         if (!appendLiteral(text, *pjMember, *pjValue)) {
-            LOG_ERROR("cannot support this type=%s", typeWordOf(*pjMember).c_str());
+            LOG_ERROR("cannot support this type=%s", TypeWord(*pjMember).text().c_str());
             return -1;
         }
         text.append(0 < nLeft ? "," : ") ");

@@ -8,7 +8,9 @@
 #include <string>
 #include <string_view>
 
-// The member, or null where there is none.
+namespace vorn {
+
+// The member, or null if there is none.
 inline const Json::Value* findMember(const Json::Value& jValue, std::string_view strKey)
 {
     return jValue.isObject() ? jValue.find(strKey.data(), strKey.data() + strKey.size()) : nullptr;
@@ -43,7 +45,7 @@ public:
         nLeft_ = jValue.size();
     }
 
-    // The member, or null where there is none.
+    // The member, or null if there is none.
     const Json::Value* find(std::string_view strKey)
     {
         while (0 < nLeft_) {
@@ -72,28 +74,4 @@ inline std::string_view textOf(const Json::Value& jString)
     return {szBegin, static_cast<std::size_t>(szEnd - szBegin)};
 }
 
-// "cpptype" of a member as the cache of member types holds it, or null where there is none. It is
-// the last by name, as far as the library fills the cache, and is looked at before a search.
-inline const Json::Value* typeWordValue(const Json::Value& jMember)
-{
-    const Json::ArrayIndex nMembers = jMember.size();
-    if (0 == nMembers) return nullptr;
-    const auto last = 1 == nMembers ? jMember.begin() : --jMember.end();
-    return "cpptype" == memberName(last) ? &*last : findMember(jMember, "cpptype");
-}
-
-// The type word of a member, empty where there is none. A host may have put something else than a
-// text there: its text is then in strBuffer.
-inline std::string_view typeWordView(const Json::Value& jMember, std::string& strBuffer)
-{
-    const Json::Value* pjWord = typeWordValue(jMember);
-    if (nullptr == pjWord) return {};
-    if (pjWord->isString()) return textOf(*pjWord);
-    return strBuffer = pjWord->asString();
-}
-
-inline std::string typeWordOf(const Json::Value& jMember)
-{
-    std::string strBuffer;
-    return std::string(typeWordView(jMember, strBuffer));
-}
+}  // namespace vorn

@@ -10,6 +10,8 @@
 #include <cstdio>
 #include <cstdlib>
 
+namespace vorn {
+
 LogLine::LogLine(Family family, const char* szComponent, int iLine)
     : family_(family), szComponent_(szComponent), iLine_(iLine), iErrno_(errno)
 {
@@ -30,7 +32,7 @@ void LogLine::write(const char* szFormat, ...)
     va_end(arguments);
     if (0 > iLength) return;
 
-    // Kept: the error family repeats its location, and hosts parse lines by these exact forms.
+    // Kept(Log.OnStandardOutputHasTheseForms): lines of the error family repeat their location
     const unsigned uPid = static_cast<unsigned>(getpid());
     errno = iErrno_;
     switch (family_) {
@@ -56,3 +58,5 @@ void LogLine::write(const char* szFormat, ...)
     }
     free(szMessage);
 }
+
+}  // namespace vorn

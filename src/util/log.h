@@ -6,15 +6,21 @@
 // The text is taken here, at the outermost macro: one macro deeper, NULL would turn into __null.
 #define FAILED(COND) FAILED_AS(COND, #COND)
 
-// For a check whose code has to differ from its text.
+// For a check whose code differs from its text. The text is part of what hosts read and may name
+// code that is gone.
 #define FAILED_AS(COND, TEXT) \
-    ((COND) ? (logFailed(VORN_LOG_COMPONENT, __LINE__, TEXT), true) : false)
+    ((COND) ? (vorn::logFailed(VORN_LOG_COMPONENT, __LINE__, TEXT), true) : false)
+
+// A check that nothing outside the library can make fail. The line above says why.
+#define GUARDED(COND) FAILED_AS(COND, #COND)
 
 // One line of the error family, or of the plain family. VORN_LOG_COMPONENT is set by the build.
 #define LOG_ERROR(...) \
-    LogLine(LogLine::Family::kError, VORN_LOG_COMPONENT, __LINE__).write(__VA_ARGS__)
+    vorn::LogLine(vorn::LogLine::Family::kError, VORN_LOG_COMPONENT, __LINE__).write(__VA_ARGS__)
 #define LOG_PLAIN(...) \
-    LogLine(LogLine::Family::kPlain, VORN_LOG_COMPONENT, __LINE__).write(__VA_ARGS__)
+    vorn::LogLine(vorn::LogLine::Family::kPlain, VORN_LOG_COMPONENT, __LINE__).write(__VA_ARGS__)
+
+namespace vorn {
 
 // Made before the arguments of write() are rendered, so that the line shows the errno of the check;
 // destroyed after them, so that the line leaves errno as it was.
@@ -42,3 +48,5 @@ inline void logFailed(const char* szComponent, int iLine, const char* szConditio
 {
     LogLine(LogLine::Family::kError, szComponent, iLine).write("Failed [%s], err=%m", szCondition);
 }
+
+}  // namespace vorn

@@ -2,12 +2,25 @@
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/no_destructor.h"
 
 #include <VornJsonDbApi.h>
 
 #include <utility>
 
+using namespace vorn;
+
 namespace {
+
+// The member types of every table that was asked for.
+// Kept(MemberTypes.OfTheFirstDefinitionHoldForEveryHandle): the first definition under a table name
+// wins
+struct Cache {
+    Json::Value jType;
+    // The entry that was asked for last: an operation asks for the same one several times.
+    std::string strLastName;
+    Json::Value* pjLast = nullptr;
+};
 
 // False, after the failed check's line, when jTableDef does not define the members of a table.
 bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
@@ -18,7 +31,8 @@ bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
     if (FAILED(!jTableDef[strJsonName].isObject())) return false;
     if (FAILED(!jTableDef[strJsonName].isMember("member"))) return false;
     if (FAILED(!jTableDef[strJsonName]["member"].isObject())) return false;
-    // Kept: the name is looked at last.
+    // Kept(FirstMemberTypes.OfAnEmptyNameFailAfterTheLookUps): an empty table name is refused only
+    // after the look-ups
     return !FAILED(strJsonName.empty());
 }
 
@@ -43,8 +57,9 @@ bool readMembers(Json::Value& jTableDef, std::string& strJsonName, Json::Value& 
     return true;
 }
 
-// Fills the table's entry. Kept: the members before a bad one stay, and nothing completes them
-// later.
+// Fills the table's entry.
+// Kept(MemberTypes.OfABadDefinitionAreReportedAndStayAsTheyAre): a bad definition leaves a null or
+// partial entry for the life of the process
 bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jType)
 {
     if (!definesTable(jTableDef, strJsonName)) return false;
@@ -55,36 +70,39 @@ bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jT
     return !FAILED(jType == Json::nullValue || !jType.isMember(strJsonName));
 }
 
-// The entry that was asked for last: an operation asks for the same one several times.
-struct LastEntry {
-    std::string strName;
-    Json::Value* pjEntry = nullptr;
-};
+// The table's entry, filled where it is new; null, after the failed check's line, when there is no
+// usable one.
+Json::Value* findEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jType)
+{
+    Json::Value* pjEntry = findMember(jType, strJsonName);
+    if (nullptr == pjEntry) {
+        if (!fillEntry(jTableDef, strJsonName, jType)) return nullptr;
+        pjEntry = findMember(jType, strJsonName);
+    }
+    if (FAILED_AS(pjEntry->type() != Json::objectValue,
+                  "jType[strJsonName].type() != Json::objectValue"))
+        return nullptr;
+    return pjEntry;
+}
 
 }  // namespace
 
 Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonName)
 {
-    // Never destroyed: references to its entries stay valid until the process ends.
-    static Json::Value& jType = *new Json::Value;
-    static LastEntry& last = *new LastEntry;
-    if (nullptr != last.pjEntry && last.strName == strJsonName && last.pjEntry->isObject())
-        return *last.pjEntry;
+    static NoDestructor<Cache> instance;
+    Cache& cache = *instance;
+    if (nullptr != cache.pjLast && cache.strLastName == strJsonName && cache.pjLast->isObject())
+        return *cache.pjLast;
 
-    Json::Value* pjEntry = findMember(jType, strJsonName);
-    if (nullptr == pjEntry && fillEntry(jTableDef, strJsonName, jType))
-        pjEntry = findMember(jType, strJsonName);
-    if (nullptr != pjEntry &&
-        !FAILED_AS(pjEntry->type() != Json::objectValue,
-                                         "jType[strJsonName].type() != Json::objectValue")) {
-        last.strName = strJsonName;
-        last.pjEntry = pjEntry;
+    Json::Value& jType = cache.jType;
+    if (Json::Value* pjEntry = findEntry(jTableDef, strJsonName, jType)) {
+        cache.strLastName = strJsonName;
+        cache.pjLast = pjEntry;
         return *pjEntry;
     }
-
     LOG_PLAIN("strJsonName=%s", strJsonName.c_str());
     LOG_PLAIN("jTableDef=%s", toString(jTableDef).c_str());
     LOG_PLAIN("jType=%s", toString(jType).c_str());
-    // Kept: a name that was absent gets a null entry, which stays.
+    // A name that was absent gets a null entry, which stays.
     return jType[strJsonName];
 }

@@ -4,7 +4,9 @@
 
 #include <sqlite3.h>
 
-// Assignable from sqlite3_mprintf and comparable with NULL, so that a check can stand in the code
+namespace vorn {
+
+// Assignable from sqlite3_mprintf and comparable with NULL, so that the code of a check reads
 // just as it is logged.
 class SqliteText {
 public:
@@ -33,3 +35,5 @@ public:
 private:
     char* szText_ = nullptr;
 };
+
+}  // namespace vorn

@@ -18,6 +18,9 @@ static_assert(sizeof(long) <= sizeof(time_t));
 
 int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, long& now)
 {
+    // Kept(TimeAfterNow.DoesNotLookWhetherTheClockFails): a clock that fails counts as the second
+    // before the epoch
+    //
     // Beyond a long, as after 2038 where it has 32 bits, the sum wraps.
     __builtin_add_overflow(time(NULL), offsetSecond, &now);
     return 0;
@@ -38,7 +41,7 @@ int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, i
             return -1;
     }
     if (iType & kGmtLayout) {
-        // Kept: local time too is followed by the letters GMT.
+        // Kept(TimeText.EveryBitSet): local time too may be followed by the letters GMT
         if (FAILED(0 == strftime(szTime, sizeof(szTime), "%a, %d %b %Y %T GMT", &sTime))) return -1;
     } else if (iType & kNumericLayout) {
         if (FAILED(0 == strftime(szTime, sizeof(szTime), "%Y-%m-%d %H:%M:%S", &sTime))) return -1;
@@ -53,7 +56,8 @@ int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, i
 int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, std::string& strOut, int iType)
 {
     long now = 0;
-    if (FAILED(0 > getTimeAfterNow(offsetSecond, now))) return -1;  // Guard: always 0
+    // Cannot fail: it always returns 0.
+    if (GUARDED(0 > getTimeAfterNow(offsetSecond, now))) return -1;
     if (FAILED(0 > convert2ReadableTime(now, strOut, iType))) return -1;
     return 0;
 }

@@ -4,63 +4,96 @@
 
 #include "util/json_members.h"
 
+#include <string>
 #include <string_view>
 
+namespace vorn {
+
 // How a column of a result row becomes a member.
-enum class Decode { kNo, kText, kInt32, kInt64, kBool, kJson };
+enum class RowForm { kNo, kText, kInt32, kInt64, kBool, kJson };
 // How a member is written in the value list of INSERT and REPLACE.
-enum class Value { kNo, kText, kSigned, kUnsigned, kFloat, kDouble, kJson };
+enum class LiteralForm { kNo, kText, kSigned, kUnsigned, kFloat, kDouble, kJson };
 // How a member is written in an equality term. A membership list knows only text and JSON words and
 // writes the rest bare, "bool" too.
-enum class Term { kText, kJson, kBool, kBare };
+enum class TermForm { kText, kJson, kBool, kBare };
 // Which kind of JSON value the type check asks for.
-enum class Check { kNo, kIntegral, kBool, kString, kArray, kObject };
+enum class CheckedKind { kNo, kIntegral, kBool, kString, kArray, kObject };
 
-struct TypeWord {
+struct TypeForms {
     std::string_view strWord;
-    Decode decode;
-    Value value;
-    Term term;
-    Check check;
+    RowForm row;
+    LiteralForm literal;
+    TermForm term;
+    CheckedKind checked;
 };
 
-// Kept: each consumer knows words of its own, and the gaps are part of what hosts rely on (a
-// "double" can be written but not read back, a "Json::Value" the other way round).
+// Kept(ValueLists.RefuseEveryOtherWord, RowDecoder.RefusesAValueOfAnyOtherType,
+// TypeCheck.KnowsNoOtherWord): each consumer knows type words of its own: a "double" is written and
+// not read back, a "Json::Value" read and not written
 // clang-format off
-inline constexpr TypeWord kTypeWords[] = {
-    //  word               decode a row     value list        condition    type check
-    {"string",             Decode::kText,   Value::kText,     Term::kText, Check::kString  },
-    {"int",                Decode::kInt32,  Value::kSigned,   Term::kBare, Check::kIntegral},
-    {"unsigned int",       Decode::kInt32,  Value::kUnsigned, Term::kBare, Check::kNo      },
-    {"unsigned",           Decode::kNo,     Value::kUnsigned, Term::kBare, Check::kNo      },
-    {"long",               Decode::kNo,     Value::kSigned,   Term::kBare, Check::kNo      },
-    {"unsigned long",      Decode::kNo,     Value::kUnsigned, Term::kBare, Check::kNo      },
-    {"long long",          Decode::kInt64,  Value::kSigned,   Term::kBare, Check::kIntegral},
-    {"unsigned long long", Decode::kInt64,  Value::kUnsigned, Term::kBare, Check::kNo      },
-    {"float",              Decode::kNo,     Value::kFloat,    Term::kBare, Check::kNo      },
-    {"double",             Decode::kNo,     Value::kDouble,   Term::kBare, Check::kNo      },
-    {"bool",               Decode::kBool,   Value::kSigned,   Term::kBool, Check::kBool    },
-    {"Json::Value",        Decode::kJson,   Value::kNo,       Term::kJson, Check::kNo      },
-    {"Json::objectValue",  Decode::kJson,   Value::kJson,     Term::kJson, Check::kObject  },
-    {"Json::arrayValue",   Decode::kJson,   Value::kJson,     Term::kJson, Check::kArray   },
-    {"uid_t",              Decode::kNo,     Value::kNo,       Term::kBare, Check::kIntegral},
-    {"time_t",             Decode::kNo,     Value::kNo,       Term::kBare, Check::kIntegral},
+inline constexpr TypeForms kTypeWords[] = {
+    //  word               a row            a value list            a condition      the type check
+    {"string",             RowForm::kText,  LiteralForm::kText,     TermForm::kText, CheckedKind::kString  },
+    {"int",                RowForm::kInt32, LiteralForm::kSigned,   TermForm::kBare, CheckedKind::kIntegral},
+    {"unsigned int",       RowForm::kInt32, LiteralForm::kUnsigned, TermForm::kBare, CheckedKind::kNo      },
+    {"unsigned",           RowForm::kNo,    LiteralForm::kUnsigned, TermForm::kBare, CheckedKind::kNo      },
+    {"long",               RowForm::kNo,    LiteralForm::kSigned,   TermForm::kBare, CheckedKind::kNo      },
+    {"unsigned long",      RowForm::kNo,    LiteralForm::kUnsigned, TermForm::kBare, CheckedKind::kNo      },
+    {"long long",          RowForm::kInt64, LiteralForm::kSigned,   TermForm::kBare, CheckedKind::kIntegral},
+    {"unsigned long long", RowForm::kInt64, LiteralForm::kUnsigned, TermForm::kBare, CheckedKind::kNo      },
+    {"float",              RowForm::kNo,    LiteralForm::kFloat,    TermForm::kBare, CheckedKind::kNo      },
+    {"double",             RowForm::kNo,    LiteralForm::kDouble,   TermForm::kBare, CheckedKind::kNo      },
+    {"bool",               RowForm::kBool,  LiteralForm::kSigned,   TermForm::kBool, CheckedKind::kBool    },
+    {"Json::Value",        RowForm::kJson,  LiteralForm::kNo,       TermForm::kJson, CheckedKind::kNo      },
+    {"Json::objectValue",  RowForm::kJson,  LiteralForm::kJson,     TermForm::kJson, CheckedKind::kObject  },
+    {"Json::arrayValue",   RowForm::kJson,  LiteralForm::kJson,     TermForm::kJson, CheckedKind::kArray   },
+    {"uid_t",              RowForm::kNo,    LiteralForm::kNo,       TermForm::kBare, CheckedKind::kIntegral},
+    {"time_t",             RowForm::kNo,    LiteralForm::kNo,       TermForm::kBare, CheckedKind::kIntegral},
 };
+inline constexpr TypeForms kUnknownWord =
+    {"",                   RowForm::kNo,    LiteralForm::kNo,       TermForm::kBare, CheckedKind::kNo      };
 // clang-format on
 
-inline constexpr TypeWord kUnknownWord = {"", Decode::kNo, Value::kNo, Term::kBare, Check::kNo};
-
-// The row of a type word. Words are compared whole and case-sensitively.
-inline const TypeWord& typeWord(std::string_view strWord)
+// Words are compared whole and case-sensitively.
+inline const TypeForms& formsOf(std::string_view strWord)
 {
-    for (const TypeWord& row : kTypeWords)
-        if (row.strWord == strWord) return row;
+    for (const TypeForms& forms : kTypeWords)
+        if (forms.strWord == strWord) return forms;
     return kUnknownWord;
 }
 
-// The row of a member's type word as the cache of member types holds it.
-inline const TypeWord& typeWordRow(const Json::Value& jMember)
-{
-    std::string strBuffer;
-    return typeWord(typeWordView(jMember, strBuffer));
-}
+// The type word of a member as the cache of member types holds it; empty if there is none.
+class TypeWord {
+public:
+    explicit TypeWord(const Json::Value& jMember) : pjWord_(find(jMember)) {}
+
+    // A host may have put something other than a text there: it is converted, or jsoncpp throws.
+    std::string text() const { return nullptr == pjWord_ ? std::string() : pjWord_->asString(); }
+
+    const TypeForms& forms() const
+    {
+        const bool blText = nullptr != pjWord_ && pjWord_->isString();
+        return blText ? formsOf(textOf(*pjWord_)) : formsOf(text());
+    }
+
+    // Whether it is that text. Never throws.
+    bool is(std::string_view strWord) const
+    {
+        return nullptr != pjWord_ && textOf(*pjWord_) == strWord;
+    }
+
+private:
+    // "cpptype" is the last member by name, as far as the library fills the cache, so that one is
+    // looked at before a search.
+    static const Json::Value* find(const Json::Value& jMember)
+    {
+        const Json::ArrayIndex nMembers = jMember.size();
+        if (0 == nMembers) return nullptr;
+        const auto last = 1 == nMembers ? jMember.begin() : --jMember.end();
+        return "cpptype" == memberName(last) ? &*last : findMember(jMember, "cpptype");
+    }
+
+    const Json::Value* pjWord_;
+};
+
+}  // namespace vorn

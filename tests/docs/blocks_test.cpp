@@ -24,7 +24,7 @@ const Blocks kRun = {
     // examples/CMakeLists.txt, readme_host
     {{"README.md", "A host in 30 lines", "cpp"}, 1},
     {{"README.md", "A host in 30 lines", ""}, 1},
-    // tests/install_ways.sh, by scripts/clean-root
+    // tests/install_ways.sh, by scripts/release/clean-root
     {{"README.md", "Install it", "sh"}, 1},
     {{"README.md", "By CMake", "sh"}, 2},
     {{"README.md", "By Debian packages", "sh"}, 3},

@@ -2,9 +2,9 @@
 # SPDX-License-Identifier: MIT
 # install_ways.sh: runs every block of README's "Install it", word for word: each way ends in the README's
 # host, which has to print what the README says, and is then removed again. For a machine that is thrown
-# away afterwards; scripts/clean-root makes one.
+# away afterwards; scripts/release/clean-root makes one.
 set -euo pipefail
-clone=$(cd "$(dirname "$0")/.." && pwd)
+clone=$(cd "$(dirname "$0")/../.." && pwd)
 work=$(mktemp -d)
 : >"$work/taken"
 

@@ -49,7 +49,7 @@ TEST(Interface, HasTheseTypes)
                                  decltype(&VORN_JSON_DB::recType)>);
     static_assert(std::is_same_v<bool, decltype(blLogToStdout)>);
     static_assert(std::is_same_v<bool, decltype(blDebugOutput)>);
-    // Compiled into the hosts, so scripts/abi does not see them.
+    // Compiled into the hosts, so scripts/dev/abi does not see them.
     static_assert(0 == VORN_SQL_WHERE_TYPE_OR);
     static_assert(1 == VORN_SQL_WHERE_TYPE_AND);
     static_assert(2 == VORN_SQL_WHERE_TYPE_COMMA);

@@ -63,11 +63,11 @@ protected:
 
     Table table_{database_, R"({"a":{"cpptype":"string"}})", "a"};
     const std::string strPid_ = "(" + std::to_string(getpid()) + ")";
-    const std::string strCheck_ = "VornJsonDbApi:" + lineOf("VornJsonDbApi/execution.cpp",
+    const std::string strCheck_ = "VornJsonDbApi:" + lineOf("VornJsonDbApi/run_sql.cpp",
                                                             "if (FAILED(0 >= strSql.length()))");
     const std::string strFailure_ =
         "VornJsonDbApi:" +
-        lineOf("VornJsonDbApi/execution.cpp", R"(LOG_PLAIN("i=%d,errno=%d, run sql failed,)");
+        lineOf("VornJsonDbApi/run_sql.cpp", R"(LOG_PLAIN("i=%d,errno=%d, run sql failed,)");
 };
 
 TEST_F(Log, OnStandardOutputHasTheseForms)
