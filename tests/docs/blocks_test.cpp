@@ -45,7 +45,7 @@ TEST(DocsBlocks, AreAllRun)
                                          "docs/upgrading.md"};
     for (const std::string& strPage : pages()) {
         if (0 != known.count(strPage)) continue;
-        for (const MarkdownSection& section : readPage("../" + strPage)) {
+        for (const MarkdownSection& section : readPage("../" + strPage).sections) {
             std::map<std::string, int> counts;
             for (const MarkdownBlock& block : section.blocks) {
                 SCOPED_TRACE(strPage + ":\n" + block.strText);
@@ -75,7 +75,7 @@ TEST(LimitsPage, NamesOneTestInEachSection)
 {
     const std::string strTests = folderText("tests");
     std::set<std::string> named;
-    for (const MarkdownSection& section : limitsPage()) {
+    for (const MarkdownSection& section : limitsPage().sections) {
         SCOPED_TRACE(section.strHeading);
         const auto tests = matches(section.strText, R"(`((?:Memory)?Limits)\.(\w+)`)", {1, 2});
         if (tests.empty()) {

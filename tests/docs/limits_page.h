@@ -5,7 +5,6 @@
 #include "docs/calls.h"
 #include "support/markdown.h"
 
-#include <algorithm>
 #include <set>
 
 inline const MarkdownPage& limitsPage()
@@ -36,14 +35,13 @@ protected:
         return "null";
     }
 
-    // The ids of the records that recList gives.
+    // The ids of the records that recList gives, like "123".
     std::string ids(const std::string& strRequest = "null")
     {
         const std::string strRecords = listed(api_, strRequest);
         if ("-1" == strRecords) return strRecords;
         std::string strIds;
-        for (const Json::Value& jRecord : json(strRecords))
-            strIds.append(strIds.empty() ? "" : ", ").append(jRecord["id"].asString());
+        for (const std::string& strId : matches(strRecords, "\"id\":([0-9]+)")) strIds += strId;
         return strIds;
     }
 
@@ -55,12 +53,10 @@ private:
         const std::string strTest = std::string("`Limits.") +
                                     testing::UnitTest::GetInstance()->current_test_info()->name() +
                                     "`";
-        const auto it = std::find_if(limitsPage().begin(), limitsPage().end(),
-                                     [&strTest](const MarkdownSection& section) {
-                                         return std::string::npos != section.strText.find(strTest);
-                                     });
-        EXPECT_NE(limitsPage().end(), it) << "limits.md does not name " << strTest;
-        return limitsPage().end() == it ? limitsPage().front() : *it;
+        for (const MarkdownSection& section : limitsPage().sections)
+            if (std::string::npos != section.strText.find(strTest)) return section;
+        ADD_FAILURE() << "limits.md does not name " << strTest;
+        return limitsPage().sections[0];
     }
 
     const MarkdownSection& section_ = ownSection();
@@ -69,7 +65,7 @@ private:
 protected:
     // The table that the page begins with, in a file, so that a second connection can be opened.
     Database database_{Database::Place::kFile};
-    const std::string strMembers_ = blocksOf(limitsPage()).at(0).strText;
-    Table table_{database_, strMembers_, blocksOf(limitsPage()).at(1).strText};
+    const std::string strMembers_ = limitsPage().blocks.at(0).strText;
+    Table table_{database_, strMembers_, limitsPage().blocks.at(1).strText};
     VornJsonDbApi& api_ = table_.api;
 };

@@ -65,25 +65,20 @@ TEST_F(Limits, OneThread)
     const std::string strStored = stored(1);
 
     // A call within a call: the rows after it are looked up among the members of the other table.
-    const auto addFunction = [this](const char* szName, std::function<void()>& callback) {
-        const auto call = [](sqlite3_context* pContext, int, sqlite3_value**) {
+    const std::function<void()> calls[] = {
+        [&] { EXPECT_EQ("[" + strOther + "]", listed(other.api)); },
+        [&] { VornJsonDbApi(database_.get(), other.strName, other.jDefinition, other.strCreate); },
+    };
+    for (std::function<void()> call : calls) {
+        const auto nested = [](sqlite3_context* pContext, int, sqlite3_value**) {
             (*static_cast<std::function<void()>*>(sqlite3_user_data(pContext)))();
             sqlite3_result_int(pContext, 1);
         };
-        EXPECT_EQ(SQLITE_OK, sqlite3_create_function(database_.get(), szName, 0, SQLITE_UTF8,
-                                                     &callback, call, nullptr, nullptr));
-    };
-    std::function<void()> list = [&] { EXPECT_EQ("[" + strOther + "]", listed(other.api)); };
-    std::function<void()> make = [&] {
-        VornJsonDbApi(database_.get(), other.strName, other.jDefinition, other.strCreate);
-    };
-    addFunction("list", list);
-    addFunction("make", make);
-    for (const char* szCall : {"list()", "make()"}) {
-        Json::Value jNested;
-        jNested["vornSqlWhereFilter"] = std::string("id = 1 or ") + szCall;
+        EXPECT_EQ(SQLITE_OK, sqlite3_create_function(database_.get(), "nested", 0, SQLITE_UTF8,
+                                                     &call, nested, nullptr, nullptr));
+        Json::Value jRequest = json(R"x({"vornSqlWhereFilter":"id = 1 or nested()"})x");
         Json::Value jRecords;
-        EXPECT_EQ(-1, api_.recList(jNested, jRecords));
+        EXPECT_EQ(-1, api_.recList(jRequest, jRecords));
         EXPECT_EQ("[" + strStored + "]", text(jRecords));
         EXPECT_EQ(failed("!jType.isMember(strName)"), takeLog().at(0));
     }
@@ -203,23 +198,19 @@ TEST_F(Limits, FirstPluginsFlagsRule)
 
 TEST_F(Limits, DeepJsonReadsBackAsNull)
 {
-    for (std::size_t nLevels : {1000U, 1001U}) {
-        SCOPED_TRACE(nLevels);
-        // Read as a host does that keeps the document as text.
-        const std::string strDeep = std::string(nLevels, '[') + std::string(nLevels, ']');
-        Json::CharReaderBuilder builder;
-        builder["stackLimit"] = 10000;
-        Json::Value jRecord;
-        std::istringstream document(strDeep);
-        EXPECT_TRUE(Json::parseFromStream(builder, document, &jRecord["tags"], nullptr));
-        jRecord["text"] = strDeep;
-        Json::Value jStored;
-        EXPECT_EQ(0, api_.recCreate(jRecord, jStored));
-        EXPECT_EQ(1000U == nLevels ? Json::arrayValue : Json::nullValue, jStored["tags"].type());
-        EXPECT_EQ(strDeep, jStored["text"].asString());
-        EXPECT_EQ(strDeep, database_.value("select tags from " + table_.strName +
-                                           " where rowid = last_insert_rowid()"));
-    }
+    const std::string strDeep = std::string(1001, '[') + std::string(1001, ']');
+    // As a host reads a document that it keeps as text.
+    Json::CharReaderBuilder builder;
+    builder["stackLimit"] = 10000;
+    Json::Value jRecord;
+    std::istringstream document(strDeep);
+    EXPECT_TRUE(Json::parseFromStream(builder, document, &jRecord["tags"], nullptr));
+    jRecord["text"] = strDeep;
+    Json::Value jStored;
+    EXPECT_EQ(0, api_.recCreate(jRecord, jStored));
+    EXPECT_TRUE(jStored["tags"].isNull());
+    EXPECT_EQ(strDeep, jStored["text"].asString());
+    EXPECT_EQ(strDeep, database_.value("select tags from " + table_.strName));
 }
 
 namespace {
@@ -243,12 +234,10 @@ TEST_F(Limits, GlobalLocaleWithADecimalComma)
     };
     const Json::Value jFraction = json(R"({"o":)" + example(0) + "}");
     const Json::Value jText = json(R"({"o":)" + example(1) + "}");
-    const Json::Value jWhole = json(R"({"o":{"rate":12345,"unit":"EUR"}})");
     const bool blByLocale = JSONCPP_VERSION_HEXA < 0x01090800;
     const std::locale before = std::locale::global(std::locale(std::locale(), new DecimalComma));
     EXPECT_EQ(blByLocale ? R"({"o":{"rate":null}})" : text(jFraction), create(jFraction));
     EXPECT_EQ(text(jText), create(jText));
-    EXPECT_EQ(text(jWhole), create(jWhole));
     EXPECT_EQ(Lines(), takeLog());
     std::locale::global(before);
     EXPECT_EQ(text(jFraction), create(jFraction));

@@ -57,7 +57,7 @@ TEST(ManClassPage, DescribesEveryFunction)
 TEST(ManClassPage, ShowsTheHostOfTheReadme)
 {
     const std::string strHost = replaced(sectionOf("EXAMPLES"), R"(\\e)", "\\");
-    const auto blocks = blocksOf(readPage("../README.md"));
+    const auto blocks = readPage("../README.md").blocks;
     EXPECT_TRUE(std::any_of(blocks.begin(), blocks.end(), [&](const MarkdownBlock& block) {
         return "cpp" == block.strLanguage && std::string::npos != strHost.find(block.strText);
     }));
@@ -74,7 +74,7 @@ TEST(ManGeneralPage, ShowsADefinitionThatIsRead)
 TEST(ManGeneralPage, SaysOfEveryTypeWordWhatTheGuideSays)
 {
     std::vector<std::string> inTheGuide;
-    const auto words = tablesOf(readPage("types.md")).at(0).rows;
+    const auto words = readPage("types.md").tables.at(0).rows;
     for (const auto& row : words) {
         inTheGuide.push_back(&row == &words.back() ? "" : row[0]);
         for (std::size_t i : {2U, 3U}) inTheGuide.push_back("error" == row[i] ? "\\-" : "yes");
@@ -89,7 +89,7 @@ TEST(ManGeneralPage, SaysOfEveryTypeWordWhatTheGuideSays)
 TEST(ManGeneralPage, HasRequestsOfTheGuide)
 {
     std::set<std::string> inTheGuide;
-    for (const MarkdownTable& table : tablesOf(readPage("requests.md")))
+    for (const MarkdownTable& table : readPage("requests.md").tables)
         for (const auto& row : table.rows) inTheGuide.insert(row[0] + " " + row[1]);
 
     const auto requests =
@@ -105,7 +105,7 @@ TEST(ManGeneralPage, HasRequestsOfTheGuide)
 TEST(ManGeneralPage, HasTheFormsOfTheLog)
 {
     std::vector<std::string> inTheGuide;
-    for (const MarkdownTable& table : tablesOf(readPage("log.md")))
+    for (const MarkdownTable& table : readPage("log.md").tables)
         for (const auto& row : table.rows)
             if (std::string::npos != row.back().find("FILE:LINE")) inTheGuide.push_back(row.back());
     EXPECT_EQ(inTheGuide, matches(fileText("man/vornjsondb.7"), R"re(\.Li "(.*TEXT)"\n)re"));

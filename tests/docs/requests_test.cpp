@@ -54,7 +54,7 @@ protected:
     }
 
     const MarkdownPage page_ = readPage("requests.md");
-    const std::vector<MarkdownBlock> blocks_ = blocksOf(page_);
+    const std::vector<MarkdownBlock> blocks_ = page_.blocks;
     Json::Value jDefinition_ = json(blocks_.at(0).strText);
     std::string strCreate_ = blocks_.at(1).strText;
     Json::Value jRecords_ = json(blocks_.at(2).strText);
@@ -65,7 +65,7 @@ protected:
 TEST_F(DocsRequests, DoWhatEveryRowSays)
 {
     std::set<std::size_t> columns;
-    for (const MarkdownTable& table : tablesOf(page_)) {
+    for (const MarkdownTable& table : page_.tables) {
         columns.insert(table.header.size());
         for (const auto& row : table.rows) {
             SCOPED_TRACE(row[0] + " " + row[1]);
@@ -82,21 +82,6 @@ TEST_F(DocsRequests, DoWhatEveryRowSays)
         }
     }
     EXPECT_EQ((std::set<std::size_t>{3, 4}), columns);
-}
-
-TEST_F(DocsRequests, TakeATextFromOutsideIntoTheRawFilter)
-{
-    char* szFilter = sqlite3_mprintf("title like %Q", "Gulliver's%");
-    Json::Value jRequest;
-    jRequest["vornSqlWhereFilter"] = szFilter;
-    sqlite3_free(szFilter);
-    EXPECT_EQ(expected("3"), listed(api_, text(jRequest)));
-}
-
-TEST_F(DocsRequests, UpdateTheRowsThatTheFilterSelects)
-{
-    EXPECT_EQ(0, call("recUpdateByFilter", R"({"vornSqlWhereFilter":"due is null"})"));
-    EXPECT_EQ("6", database_.value("select count(*) from book where lent = 1"));
 }
 
 }  // namespace

@@ -13,7 +13,7 @@ protected:
     DocsUpgrading()
     {
         // The layouts, of which the first is the library's, and two requests.
-        for (const MarkdownBlock& block : blocksOf(readPage("upgrading.md")))
+        for (const MarkdownBlock& block : readPage("upgrading.md").blocks)
             layouts_.push_back(block.strText);
         EXPECT_LT(4U, layouts_.size());
         strByText_ = layouts_.at(layouts_.size() - 2);

@@ -62,7 +62,8 @@ std::string replaced(const std::string& strText, const std::string& strPattern,
 
 MarkdownPage readPage(const std::string& strFile)
 {
-    MarkdownPage page(1);
+    MarkdownPage page;
+    page.sections.emplace_back();
     bool blBlock = false;
     bool blTable = false;
     std::istringstream lines(fileText("docs/" + strFile));
@@ -70,8 +71,8 @@ MarkdownPage readPage(const std::string& strFile)
         const bool blMark = 0 == strLine.rfind("```", 0);
         const bool blRow = !blBlock && 0 == strLine.rfind('|', 0);
         if (!blBlock && 0 == strLine.rfind('#', 0))
-            page.push_back({replaced(strLine, "^#+ *", ""), "", {}, {}});
-        MarkdownSection& section = page.back();
+            page.sections.push_back({replaced(strLine, "^#+ *", ""), "", {}, {}});
+        MarkdownSection& section = page.sections.back();
         section.strText += strLine + "\n";
         if (blMark && !blBlock) section.blocks.push_back({strLine.substr(3), ""});
         if (!blMark && blBlock) section.blocks.back().strText += strLine + "\n";
@@ -87,28 +88,16 @@ MarkdownPage readPage(const std::string& strFile)
         blTable = blRow;
     }
     EXPECT_FALSE(blBlock) << strFile << ": the last block does not end";
+    for (const MarkdownSection& section : page.sections) {
+        page.blocks.insert(page.blocks.end(), section.blocks.begin(), section.blocks.end());
+        page.tables.insert(page.tables.end(), section.tables.begin(), section.tables.end());
+    }
     return page;
-}
-
-std::vector<MarkdownBlock> blocksOf(const MarkdownPage& page)
-{
-    std::vector<MarkdownBlock> blocks;
-    for (const MarkdownSection& section : page)
-        blocks.insert(blocks.end(), section.blocks.begin(), section.blocks.end());
-    return blocks;
-}
-
-std::vector<MarkdownTable> tablesOf(const MarkdownPage& page)
-{
-    std::vector<MarkdownTable> tables;
-    for (const MarkdownSection& section : page)
-        tables.insert(tables.end(), section.tables.begin(), section.tables.end());
-    return tables;
 }
 
 MarkdownTable table(const MarkdownPage& page, const std::string& strHeading, std::size_t nRows)
 {
-    for (const MarkdownSection& section : page) {
+    for (const MarkdownSection& section : page.sections) {
         if (section.strHeading != strHeading || 1 != section.tables.size()) continue;
         EXPECT_EQ(nRows, section.tables[0].rows.size()) << strHeading;
         return section.tables[0];

@@ -35,14 +35,15 @@ struct MarkdownSection {
     std::vector<MarkdownTable> tables;
 };
 
-using MarkdownPage = std::vector<MarkdownSection>;
+// All sections, blocks and tables, each in the order of the page.
+struct MarkdownPage {
+    std::vector<MarkdownSection> sections;
+    std::vector<MarkdownBlock> blocks;
+    std::vector<MarkdownTable> tables;
+};
 
 // Reads a page of docs/. The test fails when a row has more or fewer cells than its header.
 MarkdownPage readPage(const std::string& strFile);
-
-// All blocks, and all tables, in the order of the page.
-std::vector<MarkdownBlock> blocksOf(const MarkdownPage& page);
-std::vector<MarkdownTable> tablesOf(const MarkdownPage& page);
 
 // The only table below a heading. The test fails when it has another number of rows.
 MarkdownTable table(const MarkdownPage& page, const std::string& strHeading, std::size_t nRows);
