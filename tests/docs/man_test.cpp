@@ -68,7 +68,9 @@ TEST(ManGeneralPage, ShowsADefinitionThatIsRead)
     Json::Value jDefinition =
         json(matches(fileText("man/vornjsondb.7"), "\n(\\{\"[^.]*)\\.Ed").at(0));
     std::string strName = jDefinition.getMemberNames().at(0);
-    EXPECT_EQ(jDefinition[strName]["member"], VORN_JSON_DB::recType(jDefinition, strName));
+    const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
+    EXPECT_FALSE(jTypes.empty());
+    EXPECT_EQ(jDefinition[strName]["member"], jTypes);
 }
 
 TEST(ManGeneralPage, SaysOfEveryTypeWordWhatTheGuideSays)
