@@ -38,7 +38,7 @@ bool isRunByInstallWays(const std::string& strHeading, const std::string& strLan
     return !matches(strScript, strName + strWord + strEnd, {0}).empty();
 }
 
-TEST(DocsBlocks, AreAllRun)
+TEST(Documentation, HasNoBlockThatIsNotRun)
 {
     // The tests of these pages fail when there is a block that they do not know.
     const std::set<std::string> known = {"docs/limits.md", "docs/log.md", "docs/requests.md",
@@ -60,7 +60,7 @@ TEST(DocsBlocks, AreAllRun)
 }
 
 // An indented block is a drawing, or a list of scripts to call.
-TEST(DocsBlocks, NameScriptsThatExist)
+TEST(Documentation, NamesScriptsThatExist)
 {
     std::string strPages;
     for (const std::string& strPage : pages()) strPages += fileText(strPage);

@@ -24,34 +24,30 @@ std::size_t waits()
     return sleeps.size();
 }
 
-// Between the INSERT of the first attempt and the SELECT that reads the row back, the other
-// connection locks the database until the second attempt.
-class LockBetween {
-public:
-    explicit LockBetween(Database& other)
-    {
-        state().exec = [this, &other](sqlite3* pDb, const char* szSql,
-                                      doubles::RowCallback callback, void* arg, char** errText) {
-            const std::string strSql = szSql;
-            std::size_t nSelect = strSql.find(";select") + 1;
-            if (0 != nSelect && 0 == iAttempts++) {
-                EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strSql.substr(0, nSelect).c_str(),
-                                                       nullptr, nullptr, nullptr));
-                iLocked = run(other, "begin exclusive");
-            } else {
-                run(other, "rollback");
-                nSelect = 0;
-            }
-            return doubles::realExec(pDb, szSql + nSelect, callback, arg, errText);
-        };
-    }
-    ~LockBetween() { state().exec = nullptr; }
-    LockBetween(const LockBetween&) = delete;
-    LockBetween& operator=(const LockBetween&) = delete;
-
+struct LockBetween {
     int iAttempts = 0;
     int iLocked = SQLITE_OK;  // the result of the other connection's lock
 };
+
+// Between the INSERT of the first attempt and the SELECT that reads the row back, the other
+// connection locks the database until the second attempt.
+void lockBetween(Database& other, LockBetween& lock)
+{
+    state().exec = [&other, &lock](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
+                                   void* arg, char** errText) {
+        const std::string strSql = szSql;
+        std::size_t nSelect = strSql.find(";select") + 1;
+        if (0 != nSelect && 0 == lock.iAttempts++) {
+            EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strSql.substr(0, nSelect).c_str(), nullptr,
+                                                   nullptr, nullptr));
+            lock.iLocked = run(other, "begin exclusive");
+        } else {
+            run(other, "rollback");
+            nSelect = 0;
+        }
+        return doubles::realExec(pDb, szSql + nSelect, callback, arg, errText);
+    };
+}
 
 }  // namespace
 
@@ -76,38 +72,39 @@ TEST_F(Limits, LockedCallBlocks)
 TEST_F(Limits, RetryRunsTheWholeTextAgain)
 {
     Database other(database_.path());
-    {
-        const LockBetween lock(other);
-        EXPECT_NE("-1", saved(api_, example()));
-        EXPECT_EQ(2, lock.iAttempts);
-        EXPECT_EQ("12", ids());
-    }
-    const LockBetween lock(other);
+    LockBetween first;
+    lockBetween(other, first);
+    EXPECT_NE("-1", saved(api_, example()));
+    EXPECT_EQ(2, first.iAttempts);
+    EXPECT_EQ("12", ids());
+
+    LockBetween second;
+    lockBetween(other, second);
     EXPECT_LE(0, api_.runSqlEx(example(0, "sql")));
     EXPECT_NE("-1", saved(api_, example()));
     EXPECT_LE(0, api_.runSqlEx("commit"));
-    EXPECT_EQ(SQLITE_BUSY, lock.iLocked);
+    EXPECT_EQ(SQLITE_BUSY, second.iLocked);
     EXPECT_EQ("123", ids());
 }
 
 TEST_F(Limits, DuplicateMayBeYourOwnRecord)
 {
     Database other(database_.path());
-    {
-        const LockBetween lock(other);
-        EXPECT_EQ("-1", created(api_, example()));
-        EXPECT_EQ(2, lock.iAttempts);
-    }
+    LockBetween first;
+    lockBetween(other, first);
+    EXPECT_EQ("-1", created(api_, example()));
+    EXPECT_EQ(2, first.iAttempts);
     EXPECT_EQ("DUPLICATE_PRIMARY_KEY", api_.getErrMsg());
     EXPECT_EQ(0U, takeLog().at(0).find(plain("i=1,errno=")));
     const std::string strRecord = stored(1);
 
     database_.run("delete from " + table_.strName);
-    const LockBetween lock(other);
+    LockBetween second;
+    lockBetween(other, second);
     EXPECT_LE(0, api_.runSqlEx(example(0, "sql")));
     EXPECT_EQ(strRecord, created(api_, example()));
     EXPECT_LE(0, api_.runSqlEx("commit"));
-    EXPECT_EQ(SQLITE_BUSY, lock.iLocked);
+    EXPECT_EQ(SQLITE_BUSY, second.iLocked);
 }
 
 TEST_F(Limits, WhatWaitingCosts)

@@ -39,9 +39,9 @@ bool contains(const std::string& strText, const std::string& strPart)
 }
 
 // Its tables are the forms, two of examples, and the list of lines in parts.
-class DocsLog : public HostTest {
+class LogPage : public HostTest {
 protected:
-    DocsLog() { EXPECT_EQ(6U, page_.blocks.size()); }
+    LogPage() { EXPECT_EQ(6U, page_.blocks.size()); }
 
     const MarkdownPage page_ = readPage("log.md");
     // The definition and CREATE statement of the examples; a JSON text and its log for each.
@@ -54,7 +54,7 @@ protected:
     VornJsonDbApi api_{database_.get(), strName_, jDefinition_, strCreate_};
 };
 
-TEST_F(DocsLog, ListsEveryLineOnceWithItsMeaning)
+TEST_F(LogPage, ListsEveryLineOnceWithItsMeaning)
 {
     std::set<std::string> listed;
     std::set<std::string> traces;
@@ -75,7 +75,7 @@ TEST_F(DocsLog, ListsEveryLineOnceWithItsMeaning)
 }
 
 // Of each family: on standard output, on syslog with errno and without.
-TEST_F(DocsLog, HasTheFormsOfThePage)
+TEST_F(LogPage, ShowsTheFormsOfTheLines)
 {
     const auto& forms = page_.tables.at(0).rows;
     ASSERT_EQ(6U, forms.size());
@@ -96,7 +96,7 @@ TEST_F(DocsLog, HasTheFormsOfThePage)
     }
 }
 
-TEST_F(DocsLog, ShowsADuplicate)
+TEST_F(LogPage, ShowsADuplicate)
 {
     EXPECT_NE("-1", created(api_, blocks_[2].strText));
     blLogToStdout = true;
@@ -105,14 +105,14 @@ TEST_F(DocsLog, ShowsADuplicate)
     EXPECT_EQ("DUPLICATE_PRIMARY_KEY", api_.getErrMsg());
 }
 
-TEST_F(DocsLog, ShowsARowThatCannotBeRead)
+TEST_F(LogPage, ShowsARowThatCannotBeRead)
 {
     database_.run("insert into " + strName_ + " values (8,1,0.5,'x')");
     EXPECT_EQ("-1", listed(api_, blocks_[4].strText));
     EXPECT_EQ(withoutPlaces(blocks_[5].strText), takeText());
 }
 
-TEST_F(DocsLog, SaysWhatSqliteSays)
+TEST_F(LogPage, SaysWhatSqliteSays)
 {
     for (const auto& row : page_.tables.at(1).rows) {
         SCOPED_TRACE(row[1]);
@@ -121,7 +121,7 @@ TEST_F(DocsLog, SaysWhatSqliteSays)
     }
 }
 
-TEST_F(DocsLog, ShowsAGapInTheStatement)
+TEST_F(LogPage, ShowsAGapInTheStatement)
 {
     const std::string strGap = "error=near \")\": syntax error, sql=";
     for (const auto& row : page_.tables.at(2).rows) {

@@ -111,22 +111,22 @@ struct Sample {
     VornJsonDbApi& api = table.api;
 };
 
-class DocsTypes : public TableTest {
+class TypesPage : public TableTest {
 protected:
-    DocsTypes() { EXPECT_EQ(5U, tables_.size()); }
+    TypesPage() { EXPECT_EQ(5U, tables_.size()); }
 
     const std::vector<MarkdownTable> tables_ = readPage("types.md").tables;
 };
 
 // The last row of the first table is of any other word.
-TEST_F(DocsTypes, ListEveryWordOfTheLibrary)
+TEST_F(TypesPage, ListsEveryTypeWord)
 {
     Cells words = matches(folderText("src"), R"re(\{"([^"]+)",\s*Decode::)re");
     ASSERT_EQ(words.size() + 1, tables_[0].rows.size());
     for (std::size_t i = 0; i < words.size(); ++i) EXPECT_EQ(words[i], tables_[0].rows[i][0]);
 }
 
-TEST_F(DocsTypes, DoWhatTheTablesOfAllWordsSay)
+TEST_F(TypesPage, DescribesEveryTypeWord)
 {
     const std::size_t nWords = tables_[0].rows.size();
     ASSERT_EQ(nWords, tables_[1].rows.size());
@@ -165,7 +165,7 @@ TEST_F(DocsTypes, DoWhatTheTablesOfAllWordsSay)
     }
 }
 
-TEST_F(DocsTypes, KeepWhatTheyAreChosenFor)
+TEST_F(TypesPage, RecommendsWordsThatWork)
 {
     EXPECT_FALSE(tables_[3].rows.empty());
     for (const auto& row : tables_[3].rows) {
@@ -182,7 +182,7 @@ TEST_F(DocsTypes, KeepWhatTheyAreChosenFor)
     }
 }
 
-TEST_F(DocsTypes, HaveTheTrapsOfTheLastTable)
+TEST_F(TypesPage, ShowsTheTraps)
 {
     EXPECT_FALSE(tables_[4].rows.empty());
     for (const auto& row : tables_[4].rows) {

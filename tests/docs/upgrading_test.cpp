@@ -8,9 +8,9 @@
 
 namespace {
 
-class DocsUpgrading : public TableTest {
+class UpgradingPage : public TableTest {
 protected:
-    DocsUpgrading()
+    UpgradingPage()
     {
         // The layouts, of which the first is the library's, and two requests.
         for (const MarkdownBlock& block : readPage("upgrading.md").blocks)
@@ -25,10 +25,7 @@ protected:
     // As another program would write the row.
     void insert(const std::string& strText)
     {
-        char* szSql = sqlite3_mprintf("insert into %s (data) values (%Q)", table_.strName.c_str(),
-                                      strText.c_str());
-        database_.run(szSql);
-        sqlite3_free(szSql);
+        database_.run("insert into " + table_.strName + " (data) values ('" + strText + "')");
     }
 
     // The ids of the rows that a request selects; each is the same record.
@@ -52,7 +49,7 @@ protected:
                  "id integer primary key, data text"};
 };
 
-TEST_F(DocsUpgrading, ReadsEveryLayoutAndLeavesItInTheRow)
+TEST_F(UpgradingPage, ShowsLayoutsThatAreAllRead)
 {
     EXPECT_EQ("1234", selected());
     Rows expected;
@@ -64,7 +61,7 @@ TEST_F(DocsUpgrading, ReadsEveryLayoutAndLeavesItInTheRow)
     EXPECT_EQ("12345678", selected());
 }
 
-TEST_F(DocsUpgrading, SavesInTheLibrarysLayout)
+TEST_F(UpgradingPage, ShowsHowRowsAreFoundAndSaved)
 {
     EXPECT_EQ("", selected(strByText_));
     EXPECT_EQ("123", selected(strByValue_));  // not the one with comments
