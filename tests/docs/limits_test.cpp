@@ -3,8 +3,6 @@
 
 #include "docs/limits_page.h"
 
-#include <algorithm>
-
 namespace {
 
 void createThree(Table& table)
@@ -201,19 +199,17 @@ TEST_F(Limits, DuplicateMessageStays)
 
 TEST_F(Limits, LogLinesCarryWholeRecords)
 {
-    const auto nLogged = [](const std::string& strText) {
-        const Lines lines = takeLog();
-        EXPECT_FALSE(lines.empty());
-        return std::count_if(lines.begin(), lines.end(), [&](const std::string& strLine) {
-            return std::string::npos != strLine.find(strText);
-        });
+    const auto logged = [] {
+        std::string strLog;
+        for (const std::string& strLine : takeLog()) strLog += strLine + "\n";
+        return strLog;
     };
     Json::Value jRecord = table_.create(example());
     EXPECT_EQ("-1", created(api_, example()));
-    EXPECT_LT(0, nLogged("secret"));
+    EXPECT_NE(std::string::npos, logged().find("secret"));
     jRecord["text"] = "c2VjcmV0";  // as the host's cipher gives it
     EXPECT_EQ("-1", created(api_, text(jRecord)));
-    EXPECT_EQ(0, nLogged("secret"));
+    EXPECT_EQ(std::string::npos, logged().find("secret"));
 
     Table table(database_, R"({"a":{"cpptype":"int"},"b":{"cpptype":"double"}})", "a, b");
     std::string strForged = "x\nroot logged in";
@@ -222,5 +218,7 @@ TEST_F(Limits, LogLinesCarryWholeRecords)
     EXPECT_EQ(-1, api_.recDeleteByArray(values, strForged.c_str()));
     database_.run("insert into " + table.strName + " values (1, '" + strForged + "')");
     EXPECT_EQ("-1", listed(table.api));
-    EXPECT_EQ(3, nLogged("=" + strForged));
+    const std::string strLog = logged();
+    for (const char* szHead : {"strValue=", "name=", "strVector=", "column_value[1]="})
+        EXPECT_NE(std::string::npos, strLog.find(szHead + strForged)) << szHead;
 }
