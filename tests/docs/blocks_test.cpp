@@ -1,99 +1,99 @@
 // SPDX-License-Identifier: MIT
-// Every block of code in the documentation is run by a test: this list says by which. A block that
-// is not on it is run by nobody.
+// Every block of code of the documentation is run, and every section of docs/limits.md by a test of
+// its own.
 
-#include "support/markdown.h"
+#include "docs/limits_page.h"
 
-#include <gtest/gtest.h>
 #include <unistd.h>
-
 #include <filesystem>
-#include <fstream>
 #include <map>
-#include <regex>
-#include <string>
-#include <tuple>
-#include <vector>
 
 namespace {
-
-// Page, section ("" for those of the whole page), language; how many.
-using Blocks = std::map<std::tuple<std::string, std::string, std::string>, int>;
-
-const Blocks kRun = {
-    // examples/CMakeLists.txt, readme_host
-    {{"README.md", "A host in 30 lines", "cpp"}, 1},
-    {{"README.md", "A host in 30 lines", ""}, 1},
-    // tests/install_ways.sh, by scripts/release/clean-root
-    {{"README.md", "Install it", "sh"}, 1},
-    {{"README.md", "By CMake", "sh"}, 2},
-    {{"README.md", "By Debian packages", "sh"}, 3},
-    {{"README.md", "A host that finds it", "cmake"}, 1},
-    {{"README.md", "A host that finds it", "sh"}, 2},
-    {{"README.md", "As a part of the host's own build", "cmake"}, 2},
-    // tests/package_test.sh
-    {{"examples/README.md", "Examples", "sh"}, 1},
-    // limits_*_test.cpp, limits_test.cpp, faults/memory/memory_limits.cpp
-    {{"docs/limits.md", "", "cpp"}, 7},
-    {{"docs/limits.md", "", "json"}, 25},
-    {{"docs/limits.md", "", "sql"}, 7},
-    // docs_log_test.cpp
-    {{"docs/log.md", "How to read a chain", "json"}, 1},
-    {{"docs/log.md", "How to read a chain", "sql"}, 1},
-    {{"docs/log.md", "Example: a duplicate", "json"}, 1},
-    {{"docs/log.md", "Example: a duplicate", "log"}, 1},
-    {{"docs/log.md", "Example: a row that cannot be read", "json"}, 1},
-    {{"docs/log.md", "Example: a row that cannot be read", "log"}, 1},
-    // docs_requests_test.cpp
-    {{"docs/requests.md", "The sample table", "json"}, 1},
-    {{"docs/requests.md", "The sample table", "sql"}, 1},
-    {{"docs/requests.md", "The sample records", "json"}, 1},
-    // docs_upgrading_test.cpp
-    {{"docs/upgrading.md", "Rows in any JSON layout", "json"}, 6},
-};
-
-const std::string kProject = VORN_DOCS "/../";
 
 std::vector<std::string> pages()
 {
     std::vector<std::string> pages;
-    for (const char* szFolder : {"", "bench/", "docs/", "examples/"})
-        for (const auto& entry : std::filesystem::directory_iterator(kProject + szFolder))
+    for (const std::string strFolder : {"", "bench/", "docs/", "examples/"})
+        for (const auto& entry : std::filesystem::directory_iterator(VORN_DOCS "/../" + strFolder))
             if (".md" == entry.path().extension())
-                pages.push_back(szFolder + entry.path().filename().string());
+                pages.push_back(strFolder + entry.path().filename().string());
     return pages;
 }
 
-TEST(DocsBlocks, AreAllRun)
+// Whether install_ways.sh runs the n-th block of its language below a heading of the README.
+bool isRunByInstallWays(const std::string& strHeading, const std::string& strLanguage, int n)
 {
-    Blocks found;
-    for (const std::string& strPage : pages()) {
-        for (const MarkdownSection& candidate : readPage("../" + strPage)) {
-            const bool blWhole = "docs/limits.md" == strPage;
-            const std::string strSection = blWhole ? "" : candidate.strHeading;
-            for (const MarkdownFence& block : candidate.fences)
-                ++found[{strPage, strSection, block.strLanguage}];
-        }
-    }
-    EXPECT_EQ(kRun, found);
+    const std::string strScript = fileText("tests/host/install_ways.sh");
+    const std::string strNumber = std::to_string(n);
+    std::string strName = "\"(?:[^\"]*, )?" + strHeading + "\"";
+    const auto variables = matches(strScript, "\n(\\w+)=" + strName + "\n");
+    if (!variables.empty()) strName = "\"\\$" + variables[0] + "\"";
+    const bool blLoop =
+        !matches(strScript, "for number in [0-9 ]*\\b" + strNumber + "\\b", {0}).empty();
+    const std::string strWord = "sh" == strLanguage   ? " "
+                                : strLanguage.empty() ? " \"\" "
+                                                      : " " + strLanguage + " ";
+    const std::string strEnd =
+        blLoop ? "(?:" + strNumber + "\\b|\"\\$number\")" : strNumber + "\\b";
+    return !matches(strScript, strName + strWord + strEnd, {0}).empty();
 }
 
-// An indented block is a drawing, or a list of commands: of scripts, which are there.
-TEST(DocsBlocks, NameScriptsThatExist)
+TEST(Documentation, HasNoBlockThatIsNotRun)
 {
-    const std::regex command(R"((scripts/[\w-]+|\.ci/run))");
-    std::size_t nCommands = 0;
+    // The tests of these pages fail when there is a block that they do not know.
+    const std::set<std::string> known = {"docs/limits.md", "docs/log.md", "docs/requests.md",
+                                         "docs/upgrading.md"};
     for (const std::string& strPage : pages()) {
-        std::ifstream file(kProject + strPage);
-        for (std::string strLine; std::getline(file, strLine);) {
-            for (std::sregex_iterator it(strLine.begin(), strLine.end(), command), end; it != end;
-                 ++it) {
-                EXPECT_EQ(0, access((kProject + it->str()).c_str(), X_OK)) << it->str();
-                ++nCommands;
+        if (0 != known.count(strPage)) continue;
+        for (const MarkdownSection& section : readPage("../" + strPage).sections) {
+            std::map<std::string, int> counts;
+            for (const MarkdownBlock& block : section.blocks) {
+                SCOPED_TRACE(strPage + ":\n" + block.strText);
+                const int n = ++counts[block.strLanguage];
+                // package_test.sh runs all shell blocks of this page.
+                if ("examples/README.md" == strPage && "sh" == block.strLanguage) continue;
+                EXPECT_EQ("README.md", strPage);
+                EXPECT_PRED3(isRunByInstallWays, section.strHeading, block.strLanguage, n);
             }
         }
     }
-    EXPECT_LT(20U, nCommands);
+}
+
+// An indented block is a drawing, or a list of scripts to call.
+TEST(Documentation, NamesScriptsThatExist)
+{
+    std::string strPages;
+    for (const std::string& strPage : pages()) strPages += fileText(strPage);
+    const auto commands = matches(strPages, R"(scripts/[\w-]+|\.ci/run)", {0});
+    EXPECT_FALSE(commands.empty());
+    for (const std::string& strCommand : commands)
+        EXPECT_EQ(0, access((VORN_DOCS "/../" + strCommand).c_str(), X_OK)) << strCommand;
+}
+
+// The fixture of these tests looks for the section that names the test.
+TEST(LimitsPage, NamesOneTestInEachSection)
+{
+    const std::string strTests = folderText("tests");
+    std::set<std::string> named;
+    for (const MarkdownSection& section : limitsPage().sections) {
+        SCOPED_TRACE(section.strHeading);
+        const auto tests = matches(section.strText, R"(`((?:Memory)?Limits)\.(\w+)`)", {1, 2});
+        if (tests.empty()) {
+            // The introduction, with the table of the tests.
+            EXPECT_TRUE(named.empty());
+            EXPECT_TRUE(section.blocks.empty() || 2 == section.blocks.size());
+            continue;
+        }
+        ASSERT_EQ(2U, tests.size());
+        EXPECT_TRUE(named.insert(tests[1]).second);
+        EXPECT_NE(std::string::npos, strTests.find("(" + tests[0] + ", " + tests[1] + ")\n{"));
+        for (const MarkdownBlock& block : section.blocks) {
+            const std::string strInclude = "#include \"limits/" + tests[1] + ".inc\"";
+            const bool blIncluded = std::string::npos != strTests.find(strInclude);
+            EXPECT_TRUE("cpp" == block.strLanguage ? blIncluded : "Limits" == tests[0]);
+        }
+    }
+    EXPECT_FALSE(named.empty());
 }
 
 }  // namespace

@@ -1,275 +1,156 @@
 // SPDX-License-Identifier: MIT
 // docs/limits.md, other connections: locks, what waiting costs, and what a retry does.
 
-#include "support/limits.h"
+#include "docs/limits_page.h"
 
 #include <cerrno>
 #include <utility>
 
 namespace {
 
-// A second connection to a database file.
-class Other {
-public:
-    explicit Other(const Database& database)
-    {
-        EXPECT_EQ(SQLITE_OK, sqlite3_open(database.path().c_str(), &pDb_));
-    }
-    ~Other() { EXPECT_EQ(SQLITE_OK, sqlite3_close(pDb_)); }
-    Other(const Other&) = delete;
-    Other& operator=(const Other&) = delete;
-
-    int run(const char* szSql) { return doubles::realExec(pDb_, szSql, nullptr, nullptr, nullptr); }
-
-private:
-    sqlite3* pDb_ = nullptr;
-};
-
-constexpr char kMembers[] = R"({"id":{"cpptype":"int"},"text":{"cpptype":"string"}})";
-constexpr char kColumns[] = "id integer primary key, text text";
-
 using doubles::state;
 
-// The other connection comes between the INSERT of the first attempt and the SELECT that reads the
-// row back, and locks the database until the second attempt.
-class LockBetween {
-public:
-    explicit LockBetween(Other& other) : other_(other)
-    {
-        state().exec = [this](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
-                              void* arg, char** errText) {
-            const std::string strSql = szSql;
-            const std::size_t nInsert = strSql.find(";select") + 1;
-            if (0 == nInsert || 1 < ++iAttempts) {
-                if (0 != nInsert) other_.run("rollback");
-                return doubles::realExec(pDb, szSql, callback, arg, errText);
-            }
-            const std::string strInsert = strSql.substr(0, nInsert);
-            EXPECT_EQ(SQLITE_OK,
-                      doubles::realExec(pDb, strInsert.c_str(), nullptr, nullptr, nullptr));
-            iLocked = other_.run("begin exclusive");
-            return doubles::realExec(pDb, szSql + nInsert, callback, arg, errText);
-        };
-    }
-    ~LockBetween() { state().exec = nullptr; }
-    LockBetween(const LockBetween&) = delete;
-    LockBetween& operator=(const LockBetween&) = delete;
+// Runs SQL past the doubles; the result.
+int run(Database& connection, const std::string& strSql)
+{
+    return doubles::realExec(connection.get(), strSql.c_str(), nullptr, nullptr, nullptr);
+}
 
+// How often the library has waited since the last call.
+std::size_t waits()
+{
+    const auto sleeps = std::exchange(state().sleeps, {});
+    EXPECT_EQ(std::vector<unsigned>(sleeps.size(), 10000), sleeps);
+    return sleeps.size();
+}
+
+struct LockBetween {
     int iAttempts = 0;
-    int iLocked = SQLITE_OK;  // what the other connection's lock gave
-
-private:
-    Other& other_;
+    int iLocked = SQLITE_OK;  // the result of the other connection's lock
 };
 
-// The library's records of these tests.
-Json::Value listed(Table& table)
+// Between the INSERT of the first attempt and the SELECT that reads the row back, the other
+// connection locks the database until the second attempt.
+void lockBetween(Database& other, LockBetween& lock)
 {
-    Json::Value jRequest;
-    Json::Value jRecords(Json::arrayValue);
-    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-    return jRecords;
+    state().exec = [&other, &lock](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
+                                   void* arg, char** errText) {
+        const std::string strSql = szSql;
+        std::size_t nSelect = strSql.find(";select") + 1;
+        if (0 != nSelect && 0 == lock.iAttempts++) {
+            EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strSql.substr(0, nSelect).c_str(), nullptr,
+                                                   nullptr, nullptr));
+            lock.iLocked = run(other, "begin exclusive");
+        } else {
+            run(other, "rollback");
+            nSelect = 0;
+        }
+        return doubles::realExec(pDb, szSql + nSelect, callback, arg, errText);
+    };
 }
 
 }  // namespace
 
 TEST_F(Limits, LockedCallBlocks)
 {
-    Database database(Database::Place::kFile);
-    Table table(database, kMembers, kColumns);
-    Other other(database);
-    EXPECT_EQ(SQLITE_OK, other.run("begin exclusive"));
-    Json::Value jRequest;
-    Json::Value jRecords;
-    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(std::vector<unsigned>(500, 10000), state().sleeps);
+    Database other(database_.path());
+    EXPECT_EQ(SQLITE_OK, run(other, "begin exclusive"));
+    EXPECT_EQ("-1", listed(api_));
+    EXPECT_EQ(500U, waits());
 
-    // What the host set to wait on the connection is asked in each attempt.
-    int iAsked = 0;
-    const auto giveUp = [](void* pAsked, int) {
-        ++*static_cast<int*>(pAsked);
-        return 0;
-    };
-    EXPECT_EQ(SQLITE_OK, sqlite3_busy_handler(database.get(), giveUp, &iAsked));
-    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(500, iAsked);
-
-    // The host's own attempt is answered at once, and what follows it does not wait.
-    state().sleeps.clear();
-    const auto begin = [&] {
-        return doubles::realExec(database.get(), sqlExample().c_str(), nullptr, nullptr, nullptr);
-    };
-    EXPECT_EQ(SQLITE_BUSY, begin());
-    EXPECT_EQ(SQLITE_OK, other.run("rollback"));
-    EXPECT_EQ(SQLITE_OK, begin());
-    EXPECT_NE(SQLITE_OK, other.run("begin exclusive"));
-    table.create(R"({"id":1,"text":"x"})");
-    EXPECT_LE(0, table.api.runSqlEx("commit"));
-
-    // In WAL mode a reader does not wait for a writer.
-    EXPECT_EQ("wal", database.value("pragma journal_mode=wal"));
-    EXPECT_EQ(SQLITE_OK, other.run(sqlExample().c_str()));
-    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(1U, jRecords.size());
-    EXPECT_EQ(std::vector<unsigned>(), state().sleeps);
-    EXPECT_EQ(SQLITE_OK, other.run("rollback"));
+    // The host's own attempt returns at once, and the calls after it do not wait.
+    const std::string strBegin = example(0, "sql");
+    EXPECT_EQ(SQLITE_BUSY, run(database_, strBegin));
+    EXPECT_EQ(SQLITE_OK, run(other, "rollback"));
+    EXPECT_EQ(SQLITE_OK, run(database_, strBegin));
+    EXPECT_EQ(SQLITE_BUSY, run(other, "begin exclusive"));
+    table_.create(R"({"id":1,"text":"x"})");
+    EXPECT_LE(0, api_.runSqlEx("commit"));
+    EXPECT_EQ(0U, waits());
 }
 
 TEST_F(Limits, RetryRunsTheWholeTextAgain)
 {
-    Database database(Database::Place::kFile);
-    Table table(database, kMembers, kColumns);
-    Other other(database);
-    const std::string strCount = "select count(*) from " + table.strName;
-    Json::Value jRecord = jExample();
-    {
-        const LockBetween lock(other);
-        EXPECT_EQ(0, table.api.recSave(jRecord, true));
-        EXPECT_EQ(SQLITE_OK, lock.iLocked);
-        EXPECT_EQ(2, lock.iAttempts);
-        EXPECT_EQ("2", database.value(strCount));
-    }
-    database.run("delete from " + table.strName);
-    const LockBetween lock(other);
-    EXPECT_LE(0, table.api.runSqlEx(sqlExample()));
-    jRecord = jExample();
-    EXPECT_EQ(0, table.api.recSave(jRecord, true));
-    EXPECT_LE(0, table.api.runSqlEx("commit"));
-    EXPECT_EQ(SQLITE_BUSY, lock.iLocked);
-    EXPECT_EQ(1, lock.iAttempts);
-    EXPECT_EQ("1", database.value(strCount));
+    Database other(database_.path());
+    LockBetween first;
+    lockBetween(other, first);
+    EXPECT_NE("-1", saved(api_, example()));
+    EXPECT_EQ(2, first.iAttempts);
+    EXPECT_EQ("12", ids());
+
+    LockBetween second;
+    lockBetween(other, second);
+    EXPECT_LE(0, api_.runSqlEx(example(0, "sql")));
+    EXPECT_NE("-1", saved(api_, example()));
+    EXPECT_LE(0, api_.runSqlEx("commit"));
+    EXPECT_EQ(SQLITE_BUSY, second.iLocked);
+    EXPECT_EQ("123", ids());
 }
 
 TEST_F(Limits, DuplicateMayBeYourOwnRecord)
 {
-    Database database(Database::Place::kFile);
-    Table table(database, kMembers, kColumns);
-    Other other(database);
-    Json::Value jRecord = jExample();
-    Json::Value jStored;
-    {
-        const LockBetween lock(other);
-        EXPECT_EQ(-1, table.api.recCreate(jRecord, jStored));
-        EXPECT_EQ(2, lock.iAttempts);
-    }
-    EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table.api.getErrMsg());
-    EXPECT_EQ("[" + text(jRecord) + "]", text(listed(table)));
-    const std::string strLine = takeLog().at(0);
-    EXPECT_NE(std::string::npos, strLine.find("i=1,errno=")) << strLine;
+    Database other(database_.path());
+    LockBetween first;
+    lockBetween(other, first);
+    EXPECT_EQ("-1", created(api_, example()));
+    EXPECT_EQ(2, first.iAttempts);
+    EXPECT_EQ("DUPLICATE_PRIMARY_KEY", api_.getErrMsg());
+    EXPECT_EQ(0U, takeLog().at(0).find(plain("i=1,errno=")));
+    const std::string strRecord = stored(1);
 
-    database.run("delete from " + table.strName);
-    table.api.setErrMsg("");
-    const LockBetween lock(other);
-    EXPECT_LE(0, table.api.runSqlEx(sqlExample()));
-    EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
-    EXPECT_LE(0, table.api.runSqlEx("commit"));
-    EXPECT_EQ(SQLITE_BUSY, lock.iLocked);
-    EXPECT_EQ("", table.api.getErrMsg());
-    EXPECT_EQ("[" + text(jRecord) + "]", text(listed(table)));
+    database_.run("delete from " + table_.strName);
+    LockBetween second;
+    lockBetween(other, second);
+    EXPECT_LE(0, api_.runSqlEx(example(0, "sql")));
+    EXPECT_EQ(strRecord, created(api_, example()));
+    EXPECT_LE(0, api_.runSqlEx("commit"));
+    EXPECT_EQ(SQLITE_BUSY, second.iLocked);
 }
-
-namespace {
-
-// How often a call of the test has waited.
-std::size_t waits()
-{
-    return std::exchange(state().sleeps, {}).size();
-}
-
-// The page's way to end a wait, while it lasts.
-class Running {
-public:
-    explicit Running(sqlite3* pDb) : pRunning_(started(pDb)) {}
-    ~Running() { sqlite3_finalize(pRunning_); }
-    Running(const Running&) = delete;
-    Running& operator=(const Running&) = delete;
-
-    void reset() { sqlite3_reset(pRunning_); }
-
-private:
-    static sqlite3_stmt* started(sqlite3* pDb)
-    {
-#include "limits/WhatWaitingCosts.inc"
-        return pRunning;
-    }
-
-    sqlite3_stmt* pRunning_;
-};
-
-}  // namespace
 
 TEST_F(Limits, WhatWaitingCosts)
 {
-    Database database(Database::Place::kFile);
-    Table table(database, kMembers, kColumns);
-    Other other(database);
-    Json::Value jRequest;
-    Json::Value jRecords;
-    Json::Value jRecord = json(R"({"text":"x"})");
-    Json::Value jStored;
-    EXPECT_EQ(SQLITE_OK, other.run("begin exclusive"));
+    Database other(database_.path());
+    sqlite3* pDb = database_.get();
+    EXPECT_EQ(SQLITE_OK, run(other, "begin exclusive"));
 
-    // A signal that ends each sleep makes no difference to their number.
+    // A signal that ends each sleep does not change their number.
     state().onSleep = [] { errno = EINTR; };
-    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ("-1", listed(api_));
     EXPECT_EQ(500U, waits());
-    takeLog();
 
-    // A constructor waits, although the table is there.
-    VornJsonDbApi second(database.get(), table.strName, table.jDefinition, table.strCreate);
+    // A constructor waits, although the table exists.
+    VornJsonDbApi second(pDb, table_.strName, table_.jDefinition, table_.strCreate);
     EXPECT_EQ(500U, waits());
-    EXPECT_LT(0U, takeLog().size());
 
-    // One interrupt between two attempts does nothing, unless a statement is running.
-    state().onSleep = [&database] {
-        if (3 == state().sleeps.size()) sqlite3_interrupt(database.get());
+    // One interrupt between two attempts does nothing, unless a statement is running. It lasts
+    // until that statement is reset.
+    state().onSleep = [pDb] {
+        if (3 == state().sleeps.size()) sqlite3_interrupt(pDb);
     };
-    EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ("-1", listed(api_));
     EXPECT_EQ(500U, waits());
-    {
-        Running running(database.get());
-        for (int i = 0; i < 2; ++i) {
-            takeLog();
-            EXPECT_EQ(-1, table.api.recList(jRequest, jRecords));
-            // The interrupt lasts until that statement is reset.
-            EXPECT_EQ(0 == i ? 3U : 0U, waits());
-            EXPECT_NE(std::string::npos, takeLog().at(0).find("error=interrupted"));
-        }
-        running.reset();
-        state().onSleep = nullptr;
-        EXPECT_EQ(SQLITE_OK, other.run("rollback"));
-        EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
+#include "limits/WhatWaitingCosts.inc"
+    for (std::size_t nWaits : {3U, 0U}) {
+        takeLog();
+        EXPECT_EQ("-1", listed(api_));
+        EXPECT_EQ(nWaits, waits());
+        EXPECT_NE(std::string::npos, takeLog().at(0).find("error=interrupted"));
     }
-
-    // Whoever waits and succeeds is told by trace lines alone.
-    for (bool blDebug : {false, true}) {
-        blDebugOutput = blDebug;
-        EXPECT_EQ(SQLITE_OK, other.run("begin exclusive"));
-        state().onSleep = [&other] {
-            if (3 == state().sleeps.size()) other.run("rollback");
-        };
-        EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-        EXPECT_EQ(3U, waits());
-        EXPECT_EQ(blDebug ? 3U : 0U, takeLog().size());
-    }
-    blDebugOutput = false;
+    sqlite3_reset(pRunning);
+    sqlite3_finalize(pRunning);
     state().onSleep = nullptr;
+    EXPECT_EQ(SQLITE_OK, run(other, "rollback"));
 
-    // A snapshot that is old by the time of the first write.
-    EXPECT_EQ("wal", database.value("pragma journal_mode=wal"));
-    const std::string strOther = "insert into " + table.strName + " (text) values ('other')";
-    EXPECT_LE(0, table.api.runSqlEx("begin"));
-    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(SQLITE_OK, other.run(strOther.c_str()));
-    EXPECT_EQ(-1, table.api.recCreate(jRecord, jStored));
-    EXPECT_EQ(SQLITE_BUSY_SNAPSHOT, sqlite3_extended_errcode(database.get()));
-    EXPECT_EQ(500U, waits());
-    EXPECT_LE(0, table.api.runSqlEx("rollback"));
-
-    EXPECT_LE(0, table.api.runSqlEx(sqlExample()));
-    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-    EXPECT_EQ(SQLITE_BUSY, other.run(strOther.c_str()));
-    EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
-    EXPECT_LE(0, table.api.runSqlEx("commit"));
-    EXPECT_EQ(0U, waits());
+    // In a transaction that began as a writer nothing waits after a read.
+    EXPECT_EQ("wal", database_.value("pragma journal_mode=wal"));
+    const std::string strOther = "insert into " + table_.strName + " (text) values ('other')";
+    for (const std::string& strBegin : {std::string("begin"), example(0, "sql")}) {
+        const bool blWriter = "begin" != strBegin;
+        EXPECT_LE(0, api_.runSqlEx(strBegin));
+        EXPECT_NE("-1", ids());
+        EXPECT_EQ(blWriter ? SQLITE_BUSY : SQLITE_OK, run(other, strOther));
+        EXPECT_EQ(blWriter, "-1" != created(api_, R"({"text":"x"})"));
+        EXPECT_EQ(blWriter ? 0U : 500U, waits());
+        EXPECT_LE(0, api_.runSqlEx("rollback"));
+    }
 }

@@ -2,262 +2,139 @@
 // docs/log.md: its list of lines is complete, and its forms and examples are what the library
 // writes.
 
-#include "support/database.h"
+#include "docs/calls.h"
 #include "support/markdown.h"
 
 #include <unistd.h>
 #include <cerrno>
 #include <cstring>
-#include <filesystem>
-#include <fstream>
-#include <iterator>
-#include <regex>
 #include <set>
+#include <utility>
 
 namespace {
 
-using doubles::LogRecord;
 using doubles::state;
 
-std::string replaced(const std::string& strText, const std::string& strPattern,
-                     const std::string& strBy)
-{
-    return std::regex_replace(strText, std::regex(strPattern), strBy);
-}
-
-// The lines as the page shows them: another process, other line numbers.
+// The page shows another process and other line numbers.
 std::string withoutPlaces(const std::string& strText)
 {
     const std::string strNoLines = replaced(strText, "(VornJsonDbApi|util):[0-9]+", "$1:LINE");
     return replaced(strNoLines, "\\((4711|" + std::to_string(getpid()) + ")\\)", "(PID)");
 }
 
-// Several lines of the list may share a cell.
-std::vector<std::string> textsOf(const std::string& strCell)
+// What was logged since the last call, in one piece, without places.
+std::string takeText()
 {
-    static const std::string strBetween = "`<br>`";
-    std::vector<std::string> texts;
-    std::size_t nBegin = 0;
-    for (std::size_t nEnd; std::string::npos != (nEnd = strCell.find(strBetween, nBegin));
-         nBegin = nEnd + strBetween.size())
-        texts.push_back(strCell.substr(nBegin, nEnd - nBegin));
-    texts.push_back(strCell.substr(nBegin));
-    return texts;
+    std::string strLog;
+    for (const doubles::LogRecord& record : std::exchange(state().log, {})) {
+        strLog += record.strText;
+        if (record.blSyslog && '\n' != strLog.back()) strLog += '\n';
+    }
+    return withoutPlaces(strLog);
 }
 
-std::set<std::string> goldenList()
+bool contains(const std::string& strText, const std::string& strPart)
 {
-    std::set<std::string> texts;
-    std::ifstream file(VORN_TEST_DATA "/messages.txt");
-    for (std::string strLine; std::getline(file, strLine);)
-        if (0 != strLine.find("# ")) texts.insert(strLine);
-    return texts;
+    return std::string::npos != strText.find(strPart);
 }
 
-class DocsLog : public HostTest {
+// Its tables are the forms, two of examples, and the list of lines in parts.
+class LogPage : public HostTest {
 protected:
-    // The rows of the list: every table that begins with a column "Line" or "Text".
-    std::vector<std::vector<std::string>> listRows() const
-    {
-        std::vector<std::vector<std::string>> rows;
-        for (const MarkdownSection& candidate : page_)
-            for (const MarkdownTable& table : candidate.tables)
-                if ("Line" == table.header.at(0) || "Text" == table.header.at(0))
-                    rows.insert(rows.end(), table.rows.begin(), table.rows.end());
-        return rows;
-    }
+    LogPage() { EXPECT_EQ(6U, page_.blocks.size()); }
 
-    std::set<std::string> listedTexts() const
-    {
-        std::set<std::string> texts;
-        for (const auto& row : listRows())
-            for (const std::string& strText : textsOf(row.at(0)))
-                EXPECT_TRUE(texts.insert(strText).second) << "twice: " << strText;
-        return texts;
-    }
-
-    // What the host of the examples has logged since the last call, in one piece.
-    static std::string logged()
-    {
-        std::string strLog;
-        for (const LogRecord& record : std::exchange(state().log, {})) {
-            strLog += record.strText;
-            if (record.blSyslog && '\n' != strLog.back()) strLog += '\n';
-        }
-        return strLog;
-    }
-
-    // The errno of what is logged is part of the examples, so the database is in memory.
-    Database database_{std::string(":memory:")};
-    MarkdownPage page_ = readPage("log.md");
-};
-
-// With the table of the examples.
-class DocsLogExamples : public DocsLog {
-protected:
-    Json::Value jDefinition_ = json(fence(page_, "How to read a chain", "json"));
+    const MarkdownPage page_ = readPage("log.md");
+    // The definition and CREATE statement of the examples; a JSON text and its log for each.
+    const std::vector<MarkdownBlock>& blocks_ = page_.blocks;
+    Json::Value jDefinition_ = json(blocks_.at(0).strText);
+    std::string strCreate_ = blocks_.at(1).strText;
     std::string strName_ = jDefinition_.getMemberNames().at(0);
-    std::string strCreate_ = fence(page_, "How to read a chain", "sql");
+    // In memory, because the examples show errno.
+    Database database_{std::string(":memory:")};
     VornJsonDbApi api_{database_.get(), strName_, jDefinition_, strCreate_};
 };
 
-TEST_F(DocsLog, ListsEveryTextOfTheLibrary)
+TEST_F(LogPage, ListsEveryLineOnceWithItsMeaning)
 {
-    const std::set<std::string> listed = listedTexts();
-    for (const std::string& strText : goldenList())
-        EXPECT_EQ(1U, listed.count(strText)) << "not on the page: " << strText;
-}
-
-TEST_F(DocsLog, ListsNoOtherText)
-{
-    const std::set<std::string> golden = goldenList();
-    EXPECT_LT(90U, golden.size());
-    for (const std::string& strText : listedTexts())
-        EXPECT_EQ(1U, golden.count(strText)) << "not in the library: " << strText;
-}
-
-// Context and trace lines need nothing to be done.
-TEST_F(DocsLog, SaysOfEveryLineWhatItMeans)
-{
-    for (const auto& row : listRows()) {
-        ASSERT_LE(2U, row.size());
-        EXPECT_NE("", row[1]) << row[0];
-        const bool blNothingToDo = 0 == row[1].find("Context") || 0 == row[1].find("Trace");
-        EXPECT_TRUE(2 == row.size() || blNothingToDo || !row[2].empty()) << row[0];
+    std::set<std::string> listed;
+    std::set<std::string> traces;
+    for (std::size_t i = 3; i < page_.tables.size(); ++i) {
+        for (const auto& row : page_.tables[i].rows) {
+            EXPECT_NE("", row.at(1)) << row[0];
+            if (0 == row[1].find("Trace")) traces.insert(row[0]);
+            // Several lines may share a cell.
+            for (const std::string& strText : matches(row[0] + "`<br>`", "(.*?)`<br>`"))
+                EXPECT_TRUE(listed.insert(strText).second) << "twice: " << strText;
+        }
     }
+    const auto messages = matches(fileText("tests/data/messages.txt"), "(?:^|\n)(?!# )(.+)");
+    EXPECT_EQ(std::set<std::string>(messages.begin(), messages.end()), listed);
+    const auto traced =
+        matches(folderText("src"), R"re(if \(blDebugOutput\)\s+LOG_PLAIN\("([^"]*)")re");
+    EXPECT_EQ(std::set<std::string>(traced.begin(), traced.end()), traces);
 }
 
-TEST_F(DocsLog, NamesTheTraceLines)
+// Of each family: on standard output, on syslog with errno and without.
+TEST_F(LogPage, ShowsTheFormsOfTheLines)
 {
-    std::set<std::string> onThePage;
-    for (const auto& row : listRows())
-        if (0 == row.at(1).find("Trace:")) onThePage.insert(row[0]);
-
-    std::set<std::string> inTheSources;
-    const std::regex trace(R"re(if \(blDebugOutput\)\s+LOG_PLAIN\("([^"]*)")re");
-    for (const auto& entry : std::filesystem::recursive_directory_iterator(VORN_SOURCES)) {
-        if (!entry.is_regular_file()) continue;
-        std::ifstream file(entry.path());
-        const std::string strSource{std::istreambuf_iterator<char>(file), {}};
-        for (std::sregex_iterator it(strSource.begin(), strSource.end(), trace), end; it != end;
-             ++it)
-            inTheSources.insert((*it)[1]);
-    }
-    EXPECT_EQ(inTheSources, onThePage);
-    EXPECT_EQ(4U, onThePage.size());
-}
-
-TEST_F(DocsLogExamples, TheForms)
-{
-    const std::string strError = "Failed [0 >= strSql.length()], err=";
-    const std::string strPlain = ", run sql failed, error=Unknow Error!!, sql=";
-    for (const auto& row : table(page_, "The forms", 6).rows) {
-        const std::string strFamily = row[0];
-        const std::string strWhere = row[1];
-        SCOPED_TRACE(strFamily + ", " + strWhere);
-        blLogToStdout = "standard output" == strWhere;
-        const int iErrno = "syslog, `errno` set" == strWhere ? ENOENT : 0;
+    const auto& forms = page_.tables.at(0).rows;
+    ASSERT_EQ(6U, forms.size());
+    for (std::size_t i = 0; i < forms.size(); ++i) {
+        const bool blError = "error" == forms[i][0];
+        EXPECT_EQ(i < 3, blError);
+        blLogToStdout = 0 == i % 3;
+        const int iErrno = 1 == i % 3 ? ENOENT : 0;
         errno = iErrno;
         EXPECT_EQ(-1, api_.runSqlEx(""));
         const auto lines = std::exchange(state().log, {});
-        ASSERT_EQ(2U, lines.size());
-        const LogRecord& line = lines["plain" == strFamily];
+        const doubles::LogRecord& line = lines.at(blError ? 0 : 1);
         EXPECT_EQ(blLogToStdout, !line.blSyslog);
-
-        const std::string strErrno = strerror(iErrno);
-        const std::string strText = "error" == strFamily
-                                        ? strError + strErrno
-                                        : "i=0,errno=" + std::to_string(iErrno) + strPlain;
-        std::string strForm = replaced(row[2], "FILE", "VornJsonDbApi");
-        strForm = replaced(strForm, "ERRNO", strErrno);
-        strForm = replaced(strForm, "TEXT", strText);
-        const std::string strEnd =
-            std::string("error" == strFamily, '\n') + std::string(blLogToStdout, '\n');
-        EXPECT_EQ(strForm + strEnd, withoutPlaces(line.strText));
+        std::string strForm = replaced(withoutPlaces(line.strText), "(Failed|i=0,)[^\n]*", "TEXT");
+        strForm = replaced(strForm, strerror(iErrno), "ERRNO");
+        const std::string strEnd = std::string(blError, '\n') + std::string(blLogToStdout, '\n');
+        EXPECT_EQ(forms[i].back() + strEnd, replaced(strForm, "VornJsonDbApi", "FILE"));
     }
 }
 
-TEST_F(DocsLogExamples, ADuplicate)
+TEST_F(LogPage, ShowsADuplicate)
 {
-    const char* szHeading = "Example: a duplicate";
-    Json::Value jRecord = json(fence(page_, szHeading, "json"));
-    Json::Value jStored;
-    EXPECT_EQ(0, api_.recCreate(jRecord, jStored));
+    EXPECT_NE("-1", created(api_, blocks_[2].strText));
     blLogToStdout = true;
-    EXPECT_EQ(-1, api_.recCreate(jRecord, jStored));
-    EXPECT_EQ(withoutPlaces(fence(page_, szHeading, "log")), withoutPlaces(logged()));
+    EXPECT_EQ("-1", created(api_, blocks_[2].strText));
+    EXPECT_EQ(withoutPlaces(blocks_[3].strText), takeText());
     EXPECT_EQ("DUPLICATE_PRIMARY_KEY", api_.getErrMsg());
 }
 
-TEST_F(DocsLogExamples, ARowThatCannotBeRead)
+TEST_F(LogPage, ShowsARowThatCannotBeRead)
 {
-    const char* szHeading = "Example: a row that cannot be read";
     database_.run("insert into " + strName_ + " values (8,1,0.5,'x')");
-    Json::Value jRequest = json(fence(page_, szHeading, "json"));
-    Json::Value jRecords;
-    EXPECT_EQ(-1, api_.recList(jRequest, jRecords));
-    EXPECT_EQ(withoutPlaces(fence(page_, szHeading, "log")), withoutPlaces(logged()));
+    EXPECT_EQ("-1", listed(api_, blocks_[4].strText));
+    EXPECT_EQ(withoutPlaces(blocks_[5].strText), takeText());
 }
 
-TEST_F(DocsLogExamples, WhatSqliteSays)
+TEST_F(LogPage, SaysWhatSqliteSays)
 {
-    for (const auto& row : table(page_, "What SQLite says", 4).rows) {
+    for (const auto& row : page_.tables.at(1).rows) {
         SCOPED_TRACE(row[1]);
-        Json::Value jRequest = json(row[1]);
-        Json::Value jRecords;
-        EXPECT_EQ(-1, api_.recList(jRequest, jRecords));
-        const std::string strLog = logged();
-        EXPECT_NE(std::string::npos, strLog.find("run sql failed, error=" + row[0])) << strLog;
+        EXPECT_EQ("-1", listed(api_, row[1]));
+        EXPECT_PRED2(contains, takeText(), "run sql failed, error=" + row[0]);
     }
 }
 
-TEST_F(DocsLogExamples, AGapInTheStatement)
+TEST_F(LogPage, ShowsAGapInTheStatement)
 {
-    for (const auto& row : table(page_, "A gap in the statement", 3).rows) {
+    const std::string strGap = "error=near \")\": syntax error, sql=";
+    for (const auto& row : page_.tables.at(2).rows) {
         SCOPED_TRACE(row[1]);
-        Json::Value jParam = json(row[1]);
-        Json::Value jOut;
         const bool blSave = "recSave" == row[0];
         EXPECT_TRUE(blSave || "recList" == row[0]);
-        EXPECT_EQ(-1, blSave ? api_.recSave(jParam, true) : api_.recList(jParam, jOut));
-        const std::string strLog = logged();
-        EXPECT_NE(std::string::npos, strLog.find("error=near \")\": syntax error, sql=")) << strLog;
-        EXPECT_NE(std::string::npos, strLog.find(row[2])) << strLog;
-        EXPECT_EQ(blSave ? 0 : -1, api_.recCreate(jParam, jOut));
-        logged();
+        EXPECT_EQ("-1", blSave ? saved(api_, row[1]) : listed(api_, row[1]));
+        const std::string strLog = takeText();
+        EXPECT_PRED2(contains, strLog, strGap);
+        EXPECT_PRED2(contains, strLog, row[2]);
+        EXPECT_EQ(!blSave, "-1" == created(api_, row[1]));
+        takeText();
     }
-    for (const char* szRequest : {R"({"id":null,"who":"x"})", R"({"id":[],"who":"x"})"}) {
-        Json::Value jRequest = json(szRequest);
-        Json::Value jRecords;
-        EXPECT_EQ(-1, api_.recList(jRequest, jRecords));
-        EXPECT_NE(std::string::npos, logged().find("error=near \"and\": syntax error"));
-    }
-    for (const char* szMembers : {"", R"("member":{})"}) {
-        std::string strName = freshName();
-        std::string strCreate = "create table " + strName + " (a)";
-        Json::Value jDefinition = json("{\"" + strName + "\":{" + szMembers + "}}");
-        VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
-        Json::Value jRecord = json(R"({"a":1})");
-        Json::Value jStored;
-        EXPECT_EQ(-1, api.recCreate(jRecord, jStored));
-        EXPECT_NE(std::string::npos,
-                  logged().find("error=near \")\": syntax error, sql=INSERT INTO " + strName +
-                                " () VALUES (;"));
-    }
-}
-
-// A table or block that the tests above do not know would be compared by nobody.
-TEST_F(DocsLog, HasNoOtherTableOrBlock)
-{
-    std::size_t nTables = 0;
-    std::size_t nBlocks = 0;
-    for (const MarkdownSection& candidate : page_) {
-        nBlocks += candidate.fences.size();
-        for (const MarkdownTable& table : candidate.tables)
-            nTables += "Line" != table.header.at(0) && "Text" != table.header.at(0);
-    }
-    EXPECT_EQ(3U, nTables);
-    EXPECT_EQ(6U, nBlocks);
 }
 
 }  // namespace

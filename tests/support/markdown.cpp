@@ -3,146 +3,105 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <fstream>
-#include <utility>
+#include <iterator>
+#include <map>
+#include <regex>
+#include <sstream>
 
 namespace {
 
-std::string trimmed(const std::string& strText)
+const std::string kProject = VORN_DOCS "/../";
+
+const std::regex& compiled(const std::string& strPattern)
 {
-    const std::size_t iFirst = strText.find_first_not_of(' ');
-    if (std::string::npos == iFirst) return std::string();
-    return strText.substr(iFirst, strText.find_last_not_of(' ') - iFirst + 1);
+    static std::map<std::string, std::regex> patterns;
+    return patterns.try_emplace(strPattern, strPattern).first->second;
 }
 
-// Without the backquotes of a cell that is code as a whole.
-std::string bare(const std::string& strCell)
+// "| a | `b \| c` |" has the cells "a" and "b | c".
+std::vector<std::string> cellsOf(const std::string& strLine)
 {
-    const std::string strText = trimmed(strCell);
-    const bool blCode = 2 < strText.size() && '`' == strText.front() && '`' == strText.back();
-    return blCode ? strText.substr(1, strText.size() - 2) : strText;
-}
-
-// | a | `b \| c` |
-std::vector<std::string> cells(const std::string& strLine)
-{
-    std::vector<std::string> cells;
-    std::string strCell;
-    for (std::size_t i = 1; i < strLine.size(); ++i) {
-        if ('\\' == strLine[i] && i + 1 < strLine.size() && '|' == strLine[i + 1])
-            strCell += strLine[++i];
-        else if ('|' == strLine[i])
-            cells.push_back(bare(std::exchange(strCell, {})));
-        else
-            strCell += strLine[i];
-    }
+    std::vector<std::string> cells = matches(strLine.substr(1), R"( *((?:\\\||[^|])*?) *\|)");
+    for (std::string& strCell : cells)
+        strCell = replaced(replaced(strCell, "^`(.+)`$", "$1"), R"(\\\|)", "|");
     return cells;
 }
 
-bool beginsWith(const std::string& strLine, const char* szHead)
+}  // namespace
+
+std::string fileText(const std::string& strFile)
 {
-    return 0 == strLine.rfind(szHead, 0);
+    std::ifstream file(kProject + strFile);
+    EXPECT_TRUE(file.is_open()) << strFile;
+    return {std::istreambuf_iterator<char>(file), {}};
 }
 
-// One page, read line by line.
-class Reader {
-public:
-    MarkdownPage page;
+std::string folderText(const std::string& strFolder)
+{
+    std::string strText;
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(kProject + strFolder))
+        if (entry.is_regular_file())
+            strText += fileText(std::filesystem::relative(entry.path(), kProject));
+    return strText;
+}
 
-    void line(const std::string& strLine)
-    {
-        if (blFence_) return inFence(strLine);
-        if (beginsWith(strLine, "#")) {
-            page.emplace_back();
-            page.back().strHeading = trimmed(strLine.substr(strLine.find_first_not_of('#')));
-            blTable_ = false;
-            return;
-        }
-        if (page.empty()) page.emplace_back();
-        page.back().strText += strLine + "\n";
-        if (beginsWith(strLine, "```")) {
-            page.back().fences.push_back({strLine.substr(3), ""});
-            blFence_ = true;
-        }
-        tableLine(strLine);
-    }
+std::vector<std::string> matches(const std::string& strText, const std::string& strPattern,
+                                 const std::vector<int>& groups)
+{
+    const std::regex& pattern = compiled(strPattern);
+    return {std::sregex_token_iterator(strText.begin(), strText.end(), pattern, groups), {}};
+}
 
-private:
-    bool blFence_ = false;
-    bool blTable_ = false;
-
-    void inFence(const std::string& strLine)
-    {
-        page.back().strText += strLine + "\n";
-        if (beginsWith(strLine, "```"))
-            blFence_ = false;
-        else
-            page.back().fences.back().strText += strLine + "\n";
-    }
-
-    void tableLine(const std::string& strLine)
-    {
-        if (!beginsWith(strLine, "|")) {
-            blTable_ = false;
-            return;
-        }
-        auto& tables = page.back().tables;
-        if (!blTable_)
-            tables.push_back({cells(strLine), {}});
-        else if (!beginsWith(strLine, "|---"))
-            tables.back().rows.push_back(cells(strLine));
-        if (blTable_ && !tables.back().rows.empty()) {
-            EXPECT_EQ(tables.back().header.size(), tables.back().rows.back().size()) << strLine;
-            // A row that lacks cells still has them, so that a test may read it.
-            tables.back().rows.back().resize(tables.back().header.size());
-        }
-        blTable_ = true;
-    }
-};
-
-}  // namespace
+std::string replaced(const std::string& strText, const std::string& strPattern,
+                     const std::string& strBy)
+{
+    return std::regex_replace(strText, compiled(strPattern), strBy);
+}
 
 MarkdownPage readPage(const std::string& strFile)
 {
-    std::ifstream file(std::string(VORN_DOCS) + "/" + strFile);
-    EXPECT_TRUE(file.is_open()) << strFile;
-    Reader reader;
-    for (std::string strLine; std::getline(file, strLine);) reader.line(strLine);
-    return reader.page;
-}
-
-MarkdownSection section(const MarkdownPage& page, const std::string& strHeading)
-{
-    MarkdownSection found;
-    int iFound = 0;
-    for (const MarkdownSection& candidate : page) {
-        if (candidate.strHeading != strHeading) continue;
-        found = candidate;
-        ++iFound;
+    MarkdownPage page;
+    page.sections.emplace_back();
+    bool blBlock = false;
+    bool blTable = false;
+    std::istringstream lines(fileText("docs/" + strFile));
+    for (std::string strLine; std::getline(lines, strLine);) {
+        const bool blMark = 0 == strLine.rfind("```", 0);
+        const bool blRow = !blBlock && 0 == strLine.rfind('|', 0);
+        if (!blBlock && 0 == strLine.rfind('#', 0))
+            page.sections.push_back({replaced(strLine, "^#+ *", ""), "", {}, {}});
+        MarkdownSection& section = page.sections.back();
+        section.strText += strLine + "\n";
+        if (blMark && !blBlock) section.blocks.push_back({strLine.substr(3), ""});
+        if (!blMark && blBlock) section.blocks.back().strText += strLine + "\n";
+        if (blRow && !blTable) {
+            section.tables.push_back({cellsOf(strLine), {}});
+        } else if (blRow && 0 != strLine.rfind("|---", 0)) {
+            MarkdownTable& table = section.tables.back();
+            table.rows.push_back(cellsOf(strLine));
+            EXPECT_EQ(table.header.size(), table.rows.back().size()) << strLine;
+            table.rows.back().resize(table.header.size());
+        }
+        blBlock = blBlock != blMark;
+        blTable = blRow;
     }
-    EXPECT_EQ(1, iFound) << strHeading;
-    return found;
+    EXPECT_FALSE(blBlock) << strFile << ": the last block does not end";
+    for (const MarkdownSection& section : page.sections) {
+        page.blocks.insert(page.blocks.end(), section.blocks.begin(), section.blocks.end());
+        page.tables.insert(page.tables.end(), section.tables.begin(), section.tables.end());
+    }
+    return page;
 }
 
 MarkdownTable table(const MarkdownPage& page, const std::string& strHeading, std::size_t nRows)
 {
-    const MarkdownSection found = section(page, strHeading);
-    EXPECT_EQ(1U, found.tables.size()) << strHeading;
-    if (found.tables.empty()) return {};
-    EXPECT_EQ(nRows, found.tables[0].rows.size()) << strHeading;
-    return found.tables[0];
-}
-
-std::string fence(const MarkdownPage& page, const std::string& strHeading,
-                  const std::string& strLanguage)
-{
-    std::string strText;
-    int iFound = 0;
-    for (const MarkdownFence& candidate : section(page, strHeading).fences) {
-        if (candidate.strLanguage != strLanguage) continue;
-        strText = candidate.strText;
-        ++iFound;
+    for (const MarkdownSection& section : page.sections) {
+        if (section.strHeading != strHeading || 1 != section.tables.size()) continue;
+        EXPECT_EQ(nRows, section.tables[0].rows.size()) << strHeading;
+        return section.tables[0];
     }
-    EXPECT_EQ(1, iFound) << strHeading << ", " << strLanguage;
-    return strText;
+    ADD_FAILURE() << "no table: " << strHeading;
+    return {};
 }

@@ -1,41 +1,49 @@
 // SPDX-License-Identifier: MIT
-// The documentation as test data: sections, fenced blocks and tables of a Markdown page.
+// The documentation as test data: texts of the project, and the sections, blocks of code and tables
+// of a Markdown page.
 #pragma once
 
 #include <string>
 #include <vector>
 
-struct MarkdownFence {
+// A file of the project, and all files below a folder of it. The test fails when there is none.
+std::string fileText(const std::string& strFile);
+std::string folderText(const std::string& strFolder);
+
+// The given groups of every match of a pattern, and the text with every match replaced.
+std::vector<std::string> matches(const std::string& strText, const std::string& strPattern,
+                                 const std::vector<int>& groups = {1});
+std::string replaced(const std::string& strText, const std::string& strPattern,
+                     const std::string& strBy);
+
+struct MarkdownBlock {
     std::string strLanguage;
     std::string strText;
 };
 
+// Cells come without their backquotes, and with "|" for "\|".
 struct MarkdownTable {
     std::vector<std::string> header;
     std::vector<std::vector<std::string>> rows;
 };
 
-// What stands between a heading and the next one.
+// A heading and what follows it, up to the next heading.
 struct MarkdownSection {
     std::string strHeading;
-    std::string strText;  // everything, as it stands
-    std::vector<MarkdownFence> fences;
+    std::string strText;
+    std::vector<MarkdownBlock> blocks;
     std::vector<MarkdownTable> tables;
 };
 
-using MarkdownPage = std::vector<MarkdownSection>;
+// All sections, blocks and tables, each in the order of the page.
+struct MarkdownPage {
+    std::vector<MarkdownSection> sections;
+    std::vector<MarkdownBlock> blocks;
+    std::vector<MarkdownTable> tables;
+};
 
-// Reads a page of docs/. A cell is without its backquotes, with "|" for "\|". The test fails when
-// there is no such page, or a row has not as many cells as its header.
+// Reads a page of docs/. The test fails when a row has more or fewer cells than its header.
 MarkdownPage readPage(const std::string& strFile);
 
-// The section of that heading; the test fails when there is none, or the page has two of them.
-MarkdownSection section(const MarkdownPage& page, const std::string& strHeading);
-
-// The only table of the section of that heading. The test fails when the number of its rows is
-// not the one expected, so that a table that is not found is no success.
+// The only table below a heading. The test fails when it has another number of rows.
 MarkdownTable table(const MarkdownPage& page, const std::string& strHeading, std::size_t nRows);
-
-// The only block of that language in the section of that heading.
-std::string fence(const MarkdownPage& page, const std::string& strHeading,
-                  const std::string& strLanguage);
