@@ -1,0 +1,140 @@
+// SPDX-License-Identifier: MIT
+// What conditions, SET lists and the paging clause do in SQLite.
+
+#include "support/database.h"
+
+#include <utility>
+
+namespace {
+
+class ConditionsInSql : public TableTest {
+protected:
+    ConditionsInSql()
+    {
+        database_.run("insert into " + table_.strName + R"( values
+            (1, 'O''Brien', 1, 1, '{"k":1}', '[1,2]'),
+            (2, '1''2', 7, 0, '"x"', '1'),
+            (3, '', 12, 1, 'null', '[]'),
+            (4, null, null, null, null, null))");
+    }
+
+    // The ids that the statement gives, like "13", or SQLite's own words of why it does not run.
+    std::string outcome(const std::string& strSql)
+    {
+        std::string strIds;
+        const auto collect = [](void* arg, int, char** values, char**) {
+            static_cast<std::string*>(arg)->append(values[0]);
+            return 0;
+        };
+        char* szError = nullptr;
+        doubles::realExec(database_.get(), strSql.c_str(), collect, &strIds, &szError);
+        const std::string strError = szError ? szError : "";
+        sqlite3_free(szError);
+        return strError.empty() ? strIds : strError;
+    }
+
+    // A statement that ends with what SqlExpandMemberList makes of the request.
+    std::string composed(std::string strSql, const char* szRequest, int iJoiner)
+    {
+        Json::Value jRequest = json(szRequest);
+        EXPECT_EQ(0, table_.api.SqlExpandMemberList(jRequest, strSql, iJoiner)) << szRequest;
+        return strSql;
+    }
+
+    Table table_{database_,
+                 R"({"doc":{"cpptype":"Json::Value"}, "flag":{"cpptype":"bool"},
+                     "id":{"cpptype":"int"}, "list":{"cpptype":"Json::arrayValue"},
+                     "n":{"cpptype":"int"}, "name":{"cpptype":"string"}})",
+                 "id integer primary key, name text, n integer, flag integer, "
+                 "doc text, list text"};
+    const std::string strSelect_ = "select id from " + table_.strName;
+    const std::string strUpdate_ = "update " + table_.strName + " set ";
+};
+
+TEST_F(ConditionsInSql, SelectRows)
+{
+    const struct {
+        const char* szRequest;
+        const char* szOutcome;
+        int iJoiner = VORN_SQL_WHERE_TYPE_AND;
+    } cases[] = {
+        {R"({"name":"O'Brien"})", "1"},
+        {R"({"name":["O'Brien"]})", "1"},
+        {R"({"name":"o'brien"})", ""},
+        // Null is written as the empty text: a row without a value is never found.
+        {R"({"name":null})", "3"},
+        {R"({"name":[null]})", "3"},
+        {R"({"n":7})", "2"},
+        {R"({"n":"7"})", "2"},
+        {R"({"n":7.0})", "2"},
+        {R"({"n":[7]})", "2"},
+        {R"({"n":true})", "1"},
+        // A bare text is SQL.
+        {R"({"n":"n"})", "123"},
+        {R"({"n":"1 or 1=1"})", "1234"},
+        {R"({"n":["1,7"]})", "12"},
+        {R"({"n":"x"})", "no such column: x"},
+        {R"({"n":null})", "near \")\": syntax error"},
+        {R"({"flag":true})", "13"},
+        {R"({"flag":false})", "2"},
+        {R"({"flag":null})", "2"},
+        {R"({"flag":[true]})", "13"},
+        {R"({"doc":{"k":1}})", "1"},
+        {R"({"doc":"x"})", "2"},
+        {R"({"doc":null})", "3"},
+        {R"({"list":[[1,2]]})", "1"},
+        // The array is the list of values, not the value.
+        {R"({"list":[1]})", "2"},
+        {R"({"list":{}})", ""},
+        // Several items read as one, and an empty list leaves a gap.
+        {R"({"name":["1","2"]})", "2"},
+        {R"({"n":[1,2]})", "3"},
+        {R"({"flag":[true,false]})", "no such column: truefalse"},
+        {R"({"flag":true,"name":[]})", "near \")\": syntax error"},
+        {R"({"name":[]})", "near \")\": syntax error"},
+        {R"({"flag":true,"n":12})", "3"},
+        {R"({"name":"O'Brien","n":7})", "12", VORN_SQL_WHERE_TYPE_OR},
+        {R"({"name":"O'Brien","n":7})", ""},
+        {R"({"vornSqlWhereFilter":"n between 2 and 20"})", "23"},
+        {R"({"flag":true,"vornSqlWhereFilter":"n > 1"})", "3"},
+        // The filter gets no parentheses: flag=1 and n=1 or n=7.
+        {R"({"flag":true,"vornSqlWhereFilter":"n=1 or n=7"})", "12"},
+        {R"({"flag":true,"vornSqlWhereFilter":"(n=1 or n=7) "})", "1"},
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(c.szOutcome, outcome(composed(strSelect_ + " where", c.szRequest, c.iJoiner)))
+            << c.szRequest;
+}
+
+TEST_F(ConditionsInSql, UpdateRowsByASetList)
+{
+    const char szValues[] = R"({"name":"it's","n":8,"doc":{"k":"'"},"flag":false})";
+    database_.run(composed(strUpdate_, szValues, VORN_SQL_WHERE_TYPE_COMMA) + " where id=1");
+    EXPECT_EQ((Rows{{R"({"k":"'"})", "0", "8", "it's"}}),
+              database_.rows("select doc, flag, n, name from " + table_.strName + " where id=1"));
+    EXPECT_EQ(R"(near "in": syntax error)",
+              outcome(composed(strUpdate_, R"({"name":["x"]})", VORN_SQL_WHERE_TYPE_COMMA)));
+}
+
+TEST_F(ConditionsInSql, PageThroughRowsInTheOrderOfTheTable)
+{
+    const std::pair<const char*, const char*> cases[] = {
+        {R"({"limit":2})", "12"},
+        {R"({"limit":2,"offset":1})", "23"},
+        {R"({"limit":10,"offset":4})", ""},
+        {R"({"limit":0})", ""},
+        {R"({"limit":-1,"offset":2})", "34"},
+        {R"({"offset":2})", "1234"},
+        // Kept: the sort key is a text literal, the same for every row.
+        {R"({"sort_by":"id","sort_direction":"desc"})", "1234"},
+        {R"({"sort_by":"no column","sort_direction":"desc","limit":2,"offset":2})", "34"},
+    };
+    for (const auto& [szRequest, szIds] : cases) {
+        Json::Value jRequest = json(szRequest);
+        std::string strSql = strSelect_;
+        EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strSql));
+        EXPECT_EQ(szIds, outcome(strSql)) << szRequest;
+    }
+}
+
+}  // namespace
