@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: MIT
 // What conditions, SET lists and the paging clause do in SQLite.
 
-#include "support/database.h"
+#include "support/matrix.h"
 
+#include <functional>
 #include <utility>
 
 namespace {
@@ -59,28 +60,23 @@ TEST_F(ConditionsInSql, SelectRows)
         int iJoiner = VORN_SQL_WHERE_TYPE_AND;
     } cases[] = {
         {R"({"name":"O'Brien"})", "1"},
-        {R"({"name":["O'Brien"]})", "1"},
         {R"({"name":"o'brien"})", ""},
         // Null is written as the empty text: a row without a value is never found.
         {R"({"name":null})", "3"},
         {R"({"name":[null]})", "3"},
-        {R"({"n":7})", "2"},
         {R"({"n":"7"})", "2"},
         {R"({"n":7.0})", "2"},
         {R"({"n":[7]})", "2"},
         {R"({"n":true})", "1"},
         // A bare text is SQL.
-        {R"({"n":"n"})", "123"},
         {R"({"n":"1 or 1=1"})", "1234"},
         {R"({"n":["1,7"]})", "12"},
         {R"({"n":"x"})", "no such column: x"},
         {R"({"n":null})", "near \")\": syntax error"},
         {R"({"flag":true})", "13"},
-        {R"({"flag":false})", "2"},
         {R"({"flag":null})", "2"},
         {R"({"flag":[true]})", "13"},
         {R"({"doc":{"k":1}})", "1"},
-        {R"({"doc":"x"})", "2"},
         {R"({"doc":null})", "3"},
         {R"({"list":[[1,2]]})", "1"},
         // The array is the list of values, not the value.
@@ -90,9 +86,7 @@ TEST_F(ConditionsInSql, SelectRows)
         {R"({"name":["1","2"]})", "2"},
         {R"({"n":[1,2]})", "3"},
         {R"({"flag":[true,false]})", "no such column: truefalse"},
-        {R"({"flag":true,"name":[]})", "near \")\": syntax error"},
         {R"({"name":[]})", "near \")\": syntax error"},
-        {R"({"flag":true,"n":12})", "3"},
         {R"({"name":"O'Brien","n":7})", "12", VORN_SQL_WHERE_TYPE_OR},
         {R"({"name":"O'Brien","n":7})", ""},
         {R"({"vornSqlWhereFilter":"n between 2 and 20"})", "23"},
@@ -119,10 +113,8 @@ TEST_F(ConditionsInSql, UpdateRowsByASetList)
 TEST_F(ConditionsInSql, PageThroughRowsInTheOrderOfTheTable)
 {
     const std::pair<const char*, const char*> cases[] = {
-        {R"({"limit":2})", "12"},
         {R"({"limit":2,"offset":1})", "23"},
         {R"({"limit":10,"offset":4})", ""},
-        {R"({"limit":0})", ""},
         {R"({"limit":-1,"offset":2})", "34"},
         {R"({"offset":2})", "1234"},
         // Kept: the sort key is a text literal, the same for every row.
@@ -135,6 +127,81 @@ TEST_F(ConditionsInSql, PageThroughRowsInTheOrderOfTheTable)
         EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strSql));
         EXPECT_EQ(szIds, outcome(strSql)) << szRequest;
     }
+}
+
+// A list that a host makes in C++ may have holes (a[2] = 5 with nothing before it). They are
+// written as null, and the host's value keeps them.
+class Holes : public TableTest {
+protected:
+    // A list whose last item alone is set.
+    static Json::Value request(const char* szMember, const Json::Value& jLast)
+    {
+        Json::Value jRequest;
+        jRequest[szMember] = Json::Value(Json::arrayValue);
+        jRequest[szMember][2] = jLast;
+        return jRequest;
+    }
+
+    Table table_{database_,
+                 R"({"id":{"cpptype":"int"},"name":{"cpptype":"string"},
+                     "tags":{"cpptype":"Json::arrayValue"}})",
+                 "id integer primary key, name text, tags text"};
+};
+
+TEST_F(Holes, StayInARequest)
+{
+    VornJsonDbApi& api = table_.api;
+    Json::Value jOut;
+    Json::Value jValues = json(R"({"id":2})");
+    std::string strWhere = "id = 1";
+    std::string strOut;
+    // Every operation that takes a request, with its result where the list is written.
+    const struct {
+        const char* szEnd;
+        std::function<int(Json::Value&)> call;
+    } operations[] = {
+        {"-1", [&](Json::Value& jRequest) { return api.recUpdateByWhere(jRequest, strWhere); }},
+        {"0", [&](Json::Value& jRequest) { return api.recList(jRequest, jOut); }},
+        {"0", [&](Json::Value& jRequest) { return api.recGetOne(jRequest, jOut); }},
+        {"0", [&](Json::Value& jRequest) { return api.recDelete(jRequest); }},
+        {"0", [&](Json::Value& jRequest) { return api.recUpdateByFilter(jRequest, jValues); }},
+        {"0",
+         [&](Json::Value& jRequest) {
+             return api.SqlExpandMemberList(jRequest, strOut, VORN_SQL_WHERE_TYPE_COMMA);
+         }},
+        {"0",
+         [&](Json::Value& jRequest) {
+             return api.SqlMakeByListField("name", jRequest["name"], strOut);
+         }},
+    };
+    for (const auto& operation : operations)
+        // An item without a text throws.
+        for (const Json::Value& jLast : {Json::Value("x"), Json::Value(Json::objectValue)}) {
+            Json::Value jRequest = request("name", jLast);
+            jOut = Json::Value();
+            EXPECT_EQ(jLast.isString() ? operation.szEnd : "T",
+                      endOf([&] { return operation.call(jRequest); }));
+            EXPECT_TRUE(request("name", jLast) == jRequest);
+        }
+    EXPECT_EQ("name in ('''''x' )name in ('''''x' )", strOut);
+}
+
+TEST_F(Holes, StayInAJsonMember)
+{
+    Json::Value jFilter = json(R"({"id":1})");
+    Json::Value jValues = request("tags", 5);
+    takeStatements();
+    EXPECT_EQ(-1, table_.api.recUpdateByFilter(jFilter, jValues));
+    EXPECT_EQ("UPDATE " + table_.strName + " SET tags in ('null''null''5' ) WHERE  (id=1 );",
+              takeStatements().at(0));
+    EXPECT_TRUE(request("tags", 5) == jValues);
+
+    jValues["id"] = 1;
+    Json::Value jRecord = jValues;
+    Json::Value jStored;
+    EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
+    EXPECT_TRUE(jValues == jRecord);
+    EXPECT_EQ(R"({"id":1,"tags":[null,null,5]})", text(jStored));
 }
 
 }  // namespace

@@ -7,16 +7,10 @@
 namespace {
 
 constexpr char kMembers[] = R"({
-    "": {"cpptype": "string"},
-    "Z": {"cpptype": "string"},
-    "a": {"cpptype": "string"},
-    "b": {"cpptype": "string"},
-    "doc": {"cpptype": "Json::Value"},
-    "flag": {"cpptype": "bool"},
-    "list": {"cpptype": "Json::arrayValue"},
-    "n": {"cpptype": "int"},
-    "nul\u0000name": {"cpptype": "string"},
-    "obj": {"cpptype": "Json::objectValue"},
+    "": {"cpptype": "string"}, "Z": {"cpptype": "string"}, "a": {"cpptype": "string"},
+    "b": {"cpptype": "string"}, "doc": {"cpptype": "Json::Value"}, "flag": {"cpptype": "bool"},
+    "list": {"cpptype": "Json::arrayValue"}, "n": {"cpptype": "int"},
+    "nul\u0000name": {"cpptype": "string"}, "obj": {"cpptype": "Json::objectValue"},
     "z": {"cpptype": "string"}
 })";
 
@@ -40,6 +34,12 @@ struct Case {
 
 class Conditions : public TableTest {
 protected:
+    Conditions()
+    {
+        takeLog();
+        takeStatements();
+    }
+
     static void expectTerms(VornJsonDbApi& api, const std::vector<Case>& cases)
     {
         for (const Case& row : cases)
@@ -48,9 +48,11 @@ protected:
             });
     }
 
-    void expectTerms(const std::vector<Case>& cases) { expectTerms(table_.api, cases); }
+    void expectTerms(const std::vector<Case>& cases) { expectTerms(api_, cases); }
 
-    Table table_{database_, kMembers, "a, b, doc, flag, list, n, obj, z"};
+    // Conditions need no connection.
+    Table table_{database_, kMembers, "a"};
+    VornJsonDbApi api_{nullptr, table_.strName, table_.jDefinition, table_.strCreate};
 };
 
 TEST_F(Conditions, JoinTermsByTheJoiner)
@@ -81,9 +83,7 @@ TEST_F(Conditions, AddNothingWithoutAUsableKey)
 TEST_F(Conditions, PassOverUndeclaredKeys)
 {
     expectTerms({
-        {kAnd, R"({"A":1,"a":"x"})", {" (a='x' )"}},
         {kAnd, R"({"a":"x","aa":1,"b":"y"})", {" (a='x' and b='y' )"}},
-        {kAnd, R"({"a":"x","zz":1})", {" (a='x' )"}},
         {kComma, R"({"A":1,"a":"x","aa":[2],"b":"y","zz":{}})", {"a='x' , b='y'"}},
         {kAnd, R"({"a":"x","limit":1,"offset":2,"sort_by":"a"})", {" (a='x' )"}},
         {kAnd, R"({"a\u0000b":"x","b":"y"})", {" (b='y' )"}},
@@ -116,7 +116,6 @@ TEST_F(Conditions, MakeAMembershipTermOfEveryArray)
         {kAnd, R"({"a":["x"]})", {" (a in ('x' ) )"}},
         {kAnd, R"({"a":"x","b":["1","2"]})", {" (a='x' and b in ('1''2' ) )"}},
         {kOr, R"({"n":[5]})", {" (n in (5 ) )"}},
-        {kAnd, R"({"list":[1]})", {" (list in ('1' ) )"}},
         {kAnd, R"({"list":[[1,2]]})", {" (list in ('[1,2]' ) )"}},
         {kAnd, R"({"obj":[{"k":1}]})", {R"( (obj in ('{"k":1}' ) ))"}},
         {kAnd, R"({"doc":["x"]})", {R"( (doc in ('"x"' ) ))"}},
@@ -139,9 +138,6 @@ TEST_F(Conditions, MakeAnEqualityTermOfEveryOtherValue)
 {
     expectTerms({
         {kAnd, R"({"a":"O'Brien"})", {" (a='O''Brien' )"}},
-        {kAnd, R"({"a":7})", {" (a='7' )"}},
-        {kAnd, R"({"a":null})", {" (a='' )"}},
-        {kAnd, R"({"n":"7"})", {" (n=7 )"}},
         {kAnd, R"({"n":null})", {" (n= )"}},
         {kAnd, R"({"flag":true})", {" (flag=1 )"}},
         {kAnd, R"({"obj":{"k":"it's"}})", {R"( (obj='{"k":"it''s"}' ))"}},
@@ -169,14 +165,6 @@ TEST_F(Conditions, TakeTheRawFilterForAMemberOfItsName)
     Table table(database_, R"({"vornSqlWhereFilter":{"cpptype":"int"}})", "vornSqlWhereFilter");
     expectTerms(table.api, {{kAnd, R"({"vornSqlWhereFilter":"x"})", {" ( x  )"}},
                             {kAnd, R"({"vornSqlWhereFilter":5})", {" (", "-1", {kBadFilter}}}});
-}
-
-TEST_F(Conditions, NeedNoConnection)
-{
-    VornJsonDbApi api(nullptr, table_.strName, table_.jDefinition, table_.strCreate);
-    takeLog();
-    takeStatements();
-    expectTerms(api, {{kAnd, R"({"a":"x"})", {" (a='x' )"}}});
 }
 
 TEST_F(Conditions, RefuseARequestThatIsNoObject)
@@ -221,28 +209,26 @@ TEST_F(Conditions, RefuseAListUnderANameThatIsEmptyOrHoldsANul)
 
 TEST_F(Conditions, FailWithoutMemoryForATerm)
 {
-    const auto noMemory = [](const char* szOut, int iFail, const char* szFormat,
-                             const char* szArgument, const std::string& strOuter) {
-        const Lines lines = {failed(std::string("NULL == (szSql = sqlite3_mprintf(\"") + szFormat +
-                                    "\", " + szArgument + "))"),
-                             strOuter};
+    const auto noMemory = [](const char* szOut, int iFail, const std::string& strArgument,
+                             const std::string& strOuter) {
+        const Lines lines = {
+            failed("NULL == (szSql = sqlite3_mprintf(\"%q\", " + strArgument + ".c_str()))"),
+            strOuter};
         return Composed{szOut, "-1", lines, iFail};
     };
-    const char* szText = "jParam.asString().c_str()";
-    const char* szItem = "jList[i].asString().c_str()";
+    const auto noMatch = [&](const char* szOut, int iFail) {
+        return noMemory(szOut, iFail, "jParam.asString()", kBadMatch);
+    };
     expectTerms({
-        {kComma, R"({"a":"x"})", noMemory("", 1, "%q", szText, kBadMatch)},
-        {kAnd, R"({"a":"x","b":"y"})", noMemory(" (a='x' and ", 2, "%q", szText, kBadMatch)},
-        {kOr, R"({"a":"x","b":"y"})", noMemory(" (a='x' or ", 2, "%q", szText, kBadMatch)},
-        {kComma, R"({"a":"x","b":"y"})", noMemory("a='x' , ", 2, "%q", szText, kBadMatch)},
-        {kAnd, R"({"n":7})", noMemory(" (", 1, "%q", szText, kBadMatch)},
-        {kAnd, R"({"doc":1})", noMemory(" (", 1, "%q", "jParam.toString().c_str()", kBadMatch)},
-        {kAnd, R"({"flag":true})", noMemory(" (", 1, "%d", "jParam.asInt()", kBadMatch)},
-        {kAnd, R"({"a":["x"]})", noMemory(" (", 1, "%q", szItem, kBadList)},
-        {kAnd, R"({"a":"x","n":[1,2]})", noMemory(" (a='x' and ", 3, "%q", szItem, kBadList)},
-        {kAnd, R"({"doc":[1]})", noMemory(" (", 1, "%q", "jList[i].toString().c_str()", kBadList)},
-        {kAnd, R"({"vornSqlWhereFilter":"1","z":"x"})",
-         noMemory(" ( 1  and ", 1, "%q", szText, kBadMatch)},
+        {kComma, R"({"a":"x"})", noMatch("", 1)},
+        {kAnd, R"({"a":"x","b":"y"})", noMatch(" (a='x' and ", 2)},
+        {kOr, R"({"a":"x","n":7})", noMatch(" (a='x' or ", 2)},
+        {kComma, R"({"a":"x","b":"y"})", noMatch("a='x' , ", 2)},
+        {kAnd, R"({"vornSqlWhereFilter":"1","z":"x"})", noMatch(" ( 1  and ", 1)},
+        {kAnd, R"({"doc":1})", noMemory(" (", 1, "jParam.toString()", kBadMatch)},
+        {kAnd, R"({"doc":[1]})", noMemory(" (", 1, "jList[i].toString()", kBadList)},
+        {kAnd, R"({"a":"x","n":[1,2]})",
+         noMemory(" (a='x' and ", 3, "jList[i].asString()", kBadList)},
     });
 }
 
@@ -269,9 +255,8 @@ TEST_F(ConditionLookUps, ComeOnceACallBeforeEveryCheck)
         Json::Value jRequest = json(szRequest);
         return api.SqlExpandMemberList(jRequest, strOut, iJoiner);
     };
-    EXPECT_EQ(1, list(R"({"a":"x"})", kAnd));
-    EXPECT_EQ(named(lookUp("!jTableDef.isMember(strJsonName)", szDefinition, "-")), takeOwnLog());
-
+    VORN_JSON_DB::recType(jDefinition, strName_);
+    takeLog();
     const auto expectLines = [&](int iExpected, int iResult, const Lines& lines) {
         EXPECT_EQ(iExpected, iResult);
         EXPECT_EQ(named(lookUp(kPoisoned, szDefinition, "null") + lines), takeOwnLog());

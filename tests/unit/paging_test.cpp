@@ -7,26 +7,44 @@
 
 namespace {
 
-class Paging : public TableTest {
+class Paging : public HostTest {
 protected:
+    Paging()
+    {
+        takeLog();
+        takeStatements();
+    }
+
     void expectClause(const std::string& strRequest, const Composed& expected)
     {
         expectComposed(expected, strRequest, [this](auto& jRequest, auto& strOut) {
-            return table_.api.SqlFilterConditionFromJson(jRequest, strOut);
+            return api_.SqlFilterConditionFromJson(jRequest, strOut);
         });
     }
 
-    Table table_{database_, R"({"name":{"cpptype":"string"},"limit":{"cpptype":"int"}})",
-                 "name, \"limit\""};
+    // Neither a connection nor a definition is looked at.
+    std::string strName_ = freshName();
+    Json::Value jDefinition_;
+    std::string strCreate_;
+    VornJsonDbApi api_{nullptr, strName_, jDefinition_, strCreate_};
 };
 
-TEST_F(Paging, IsNothingWithoutAKey)
+TEST_F(Paging, WritesItsPartsInOrder)
 {
-    for (const char* szRequest :
-         {"null", "{}", R"({"name":"x","vornSqlWhereFilter":"1"})", R"({"offset":5})",
-          R"({"offset":{},"sort_direction":{}})", R"({"sort_direction":"desc","offset":5})",
-          R"({"Limit":1,"LIMIT":2,"limit ":3,"limit\u0000":4,"sort":"a","Sort_by":"b"})"})
-        expectClause(szRequest, {""});
+    const std::pair<const char*, const char*> cases[] = {
+        {R"({"offset":20,"limit":10,"sort_by":"name"})", " order by 'name' LIMIT 10 OFFSET 20"},
+        {R"({"sort_by":"name","sort_direction":"desc","limit":10,"offset":0})",
+         " order by 'name' DESC LIMIT 10 OFFSET 0"},
+        {R"({"sort_direction":"desc","limit":10,"offset":0})", " LIMIT 10 OFFSET 0"},
+        {R"({"sort_by":"name","offset":10})", " order by 'name'"},
+        {R"({"sort_direction":"desc","offset":5})", ""},
+        {R"({"offset":{},"sort_direction":{}})", ""},
+        {R"({"name":"x","vornSqlWhereFilter":"1"})", ""},
+        {R"({"Limit":1,"LIMIT":2,"limit ":3,"limit\u0000":4,"sort":"a","Sort_by":"b"})", ""},
+        {"{}", ""},
+        {"null", ""},
+    };
+    for (const auto& [szRequest, szClause] : cases) expectClause(szRequest, {szClause});
 }
 
 TEST_F(Paging, WritesTheSortKeyAsATextLiteral)
@@ -57,29 +75,13 @@ TEST_F(Paging, SortsDownOnlyForDesc)
         expectClause(strRequest + szDirection + "}", {" order by 'name' ASC"});
 }
 
-TEST_F(Paging, WritesItsPartsInOrder)
-{
-    expectClause(R"({"sort_by":"name","offset":10})", {" order by 'name'"});
-    expectClause(R"({"offset":20,"limit":10,"sort_by":"name"})",
-                 {" order by 'name' LIMIT 10 OFFSET 20"});
-    expectClause(R"({"sort_by":"name","sort_direction":"desc","limit":10,"offset":0})",
-                 {" order by 'name' DESC LIMIT 10 OFFSET 0"});
-    expectClause(R"({"sort_direction":"desc","limit":10,"offset":0})", {" LIMIT 10 OFFSET 0"});
-}
-
 // Of every kind, and unchecked.
 TEST_F(Paging, WritesLimitAndOffsetAsJson)
 {
-    const std::pair<const char*, const char*> spelledAnew[] = {
-        {"0.1", "0.10000000000000001"},
-        {"[1, 2]", "[1,2]"},
-        {R"({"b": 1, "a": [null]})", R"({"a":[null],"b":1})"},
-    };
     const auto expectValue = [this](const std::string& strValue, const std::string& strText) {
         expectClause(R"({"limit":)" + strValue + "}", {" LIMIT " + strText});
         expectClause(R"({"limit":1,"offset":)" + strValue + "}", {" LIMIT 1 OFFSET " + strText});
     };
-    for (const auto& [szValue, szText] : spelledAnew) expectValue(szValue, szText);
     for (const char* szValue : {"0",
                                 "-1",
                                 "2147483648",
@@ -101,6 +103,8 @@ TEST_F(Paging, WritesLimitAndOffsetAsJson)
                                 "[]",
                                 "{}"})
         expectValue(szValue, szValue);
+    expectValue("0.1", "0.10000000000000001");
+    expectValue(R"({"b": 1, "a": [null, 2]})", R"({"a":[null,2],"b":1})");
 }
 
 TEST_F(Paging, LeavesOutTheCommentsOfAReader)
@@ -108,7 +112,7 @@ TEST_F(Paging, LeavesOutTheCommentsOfAReader)
     Json::Value jRequest = json(R"({"limit":10})");
     jRequest["limit"].setComment(std::string("// ten"), Json::commentAfterOnSameLine);
     std::string strOut;
-    EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
+    EXPECT_EQ(0, api_.SqlFilterConditionFromJson(jRequest, strOut));
     EXPECT_EQ(" LIMIT 10", strOut);
 }
 
@@ -142,21 +146,6 @@ TEST_F(Paging, FailsWithoutMemoryForTheSortKey)
     const char szRequest[] = R"({"sort_by":"name","sort_direction":"desc","limit":1})";
     expectClause(szRequest, {"", "-1", {failed("!szSql")}, 1});
     expectClause(szRequest, {" order by 'name' DESC LIMIT 1"});
-}
-
-// Neither the connection nor the definition is looked at.
-TEST_F(Paging, NeedsNoTable)
-{
-    std::string strName = freshName();
-    Json::Value jDefinition;
-    std::string strCreate;
-    VornJsonDbApi api(nullptr, strName, jDefinition, strCreate);
-    takeLog();
-    takeStatements();
-    expectComposed({" order by 'name' LIMIT 1"}, R"({"sort_by":"name","limit":1})",
-                   [&](auto& jRequest, auto& strOut) {
-                       return api.SqlFilterConditionFromJson(jRequest, strOut);
-                   });
 }
 
 }  // namespace

@@ -14,24 +14,14 @@ const char* const kNoObjects[] = {"null", "true", "5",     "-5", "18446744073709
 
 class DefaultValues : public TableTest {
 protected:
-    // Filling mode, which never fails.
-    static void expectFilled(Table& table, const std::string& strRecord,
-                             const std::string& strFilled)
+    // Filling mode never fails; checking mode changes nothing and fails where it logs.
+    static void expectFill(Table& table, bool blCheckOnly, const std::string& strRecord,
+                           const std::string& strFilled, const Lines& lines = {})
     {
         SCOPED_TRACE(strRecord);
         Json::Value jRecord = json(strRecord);
-        EXPECT_EQ(0, table.api.fillDefaultValue(jRecord, false));
+        EXPECT_EQ(lines.empty() ? 0 : -1, table.api.fillDefaultValue(jRecord, blCheckOnly));
         EXPECT_EQ(strFilled, text(jRecord));
-        EXPECT_EQ(Lines(), takeLog());
-    }
-
-    // Checking mode, which changes nothing and fails where a member is lost.
-    static void expectChecked(Table& table, const std::string& strRecord, const Lines& lines)
-    {
-        SCOPED_TRACE(strRecord);
-        Json::Value jRecord = json(strRecord);
-        EXPECT_EQ(lines.empty() ? 0 : -1, table.api.fillDefaultValue(jRecord, true));
-        EXPECT_EQ(strRecord, text(jRecord));
         EXPECT_EQ(lines, takeLog());
     }
 
@@ -48,10 +38,7 @@ protected:
 
 TEST_F(DefaultValues, FillWhatTheRecordLacks)
 {
-    const struct {
-        const char* szRecord;
-        const char* szFilled;
-    } cases[] = {
+    const std::pair<const char*, const char*> cases[] = {
         {"{}", R"({"a":"x","c":3})"},
         {"null", R"({"a":"x","c":3})"},
         {R"({"b":1})", R"({"a":"x","b":1,"c":3})"},
@@ -59,7 +46,7 @@ TEST_F(DefaultValues, FillWhatTheRecordLacks)
         {R"({"a":null,"b":null,"c":null})", R"({"a":null,"b":null,"c":null})"},
         {R"({"A":1,"c":{},"d":2})", R"({"A":1,"a":"x","c":{},"d":2})"},
     };
-    for (const auto& c : cases) expectFilled(abc_, c.szRecord, c.szFilled);
+    for (const auto& [szRecord, szFilled] : cases) expectFill(abc_, false, szRecord, szFilled);
 }
 
 TEST_F(DefaultValues, AreCopiedWholeWhateverTheirKind)
@@ -71,8 +58,8 @@ TEST_F(DefaultValues, AreCopiedWholeWhateverTheirKind)
         Table table(database_,
                     R"({"i":)" + strMember + R"("int"},"v":)" + strMember + R"("no such word"}})",
                     "i,v");
-        expectFilled(table, "{}", R"({"i":)" + strDefault + R"(,"v":)" + strDefault + "}");
-        expectFilled(table, R"({"i":1,"v":null})", R"({"i":1,"v":null})");
+        expectFill(table, false, "{}", R"({"i":)" + strDefault + R"(,"v":)" + strDefault + "}");
+        expectFill(table, false, R"({"i":1,"v":null})", R"({"i":1,"v":null})");
     }
 }
 
@@ -84,7 +71,7 @@ TEST_F(DefaultValues, AreCopiesOfTheirOwn)
     EXPECT_EQ(0, table.api.fillDefaultValue(jRecord, false));
     jRecord["v"]["k"].append(2);
     jRecord["v"]["l"] = 3;
-    expectFilled(table, "{}", R"({"v":{"k":[1]}})");
+    expectFill(table, false, "{}", R"({"v":{"k":[1]}})");
     EXPECT_EQ(json(R"({"k":[1]})"),
               table.jDefinition[table.strName]["member"]["v"]["cppDefaultValue"]);
 }
@@ -93,9 +80,9 @@ TEST_F(DefaultValues, LeaveARecordAloneThatIsNoObject)
 {
     Table nameless(database_, R"({"":{"cpptype":"int"}})", "a");
     for (const std::string strRecord : kNoObjects) {
-        if ("null" != strRecord) expectFilled(abc_, strRecord, strRecord);
-        expectChecked(abc_, strRecord, {lost("a")});
-        expectChecked(nameless, strRecord, {lost("")});
+        if ("null" != strRecord) expectFill(abc_, false, strRecord, strRecord);
+        expectFill(abc_, true, strRecord, strRecord, {lost("a")});
+        expectFill(nameless, true, strRecord, strRecord, {lost("")});
     }
 }
 
@@ -109,17 +96,18 @@ TEST_F(DefaultValues, AreReportedAsLostByTheFirstName)
         {R"({"A":1,"B":1,"C":1})", "a"},
     };
     for (const auto& [szRecord, szLost] : cases) {
-        expectChecked(abc_, szRecord, {lost(szLost)});
+        expectFill(abc_, true, szRecord, szRecord, {lost(szLost)});
         blDebugOutput = true;
         for (bool blStdout : {false, true}) {
             blLogToStdout = blStdout;
-            expectChecked(abc_, szRecord, {lost(szLost), plain(std::string("jParam=") + szRecord)});
+            expectFill(abc_, true, szRecord, szRecord,
+                       {lost(szLost), plain(std::string("jParam=") + szRecord)});
         }
         blLogToStdout = blDebugOutput = false;
     }
     for (const char* szRecord : {R"({"a":"","b":1,"c":2})", R"({"a":null,"b":null,"c":null})",
                                  R"({"a":1,"b":1,"c":1,"d":1})"})
-        expectChecked(abc_, szRecord, {});
+        expectFill(abc_, true, szRecord, szRecord);
 }
 
 // The look-up says what is wrong; the result does not.
@@ -231,13 +219,9 @@ TEST_F(TypeCheck, PassesEveryObjectWhereTheTableHasNoTypes)
     Json::Value jRecord = json(R"({"a":[],"b":null})");
     EXPECT_EQ(0, table.api.checkJsonType(jRecord));
     EXPECT_EQ(4U, takeLog().size());
-    // The look-up comes first.
     jRecord = "x";
     EXPECT_EQ(-1, table.api.checkJsonType(jRecord));
-    const Lines lines = takeLog();
-    ASSERT_EQ(5U, lines.size());
-    EXPECT_EQ(utilFailed("jType[strJsonName].type() != Json::objectValue"), lines[0]);
-    EXPECT_EQ(failed("!jRecParam.isObject()"), lines[4]);
+    EXPECT_EQ(failed("!jRecParam.isObject()"), takeLog().at(4));
 }
 
 TEST_F(TypeCheck, ReadsTheWordAsText)
