@@ -8,6 +8,8 @@
 
 namespace {
 
+constexpr int kComma = VORN_SQL_WHERE_TYPE_COMMA;
+
 class ConditionsInSql : public TableTest {
 protected:
     ConditionsInSql()
@@ -103,11 +105,11 @@ TEST_F(ConditionsInSql, SelectRows)
 TEST_F(ConditionsInSql, UpdateRowsByASetList)
 {
     const char szValues[] = R"({"name":"it's","n":8,"doc":{"k":"'"},"flag":false})";
-    database_.run(composed(strUpdate_, szValues, VORN_SQL_WHERE_TYPE_COMMA) + " where id=1");
+    database_.run(composed(strUpdate_, szValues, kComma) + " where id=1");
     EXPECT_EQ((Rows{{R"({"k":"'"})", "0", "8", "it's"}}),
               database_.rows("select doc, flag, n, name from " + table_.strName + " where id=1"));
     EXPECT_EQ(R"(near "in": syntax error)",
-              outcome(composed(strUpdate_, R"({"name":["x"]})", VORN_SQL_WHERE_TYPE_COMMA)));
+              outcome(composed(strUpdate_, R"({"name":["x"]})", kComma)));
 }
 
 TEST_F(ConditionsInSql, PageThroughRowsInTheOrderOfTheTable)
@@ -160,19 +162,13 @@ TEST_F(Holes, StayInARequest)
         const char* szEnd;
         std::function<int(Json::Value&)> call;
     } operations[] = {
-        {"-1", [&](Json::Value& jRequest) { return api.recUpdateByWhere(jRequest, strWhere); }},
-        {"0", [&](Json::Value& jRequest) { return api.recList(jRequest, jOut); }},
-        {"0", [&](Json::Value& jRequest) { return api.recGetOne(jRequest, jOut); }},
-        {"0", [&](Json::Value& jRequest) { return api.recDelete(jRequest); }},
-        {"0", [&](Json::Value& jRequest) { return api.recUpdateByFilter(jRequest, jValues); }},
-        {"0",
-         [&](Json::Value& jRequest) {
-             return api.SqlExpandMemberList(jRequest, strOut, VORN_SQL_WHERE_TYPE_COMMA);
-         }},
-        {"0",
-         [&](Json::Value& jRequest) {
-             return api.SqlMakeByListField("name", jRequest["name"], strOut);
-         }},
+        {"-1", [&](auto& jIn) { return api.recUpdateByWhere(jIn, strWhere); }},
+        {"0", [&](auto& jIn) { return api.recList(jIn, jOut); }},
+        {"0", [&](auto& jIn) { return api.recGetOne(jIn, jOut); }},
+        {"0", [&](auto& jIn) { return api.recDelete(jIn); }},
+        {"0", [&](auto& jIn) { return api.recUpdateByFilter(jIn, jValues); }},
+        {"0", [&](auto& jIn) { return api.SqlExpandMemberList(jIn, strOut, kComma); }},
+        {"0", [&](auto& jIn) { return api.SqlMakeByListField("name", jIn["name"], strOut); }},
     };
     for (const auto& operation : operations)
         // An item without a text throws.

@@ -149,14 +149,13 @@ TEST_F(Conditions, MakeAnEqualityTermOfEveryOtherValue)
 
 TEST_F(Conditions, ReadPagingKeysThatTheTableDeclares)
 {
-    Table table(database_,
-                R"({"limit":{"cpptype":"int"},"offset":{"cpptype":"int"},
-                    "sort_by":{"cpptype":"string"},"sort_direction":{"cpptype":"string"}})",
-                "a");
-    expectTerms(table.api,
-                {{kAnd,
-                  R"({"limit":1,"offset":2,"sort_by":"a","sort_direction":"desc","a":3})",
-                  {" (limit=1 and offset=2 and sort_by='a' and sort_direction='desc' )"}}});
+    const char szMembers[] = R"({"limit":{"cpptype":"int"},"offset":{"cpptype":"int"},
+        "sort_by":{"cpptype":"string"},"sort_direction":{"cpptype":"string"}})";
+    Table table(database_, szMembers, "a");
+    expectTerms(table.api, {{kAnd,
+                             R"({"offset":2,"sort_by":"a","sort_direction":"desc","a":3})",
+                             {" (offset=2 and sort_by='a' and sort_direction='desc' )"}},
+                            {kAnd, R"({"limit":1})", {" (limit=1 )"}}});
 }
 
 // Kept: the name always means the raw filter, and its value is never written as a value.
@@ -167,21 +166,17 @@ TEST_F(Conditions, TakeTheRawFilterForAMemberOfItsName)
                             {kAnd, R"({"vornSqlWhereFilter":5})", {" (", "-1", {kBadFilter}}}});
 }
 
-TEST_F(Conditions, RefuseARequestThatIsNoObject)
+TEST_F(Conditions, RefuseARequestThatIsNoObjectOrAnUnknownJoiner)
 {
     for (const char* szRequest : {"[]", R"([{"a":"x"}])", R"("x")", R"("")", "0", "-1",
                                   "18446744073709551615", "1.5", "true", "false"})
         for (int iJoiner : {kOr, kAnd, kComma, 3})
             expectTerms({{iJoiner, szRequest, {"", "-1", {kBadKind}}}});
-}
-
-TEST_F(Conditions, RefuseAnUnknownJoiner)
-{
-    for (int iJoiner : {3, -1, 4, 2147483647, -2147483647 - 1})
+    for (int iJoiner : {3, -1, 4, 2147483647, -2147483647 - 1}) {
+        const std::string strLine = error("error andType=" + std::to_string(iJoiner));
         for (const char* szRequest : {R"({"a":"x"})", "{}", "null"})
-            expectTerms({{iJoiner,
-                          szRequest,
-                          {"", "-1", {error("error andType=" + std::to_string(iJoiner))}}}});
+            expectTerms({{iJoiner, szRequest, {"", "-1", {strLine}}}});
+    }
 }
 
 TEST_F(Conditions, RefuseARawFilterThatIsNoText)

@@ -37,10 +37,8 @@ const Value kValues[] = {
     {R"("x")", "x", kThrows},
     {R"("")", "", kThrows},
     {R"("O'Brien")", "O''Brien", kThrows},
-    {R"("''")", "''''", kThrows},
     {R"("a\"b\\c")", R"(a"b\c)", kThrows},
     {R"("%d%n%z%%")", "%d%n%z%%", kThrows},
-    {R"("a\nb")", "a\nb", kThrows},
     // Text is cut at a NUL byte, JSON text has it escaped.
     {R"("a\u0000b")", "a", kThrows},
     {R"("ändern 東京 😀")", "ändern 東京 😀", kThrows},
@@ -61,7 +59,6 @@ const Value kValues[] = {
     {"null", "", "0"},
     {"{}", kThrows, kThrows},
     {R"({"a":[1,null],"k":"it's"})", kThrows, kThrows},
-    {"[]", kThrows, kThrows},
     {R"(["it's",2])", kThrows, kThrows},
 };
 
@@ -211,23 +208,20 @@ TEST_F(Terms, RefuseABadFieldOrList)
 
 TEST_F(Terms, FailWithoutMemoryForAValue)
 {
-    const auto noMemory = [](const std::string& strFormat, const std::string& strArgument,
-                             int iFail) {
-        return Composed{"",
-                        "-1",
-                        {failed("NULL == (szSql = sqlite3_mprintf(\"" + strFormat + "\", " +
-                                strArgument + "))")},
-                        iFail};
+    const auto noMemory = [](const std::string& strArguments, int iFail) {
+        const Lines lines = {failed("NULL == (szSql = sqlite3_mprintf(" + strArguments + "))")};
+        return Composed{"", "-1", lines, iFail};
     };
-    expectMatch(table_, "flag", "true", noMemory("%d", "jParam.asInt()", 1));
-    for (const char* szField : {"name", "n", "odd", "flag", "doc", "arr"}) {
-        const bool blJson = 'd' == szField[0] || 'a' == szField[0];
+    expectMatch(table_, "flag", "true", noMemory(R"("%d", jParam.asInt())", 1));
+    for (const std::string strField : {"name", "n", "odd", "flag", "doc", "arr"}) {
+        const bool blJson = "doc" == strField || "arr" == strField;
         const char* szText = blJson ? ".toString().c_str()" : ".asString().c_str()";
-        if (std::string("flag") != szField)
-            expectMatch(table_, szField, "1", noMemory("%q", std::string("jParam") + szText, 1));
+        if ("flag" != strField)
+            expectMatch(table_, strField, "1",
+                        noMemory(std::string(R"("%q", jParam)") + szText, 1));
         for (int iItem : {1, 2, 3})
-            expectList(table_, szField, "[1,2,3]",
-                       noMemory("%q", std::string("jList[i]") + szText, iItem));
+            expectList(table_, strField.c_str(), "[1,2,3]",
+                       noMemory(std::string(R"("%q", jList[i])") + szText, iItem));
     }
 }
 

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
-// Column lists, and value lists of records that hold no percent sign.
+// Column lists, and value lists of records that hold no percent sign; the definition and the member
+// types that they are made by.
 
 #include "support/composed.h"
+#include "support/lookups.h"
 
 #include <stdexcept>
 
@@ -200,6 +202,79 @@ TEST_F(ValueLists, DoNotFormatATextThatGetsNoValue)
             EXPECT_EQ(0, pTable->api.SqlExpandMemberSymbol(strSql, jRecord));
             EXPECT_EQ(strText, strSql);
         }
+}
+
+TEST_F(ValueLists, FollowTheFirstDefinitionUnderAName)
+{
+    const std::string strName = freshName();
+    const auto table = [&](const char* szMembers) {
+        return Table(database_, strName, szMembers, "a,b");
+    };
+    Table first = table(R"({"a":{"cpptype":"int"},"b":{"cpptype":"string"}})");
+    expectValues(first, "{}", {""});
+    Table other = table(R"({"a":{"cpptype":"string"},"b":{"cpptype":"Json::Value"}})");
+    expectValues(other, R"({"a":7,"b":"x"})", {"7,'x') "});
+    Table fewer = table("{}");
+    expectValues(fewer, R"({"a":1})", {""});
+    Table more = table(R"({"a":{"cpptype":"int"},"c":{"cpptype":"int"}})");
+    for (const char* szRecord : {R"({"a":1,"c":2})", R"({"a":1})", "{}", "null", "[1]"})
+        expectValues(more, szRecord, {"", "-1", {failed("!jType.isMember(strKey)")}});
+    expectColumns(more, R"({"a":1,"c":2})", "a,c");
+}
+
+// What a host changes through recType's reference holds from the next call on.
+TEST_F(ValueLists, ReadTheWordFromTheTypesAsTheyAre)
+{
+    Json::Value& jType = VORN_JSON_DB::recType(abc_.jDefinition, abc_.strName)["a"];
+    jType = json(R"({"cpptype":"string"})");
+    expectValues(abc_, R"({"a":7})", {"'7',"});
+    jType = json(R"({"cpptype":5})");
+    expectValues(abc_, R"({"a":7})", {"", "-1", {error("cannot support this type=5")}});
+    for (const char* szEntry : {R"({"cpptype":null})", "{}", "null"}) {
+        jType = json(szEntry);
+        expectValues(abc_, R"({"a":7})", {"", "-1", {error("cannot support this type=")}});
+    }
+}
+
+using ValueListTypes = LookUpsTest;
+
+// Kept: what the lists look up and do not find is inserted into the handle's definition.
+TEST_F(ValueListTypes, InsertWhatTheDefinitionLacks)
+{
+    const char szNoMembers[] = R"(!jTableDef[strJsonName]["member"].isObject())";
+    const auto expectInserted = [&](const BadDefinition& bad, bool blColumns) {
+        SCOPED_TRACE(bad.szName);
+        strName_ = freshName();
+        std::string strCreate = "create table " + strName_ + " (a)";
+        Json::Value jDefinition = json(named(bad.szDefinition));
+        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate);
+        takeLog();
+        std::string strSql;
+        EXPECT_EQ(0, blColumns ? api.SqlExpandMemberName(strSql) : 0);
+        EXPECT_EQ(Lines(), takeLog());
+        Json::Value jRecord = json(R"({"a":1})");
+        EXPECT_EQ(0, api.SqlExpandMemberSymbol(strSql, jRecord));
+        // It finds what the column list has left, if that came before.
+        const bool blInserted = blColumns && std::string(bad.szDefinition) != bad.szLater;
+        EXPECT_EQ(named(blInserted ? lookUp(szNoMembers, bad.szLater, "-")
+                                   : lookUp(bad.szCondition, bad.szDefinition, "-")),
+                  takeOwnLog());
+        EXPECT_EQ(0, api.SqlExpandMemberSymbol(strSql, jRecord));
+        EXPECT_EQ(named(lookUp(kPoisoned, bad.szLater, "null")), takeOwnLog());
+        EXPECT_EQ("", strSql);
+        EXPECT_EQ(json(named(bad.szDefinition)), jDefinition) << "the host's own was changed";
+    };
+    const BadDefinition more[] = {
+        {"text", "\"$\"", "\"$\"", "!jTableDef.isMember(strJsonName)"},
+        {"number", "5", "5", "!jTableDef.isMember(strJsonName)"},
+        {"array table", R"({"$":["a"]})", R"({"$":["a"]})", "!jTableDef[strJsonName].isObject()"},
+        {"text member", R"({"$":{"member":"a"}})", R"({"$":{"member":"a"}})", szNoMembers},
+        {"null member", R"({"$":{"member":null}})", R"({"$":{"member":null}})", szNoMembers},
+    };
+    for (bool blColumns : {false, true}) {
+        for (const BadDefinition& bad : kBadDefinitions) expectInserted(bad, blColumns);
+        for (const BadDefinition& bad : more) expectInserted(bad, blColumns);
+    }
 }
 
 }  // namespace
