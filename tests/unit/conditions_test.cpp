@@ -166,7 +166,7 @@ TEST_F(Conditions, TakeTheRawFilterForAMemberOfItsName)
                             {kAnd, R"({"vornSqlWhereFilter":5})", {" (", "-1", {kBadFilter}}}});
 }
 
-TEST_F(Conditions, RefuseARequestThatIsNoObjectOrAnUnknownJoiner)
+TEST_F(Conditions, RefuseANonObjectOrAnUnknownJoiner)
 {
     for (const char* szRequest : {"[]", R"([{"a":"x"}])", R"("x")", R"("")", "0", "-1",
                                   "18446744073709551615", "1.5", "true", "false"})
@@ -179,7 +179,7 @@ TEST_F(Conditions, RefuseARequestThatIsNoObjectOrAnUnknownJoiner)
     }
 }
 
-TEST_F(Conditions, RefuseARawFilterThatIsNoText)
+TEST_F(Conditions, RefuseARawFilterThatIsNotText)
 {
     for (const char* szFilter : {"1", "1.5", "true", "null", "[]", R"(["x"])", R"({"a":"x"})"}) {
         const std::string strFilter = std::string(R"("vornSqlWhereFilter":)") + szFilter + "}";

@@ -260,7 +260,7 @@ TEST_F(FormattedLists, CutTheTextAtANulByte)
     EXPECT_EQ("", withText("%5" + strNul + "d", "x"));
 }
 
-TEST_F(FormattedLists, LimitWidthAndPrecisionButNoText)
+TEST_F(FormattedLists, LimitWidthAndPrecisionButNotText)
 {
     const std::string strBlanks(4095, ' ');
     const std::string strZeros(4095, '0');

@@ -115,7 +115,7 @@ TEST_F(Paging, LeavesOutTheCommentsOfAReader)
     EXPECT_EQ(" LIMIT 10", strOut);
 }
 
-TEST_F(Paging, RefusesARequestThatIsNoObject)
+TEST_F(Paging, RefusesARequestThatIsNotAnObject)
 {
     const Lines lines = {
         failed("jFilter.type() != Json::objectValue && jFilter.type() != Json::nullValue")};

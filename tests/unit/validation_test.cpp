@@ -9,8 +9,8 @@
 namespace {
 
 // Every kind of JSON value that is not an object.
-const char* const kNoObjects[] = {"null", "true", "5",     "-5", "18446744073709551615",
-                                  "1.5",  "\"\"", "\"a\"", "[]", R"([1,{"a":2}])"};
+const char* const kNonObjects[] = {"null", "true", "5",     "-5", "18446744073709551615",
+                                   "1.5",  "\"\"", "\"a\"", "[]", R"([1,{"a":2}])"};
 
 class DefaultValues : public TableTest {
 protected:
@@ -76,10 +76,10 @@ TEST_F(DefaultValues, AreCopiesOfTheirOwn)
               table.jDefinition[table.strName]["member"]["v"]["cppDefaultValue"]);
 }
 
-TEST_F(DefaultValues, LeaveARecordAloneThatIsNoObject)
+TEST_F(DefaultValues, LeaveARecordThatIsNotAnObjectAlone)
 {
     Table nameless(database_, R"({"":{"cpptype":"int"}})", "a");
-    for (const std::string strRecord : kNoObjects) {
+    for (const std::string strRecord : kNonObjects) {
         if ("null" != strRecord) expectFill(abc_, false, strRecord, strRecord);
         expectFill(abc_, true, strRecord, strRecord, {lost("a")});
         expectFill(nameless, true, strRecord, strRecord, {lost("")});
@@ -209,7 +209,7 @@ TEST_F(TypeCheck, StopsAtTheFirstBadMember)
         {"{}", ""},
     };
     for (const auto& [szRecord, szLine] : cases) expectLine(table, szRecord, szLine);
-    for (const char* szRecord : kNoObjects)
+    for (const char* szRecord : kNonObjects)
         expectLine(table, szRecord, "Failed [!jRecParam.isObject()]");
 }
 
