@@ -9,7 +9,7 @@
 
 namespace {
 
-// Words that value lists know, and others. Each is the name of a member of everyWord_ as well.
+// Words that value lists know, and words that they refuse. Each also names a member of everyWord_.
 const char kSigned[] = "int|long|long long|bool";
 const char kUnsigned[] = "unsigned|unsigned int|unsigned long|unsigned long long";
 const char kJson[] = "Json::objectValue|Json::arrayValue";
@@ -42,7 +42,7 @@ protected:
         });
     }
 
-    // The value list of a record that holds the value as a member of each word, after an int.
+    // The value list of a record with an int and, after it, the value as a member of the word.
     void expectOfWords(const std::string& strWords, const std::string& strValue,
                        const Composed& expected)
     {
