@@ -1,151 +1,109 @@
 // SPDX-License-Identifier: MIT
 // SqlFilterConditionFromJson: sorting and paging.
 
-#include "support/database.h"
+#include "support/composed.h"
 
-#include <stdexcept>
+#include <utility>
 
 namespace {
 
-constexpr char kMembers[] = R"({"name":{"cpptype":"string"},"limit":{"cpptype":"int"}})";
-
-struct Case {
-    const char* szRequest;
-    const char* szOut;
-};
-
-class Paging : public TableTest {
+class Paging : public HostTest {
 protected:
-    // Every case begins with a text that has to stay in front, and neither logs nor runs SQL.
-    void expectClauses(const std::vector<Case>& cases)
+    Paging()
     {
-        for (const Case& row : cases) {
-            SCOPED_TRACE(row.szRequest);
-            Json::Value jRequest = json(row.szRequest);
-            std::string strOut = "before";
-            EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-            EXPECT_EQ(std::string("before") + row.szOut, strOut);
-            EXPECT_EQ(text(json(row.szRequest)), text(jRequest));
-            EXPECT_EQ(Lines(), takeLog());
-        }
-        EXPECT_EQ(Lines(), takeStatements());
+        takeLog();
+        takeStatements();
     }
 
-    // An accessor throws; strOut is what it leaves behind the text that was there.
-    void expectThrow(const std::string& strRequest, const std::string& strOut)
+    void expectClause(const std::string& strRequest, const Composed& expected)
     {
-        SCOPED_TRACE(strRequest);
-        Json::Value jRequest = json(strRequest);
-        std::string strWritten = "before";
-        EXPECT_THROW(table_.api.SqlFilterConditionFromJson(jRequest, strWritten), Json::LogicError);
-        EXPECT_EQ("before" + strOut, strWritten);
-        EXPECT_EQ(text(json(strRequest)), text(jRequest));
-        EXPECT_EQ(Lines(), takeLog());
+        expectComposed(expected, strRequest, [this](auto& jRequest, auto& strOut) {
+            return api_.SqlFilterConditionFromJson(jRequest, strOut);
+        });
     }
 
-    Table table_{database_, kMembers, "name, \"limit\""};
+    // Neither a connection nor a definition is looked at.
+    std::string strName_ = freshName();
+    Json::Value jDefinition_;
+    std::string strCreate_;
+    VornJsonDbApi api_{nullptr, strName_, jDefinition_, strCreate_};
 };
 
-TEST_F(Paging, IsNothingWithoutAKey)
+TEST_F(Paging, WritesItsPartsInOrder)
 {
-    expectClauses({
-        {"null", ""},
-        {"{}", ""},
-        {R"({"name":"x","vornSqlWhereFilter":"1"})", ""},
-        {R"({"offset":5})", ""},
-        {R"({"offset":{},"sort_direction":{}})", ""},
-        {R"({"sort_direction":"desc"})", ""},
+    const std::pair<const char*, const char*> cases[] = {
+        {R"({"offset":20,"limit":10,"sort_by":"name"})", " order by 'name' LIMIT 10 OFFSET 20"},
+        {R"({"sort_by":"name","sort_direction":"desc","limit":10,"offset":0})",
+         " order by 'name' DESC LIMIT 10 OFFSET 0"},
+        {R"({"sort_direction":"desc","limit":10,"offset":0})", " LIMIT 10 OFFSET 0"},
+        {R"({"sort_by":"name","offset":10})", " order by 'name'"},
         {R"({"sort_direction":"desc","offset":5})", ""},
+        {R"({"offset":{},"sort_direction":{}})", ""},
+        {R"({"name":"x","vornSqlWhereFilter":"1"})", ""},
         {R"({"Limit":1,"LIMIT":2,"limit ":3,"limit\u0000":4,"sort":"a","Sort_by":"b"})", ""},
-    });
+        {"{}", ""},
+        {"null", ""},
+    };
+    for (const auto& [szRequest, szClause] : cases) expectClause(szRequest, {szClause});
 }
 
 TEST_F(Paging, WritesTheSortKeyAsATextLiteral)
 {
-    expectClauses({
-        {R"({"sort_by":"name"})", " order by 'name'"},
-        {R"({"sort_by":""})", " order by ''"},
-        {R"({"sort_by":"a'b"})", " order by 'a''b'"},
-        {R"({"sort_by":"''"})", " order by ''''''"},
-        {R"({"sort_by":"a\"b\\c"})", R"( order by 'a"b\c')"},
-        {R"({"sort_by":"name desc, id"})", " order by 'name desc, id'"},
-        {R"({"sort_by":"%d%n%s%q"})", " order by '%d%n%s%q'"},
-        {R"({"sort_by":"größe 東京"})", " order by 'größe 東京'"},
+    const std::pair<const char*, const char*> cases[] = {
+        {"name", "name"},
+        {"", ""},
+        {"a'b", "a''b"},
+        {R"(a\"b\\c)", R"(a"b\c)"},
+        {"name desc, id", "name desc, id"},
+        {"%d%n%s%q", "%d%n%s%q"},
+        {"größe 東京", "größe 東京"},
         // Cut at a NUL byte.
-        {R"({"sort_by":"a\u0000b"})", " order by 'a'"},
-        {R"({"sort_by":"not declared"})", " order by 'not declared'"},
-    });
+        {R"(a\u0000b)", "a"},
+    };
+    for (const auto& [szKey, szLiteral] : cases)
+        expectClause(std::string(R"({"sort_by":")") + szKey + "\"}",
+                     {std::string(" order by '") + szLiteral + "'"});
 }
 
 TEST_F(Paging, SortsDownOnlyForDesc)
 {
-    expectClauses({
-        {R"({"sort_by":"name","sort_direction":"desc"})", " order by 'name' DESC"},
-        {R"({"sort_by":"name","sort_direction":"DESC"})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":"Desc"})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":"desc "})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":"desc\u0000"})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":"des"})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":"asc"})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":""})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":null})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":1})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":1.5})", " order by 'name' ASC"},
-        {R"({"sort_by":"name","sort_direction":true})", " order by 'name' ASC"},
-    });
+    const std::string strRequest = R"({"sort_by":"name","sort_direction":)";
+    expectClause(strRequest + R"("desc"})", {" order by 'name' DESC"});
+    for (const char* szDirection : {R"("DESC")", R"("Desc")", R"("desc ")", R"("desc\u0000")",
+                                    R"("des")", R"("asc")", R"("")", "null", "1", "1.5", "true"})
+        expectClause(strRequest + szDirection + "}", {" order by 'name' ASC"});
 }
 
-TEST_F(Paging, WritesAllOfItInOrder)
-{
-    expectClauses({
-        {R"({"limit":10})", " LIMIT 10"},
-        {R"({"limit":10,"offset":20})", " LIMIT 10 OFFSET 20"},
-        {R"({"sort_by":"name","limit":10})", " order by 'name' LIMIT 10"},
-        {R"({"sort_by":"name","offset":10})", " order by 'name'"},
-        {R"({"sort_by":"name","limit":10,"offset":20})", " order by 'name' LIMIT 10 OFFSET 20"},
-        {R"({"sort_by":"name","sort_direction":"desc","limit":10,"offset":0})",
-         " order by 'name' DESC LIMIT 10 OFFSET 0"},
-        {R"({"sort_direction":"desc","limit":10,"offset":0})", " LIMIT 10 OFFSET 0"},
-    });
-}
-
-// Limit and offset of every kind, as their JSON text and unchecked.
+// Of every kind, and unchecked.
 TEST_F(Paging, WritesLimitAndOffsetAsJson)
 {
-    const Case values[] = {
-        {"0", "0"},
-        {"-1", "-1"},
-        {"2147483648", "2147483648"},
-        {"-9223372036854775808", "-9223372036854775808"},
-        {"18446744073709551615", "18446744073709551615"},
-        {"1.5", "1.5"},
-        {"10.0", "10.0"},
-        {"0.1", "0.10000000000000001"},
-        {"NaN", "NaN"},
-        {R"("10")", R"("10")"},
-        {R"("")", R"("")"},
-        {R"("1; drop table t")", R"("1; drop table t")"},
-        {R"("a'b\"c")", R"("a'b\"c")"},
-        {R"("%d%n")", R"("%d%n")"},
-        {R"("a\u0000b")", R"("a\u0000b")"},
-        {R"("東京")", R"("東京")"},
-        {"true", "true"},
-        {"false", "false"},
-        {"null", "null"},
-        {"[]", "[]"},
-        {"[1, 2]", "[1,2]"},
-        {"{}", "{}"},
-        {R"({"b": 1, "a": [null]})", R"({"a":[null],"b":1})"},
+    const auto expectValue = [this](const std::string& strValue, const std::string& strText) {
+        expectClause(R"({"limit":)" + strValue + "}", {" LIMIT " + strText});
+        expectClause(R"({"limit":1,"offset":)" + strValue + "}", {" LIMIT 1 OFFSET " + strText});
     };
-    for (const Case& value : values) {
-        const std::string strLimit = std::string(R"({"limit":)") + value.szRequest + "}";
-        const std::string strOffset =
-            std::string(R"({"limit":1,"offset":)") + value.szRequest + "}";
-        const std::string strLimitOut = std::string(" LIMIT ") + value.szOut;
-        const std::string strOffsetOut = std::string(" LIMIT 1 OFFSET ") + value.szOut;
-        expectClauses(
-            {{strLimit.c_str(), strLimitOut.c_str()}, {strOffset.c_str(), strOffsetOut.c_str()}});
-    }
+    for (const char* szValue : {"0",
+                                "-1",
+                                "2147483648",
+                                "-9223372036854775808",
+                                "18446744073709551615",
+                                "1.5",
+                                "10.0",
+                                "NaN",
+                                R"("10")",
+                                R"("")",
+                                R"("1; drop table t")",
+                                R"("a'b\"c")",
+                                R"("%d%n")",
+                                R"("a\u0000b")",
+                                R"("東京")",
+                                "true",
+                                "false",
+                                "null",
+                                "[]",
+                                "{}"})
+        expectValue(szValue, szValue);
+    expectValue("0.1", "0.10000000000000001");
+    expectValue(R"({"b": 1, "a": [null, 2]})", R"({"a":[null,2],"b":1})");
 }
 
 TEST_F(Paging, LeavesOutTheCommentsOfAReader)
@@ -153,71 +111,40 @@ TEST_F(Paging, LeavesOutTheCommentsOfAReader)
     Json::Value jRequest = json(R"({"limit":10})");
     jRequest["limit"].setComment(std::string("// ten"), Json::commentAfterOnSameLine);
     std::string strOut;
-    EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
+    EXPECT_EQ(0, api_.SqlFilterConditionFromJson(jRequest, strOut));
     EXPECT_EQ(" LIMIT 10", strOut);
 }
 
-TEST_F(Paging, RequestsOfEveryOtherKind)
+TEST_F(Paging, RefusesARequestThatIsNotAnObject)
 {
     const Lines lines = {
         failed("jFilter.type() != Json::objectValue && jFilter.type() != Json::nullValue")};
-    for (const char* szRequest : {"[]", "[1]", R"([{"limit":1}])", R"("limit")", R"("")", "0", "1",
-                                  "-1", "18446744073709551615", "1.5", "true", "false"})
-        for (bool blStdout : {false, true}) {
-            SCOPED_TRACE(szRequest);
-            blLogToStdout = blStdout;
-            Json::Value jRequest = json(szRequest);
-            std::string strOut = "before";
-            EXPECT_EQ(-1, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-            EXPECT_EQ("before", strOut);
-            EXPECT_EQ(lines, takeLog());
-            EXPECT_EQ(text(json(szRequest)), text(jRequest));
-        }
+    for (bool blStdout : {false, true}) {
+        blLogToStdout = blStdout;
+        for (const char* szRequest : {"[]", R"([{"limit":1}])", R"("limit")", R"("")", "0", "-1",
+                                      "18446744073709551615", "1.5", "true", "false"})
+            expectClause(szRequest, {"", "-1", lines});
+    }
 }
 
-TEST_F(Paging, ASortKeyThatIsNoTextThrowsBeforeAnythingIsWritten)
+TEST_F(Paging, ThrowsForASortKeyOrDirectionWithoutAText)
 {
     for (const char* szKey :
          {"null", "1", "-1", "18446744073709551615", "1.5", "true", "[]", R"(["name"])", "{}"})
-        expectThrow(std::string(R"({"limit":1,"sort_direction":"desc","sort_by":)") + szKey + "}",
-                    "");
-}
-
-TEST_F(Paging, ADirectionThatHasNoTextThrowsBehindTheSortKey)
-{
+        expectClause(std::string(R"({"limit":1,"sort_direction":"desc","sort_by":)") + szKey + "}",
+                     {"", "T"});
+    // The sort key is written by then.
     for (const char* szDirection : {"{}", R"({"desc":1})", "[]", R"(["desc"])"})
-        expectThrow(
+        expectClause(
             std::string(R"({"limit":1,"sort_by":"name","sort_direction":)") + szDirection + "}",
-            " order by 'name'");
-    expectClauses({{R"({"sort_by":"name"})", " order by 'name'"}});
+            {" order by 'name'", "T"});
 }
 
-TEST_F(Paging, NoMemoryForTheSortKey)
+TEST_F(Paging, FailsWithoutMemoryForTheSortKey)
 {
-    Json::Value jRequest = json(R"({"sort_by":"name","sort_direction":"desc","limit":1})");
-    std::string strOut = "before";
-    doubles::state().iFailMprintf = 1;
-    EXPECT_EQ(-1, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-    EXPECT_EQ(0, doubles::state().iFailMprintf);
-    EXPECT_EQ("before", strOut);
-    EXPECT_EQ(Lines{failed("!szSql")}, takeLog());
-    EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-    EXPECT_EQ("before order by 'name' DESC LIMIT 1", strOut);
-}
-
-// Neither the connection nor the definition is looked at.
-TEST_F(Paging, NeedsNoTable)
-{
-    std::string strName = freshName();
-    Json::Value jDefinition;
-    std::string strCreate;
-    VornJsonDbApi api(nullptr, strName, jDefinition, strCreate);
-    takeLog();
-    Json::Value jRequest = json(R"({"sort_by":"name","limit":1})");
-    std::string strOut;
-    EXPECT_EQ(0, api.SqlFilterConditionFromJson(jRequest, strOut));
-    EXPECT_EQ(" order by 'name' LIMIT 1", strOut);
-    EXPECT_EQ(Lines(), takeLog());
+    const char szRequest[] = R"({"sort_by":"name","sort_direction":"desc","limit":1})";
+    expectClause(szRequest, {"", "-1", {failed("!szSql")}, 1});
+    expectClause(szRequest, {" order by 'name' DESC LIMIT 1"});
 }
 
 }  // namespace
