@@ -35,16 +35,17 @@ std::string squeezed(const std::string& strText)
     return strOut;
 }
 
-using SqueezedLines = std::vector<std::string>;
-
-std::vector<SqueezedLines> readSources(const std::string& strComponent)
+// The source files of a component, each as its squeezed lines.
+const std::vector<std::vector<std::string>>& sourcesOf(const std::string& strComponent)
 {
-    std::vector<SqueezedLines> files;
+    static std::map<std::string, std::vector<std::vector<std::string>>> components;
+    auto& files = components[strComponent];
+    if (!files.empty()) return files;
     for (const auto& entry : std::filesystem::directory_iterator(VORN_SOURCES "/" + strComponent)) {
         // A line that is logged from a header would have the same number in every operation.
         if (".cpp" != entry.path().extension()) continue;
         std::ifstream file(entry.path());
-        SqueezedLines& lines = files.emplace_back();
+        auto& lines = files.emplace_back();
         for (std::string strLine; std::getline(file, strLine);) lines.push_back(squeezed(strLine));
     }
     return files;
@@ -53,16 +54,14 @@ std::vector<SqueezedLines> readSources(const std::string& strComponent)
 // Whether a source file of the component has the check or message near that line.
 bool leadsToSource(const std::string& strComponent, std::size_t nLine, const std::string& strWanted)
 {
-    static std::map<std::string, std::vector<SqueezedLines>> components;
-    std::vector<SqueezedLines>& files = components[strComponent];
-    if (files.empty()) files = readSources(strComponent);
-    return std::any_of(files.begin(), files.end(), [&](const SqueezedLines& lines) {
-        if (0 == nLine || lines.size() < nLine) return false;
+    for (const auto& lines : sourcesOf(strComponent)) {
+        if (0 == nLine || lines.size() < nLine) continue;
         std::string strAround;
         for (std::size_t n = nLine < 3 ? 0 : nLine - 3; n < std::min(lines.size(), nLine + 2); ++n)
             strAround += lines[n];
-        return std::string::npos != strAround.find(squeezed(strWanted));
-    });
+        if (std::string::npos != strAround.find(squeezed(strWanted))) return true;
+    }
+    return false;
 }
 
 // The line in the form that takeLog() promises.
@@ -155,4 +154,14 @@ std::string plain(const std::string& strMessage)
 std::string utilPlain(const std::string& strMessage)
 {
     return "P util: " + strMessage;
+}
+
+std::multiset<std::string> placesOf(const std::string& strComponent, const std::string& strText)
+{
+    std::multiset<std::string> places;
+    for (const auto& lines : sourcesOf(strComponent))
+        for (std::size_t n = 0; n < lines.size(); ++n)
+            if (std::string::npos != lines[n].find(squeezed(strText)))
+                places.insert(strComponent + ":" + std::to_string(n + 1));
+    return places;
 }
