@@ -126,19 +126,14 @@ bool shows(const std::string& strLine, const std::string& strText)
 }
 
 // The texts that no line has shown yet.
-std::set<std::string>& missing()
-{
-    static std::set<std::string> texts;
-    return texts;
-}
+std::set<std::string> missing;
 
 void strikeOut(const std::string& strLine)
 {
     // Long lines are records; their texts come first.
     const std::string strFront = strLine.substr(0, 600);
-    auto& texts = missing();
-    for (auto it = texts.begin(); it != texts.end();)
-        it = shows(strFront, *it) ? texts.erase(it) : std::next(it);
+    for (auto it = missing.begin(); it != missing.end();)
+        it = shows(strFront, *it) ? missing.erase(it) : std::next(it);
 }
 
 // It takes the whole suite in one process to tell.
@@ -148,15 +143,15 @@ public:
     {
         const auto& unitTest = *testing::UnitTest::GetInstance();
         if (unitTest.test_to_run_count() != unitTest.total_test_count()) return;
-        missing() = listedTexts({"every failed check", "guards", "not log lines"});
-        ASSERT_LT(80U, missing().size());
+        missing = listedTexts({"every failed check", "guards", "not log lines"});
+        ASSERT_LT(80U, missing.size());
         doubles::onEveryLine = strikeOut;
     }
 
     void TearDown() override
     {
         doubles::onEveryLine = nullptr;
-        for (const std::string& strText : missing()) ADD_FAILURE() << "never logged: " << strText;
+        for (const std::string& strText : missing) ADD_FAILURE() << "never logged: " << strText;
     }
 };
 
