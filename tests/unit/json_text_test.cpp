@@ -3,6 +3,8 @@
 
 #include "support/database.h"
 
+#include <utility>
+
 namespace {
 
 class JsonText : public TableTest {
@@ -34,10 +36,7 @@ protected:
 
 TEST_F(JsonText, IsOneCompactLine)
 {
-    const struct {
-        const char* szObject;
-        const char* szText;
-    } cases[] = {
+    const std::pair<const char*, const char*> cases[] = {
         {"{ }", "{}"},
         {R"({ "b" : [ 1 , 2 ] , "a" : { "c" : null } })", R"({"a":{"c":null},"b":[1,2]})"},
         {R"({"k":[ ]})", R"({"k":[]})"},
@@ -53,10 +52,8 @@ TEST_F(JsonText, IsOneCompactLine)
         {R"({"k":0.1})", R"({"k":0.10000000000000001})"},
         {R"({"k":[NaN,Infinity,-Infinity]})", R"({"k":[NaN,Infinity,-Infinity]})"},
     };
-    for (const auto& row : cases) {
-        SCOPED_TRACE(row.szObject);
-        EXPECT_EQ((std::vector<std::string>{"[]", row.szText}), stored(row.szObject));
-    }
+    for (const auto& [szObject, szText] : cases)
+        EXPECT_EQ((std::vector<std::string>{"[]", szText}), stored(szObject)) << szObject;
     // Numbers are read back exactly.
     for (const char* szNumber :
          {"0.3333333333333333", "2.5", "-0.0", "-273.15", "1e-300", "5e-324", "1e15", "1e300",
@@ -102,39 +99,25 @@ TEST_F(JsonText, IsTheSameInTheLog)
 
 TEST_F(JsonText, IsReadAsFarAsTheReaderUnderstandsIt)
 {
+    const auto expectRead = [this](const std::string& strText, const std::string& strMember) {
+        EXPECT_EQ(R"({"a":)" + strMember + R"(,"o":{"k":1}})",
+                  text(readBack(strText, R"({"k":1})")))
+            << strText.substr(0, 20);
+    };
     const auto nested = [](std::size_t nLevels) {
         return std::string(nLevels, '[') + std::string(nLevels, ']');
     };
-    const struct {
-        std::string strText;
-        std::string strMember;
-    } cases[] = {
-        {"", "null"},
-        {"x", "null"},
-        {"tru", "null"},
-        {"[1] x", "[1]"},
-        {"[1,", "[1,null]"},
-        {R"({"k":1)", R"({"k":1})"},
-        {R"("open)", "null"},
-        {"[1]]", "[1]"},
-        {"\xff\xfe", "null"},
-        {"5", "5"},
-        {"null", "null"},
-        {R"("x")", R"("x")"},
-        {" [ 1 ] ", "[1]"},
-        {R"({"a":1,"a":2})", R"({"a":2})"},
-        {"[1] // after", "[1]"},
-        {"[NaN,-Infinity]", "[NaN,-Infinity]"},
-        {nested(1000), nested(1000)},
-        {nested(1001), "null"},
-        {nested(100000), "null"},
-        {"[1]", "[1]"},  // also after a text that is nested too deep
-    };
-    for (const auto& row : cases) {
-        SCOPED_TRACE(row.strText.substr(0, 20));
-        EXPECT_EQ(R"({"a":)" + row.strMember + R"(,"o":{"k":1}})",
-                  text(readBack(row.strText, R"({"k":1})")));
-    }
+    for (const std::string& strText : std::vector<std::string>{
+             "", "x", "tru", R"("open)", "\xff\xfe", nested(1001), nested(100000)})
+        expectRead(strText, "null");
+    for (const std::string& strText :
+         std::vector<std::string>{nested(1000), "5", "null", R"("x")", "[NaN,-Infinity]"})
+        expectRead(strText, strText);
+    for (const char* szText : {"[1] x", "[1]]", " [ 1 ] ", "[1] // after"})
+        expectRead(szText, "[1]");
+    expectRead("[1,", "[1,null]");
+    expectRead(R"({"k":1)", R"({"k":1})");
+    expectRead(R"({"a":1,"a":2})", R"({"a":2})");
 }
 
 }  // namespace

@@ -17,17 +17,15 @@ bool blDebugOutput = false;
 
 namespace {
 
-bool hasMemory()
-{
-    constexpr long kGigabyte = 1L << 30;
-    return 4 < sizeof(void*) && 8 <= sysconf(_SC_PHYS_PAGES) / (kGigabyte / sysconf(_SC_PAGESIZE));
-}
+// 8 GiB.
+const bool blHasMemory =
+    4 < sizeof(void*) && 8 <= sysconf(_SC_PHYS_PAGES) / ((1L << 30) / sysconf(_SC_PAGESIZE));
 
 // How often SQLite has formatted.
 std::size_t nFormatted = 0;
 
 // The shortest text that is too long.
-const std::size_t nLimit = hasMemory() ? 1'000'000'000 : 510'000'000;
+const std::size_t nLimit = blHasMemory ? 1'000'000'000 : 510'000'000;
 
 }  // namespace
 
@@ -38,7 +36,7 @@ extern "C" char* sqlite3_mprintf(const char* szFormat, ...)
     va_start(arguments, szFormat);
     char* szText = sqlite3_vmprintf(szFormat, arguments);
     va_end(arguments);
-    if (hasMemory() || nullptr == szText || strlen(szText) < nLimit) return szText;
+    if (blHasMemory || nullptr == szText || strlen(szText) < nLimit) return szText;
     sqlite3_free(szText);
     return nullptr;
 }
@@ -69,7 +67,7 @@ int expand(std::string& strSql)
 
 TEST(LongTexts, AreWrittenUpToTheLimitAndRefusedBeyondIt)
 {
-    if (!hasMemory()) printf("left out: texts of a gigabyte: they need 64 bits and 8 GiB\n");
+    if (!blHasMemory) printf("left out: texts of a gigabyte: they need 64 bits and 8 GiB\n");
     const struct {
         const char* szBefore;
         std::size_t nLetters;
@@ -92,7 +90,7 @@ TEST(LongTexts, AreWrittenUpToTheLimitAndRefusedBeyondIt)
 
 TEST(LongTexts, AreRefusedBeforeTheirWideConversionsAreAllWritten)
 {
-    if (!hasMemory()) GTEST_SKIP() << "a text of a gigabyte needs 64 bits and 8 GiB";
+    if (!blHasMemory) GTEST_SKIP() << "a text of a gigabyte needs 64 bits and 8 GiB";
     constexpr std::size_t kWidth = 4096;
     std::string strSql;
     for (std::size_t i = 0; i < 4 * nLimit / kWidth; ++i) strSql += "%4096d";

@@ -3,8 +3,8 @@
 
 #include "support/database.h"
 
-#include <cstdio>
 #include <cstdlib>
+#include <utility>
 
 namespace {
 
@@ -164,41 +164,23 @@ TEST_F(MemberTypes, KeepTheFirstDefinitionForEveryHandle)
     EXPECT_EQ(Lines{failed("!jType.isMember(strKey)")}, takeLog());
 }
 
-// The first look-up of a process, whose cache is still null.
-class FirstMemberTypes : public MemberTypes {
-protected:
-    // Ends the process, with 0 when the look-up gave null and logged these lines.
-    static void lookUpAndExit(const char* szDefinition, std::string strName, const Lines& lines)
-    {
-        Json::Value jDefinition = json(szDefinition);
-        const bool blNull = VORN_JSON_DB::recType(jDefinition, strName).isNull();
-        const Lines logged = takeLog();
-        for (const std::string& strLine : logged) fprintf(stderr, "%s\n", strLine.c_str());
-        _Exit(blNull && lines == logged ? 0 : 1);
-    }
-
-    static void expectFailure(const std::string& strName, const char* szDefinition,
-                              const char* szCondition)
-    {
-        GTEST_FLAG_SET(death_test_style, "threadsafe");
-        const Lines lines = {utilFailed(szCondition), utilPlain("strJsonName=" + strName),
+// In processes of their own, which have not kept anything under the empty name yet.
+TEST_F(MemberTypes, RefuseAnEmptyNameAfterTheLookUps)
+{
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    const std::pair<const char*, const char*> cases[] = {
+        {R"({"":{"member":[]}})", R"(!jTableDef[strJsonName]["member"].isObject())"},
+        {R"({"":{"member":{"a":{"cpptype":"int"}}}})", "strJsonName.empty()"},
+    };
+    strName_.clear();
+    for (const auto& [szDefinition, szCondition] : cases) {
+        const Lines lines = {utilFailed(szCondition), utilPlain("strJsonName="),
                              utilPlain(std::string("jTableDef=") + szDefinition),
                              utilPlain("jType=null")};
-        EXPECT_EXIT(lookUpAndExit(szDefinition, strName, lines), testing::ExitedWithCode(0), "");
+        EXPECT_EXIT(_Exit(entry(szDefinition).isNull() && lines == takeLog() ? 0 : 1),
+                    testing::ExitedWithCode(0), "")
+            << szDefinition;
     }
-};
-
-TEST_F(FirstMemberTypes, FindTheCacheNull)
-{
-    expectFailure("first", "null", "jTableDef.empty()");
-    expectFailure("first", R"({"first":{"member":{}}})",
-                  "jType == Json::nullValue || !jType.isMember(strJsonName)");
-}
-
-TEST_F(FirstMemberTypes, RefuseAnEmptyNameAfterTheLookUps)
-{
-    expectFailure("", R"({"":{"member":[]}})", R"(!jTableDef[strJsonName]["member"].isObject())");
-    expectFailure("", R"({"":{"member":{"a":{"cpptype":"int"}}}})", "strJsonName.empty()");
 }
 
 }  // namespace
