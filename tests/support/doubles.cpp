@@ -28,6 +28,7 @@ State& state()
 void reset()
 {
     state() = State();
+    blLogToStdout = blDebugOutput = false;
 }
 
 char* errorText(const char* szText)

