@@ -28,7 +28,8 @@ auto* const pRealVasprintf =
 }  // namespace
 
 // What the library calls instead of the real one.
-extern "C" int vasprintf(char** pszText, const char* szFormat, va_list arguments) noexcept
+extern "C" __attribute__((format(printf, 2, 0))) int vasprintf(char** pszText, const char* szFormat,
+                                                               va_list arguments) noexcept
 {
     if (std::exchange(blFailNextLine, false)) return -1;
     const int iLength = pRealVasprintf(pszText, szFormat, arguments);
@@ -37,8 +38,9 @@ extern "C" int vasprintf(char** pszText, const char* szFormat, va_list arguments
 }
 
 // With _FORTIFY_SOURCE it is this one.
-extern "C" int __vasprintf_chk(char** pszText, int /*iFlag*/, const char* szFormat,
-                               va_list arguments) noexcept
+extern "C" __attribute__((format(printf, 3, 0))) int __vasprintf_chk(char** pszText, int /*iFlag*/,
+                                                                     const char* szFormat,
+                                                                     va_list arguments) noexcept
 {
     return vasprintf(pszText, szFormat, arguments);
 }

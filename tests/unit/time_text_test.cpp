@@ -141,14 +141,14 @@ TEST_F(TimeText, ReadsThreeBitsOfASet)
 
 TEST_F(TimeText, NamesDaysAndMonths)
 {
-    const std::string strDays = "ThuFriSatSunMonTueWed";
-    for (std::size_t i = 0; i < 14; ++i)
-        EXPECT_EQ(strDays.substr(i % 7 * 3, 3), converted(86400LL * i, kGmt).substr(0, 3));
-    const std::string strMonths = "JanFebMarAprMayJunJulAugSepOctNovDec";
+    const char* const days[] = {"Thu", "Fri", "Sat", "Sun", "Mon", "Tue", "Wed"};
+    for (int i = 0; i < 14; ++i)
+        EXPECT_EQ(days[i % 7], converted(86400LL * i, kGmt).substr(0, 3)) << i;
+    const char* const months[] = {"Jan", "Feb", "Mar", "Apr", "May", "Jun",
+                                  "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
     // 15 January 1970 and every 30.5 days.
-    for (std::size_t i = 0; i < 12; ++i)
-        EXPECT_EQ(strMonths.substr(i * 3, 3),
-                  converted(86400LL * 14 + 2635200LL * i, kGmt).substr(8, 3));
+    for (int i = 0; i < 12; ++i)
+        EXPECT_EQ(months[i], converted(86400LL * 14 + 2635200LL * i, kGmt).substr(8, 3)) << i;
 }
 
 TEST_F(TimeText, ReachesFromTheFirstToTheLastSecondOfTheCalendar)
