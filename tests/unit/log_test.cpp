@@ -125,7 +125,7 @@ TEST_F(Log, WritesEachFamilyInItsForms)
     }
 }
 
-TEST_F(Log, HasALineNumberOfItsOwnInEachOperationThatNamesTheSqlError)
+TEST_F(Log, GivesTheSqlErrorOfEachOperationALineNumberOfItsOwn)
 {
     database_.run("drop table " + table_.strName);
     blLogToStdout = true;

@@ -54,7 +54,7 @@ TEST(Messages, AreAllInTheLibrary)
         EXPECT_NE(std::string::npos, strLibrary.find(strText + '\0')) << strText;
 }
 
-// What stands between the parenthesis at nOpen and its counterpart.
+// The text between the parenthesis at nOpen and its counterpart.
 std::string argumentsAt(const std::string& strCode, std::size_t nOpen)
 {
     int iDepth = 0;
@@ -82,7 +82,7 @@ std::string textOf(const std::string& strMacro, const std::string& strArguments)
     return std::regex_replace(strText, std::regex(R"(\\(.))"), "$1");
 }
 
-TEST(Messages, OfTheSourcesAreAllListed)
+TEST(Messages, InTheSourcesAreAllListed)
 {
     const std::set<std::string> listed = listedTexts("nothing");
     static const std::regex macro(

@@ -118,7 +118,7 @@ TEST_F(TimeText, FollowsAChangedZoneAfterTzset)
 }
 
 // Kept: the letters GMT follow local time too.
-TEST_F(TimeText, ReadsThreeBitsOfASet)
+TEST_F(TimeText, ReadsOnlyTheThreeLowestBits)
 {
     const TimeZone zone("AAA-5:30");
     const std::string strLocalGmt = "Thu, 01 Jan 1970 05:30:00 GMT";
@@ -230,7 +230,7 @@ TEST_F(TimeAfterNow, IsTheSumInSecondsAndWrapsBeyondALong)
 }
 
 // Kept: a clock that fails counts as the second before the epoch.
-TEST_F(TimeAfterNow, IgnoresThatTheClockFails)
+TEST_F(TimeAfterNow, IgnoresAFailingClock)
 {
     state().blNoClock = true;
     long lOut = 42;
