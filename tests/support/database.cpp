@@ -62,10 +62,7 @@ Database::~Database()
 
 void Database::run(const std::string& strSql)
 {
-    char* szError = nullptr;
-    const int iStatus = doubles::realExec(pDb_, strSql.c_str(), nullptr, nullptr, &szError);
-    EXPECT_EQ(SQLITE_OK, iStatus) << strSql << ": " << (szError ? szError : "");
-    sqlite3_free(szError);
+    rows(strSql);
 }
 
 Rows Database::rows(const std::string& strSql)
@@ -87,11 +84,9 @@ Rows Database::rows(const std::string& strSql)
 std::string Database::value(const std::string& strSql)
 {
     const Rows rows = this->rows(strSql);
-    if (1 != rows.size() || 1 != rows[0].size()) {
-        ADD_FAILURE() << "not one value: " << strSql;
-        return std::string();
-    }
-    return rows[0][0];
+    if (1 == rows.size() && 1 == rows[0].size()) return rows[0][0];
+    ADD_FAILURE() << "not one value: " << strSql;
+    return std::string();
 }
 
 namespace {
@@ -132,16 +127,12 @@ Json::Value Table::create(const std::string& strRecord)
 HostTest::HostTest()
 {
     doubles::reset();
-    blLogToStdout = false;
-    blDebugOutput = false;
     errno = 0;
 }
 
 HostTest::~HostTest()
 {
     doubles::reset();
-    blLogToStdout = false;
-    blDebugOutput = false;
 }
 
 std::vector<std::string> HostTest::takeStatements()

@@ -53,8 +53,8 @@ private:
 
 // A handle with what it was made from.
 struct Table {
-    // strMembers is the "member" object of the definition; strColumns what stands between the
-    // parentheses of the CREATE statement.
+    // strMembers is the "member" object of the definition; strColumns is the text between
+    // the parentheses of the CREATE statement.
     Table(Database& database, const std::string& strMembers, const std::string& strColumns);
     // On a table of that name that exists already.
     Table(Database& database, const std::string& strTable, const std::string& strMembers,

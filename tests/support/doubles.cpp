@@ -28,6 +28,7 @@ State& state()
 void reset()
 {
     state() = State();
+    blLogToStdout = blDebugOutput = false;
 }
 
 char* errorText(const char* szText)
@@ -46,6 +47,13 @@ Function* real(const char* szName)
 {
     return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, szName));
 }
+
+// Runs the statement, which reads the variable arguments after szFormat.
+#define WITH_ARGUMENTS(STATEMENT)  \
+    va_list arguments;             \
+    va_start(arguments, szFormat); \
+    STATEMENT;                     \
+    va_end(arguments)
 
 // SQLite calls sqlite3_exec itself while it loads a schema; those calls are not the library's.
 int iExecDepth = 0;
@@ -120,10 +128,7 @@ int sqlite3_changes(sqlite3* pDb)
 char* sqlite3_mprintf(const char* szFormat, ...)
 {
     if (isDue(state().iFailMprintf)) return nullptr;
-    va_list arguments;
-    va_start(arguments, szFormat);
-    char* szText = sqlite3_vmprintf(szFormat, arguments);
-    va_end(arguments);
+    WITH_ARGUMENTS(char* szText = sqlite3_vmprintf(szFormat, arguments));
     return szText;
 }
 
@@ -137,35 +142,23 @@ int usleep(useconds_t uMicroseconds)
 
 void syslog(int iPriority, const char* szFormat, ...)
 {
-    va_list arguments;
-    va_start(arguments, szFormat);
-    record(true, iPriority, szFormat, arguments);
-    va_end(arguments);
+    WITH_ARGUMENTS(record(true, iPriority, szFormat, arguments));
 }
 
 void __syslog_chk(int iPriority, int /*iFlag*/, const char* szFormat, ...)
 {
-    va_list arguments;
-    va_start(arguments, szFormat);
-    record(true, iPriority, szFormat, arguments);
-    va_end(arguments);
+    WITH_ARGUMENTS(record(true, iPriority, szFormat, arguments));
 }
 
 int printf(const char* szFormat, ...)
 {
-    va_list arguments;
-    va_start(arguments, szFormat);
-    const int iLength = writeToStdout(szFormat, arguments);
-    va_end(arguments);
+    WITH_ARGUMENTS(const int iLength = writeToStdout(szFormat, arguments));
     return iLength;
 }
 
 int __printf_chk(int /*iFlag*/, const char* szFormat, ...)
 {
-    va_list arguments;
-    va_start(arguments, szFormat);
-    const int iLength = writeToStdout(szFormat, arguments);
-    va_end(arguments);
+    WITH_ARGUMENTS(const int iLength = writeToStdout(szFormat, arguments));
     return iLength;
 }
 

@@ -2,6 +2,7 @@
 // The log as a test reads it.
 #pragma once
 
+#include <set>
 #include <string>
 #include <vector>
 
@@ -26,3 +27,6 @@ std::string error(const std::string& strMessage);
 // A line of the plain family of the class.
 std::string plain(const std::string& strMessage);
 std::string utilPlain(const std::string& strMessage);
+
+// The places of a text in the sources of a component, such as "util:12", one a line of its code.
+std::multiset<std::string> placesOf(const std::string& strComponent, const std::string& strText);

@@ -5,6 +5,7 @@
 #include <climits>
 #include <cstdlib>
 #include <ctime>
+#include <optional>
 #include <string>
 
 // Whether the system's long holds the time.
@@ -18,26 +19,19 @@ class TimeZone {
 public:
     explicit TimeZone(const char* szZone)
     {
-        const char* szBefore = getenv("TZ");
-        blSet_ = nullptr != szBefore;
-        if (blSet_) strBefore_ = szBefore;
-        setenv("TZ", szZone, 1);
-        tzset();
+        if (const char* szBefore = getenv("TZ")) before_ = szBefore;
+        set(szZone);
     }
-
-    ~TimeZone()
-    {
-        if (blSet_)
-            setenv("TZ", strBefore_.c_str(), 1);
-        else
-            unsetenv("TZ");
-        tzset();
-    }
-
+    ~TimeZone() { set(before_ ? before_->c_str() : nullptr); }
     TimeZone(const TimeZone&) = delete;
     TimeZone& operator=(const TimeZone&) = delete;
 
 private:
-    bool blSet_ = false;
-    std::string strBefore_;
+    static void set(const char* szZone)
+    {
+        nullptr == szZone ? unsetenv("TZ") : setenv("TZ", szZone, 1);
+        tzset();
+    }
+
+    std::optional<std::string> before_;
 };

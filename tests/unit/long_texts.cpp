@@ -17,17 +17,15 @@ bool blDebugOutput = false;
 
 namespace {
 
-bool hasMemory()
-{
-    constexpr long kGigabyte = 1L << 30;
-    return 4 < sizeof(void*) && 8 <= sysconf(_SC_PHYS_PAGES) / (kGigabyte / sysconf(_SC_PAGESIZE));
-}
+// 8 GiB.
+const bool blHasMemory =
+    4 < sizeof(void*) && 8 <= sysconf(_SC_PHYS_PAGES) / ((1L << 30) / sysconf(_SC_PAGESIZE));
 
 // How often SQLite has formatted.
 std::size_t nFormatted = 0;
 
 // The shortest text that is too long.
-const std::size_t nLimit = hasMemory() ? 1'000'000'000 : 510'000'000;
+const std::size_t nLimit = blHasMemory ? 1'000'000'000 : 510'000'000;
 
 }  // namespace
 
@@ -38,56 +36,38 @@ extern "C" char* sqlite3_mprintf(const char* szFormat, ...)
     va_start(arguments, szFormat);
     char* szText = sqlite3_vmprintf(szFormat, arguments);
     va_end(arguments);
-    if (hasMemory() || nullptr == szText || strlen(szText) < nLimit) return szText;
+    if (blHasMemory || nullptr == szText || strlen(szText) < nLimit) return szText;
     sqlite3_free(szText);
     return nullptr;
 }
 
 namespace {
 
-std::string text(const char* szStart, std::size_t nLetters, const char* szEnd)
+// The result for a statement to which the value 7 is appended; -2 for std::logic_error.
+int expand(std::string& strSql)
 {
-    return std::string(szStart).append(nLetters, 'x').append(szEnd);
+    sqlite3* pDb = nullptr;
+    sqlite3_open(":memory:", &pDb);
+    std::string strName = "t";
+    std::string strCreate = "create table t (n)";
+    Json::Value jDefinition;
+    jDefinition["t"]["member"]["n"]["cpptype"] = "int";
+    Json::Value jRecord;
+    jRecord["n"] = 7;
+    int iResult = -2;
+    nFormatted = 0;
+    try {
+        iResult = VornJsonDbApi(pDb, strName, jDefinition, strCreate)
+                      .SqlExpandMemberSymbol(strSql, jRecord);
+    } catch (const std::logic_error&) {
+    }
+    sqlite3_close(pDb);
+    return iResult;
 }
 
-class LongTexts : public testing::Test {
-protected:
-    LongTexts()
-    {
-        jDefinition_["t"]["member"]["n"]["cpptype"] = "int";
-        jRecord_["n"] = 7;
-        sqlite3_open(":memory:", &pDb_);
-    }
-    ~LongTexts() override { sqlite3_close(pDb_); }
-
-    static void SetUpTestSuite()
-    {
-        if (!hasMemory()) printf("left out: texts of a gigabyte: they need 64 bits and 8 GiB\n");
-    }
-
-    // The result for the statement; -2 for std::logic_error.
-    int expand(std::string strSql)
-    {
-        VornJsonDbApi api(pDb_, strName_, jDefinition_, strCreate_);
-        strSql_ = std::move(strSql);
-        nFormatted = 0;
-        try {
-            return api.SqlExpandMemberSymbol(strSql_, jRecord_);
-        } catch (const std::logic_error&) {
-            return -2;
-        }
-    }
-
-    sqlite3* pDb_ = nullptr;
-    std::string strName_ = "t";
-    std::string strCreate_ = "create table t (n)";
-    std::string strSql_;
-    Json::Value jDefinition_;
-    Json::Value jRecord_;
-};
-
-TEST_F(LongTexts, AreWrittenUpToTheLimitAndRefusedBeyondIt)
+TEST(LongTexts, AreWrittenUpToTheLimitAndRefusedBeyondIt)
 {
+    if (!blHasMemory) printf("left out: texts of a gigabyte: they need 64 bits and 8 GiB\n");
     const struct {
         const char* szBefore;
         std::size_t nLetters;
@@ -102,19 +82,21 @@ TEST_F(LongTexts, AreWrittenUpToTheLimitAndRefusedBeyondIt)
     };
     for (const auto& row : cases) {
         SCOPED_TRACE(std::string(row.szBefore) + " " + std::to_string(row.iResult));
-        EXPECT_EQ(row.iResult, expand(text(row.szBefore, row.nLetters, "")));
-        EXPECT_TRUE(text(row.szAfter, row.nLetters, row.szEnd) == strSql_);
+        std::string strSql = std::string(row.szBefore).append(row.nLetters, 'x');
+        EXPECT_EQ(row.iResult, expand(strSql));
+        EXPECT_TRUE(std::string(row.szAfter).append(row.nLetters, 'x').append(row.szEnd) == strSql);
     }
 }
 
-TEST_F(LongTexts, OfWideConversionsAreRefusedBeforeTheyAreWhole)
+TEST(LongTexts, AreRefusedBeforeTheirWideConversionsAreAllWritten)
 {
-    if (!hasMemory()) GTEST_SKIP() << "a text of a gigabyte needs 64 bits and 8 GiB";
+    if (!blHasMemory) GTEST_SKIP() << "a text of a gigabyte needs 64 bits and 8 GiB";
     constexpr std::size_t kWidth = 4096;
     std::string strSql;
     for (std::size_t i = 0; i < 4 * nLimit / kWidth; ++i) strSql += "%4096d";
+    const std::string strBefore = strSql;
     EXPECT_EQ(-2, expand(strSql));
-    EXPECT_TRUE(strSql == strSql_);
+    EXPECT_TRUE(strBefore == strSql);
     EXPECT_GT(3 * nLimit / kWidth, nFormatted);
 }
 

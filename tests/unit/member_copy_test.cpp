@@ -7,56 +7,64 @@ namespace {
 
 using VORN_JSON_DB::jsonCopyMember;
 
-class MemberCopy : public HostTest {};
+class MemberCopy : public HostTest {
+protected:
+    // What filling and overwriting make of the destination; or the line that both log instead.
+    static void expectCopies(const char* szIn, const char* szSource, const char* szFilled,
+                             const char* szOverwritten, const Lines& lines = {})
+    {
+        for (bool blOverwrite : {false, true}) {
+            SCOPED_TRACE(std::string(szIn) + " from " + szSource);
+            Json::Value jIn = json(szIn);
+            Json::Value jSource = json(szSource);
+            EXPECT_EQ(lines.empty() ? 0 : -1, jsonCopyMember(jIn, jSource, blOverwrite));
+            EXPECT_EQ(text(json(blOverwrite ? szOverwritten : szFilled)), text(jIn));
+            EXPECT_EQ(text(json(szSource)), text(jSource));
+            EXPECT_EQ(lines, takeLog());
+        }
+    }
+};
 
 TEST_F(MemberCopy, FillsAndOverwrites)
 {
-    struct Case {
-        const char* szName;
-        const char* szIn;
-        const char* szSource;
-        const char* szFilled;
-        const char* szOverwritten;
-    };
-    const Case cases[] = {
-        {"both have one", R"({"a":1})", R"({"a":2,"b":3})", R"({"a":1,"b":3})", R"({"a":2,"b":3})"},
-        {"nothing in common", R"({"a":1})", R"({"b":2})", R"({"a":1,"b":2})", R"({"a":1,"b":2})"},
-        {"the destination has more", R"({"a":1,"z":[2]})", R"({"a":2})", R"({"a":1,"z":[2]})",
-         R"({"a":2,"z":[2]})"},
-        {"into null", "null", R"({"a":1,"b":2})", R"({"a":1,"b":2})", R"({"a":1,"b":2})"},
-        {"into empty", "{}", R"({"a":1,"b":2})", R"({"a":1,"b":2})", R"({"a":1,"b":2})"},
-        {"nothing into null", "null", "{}", "null", "null"},
-        {"nothing into empty", "{}", "{}", "{}", "{}"},
-        {"nothing into one", R"({"a":1})", "{}", R"({"a":1})", R"({"a":1})"},
-        {"objects are not merged", R"({"o":{"x":1,"y":2}})", R"({"o":{"x":5}})",
-         R"({"o":{"x":1,"y":2}})", R"({"o":{"x":5}})"},
-        {"arrays are not merged", R"({"l":[1,2,3]})", R"({"l":[9]})", R"({"l":[1,2,3]})",
-         R"({"l":[9]})"},
-        {"null counts as a member", R"({"a":null})", R"({"a":1,"b":null})",
-         R"({"a":null,"b":null})", R"({"a":1,"b":null})"},
-        {"null replaces", R"({"a":1})", R"({"a":null})", R"({"a":1})", R"({"a":null})"},
-        {"another kind", R"({"a":{"x":1},"b":"t"})", R"({"a":1.5,"b":{"y":true}})",
-         R"({"a":{"x":1},"b":"t"})", R"({"a":1.5,"b":{"y":true}})"},
-        {"every kind", "null",
-         R"({"":0,"a":null,"b":true,"c":-1,"d":18446744073709551615,"e":1.5,"f":"t","g":[{}],"h":{"i":[]}})",
-         R"({"":0,"a":null,"b":true,"c":-1,"d":18446744073709551615,"e":1.5,"f":"t","g":[{}],"h":{"i":[]}})",
-         R"({"":0,"a":null,"b":true,"c":-1,"d":18446744073709551615,"e":1.5,"f":"t","g":[{}],"h":{"i":[]}})"},
-        {"names count whole and in their case", R"({"a":1})", R"({"A":2,"a ":3,"a\u0000b":4})",
-         R"({"A":2,"a":1,"a\u0000b":4,"a ":3})", R"({"A":2,"a":1,"a\u0000b":4,"a ":3})"},
-    };
-    for (const Case& row : cases)
-        for (bool blOverwrite : {false, true}) {
-            SCOPED_TRACE(std::string(row.szName) + (blOverwrite ? ", overwriting" : ", filling"));
-            Json::Value jIn = json(row.szIn);
-            Json::Value jSource = json(row.szSource);
-            EXPECT_EQ(0, jsonCopyMember(jIn, jSource, blOverwrite));
-            EXPECT_EQ(text(json(blOverwrite ? row.szOverwritten : row.szFilled)), text(jIn));
-            EXPECT_EQ(text(json(row.szSource)), text(jSource));
-            EXPECT_EQ(Lines(), takeLog());
-        }
+    const char* szEveryKind =
+        R"({"":0,"a":null,"b":true,"c":-1,"d":18446744073709551615,"e":1.5,"f":"t","g":[{}],"h":{}})";
+    expectCopies("null", szEveryKind, szEveryKind, szEveryKind);
+    const char* szBoth = R"({"a":1,"b":3,"z":[2]})";
+    expectCopies(R"({"a":1,"z":[2]})", R"({"a":2,"b":3})", szBoth, R"({"a":2,"b":3,"z":[2]})");
+    for (const char* szIn : {"null", "{}", R"({"a":1})"}) expectCopies(szIn, "{}", szIn, szIn);
+    // Objects and arrays are not merged.
+    const char* szNested = R"({"l":[1,2],"o":{"x":1,"y":2}})";
+    expectCopies(szNested, R"({"l":[9],"o":{"x":5}})", szNested, R"({"l":[9],"o":{"x":5}})");
+    // Null counts as a member.
+    expectCopies(R"({"a":null,"b":1})", R"({"a":1,"b":null})", R"({"a":null,"b":1})",
+                 R"({"a":1,"b":null})");
+    // Names count whole and in their case.
+    const char* szNames = R"({"A":2,"a":1,"a\u0000b":4,"a ":3})";
+    expectCopies(R"({"a":1})", R"({"A":2,"a ":3,"a\u0000b":4})", szNames, szNames);
 }
 
-TEST_F(MemberCopy, CopiesAreOfTheirOwn)
+TEST_F(MemberCopy, RefusesEveryOtherKind)
+{
+    const Lines badDestination = {
+        utilFailed("jIn.type() != Json::nullValue && jIn.type() != Json::objectValue")};
+    const Lines badSource = {utilFailed("jSubSet.type() != Json::objectValue")};
+    for (bool blStdout : {false, true}) {
+        blLogToStdout = blStdout;
+        for (const char* szKind : {"[]", R"([{"a":1}])", R"("")", R"("x")", "1", "-1",
+                                   "18446744073709551615", "1.5", "true", "false"}) {
+            // The destination is looked at first.
+            for (const char* szSource : {R"({"a":1})", "{}", "[]", "null"})
+                expectCopies(szKind, szSource, szKind, szKind, badDestination);
+            for (const char* szIn : {"null", "{}", R"({"a":1})"})
+                expectCopies(szIn, szKind, szIn, szIn, badSource);
+        }
+        // Null is refused as a source, unlike as a destination.
+        for (const char* szIn : {"null", "{}"}) expectCopies(szIn, "null", szIn, szIn, badSource);
+    }
+}
+
+TEST_F(MemberCopy, MakesCopiesThatDoNotFollowTheSource)
 {
     Json::Value jIn;
     Json::Value jSource = json(R"({"o":{"x":1}})");
@@ -67,104 +75,39 @@ TEST_F(MemberCopy, CopiesAreOfTheirOwn)
     EXPECT_EQ(R"({"o":{"x":2}})", text(jSource));
 }
 
-TEST_F(MemberCopy, IntoItselfChangesNothing)
+TEST_F(MemberCopy, CopiesBetweenPartsOfOneValue)
 {
-    for (bool blOverwrite : {false, true}) {
-        Json::Value jIn = json(R"({"a":1,"o":{"x":[2]}})");
-        EXPECT_EQ(0, jsonCopyMember(jIn, jIn, blOverwrite));
-        EXPECT_EQ(R"({"a":1,"o":{"x":[2]}})", text(jIn));
-    }
-}
-
-TEST_F(MemberCopy, FromAMemberOfTheDestination)
-{
-    for (bool blOverwrite : {false, true}) {
-        Json::Value jIn = json(R"({"a":1,"o":{"a":2,"b":3}})");
-        EXPECT_EQ(0, jsonCopyMember(jIn, jIn["o"], blOverwrite));
-        EXPECT_EQ(blOverwrite ? R"({"a":2,"b":3,"o":{"a":2,"b":3}})"
-                              : R"({"a":1,"b":3,"o":{"a":2,"b":3}})",
-                  text(jIn));
-    }
-}
-
-TEST_F(MemberCopy, IntoADestinationInsideTheSource)
-{
-    struct Case {
-        const char* szSource;
-        std::vector<const char*> path;  // to the destination
+    using Path = std::vector<const char*>;
+    const Path whole, o = {"o"}, n = {"n"}, op = {"o", "p"};
+    const struct {
+        const char* szValue;
+        const Path& in;
+        const Path& source;
         const char* szFilled;
         const char* szOverwritten;
-    };
-    const Case cases[] = {
-        {R"({"a":1,"o":{"a":2,"b":3}})",
-         {"o"},
-         R"({"a":1,"o":{"a":2,"b":3,"o":{"a":2,"b":3}}})",
-         R"({"a":1,"o":{"a":1,"b":3,"o":{"a":1,"b":3}}})"},
-        {R"({"a":1,"n":null})",
-         {"n"},
-         R"({"a":1,"n":{"a":1,"n":{"a":1}}})",
+    } cases[] = {
+        {R"({"o":{"x":[2]}})", whole, whole, R"({"o":{"x":[2]}})", R"({"o":{"x":[2]}})"},
+        {R"({"a":1,"o":{"a":2,"b":3}})", whole, o, R"({"a":1,"b":3,"o":{"a":2,"b":3}})",
+         R"({"a":2,"b":3,"o":{"a":2,"b":3}})"},
+        {R"({"a":1,"o":{"a":2}})", o, whole, R"({"a":1,"o":{"a":2,"o":{"a":2}}})",
+         R"({"a":1,"o":{"a":1,"o":{"a":1}}})"},
+        {R"({"a":1,"n":null})", n, whole, R"({"a":1,"n":{"a":1,"n":{"a":1}}})",
          R"({"a":1,"n":{"a":1,"n":{"a":1}}})"},
-        {R"({"o":{"p":{"o":1}},"z":[2]})",
-         {"o", "p"},
-         R"({"o":{"p":{"o":1,"z":[2]}},"z":[2]})",
+        {R"({"o":{"p":{"o":1}},"z":[2]})", op, whole, R"({"o":{"p":{"o":1,"z":[2]}},"z":[2]})",
          R"({"o":{"p":{"o":{"p":{"o":1}},"z":[2]}},"z":[2]})"},
     };
-    for (const Case& row : cases)
+    for (const auto& row : cases)
         for (bool blOverwrite : {false, true}) {
-            SCOPED_TRACE(std::string(row.szSource) + (blOverwrite ? ", overwriting" : ", filling"));
-            Json::Value jSource = json(row.szSource);
-            Json::Value* pjIn = &jSource;
-            for (const char* szName : row.path) pjIn = &(*pjIn)[szName];
-            EXPECT_EQ(0, jsonCopyMember(*pjIn, jSource, blOverwrite));
-            EXPECT_EQ(text(json(blOverwrite ? row.szOverwritten : row.szFilled)), text(jSource));
+            Json::Value jValue = json(row.szValue);
+            const auto at = [&](const Path& path) {
+                Json::Value* pjValue = &jValue;
+                for (const char* szName : path) pjValue = &(*pjValue)[szName];
+                return pjValue;
+            };
+            EXPECT_EQ(0, jsonCopyMember(*at(row.in), *at(row.source), blOverwrite));
+            EXPECT_EQ(blOverwrite ? row.szOverwritten : row.szFilled, text(jValue));
             EXPECT_EQ(Lines(), takeLog());
         }
-}
-
-const std::string kBadDestination =
-    utilFailed("jIn.type() != Json::nullValue && jIn.type() != Json::objectValue");
-const std::string kBadSource = utilFailed("jSubSet.type() != Json::objectValue");
-
-// A failing copy, in every variant of the log.
-void expectFailure(const char* szIn, const char* szSource, const std::string& strLine)
-{
-    for (bool blOverwrite : {false, true})
-        for (bool blStdout : {false, true}) {
-            SCOPED_TRACE(std::string(szIn) + " from " + szSource);
-            blLogToStdout = blStdout;
-            Json::Value jIn = json(szIn);
-            Json::Value jSource = json(szSource);
-            EXPECT_EQ(-1, jsonCopyMember(jIn, jSource, blOverwrite));
-            EXPECT_EQ(text(json(szIn)), text(jIn));
-            EXPECT_EQ(text(json(szSource)), text(jSource));
-            EXPECT_EQ(Lines{strLine}, takeLog());
-        }
-}
-
-constexpr const char* kOtherKinds[] = {"[]", R"([{"a":1}])",         R"("")", R"("x")", "0",    "1",
-                                       "-1", "18446744073709551615", "1.5",   "true",   "false"};
-
-TEST_F(MemberCopy, DestinationsOfEveryOtherKind)
-{
-    for (const char* szIn : kOtherKinds) {
-        expectFailure(szIn, R"({"a":1})", kBadDestination);
-        expectFailure(szIn, "{}", kBadDestination);
-    }
-}
-
-TEST_F(MemberCopy, SourcesOfEveryOtherKind)
-{
-    for (const char* szIn : {"null", "{}", R"({"a":1})"}) {
-        for (const char* szSource : kOtherKinds) expectFailure(szIn, szSource, kBadSource);
-        // Null is no source, unlike for the destination.
-        expectFailure(szIn, "null", kBadSource);
-    }
-}
-
-TEST_F(MemberCopy, TheDestinationIsLookedAtFirst)
-{
-    expectFailure("[]", "[]", kBadDestination);
-    expectFailure("1", "null", kBadDestination);
 }
 
 }  // namespace

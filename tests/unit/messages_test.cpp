@@ -1,15 +1,18 @@
 // SPDX-License-Identifier: MIT
-// Hosts read the log by its texts: data/messages.txt holds each of them, and the library none else.
-// A formatter, a linter or a renaming that touches one is found here.
+// Hosts read the log by its texts. data/messages.txt lists each of them: the library and its
+// sources hold these and no others, and each but the guards is logged by some test. A formatter, a
+// linter or a renaming that touches one is found here.
+
+#include "support/doubles.h"
 
 #include <gtest/gtest.h>
 
 #include <filesystem>
 #include <fstream>
 #include <iterator>
+#include <regex>
 #include <set>
 #include <string>
-#include <vector>
 
 namespace {
 
@@ -20,146 +23,134 @@ std::string contents(const std::filesystem::path& path)
     return {std::istreambuf_iterator<char>(file), {}};
 }
 
-std::vector<std::string> linesOf(const std::filesystem::path& path)
+// The listed texts but those below headings that begin with one of the words.
+std::set<std::string> listedTexts(const std::string& strWithout)
 {
-    std::ifstream file(path);
-    std::vector<std::string> lines;
-    for (std::string strLine; std::getline(file, strLine);) lines.push_back(strLine);
-    return lines;
+    const std::regex heading("# (?!" + strWithout + ").*");
+    std::set<std::string> texts;
+    std::ifstream file(VORN_TEST_DATA "/messages.txt");
+    bool blListed = false;
+    for (std::string strLine; std::getline(file, strLine);)
+        if (0 == strLine.find("# "))
+            blListed = std::regex_match(strLine, heading);
+        else if (blListed && !texts.insert(strLine).second)
+            ADD_FAILURE() << "listed twice: " << strLine;
+    return texts;
 }
 
 // An optimiser may leave out the guards, which it can prove not to fail.
 #ifdef __OPTIMIZE__
-constexpr bool kGuardsStay = false;
+constexpr char kLeftOut[] = "guards";
 #else
-constexpr bool kGuardsStay = true;
+constexpr char kLeftOut[] = "nothing";
 #endif
 
-std::set<std::string> listedTexts(bool blGuards = true)
+TEST(Messages, AreAllInTheLibrary)
 {
-    std::set<std::string> texts;
-    bool blListed = true;
-    for (const std::string& strLine : linesOf(VORN_TEST_DATA "/messages.txt")) {
-        if (0 == strLine.find("# ")) blListed = blGuards || 0 != strLine.find("# guards");
-        if (!blListed || strLine.empty() || 0 == strLine.find("# ")) continue;
-        EXPECT_TRUE(texts.insert(strLine).second) << "listed twice: " << strLine;
-    }
-    return texts;
-}
-
-// Without comments and macro definitions; one line.
-std::string codeOf(const std::filesystem::path& path)
-{
-    std::string strCode;
-    for (const std::string& strLine : linesOf(path)) {
-        const std::size_t nStart = strLine.find_first_not_of(' ');
-        if (std::string::npos == nStart) continue;
-        if (0 == strLine.compare(nStart, 2, "//") || '#' == strLine[nStart]) continue;
-        strCode += strLine.substr(nStart) + " ";
-    }
-    return strCode;
-}
-
-// The arguments of the macro call whose opening parenthesis is at nOpen.
-std::vector<std::string> argumentsAt(const std::string& strCode, std::size_t nOpen)
-{
-    std::vector<std::string> arguments(1);
-    int iDepth = 0;
-    bool blQuoted = false;
-    for (std::size_t n = nOpen + 1; n < strCode.size(); ++n) {
-        const char c = strCode[n];
-        if ('"' == c && '\\' != strCode[n - 1]) blQuoted = !blQuoted;
-        if (!blQuoted) {
-            if (')' == c && 0 == iDepth) return arguments;
-            if (',' == c && 0 == iDepth) {
-                arguments.emplace_back();
-                continue;
-            }
-            if ('(' == c) ++iDepth;
-            if (')' == c) --iDepth;
-        }
-        arguments.back() += c;
-    }
-    ADD_FAILURE() << "no end of " << strCode.substr(nOpen, 40);
-    return arguments;
-}
-
-// The arguments again as one text, blanks as the preprocessor leaves them.
-std::string asPreprocessed(const std::vector<std::string>& arguments)
-{
-    std::string strOut;
-    for (const std::string& strArgument : arguments) {
-        if (!strOut.empty()) strOut += ",";
-        for (char c : strArgument)
-            if (' ' != c || strOut.empty() || ' ' != strOut.back()) strOut += c;
-    }
-    while (!strOut.empty() && ' ' == strOut.back()) strOut.pop_back();
-    return strOut;
-}
-
-// What the string literals of an argument amount to.
-std::string literal(const std::string& strArgument)
-{
-    std::string strOut;
-    bool blQuoted = false;
-    for (std::size_t n = 0; n < strArgument.size(); ++n) {
-        if (blQuoted && '\\' == strArgument[n])
-            strOut += strArgument[++n];
-        else if ('"' == strArgument[n])
-            blQuoted = !blQuoted;
-        else if (blQuoted)
-            strOut += strArgument[n];
-    }
-    return strOut;
-}
-
-// The texts of all calls of a macro.
-template <typename TextOf>
-void collect(const std::string& strCode, const std::string& strMacro, TextOf textOf,
-             std::set<std::string>& texts)
-{
-    for (std::size_t n = 0; std::string::npos != (n = strCode.find(strMacro + "(", n)); ++n) {
-        if (0 < n && (isalnum(static_cast<unsigned char>(strCode[n - 1])) || '_' == strCode[n - 1]))
-            continue;
-        texts.insert(textOf(argumentsAt(strCode, n + strMacro.size())));
-    }
-}
-
-std::set<std::string> textsInSources()
-{
-    using Arguments = std::vector<std::string>;
-    const auto format = [](const Arguments& arguments) { return literal(arguments[0]); };
-    const auto text = [](const Arguments& arguments) { return literal(arguments.back()); };
-    std::set<std::string> texts;
-    for (const auto& entry : std::filesystem::recursive_directory_iterator(VORN_SOURCES)) {
-        const std::string strEnd = entry.path().extension();
-        if (".cpp" != strEnd && ".h" != strEnd) continue;
-        const std::string strCode = codeOf(entry.path());
-        collect(strCode, "FAILED", asPreprocessed, texts);
-        collect(strCode, "REPORT", asPreprocessed, texts);
-        collect(strCode, "FAILED_AS", text, texts);
-        collect(strCode, "LOG_ERROR", format, texts);
-        collect(strCode, "LOG_PLAIN", format, texts);
-    }
-    return texts;
-}
-
-TEST(Messages, OfTheListStandInTheLibrary)
-{
-    const std::string strLibrary = contents(VORN_LIBRARY);
-    const std::set<std::string> texts = listedTexts(kGuardsStay);
+    const std::set<std::string> texts = listedTexts(kLeftOut);
     EXPECT_LT(50U, texts.size());
+    const std::string strLibrary = contents(VORN_LIBRARY);
     for (const std::string& strText : texts)
         EXPECT_NE(std::string::npos, strLibrary.find(strText + '\0')) << strText;
 }
 
-TEST(Messages, OfTheSourcesStandInTheList)
+// The text between the parenthesis at nOpen and its counterpart.
+std::string argumentsAt(const std::string& strCode, std::size_t nOpen)
 {
-    const std::set<std::string> listed = listedTexts();
-    const std::set<std::string> texts = textsInSources();
-    EXPECT_LT(50U, texts.size());
-    for (const std::string& strText : texts)
-        EXPECT_EQ(1U, listed.count(strText)) << "not listed: " << strText;
+    int iDepth = 0;
+    bool blQuoted = false;
+    for (std::size_t n = nOpen; n < strCode.size(); ++n) {
+        if ('"' == strCode[n] && '\\' != strCode[n - 1]) blQuoted = !blQuoted;
+        if (blQuoted) continue;
+        if ('(' == strCode[n]) ++iDepth;
+        if (')' == strCode[n] && 0 == --iDepth) return strCode.substr(nOpen + 1, n - nOpen - 1);
+    }
+    ADD_FAILURE() << "no end of " << strCode.substr(nOpen, 40);
+    return std::string();
 }
+
+// The text that a call of a macro logs: its arguments as they are, or their first or last literals.
+std::string textOf(const std::string& strMacro, const std::string& strArguments)
+{
+    if ("FAILED" == strMacro || "GUARDED" == strMacro || "REPORT" == strMacro) return strArguments;
+    const std::string strLiteral = R"re("((?:[^"\\]|\\.)*)" ?)re";
+    const bool blLast = std::string::npos != strMacro.find("_AS");
+    const std::regex literals(blLast ? "(" + strLiteral + ")+$" : "^(" + strLiteral + ")+");
+    std::smatch match;
+    if (!std::regex_search(strArguments, match, literals)) return "no text in " + strArguments;
+    const std::string strText = std::regex_replace(match.str(), std::regex(strLiteral), "$1");
+    return std::regex_replace(strText, std::regex(R"(\\(.))"), "$1");
+}
+
+TEST(Messages, InTheSourcesAreAllListed)
+{
+    const std::set<std::string> listed = listedTexts("nothing");
+    static const std::regex macro(
+        R"(\b(FAILED|FAILED_AS|GUARDED|GUARDED_AS|REPORT|LOG_ERROR|LOG_PLAIN)\()");
+    static const std::regex noCode(R"((^|\n) *(//|#)[^\n]*)");
+    static const std::regex blanks(R"(\s+)");
+    int iTexts = 0;
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(VORN_SOURCES)) {
+        if (!entry.is_regular_file()) continue;
+        const std::string strCode =
+            std::regex_replace(std::regex_replace(contents(entry.path()), noCode, ""), blanks, " ");
+        for (std::sregex_iterator it(strCode.begin(), strCode.end(), macro), end; it != end; ++it) {
+            const std::size_t nOpen = static_cast<std::size_t>(it->position() + it->length() - 1);
+            const std::string strText = textOf((*it)[1], argumentsAt(strCode, nOpen));
+            EXPECT_EQ(1U, listed.count(strText)) << "not listed: " << strText;
+            ++iTexts;
+        }
+    }
+    EXPECT_LT(50, iTexts);
+}
+
+// Whether the line shows the text: a condition in brackets, or a format with its values.
+bool shows(const std::string& strLine, const std::string& strText)
+{
+    if (std::string::npos == strText.find("=%"))
+        return std::string::npos != strLine.find("Failed [" + strText + "]");
+    std::size_t nFound = 0;
+    for (std::size_t n = 0;;) {
+        const std::size_t nConversion = strText.find('%', n);
+        nFound = strLine.find(strText.substr(n, nConversion - n), nFound);
+        if (std::string::npos == nFound || std::string::npos == nConversion)
+            return std::string::npos != nFound;
+        nFound += nConversion - n;
+        n = nConversion + 2;
+    }
+}
+
+// The texts that no line has shown yet.
+std::set<std::string> missing;
+
+void strikeOut(const std::string& strLine)
+{
+    // Long lines are records; their texts come first.
+    const std::string strFront = strLine.substr(0, 600);
+    for (auto it = missing.begin(); it != missing.end();)
+        it = shows(strFront, *it) ? missing.erase(it) : std::next(it);
+}
+
+// It takes the whole suite in one process to tell.
+class EveryMessage : public testing::Environment {
+public:
+    void SetUp() override
+    {
+        const auto& unitTest = *testing::UnitTest::GetInstance();
+        if (unitTest.test_to_run_count() != unitTest.total_test_count()) return;
+        missing = listedTexts("every failed check|guards|not log lines");
+        ASSERT_LT(80U, missing.size());
+        doubles::onEveryLine = strikeOut;
+    }
+
+    void TearDown() override
+    {
+        doubles::onEveryLine = nullptr;
+        for (const std::string& strText : missing) ADD_FAILURE() << "never logged: " << strText;
+    }
+};
+
+const testing::Environment* const pEveryMessage =
+    testing::AddGlobalTestEnvironment(new EveryMessage);
 
 }  // namespace
