@@ -132,6 +132,7 @@ TEST_F(DeleteBy, ComposesOneStatementAndCounts)
     database_.run("insert into " + table.strName + " values ('a'),('a'),('b'),(''),(NULL)");
     pTable_ = &table;
     expectContents(removeByArray({"a"}, "k"), 2, kAnySql, "b,,NULL");
+    expectContents(removeByName("a", "k"), 2, kAnySql, "b,,NULL");
     expectContents(removeByArray({""}, "k"), 1, kAnySql, "a,a,b,NULL");
 }
 
