@@ -20,15 +20,14 @@ protected:
     {
         return saved(blCreate, "data,flag,id,name,tags", "'{}',0,4,'Eve','[]') ");
     }
-    const std::string strSelect_ = "SELECT data,flag,id,name,tags FROM $ ;";
     const std::string strUpdate_ = "UPDATE $ SET name='Eve' WHERE ";
     const std::string strList_ = listed("123");
     const std::vector<Row> rows_ = {
         {save(kEve, true), {0, savedEve(true), kEve, kWithEve}},
         {save(kEve, false), {0, savedEve(false), kEve, kWithEve}},
         {create(kEve), {0, savedEve(true), kEve, kWithEve}},
-        {list("null"), {0, strSelect_, strList_.c_str(), kBefore}},
-        {get("null"), {1, strSelect_, record('1'), kBefore}},
+        {list("null"), {0, select(";"), strList_.c_str(), kBefore}},
+        {get("null"), {1, select(";"), record('1'), kBefore}},
         {updateByWhere(R"({"name":"Eve"})", "id=1"),
          {0, strUpdate_ + "id=1;", nullptr, "1Eve1,2Bob0,3O'Brien1"},
          true},
