@@ -1,279 +1,198 @@
 // SPDX-License-Identifier: MIT
-// Deleting by a condition object, and everything.
+// Deletes by a condition object, of everything, and by the values of a text member.
 
-#include "support/records.h"
+#include "support/record_calls.h"
 
 namespace {
 
-const std::string kNoObject = failed("jRecParam.type() != Json::objectValue");
-const std::string kNoConditions =
-    failed("0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND)");
-const std::string kNotRun = failed("0 > (err = runSqlEx(strSqlRun))");
+using Texts = std::vector<std::string>;
 
-class Delete : public RecordsTest {
-protected:
-    int remove(const std::string& strRequest, bool blDeleteAll = false)
-    {
-        jRequest_ = json(strRequest);
-        const int iResult = table_.api.recDelete(jRequest_, blDeleteAll);
-        EXPECT_EQ(json(strRequest), jRequest_) << "the request was changed";
-        return iResult;
-    }
+const std::string kNoTextMember = failed(R"(jType[szKey]["cpptype"].asString() != "string")");
 
-    std::string statement(const std::string& strTail) const
-    {
-        return "DELETE FROM " + table_.strName + " " + strTail;
-    }
-
-    static Lines refused(const std::string& strError, const std::string& strSql)
-    {
-        return {runFailed(strError, strSql), kNotRun, sqlError(strError, strSql)};
-    }
-
-    Json::Value jRequest_;
-};
+class Delete : public RecordsTest {};
 
 TEST_F(Delete, ComposesOneStatementAndCounts)
 {
     const struct {
         const char* szRequest;
-        const char* szTail;
+        const char* szTerms;
         int iResult;
         const char* szContents;
     } cases[] = {
-        {R"({"id":1})", " WHERE  (id=1 );", 1, "2Bob0,3O'Brien1"},
-        {R"({"id":9})", " WHERE  (id=9 );", 0, "1Ann1,2Bob0,3O'Brien1"},
-        {R"({"flag":true})", " WHERE  (flag=1 );", 2, "2Bob0"},
-        {R"({"flag":true,"id":3})", " WHERE  (flag=1 and id=3 );", 1, "1Ann1,2Bob0"},
-        {R"({"name":"O'Brien"})", " WHERE  (name='O''Brien' );", 1, "1Ann1,2Bob0"},
-        {R"({"name":["Bob"]})", " WHERE  (name in ('Bob' ) );", 1, "1Ann1,3O'Brien1"},
-        {R"({"id":[1]})", " WHERE  (id in (1 ) );", 1, "2Bob0,3O'Brien1"},
-        {R"({"name":["Ann","Bob"]})", " WHERE  (name in ('Ann''Bob' ) );", 0,
-         "1Ann1,2Bob0,3O'Brien1"},
-        {R"({"data":{"k":1}})", R"( WHERE  (data='{"k":1}' );)", 1, "2Bob0,3O'Brien1"},
-        {R"({"vornSqlWhereFilter":"id > 1"})", " WHERE  ( id > 1  );", 2, "1Ann1"},
-        {R"({"vornSqlWhereFilter":"1"})", " WHERE  ( 1  );", 3, ""},
+        {R"({"id":1})", "id=1", 1, "2Bob0,3O'Brien1"},
+        {R"({"id":9})", "id=9", 0, kBefore},
+        {R"({"flag":true})", "flag=1", 2, "2Bob0"},
+        {R"({"flag":true,"id":3})", "flag=1 and id=3", 1, "1Ann1,2Bob0"},
+        {R"({"name":"O'Brien"})", "name='O''Brien'", 1, "1Ann1,2Bob0"},
+        {R"({"name":["Bob"]})", "name in ('Bob' )", 1, "1Ann1,3O'Brien1"},
+        {R"({"id":[1]})", "id in (1 )", 1, "2Bob0,3O'Brien1"},
+        {R"({"name":["Ann","Bob"]})", "name in ('Ann''Bob' )", 0, kBefore},
+        {R"({"data":{"k":1}})", R"(data='{"k":1}')", 1, "2Bob0,3O'Brien1"},
+        {R"({"vornSqlWhereFilter":"id > 1"})", " id > 1 ", 2, "1Ann1"},
+        {R"({"vornSqlWhereFilter":"1"})", " 1 ", 3, ""},
         // Kept: sorting and paging do not count here.
-        {R"({"flag":true,"limit":1,"offset":1,"sort_by":5})", " WHERE  (flag=1 );", 2, "2Bob0"},
-        {R"({"id":2,"undeclared":1})", " WHERE  (id=2 );", 1, "1Ann1,3O'Brien1"},
+        {R"({"flag":true,"limit":1,"offset":1,"sort_by":5})", "flag=1", 2, "2Bob0"},
+        {R"({"id":2,"undeclared":1})", "id=2", 1, "1Ann1,3O'Brien1"},
     };
     // A condition counts whatever the flag says.
-    for (const bool blDeleteAll : {false, true}) {
-        for (const auto& row : cases) {
-            database_.run("begin");
-            EXPECT_EQ(row.iResult, remove(row.szRequest, blDeleteAll)) << row.szRequest;
-            EXPECT_EQ(Lines{statement(row.szTail)}, takeStatements()) << row.szRequest;
-            EXPECT_EQ(Lines(), takeLog()) << row.szRequest;
-            EXPECT_EQ(row.szContents, contents()) << row.szRequest;
-            database_.run("rollback");
-        }
-    }
+    for (const bool blDeleteAll : {false, true})
+        for (const auto& row : cases)
+            expectContents(remove(row.szRequest, blDeleteAll), row.iResult,
+                           std::string("DELETE FROM $  WHERE  (") + row.szTerms + " );",
+                           row.szContents);
 }
 
-TEST_F(Delete, RefusesARequestThatSelectsByNothing)
+TEST_F(Delete, DeletesEverythingOnlyWhereThatIsAllowed)
 {
     for (const char* szRequest : {"{}", R"({"undeclared":1})", R"({"limit":1,"sort_by":"id"})"}) {
-        EXPECT_EQ(-1, remove(szRequest)) << szRequest;
-        EXPECT_EQ(Lines{failed("strSql.empty()")}, takeLog()) << szRequest;
+        expectFailure(remove(szRequest), {failed("strSql.empty()")});
+        expectContents(remove(szRequest, true), 3, "DELETE FROM $ ;", "");
     }
-    EXPECT_EQ(Lines(), takeStatements());
-    EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
+    expectContents(removeAll(), 3, "DELETE FROM $ ;", "");
+    database_.run("delete from " + table_.strName);
+    expectContents(removeAll(), 0, "DELETE FROM $ ;", "");
 }
 
-TEST_F(Delete, DeletesEverythingByARequestThatSelectsByNothingWhenAllowed)
-{
-    for (const char* szRequest : {"{}", R"({"undeclared":1})", R"({"limit":1,"sort_by":"id"})"}) {
-        database_.run("begin");
-        EXPECT_EQ(3, remove(szRequest, true)) << szRequest;
-        EXPECT_EQ(Lines{statement(";")}, takeStatements());
-        EXPECT_EQ("", contents());
-        EXPECT_EQ(0, remove(szRequest, true)) << szRequest;
-        EXPECT_EQ(Lines{statement(";")}, takeStatements());
-        EXPECT_EQ(Lines(), takeLog());
-        database_.run("rollback");
-    }
-}
-
-TEST_F(Delete, DeletesAllOnlyThroughTheOperationOfThatName)
-{
-    EXPECT_EQ(-1, remove("{}"));
-    EXPECT_EQ(Lines{failed("strSql.empty()")}, takeLog());
-    EXPECT_EQ(3, table_.api.recDeleteAll());
-    EXPECT_EQ(Lines{statement(";")}, takeStatements());
-    EXPECT_EQ("", contents());
-    EXPECT_EQ(0, table_.api.recDeleteAll());
-    EXPECT_EQ(Lines(), takeLog());
-}
-
-TEST_F(Delete, RefusesARequestOfAnotherKind)
+TEST_F(Delete, FailsWhereTheRequestDoes)
 {
     for (const bool blDeleteAll : {false, true}) {
         for (const char* szRequest : {"null", R"("x")", R"("")", "[]", "[1]", R"([{"id":1}])", "5",
-                                      "0", "1.5", "true", "false"}) {
-            EXPECT_EQ(-1, remove(szRequest, blDeleteAll)) << szRequest;
-            EXPECT_EQ(Lines{kNoObject}, takeLog()) << szRequest;
-        }
+                                      "0", "1.5", "true", "false"})
+            expectFailure(remove(szRequest, blDeleteAll),
+                          {failed("jRecParam.type() != Json::objectValue")});
+        for (const std::string strFilter : {"5", "null", "[]", "{}", "true"})
+            expectFailure(remove(R"({"vornSqlWhereFilter":)" + strFilter + "}", blDeleteAll),
+                          {kFilterIsNoText, kNoRequestConditions});
+        for (const char* szRequest : {R"({"flag":"x"})", R"({"flag":[{}]})", R"({"name":{}})",
+                                      R"({"id":{}})", R"({"id":[[]],"name":[{}]})"})
+            expectThrow(remove(szRequest, blDeleteAll));
     }
-    EXPECT_EQ(Lines(), takeStatements());
-    EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
 }
 
-TEST_F(Delete, FailsWhereTheConditionsDo)
+TEST_F(Delete, FailsWhereMemoryRunsOut)
 {
-    for (const bool blDeleteAll : {false, true}) {
-        for (const char* szFilter : {"5", "null", "[]", "{}", "true"}) {
-            const std::string strRequest =
-                std::string(R"({"vornSqlWhereFilter":)") + szFilter + "}";
-            EXPECT_EQ(-1, remove(strRequest, blDeleteAll));
-            EXPECT_EQ((Lines{kFilterIsNoText, kNoConditions}), takeLog());
-        }
-        doubles::state().iFailMprintf = 1;
-        EXPECT_EQ(-1, remove(R"({"name":"Ann"})", blDeleteAll));
-        EXPECT_EQ((Lines{kNoMemoryForText, kNoMatchTerm, kNoConditions}), takeLog());
-    }
-    EXPECT_EQ(Lines(), takeStatements());
-    EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
+    prepare_ = [] { doubles::state().iFailMprintf = 1; };
+    for (const bool blDeleteAll : {false, true})
+        expectFailure(remove(R"({"name":"Ann"})", blDeleteAll),
+                      kNoMemoryForText + Lines{kNoRequestConditions});
+    for (const Call& call : {removeByArray({"Bob"}, "name"), removeByName("Bob", "name")})
+        expectFailure(call, kNoMemoryForItem + Lines{kNoRequestConditions}, 0);
 }
 
 TEST_F(Delete, FailsWhereSqliteRefuses)
 {
     const struct {
         const char* szRequest;
-        const char* szTail;
+        const char* szTerms;
         const char* szError;
     } cases[] = {
-        {R"({"tags":[]})", " WHERE  ( );", kNearParenthesis},
-        {R"({"id":1,"tags":[]})", " WHERE  (id=1 and  );", kNearParenthesis},
-        {R"({"vornSqlWhereFilter":""})", " WHERE  (   );", kNearParenthesis},
-        {R"({"id":null})", " WHERE  (id= );", kNearParenthesis},
-        {R"({"vornSqlWhereFilter":"absent"})", " WHERE  ( absent  );", "no such column: absent"},
+        {R"({"tags":[]})", "", kNearParenthesis},
+        {R"({"id":1,"tags":[]})", "id=1 and ", kNearParenthesis},
+        {R"({"vornSqlWhereFilter":""})", "  ", kNearParenthesis},
+        {R"({"id":null})", "id=", kNearParenthesis},
+        {R"({"vornSqlWhereFilter":"absent"})", " absent ", "no such column: absent"},
     };
-    for (const auto& row : cases) {
-        EXPECT_EQ(-1, remove(row.szRequest, true)) << row.szRequest;
-        EXPECT_EQ(refused(row.szError, statement(row.szTail)), takeLog());
-        EXPECT_EQ(Lines{statement(row.szTail)}, takeStatements());
-    }
-    EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
-}
-
-TEST_F(Delete, FailsOnATableThatIsGone)
-{
-    database_.run("drop table " + table_.strName);
-    const std::string strError = "no such table: " + table_.strName;
-    EXPECT_EQ(-1, remove(R"({"id":1})"));
-    EXPECT_EQ(refused(strError, statement(" WHERE  (id=1 );")), takeLog());
-    EXPECT_EQ(-1, table_.api.recDeleteAll());
-    EXPECT_EQ(refused(strError, statement(";")), takeLog());
-}
-
-TEST_F(Delete, AConstraintKeepsEveryRowAndSetsNoMessage)
-{
+    for (const auto& row : cases)
+        expectSqlFailure(remove(row.szRequest, true),
+                         std::string("DELETE FROM $  WHERE  (") + row.szTerms + " );", row.szError);
+    // These are the words of a duplicate, but a delete tells the host nothing.
     database_.run("create trigger keep before delete on " + table_.strName +
                   " when old.id = 3 begin select raise(abort, 'UNIQUE constraint failed'); end");
-    EXPECT_EQ(-1, table_.api.recDeleteAll());
-    EXPECT_EQ(refused("UNIQUE constraint failed", statement(";")), takeLog());
-    EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
-    // The words are those of a duplicate, but a delete tells the host nothing.
-    EXPECT_EQ("", table_.api.getErrMsg());
+    expectSqlFailure(removeAll(), "DELETE FROM $ ;", "UNIQUE constraint failed");
 }
 
-TEST_F(Delete, RepeatsAnEarlierErrorTextUntilAStatementSucceeds)
-{
-    makeStale();
-    EXPECT_EQ(-1, remove("null"));
-    EXPECT_EQ((Lines{kNoObject, sqlError(kStale, "")}), takeLog());
-    EXPECT_EQ(-1, remove(R"({"vornSqlWhereFilter":5})"));
-    EXPECT_EQ((Lines{kFilterIsNoText, kNoConditions, sqlError(kStale, "")}), takeLog());
-    EXPECT_EQ(-1, remove("{}"));
-    EXPECT_EQ((Lines{failed("strSql.empty()"), sqlError(kStale, "")}), takeLog());
-    EXPECT_EQ(0, remove(R"({"id":9})"));
-    EXPECT_EQ(-1, remove("{}"));
-    EXPECT_EQ(Lines{failed("strSql.empty()")}, takeLog());
-}
+class DeleteBy : public RecordsTest {};
 
-TEST_F(Delete, SetsNoMessageBesideAnEarlierDuplicate)
+TEST_F(DeleteBy, ComposesOneStatementAndCounts)
 {
-    makeStaleDuplicate();
-    EXPECT_EQ(-1, remove("{}"));
-    EXPECT_EQ("", table_.api.getErrMsg());
-}
-
-TEST_F(Delete, WhatAnAccessorThrowsReachesTheHost)
-{
-    for (const char* szRequest : {R"({"flag":"x"})", R"({"flag":[{}]})", R"({"name":{}})",
-                                  R"({"id":{}})", R"({"id":[[]],"name":[{}]})"}) {
-        EXPECT_THROW(remove(szRequest, true), Json::LogicError) << szRequest;
-        EXPECT_EQ(szRequest, text(jRequest_));
-        EXPECT_EQ(Lines(), takeLog()) << szRequest;
-        EXPECT_EQ(Lines(), takeStatements()) << szRequest;
+    const struct {
+        Texts texts;
+        const char* szItems;
+        int iResult;
+        const char* szContents;
+    } cases[] = {
+        {{"Bob"}, "'Bob'", 1, "1Ann1,3O'Brien1"},
+        {{std::string("Bob\0x", 5)}, "'Bob'", 1, "1Ann1,3O'Brien1"},
+        {{"O'Brien"}, "'O''Brien'", 1, "1Ann1,2Bob0"},
+        {{"bob"}, "'bob'", 0, kBefore},
+        {{""}, "''", 0, kBefore},
+        {{"%s%n"}, "'%s%n'", 0, kBefore},
+        // Kept: nothing separates the items, so that two texts read as one.
+        {{"Ann", "Bob"}, "'Ann''Bob'", 0, kBefore},
+        {{"O", "Brien"}, "'O''Brien'", 1, "1Ann1,2Bob0"},
+    };
+    for (const auto& row : cases) {
+        const std::string strSql =
+            std::string("DELETE FROM $  WHERE  (name in (") + row.szItems + " ) );";
+        expectContents(removeByArray(row.texts, "name"), row.iResult, strSql, row.szContents);
+        if (1 == row.texts.size() && !row.texts[0].empty())
+            expectContents(removeByName(row.texts[0], "name"), row.iResult, strSql, row.szContents);
     }
-    EXPECT_EQ(1, remove(R"({"id":1})"));
-    EXPECT_EQ("2Bob0,3O'Brien1", contents());
+    Table table(database_, R"({"k":{"cpptype":"string"}})", "k text");
+    database_.run("insert into " + table.strName + " values ('a'),('a'),('b'),(''),(NULL)");
+    pTable_ = &table;
+    expectContents(removeByArray({"a"}, "k"), 2, kAnySql, "b,,NULL");
+    expectContents(removeByName("a", "k"), 2, kAnySql, "b,,NULL");
+    expectContents(removeByArray({""}, "k"), 1, kAnySql, "a,a,b,NULL");
 }
 
-TEST_F(Delete, TracesTheNumberOfRows)
+TEST_F(DeleteBy, RefusesAnEmptyListBeforeTheKey)
 {
-    for (const bool blStdout : {false, true}) {
-        blDebugOutput = true;
-        blLogToStdout = blStdout;
-        database_.run("begin");
-        EXPECT_EQ(0, remove(R"({"id":9})"));
-        EXPECT_EQ(Lines{plain("delete rec number=0")}, takeLog());
-        EXPECT_EQ(2, remove(R"({"flag":true})"));
-        EXPECT_EQ(Lines{plain("delete rec number=2")}, takeLog());
-        EXPECT_EQ(1, table_.api.recDeleteAll());
-        EXPECT_EQ(Lines{plain("delete rec number=1")}, takeLog());
-        // A failure has no such line.
-        EXPECT_EQ(-1, remove("{}"));
-        EXPECT_EQ(Lines{failed("strSql.empty()")}, takeLog());
-        database_.run("rollback");
-        blDebugOutput = false;
-        EXPECT_EQ(0, remove(R"({"id":9})"));
-        EXPECT_EQ(Lines(), takeLog());
+    for (const char* szKey : {"name", "id", "undeclared", "", static_cast<const char*>(nullptr)}) {
+        expectFailure(removeByArray({}, szKey), {failed("0 >= strVector.size()")});
+        expectFailure(removeByName("", szKey), {failed("strValue.empty()")});
     }
 }
 
-TEST_F(Delete, GivesTheCountThatSqliteReports)
+// recDeleteByName does not reach the list.
+TEST_F(DeleteBy, RefusesAKeyThatIsNoMember)
 {
-    blDebugOutput = true;
-    doubles::state().changes = [] { return 2147483647; };
-    EXPECT_EQ(2147483647, remove(R"({"id":9})"));
-    EXPECT_EQ(Lines{plain("delete rec number=2147483647")}, takeLog());
+    for (const char* szKey : {static_cast<const char*>(nullptr), "", "undeclared", "Name", " name",
+                              "vornSqlWhereFilter"}) {
+        const Lines causes = {failed(nullptr == szKey || !szKey[0] ? "!szKey || !szKey[0]"
+                                                                   : "!jType.isMember(szKey)")};
+        expectFailure(removeByName("%s%n", szKey), causes);
+        for (const Texts& texts : {Texts{"a"},
+                                   {"a", "b", "c"},
+                                   {""},
+                                   {"", ""},
+                                   {"a", "", "b"},
+                                   {"a,b", "c d"},
+                                   {"%s%n"}})
+            expectFailure(removeByArray(texts, szKey), causes);
+    }
 }
 
-TEST_F(Delete, ANegativeCountIsAFailureAlthoughTheRowIsGone)
+TEST_F(DeleteBy, RefusesAKeyOfEveryOtherWord)
 {
-    doubles::state().changes = [] { return -7; };
-    EXPECT_EQ(-1, remove(R"({"id":1})"));
-    EXPECT_EQ(refused("Unknow Error!!", statement(" WHERE  (id=1 );")), takeLog());
-    EXPECT_EQ("2Bob0,3O'Brien1", contents());
-    EXPECT_EQ(-1, table_.api.recDeleteAll());
-    EXPECT_EQ(refused("Unknow Error!!", statement(";")), takeLog());
-    EXPECT_EQ("", contents());
+    Json::Value jMembers;
+    for (const char* szWord :
+         {"int", "unsigned int", "unsigned", "long", "unsigned long", "long long",
+          "unsigned long long", "float", "double", "bool", "Json::Value", "Json::objectValue",
+          "Json::arrayValue", "uid_t", "time_t", "String", "string ", "std::string", ""})
+        jMembers["k" + std::to_string(jMembers.size())]["cpptype"] = szWord;
+    Table table(database_, text(jMembers), "k0");
+    pTable_ = &table;
+    for (const std::string& strKey : jMembers.getMemberNames()) {
+        expectFailure(removeByArray({"1", "2"}, strKey.c_str()), {kNoTextMember});
+        expectFailure(removeByName("1", strKey.c_str()), {kNoTextMember}, 1);
+    }
 }
 
-TEST_F(Delete, WaitsForALock)
+// What the look-up of missing types logs comes before every check.
+TEST_F(DeleteBy, LooksUpTheMembersFirst)
 {
-    lock(499);
-    EXPECT_EQ(3, table_.api.recDeleteAll());
-    EXPECT_EQ(Lines(500, statement(";")), takeStatements());
-    EXPECT_EQ(499U, doubles::state().sleeps.size());
-    EXPECT_EQ(Lines(), takeLog());
-}
-
-class DeleteLocked : public RecordsInFileTest {};
-
-TEST_F(DeleteLocked, GivesUpAfterEveryAttempt)
-{
-    EXPECT_EQ(-1, table_.api.recDeleteAll());
-    const std::string strSql = "DELETE FROM " + table_.strName + " ;";
-    EXPECT_EQ((Lines{runFailed("database is locked", strSql, 500), kNotRun,
-                     sqlError("database is locked", strSql)}),
-              takeLog());
-    expectEveryAttempt(strSql);
-    other("commit");
-    EXPECT_EQ("1Ann1,2Bob0,3O'Brien1", contents());
-    EXPECT_EQ(3, table_.api.recDeleteAll());
+    VORN_JSON_DB::recType(table_.jDefinition, table_.strName) = json("[1]");
+    Texts none;
+    std::string strEmpty;
+    for (const bool blByName : {false, true}) {
+        EXPECT_EQ(-1, blByName ? table_.api.recDeleteByName(strEmpty, "name")
+                               : table_.api.recDeleteByArray(none, "name"));
+        Lines lines = takeLog();
+        ASSERT_EQ(6U, lines.size());
+        EXPECT_EQ(utilFailed("jType[strJsonName].type() != Json::objectValue"), lines[0]);
+        EXPECT_EQ(failed(blByName ? "strValue.empty()" : "0 >= strVector.size()"), lines[4]);
+    }
 }
 
 }  // namespace

@@ -1,93 +1,66 @@
 // SPDX-License-Identifier: MIT
-// Fetching one record.
+// recGetOne: the statement, what is merged into the output, and every failure.
 
-#include "support/records.h"
+#include "support/record_calls.h"
 
 namespace {
 
-const std::string kNoList = failed("0 > recList(jRecParam, jRecArray)");
-const std::string kNotRun = failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)");
+class GetOne : public RecordsTest {};
 
-class GetOne : public RecordsTest {
-protected:
-    int get(const std::string& strRequest)
-    {
-        jRequest_ = json(strRequest);
-        return table_.api.recGetOne(jRequest_, jOut_);
-    }
-
-    Json::Value jRequest_;
-    Json::Value jOut_;
-};
-
+// Kept: without a LIMIT of its own.
 TEST_F(GetOne, CopiesTheFirstRow)
 {
     const struct {
         const char* szRequest;
         const char* szTail;
-        const char* szRecord;
+        char cId;
     } cases[] = {
-        {R"({"id":2})", " WHERE  (id=2 );", R"({"flag":false,"id":2,"name":"Bob"})"},
-        {R"({"id":1})", " WHERE  (id=1 );",
-         R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
-        {R"({"vornSqlWhereFilter":"id > 1"})", " WHERE  ( id > 1  );",
-         R"({"flag":false,"id":2,"name":"Bob"})"},
-        {R"({"limit":1,"offset":2})", " LIMIT 1 OFFSET 2;",
-         R"({"flag":true,"id":3,"name":"O'Brien"})"},
+        {R"({"id":2})", " WHERE  (id=2 );", '2'},
+        {R"({"id":1})", " WHERE  (id=1 );", '1'},
+        {R"({"vornSqlWhereFilter":"id > 1"})", " WHERE  ( id > 1  );", '2'},
+        {R"({"limit":1,"offset":2})", " LIMIT 1 OFFSET 2;", '3'},
         {R"({"vornSqlWhereFilter":"1) order by (id) desc limit (9"})",
-         " WHERE  ( 1) order by (id) desc limit (9  );",
-         R"({"flag":true,"id":3,"name":"O'Brien"})"},
-        {"null", ";", R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
-        {"{}", ";", R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
+         " WHERE  ( 1) order by (id) desc limit (9  );", '3'},
+        {"null", ";", '1'},
+        {"{}", ";", '1'},
     };
-    for (const auto& row : cases) {
-        jOut_ = Json::nullValue;
-        EXPECT_EQ(1, get(row.szRequest)) << row.szRequest;
-        EXPECT_EQ(row.szRecord, text(jOut_)) << row.szRequest;
-        EXPECT_EQ(row.szRequest, text(jRequest_));
-        // Kept: no LIMIT of its own.
-        EXPECT_EQ(Lines{select(row.szTail)}, takeStatements()) << row.szRequest;
-        EXPECT_EQ(Lines(), takeLog()) << row.szRequest;
-    }
+    for (const auto& row : cases)
+        for (const char* szOut : {"null", "{}"})
+            expectOutput(get(row.szRequest, szOut), 1, select(row.szTail), record(row.cId));
 }
 
 TEST_F(GetOne, ReadsEveryMatchAndDropsAllButTheFirst)
 {
-    int iRows = 0;
-    doubles::state().exec = [&](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
-                                void* arg, char** errText) {
-        const int iStatus = doubles::realExec(pDb, szSql, callback, arg, errText);
-        iRows = static_cast<int>(static_cast<Json::Value*>(arg)->size());
-        return iStatus;
+    Json::ArrayIndex nRows = 0;
+    prepare_ = [&] {
+        doubles::state().exec = [&](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
+                                    void* arg, char** errText) {
+            const int iStatus = doubles::realExec(pDb, szSql, callback, arg, errText);
+            nRows = static_cast<Json::Value*>(arg)->size();
+            return iStatus;
+        };
     };
-    EXPECT_EQ(1, get("null"));
-    EXPECT_EQ(3, iRows);
-    EXPECT_EQ(1, jOut_["id"].asInt());
+    expectOutput(get("null"), 1, select(";"), record('1'));
+    EXPECT_EQ(3U, nRows);
 }
 
 TEST_F(GetOne, LeavesTheOutputWhereNothingMatches)
 {
-    for (const char* szOut : {"null", "{}", R"({"id":7})", "[1]", R"("x")", "5", "true"}) {
-        jOut_ = json(szOut);
-        EXPECT_EQ(0, get(R"({"id":9})")) << szOut;
-        EXPECT_EQ(szOut, text(jOut_));
-        EXPECT_EQ(Lines(), takeLog()) << szOut;
-    }
+    for (const char* szOut : {"null", "{}", R"({"id":7})", "[1]", R"("x")", "5", "true"})
+        expectOutput(get(R"({"id":9})", szOut), 0, select(" WHERE  (id=9 );"), szOut);
 }
 
-TEST_F(GetOne, OverwritesMembersAndKeepsTheOthers)
+TEST_F(GetOne, OverwritesMembersAndKeepsTheOthersAndThoseThatAreNullInTheRow)
 {
-    jOut_ = json(R"({"data":{"k":5,"m":6},"flag":"mine","mine":[1],"tags":"mine"})");
-    EXPECT_EQ(1, get(R"({"id":1})"));
-    EXPECT_EQ(R"({"data":{"k":1},"flag":true,"id":1,"mine":[1],"name":"Ann","tags":[1]})",
-              text(jOut_));
-    // What is NULL in the row stays as it was.
-    EXPECT_EQ(1, get(R"({"id":2})"));
-    EXPECT_EQ(R"({"data":{"k":1},"flag":false,"id":2,"mine":[1],"name":"Bob","tags":[1]})",
-              text(jOut_));
+    const char szOut[] = R"({"data":{"k":5,"m":6},"flag":"mine","mine":[1],"tags":"mine"})";
+    expectOutput(get(R"({"id":1})", szOut), 1, select(" WHERE  (id=1 );"),
+                 R"({"data":{"k":1},"flag":true,"id":1,"mine":[1],"name":"Ann","tags":[1]})");
+    expectOutput(
+        get(R"({"id":2})", szOut), 1, select(" WHERE  (id=2 );"),
+        R"({"data":{"k":5,"m":6},"flag":false,"id":2,"mine":[1],"name":"Bob","tags":"mine"})");
 }
 
-TEST_F(GetOne, MayTakeTheRequestItselfAsTheOutput)
+TEST_F(GetOne, TakesTheRequestItselfAsTheOutput)
 {
     const struct {
         const char* szBoth;
@@ -97,8 +70,8 @@ TEST_F(GetOne, MayTakeTheRequestItselfAsTheOutput)
         {R"({"id":2,"limit":1})", 1, R"({"flag":false,"id":2,"limit":1,"name":"Bob"})"},
         {R"({"limit":1,"offset":1})", 1,
          R"({"flag":false,"id":2,"limit":1,"name":"Bob","offset":1})"},
-        {"null", 1, R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
-        {"{}", 1, R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})"},
+        {"null", 1, record('1')},
+        {"{}", 1, record('1')},
         {R"({"id":9})", 0, R"({"id":9})"},
         {R"({"tags":[]})", -1, R"({"tags":[]})"},
         {"[1]", -1, "[1]"},
@@ -112,133 +85,49 @@ TEST_F(GetOne, MayTakeTheRequestItselfAsTheOutput)
     }
 }
 
-// The record is the host's own: what becomes of it touches no later one.
+// What becomes of the record touches no later one.
 TEST_F(GetOne, GivesARecordOfItsOwn)
 {
-    EXPECT_EQ(1, get(R"({"id":2})"));
-    Json::Value jFirst = jOut_;
+    Json::Value jRequest = json(R"({"id":2})");
+    Json::Value jFirst;
+    EXPECT_EQ(1, table_.api.recGetOne(jRequest, jFirst));
     jFirst["name"] = "changed";
     jFirst.removeMember("flag");
     jFirst["new"] = 1;
-    jOut_ = Json::nullValue;
-    EXPECT_EQ(1, get(R"({"id":2})"));
-    EXPECT_EQ(R"({"flag":false,"id":2,"name":"Bob"})", text(jOut_));
+    takeStatements();
+    expectOutput(get(R"({"id":2})"), 1, select(" WHERE  (id=2 );"), record('2'));
     EXPECT_EQ(R"({"id":2,"name":"changed","new":1})", text(jFirst));
 }
 
-TEST_F(GetOne, ARowOfNullsLeavesANullOutput)
+TEST_F(GetOne, LeavesTheOutputAloneForARowOfNulls)
 {
     Table table(database_, R"({"a":{"cpptype":"string"}})", "a");
+    pTable_ = &table;
     database_.run("insert into " + table.strName + " values (NULL)");
-    EXPECT_EQ(1, table.api.recGetOne(jRequest_, jOut_));
-    EXPECT_TRUE(jOut_.isNull());
-    jOut_ = json(R"({"mine":1})");
-    EXPECT_EQ(1, table.api.recGetOne(jRequest_, jOut_));
-    EXPECT_EQ(R"({"mine":1})", text(jOut_));
-
-    // The rows behind it make no difference.
+    for (const char* szOut : {"null", R"({"mine":1})"})
+        expectOutput(get("null", szOut), 1, "SELECT a FROM $ ;", szOut);
     database_.run("insert into " + table.strName + " values ('x')");
-    jOut_ = Json::nullValue;
-    EXPECT_EQ(1, table.api.recGetOne(jRequest_, jOut_));
-    EXPECT_TRUE(jOut_.isNull());
+    expectOutput(get("null"), 1, "SELECT a FROM $ ;", "null");
 }
 
 TEST_F(GetOne, RefusesAnOutputOfAnotherKindAfterTheListing)
 {
-    for (const char* szOut : {R"("x")", "[1]", "[]", "5", "1.5", "true"}) {
-        jOut_ = json(szOut);
-        EXPECT_EQ(-1, get(R"({"id":2})")) << szOut;
-        EXPECT_EQ(szOut, text(jOut_));
-        EXPECT_EQ(Lines{select(" WHERE  (id=2 );")}, takeStatements()) << szOut;
-        EXPECT_EQ(
-            (Lines{utilFailed("jIn.type() != Json::nullValue && jIn.type() != Json::objectValue"),
-                   failed("0 > jsonCopyMember(jRecOut, jRecArray[0], true)")}),
-            takeLog());
-    }
+    Outcome outcome{-1, select(" WHERE  (id=2 );")};
+    outcome.causes = {
+        utilFailed("jIn.type() != Json::nullValue && jIn.type() != Json::objectValue"),
+        failed("0 > jsonCopyMember(jRecOut, jRecArray[0], true)")};
+    for (const char* szOut : {R"("x")", "[1]", "[]", "5", "1.5", "true"})
+        expect(get(R"({"id":2})", szOut), outcome);
 }
 
-TEST_F(GetOne, RefusesARequestOfAnotherKind)
+TEST_F(GetOne, FailsWhereTheListingDoes)
 {
-    jOut_ = json(R"({"id":7})");
-    for (const char* szRequest : {R"("x")", "[]", "[1]", "5", "true"}) {
-        EXPECT_EQ(-1, get(szRequest)) << szRequest;
-        EXPECT_EQ((Lines{kNoObjectOrNull, plain(std::string("jRecParam=") + szRequest), kNoList}),
-                  takeLog());
-        EXPECT_EQ(R"({"id":7})", text(jOut_));
-    }
-    EXPECT_EQ(Lines(), takeStatements());
-}
-
-TEST_F(GetOne, LogsTheLinesOfTheListingFirst)
-{
-    jOut_ = json(R"({"id":7})");
-    EXPECT_EQ(-1, get(R"({"tags":[]})"));
-    const std::string strSql = select(" WHERE  ( );");
-    EXPECT_EQ(
-        (Lines{runFailed(kNearParenthesis, strSql), kNotRun, plain(R"(jRecParam={"tags":[]})"),
-               sqlError(kNearParenthesis, strSql), kNoList}),
-        takeLog());
-    // The text stays for the next failure.
-    EXPECT_EQ(-1, get("[1]"));
-    EXPECT_EQ(
-        (Lines{kNoObjectOrNull, plain("jRecParam=[1]"), sqlError(kNearParenthesis, ""), kNoList}),
-        takeLog());
-    EXPECT_EQ(R"({"id":7})", text(jOut_));
-}
-
-TEST_F(GetOne, FailsWhereALaterRowIsBad)
-{
-    Table table(database_, R"({"id":{"cpptype":"int"},"real":{"cpptype":"double"}})",
-                "id integer primary key, real real");
-    database_.run("insert into " + table.strName + " values (1,NULL),(2,2.5)");
-    EXPECT_EQ(-1, table.api.recGetOne(jRequest_, jOut_));
-    EXPECT_TRUE(jOut_.isNull());
-    const Lines lines = takeLog();
-    ASSERT_EQ(10U, lines.size());
-    EXPECT_EQ(error("type error, strType=double"), lines.front());
-    EXPECT_EQ(kNoList, lines.back());
-
-    jRequest_["limit"] = 1;
-    EXPECT_EQ(1, table.api.recGetOne(jRequest_, jOut_));
-    EXPECT_EQ(R"({"id":1})", text(jOut_));
-}
-
-TEST_F(GetOne, WhatAnAccessorThrowsReachesTheHost)
-{
-    jOut_ = json(R"({"id":7})");
-    for (const char* szRequest : {R"({"sort_by":5})", R"({"flag":"x"})", R"({"name":{}})"}) {
-        EXPECT_THROW(get(szRequest), Json::LogicError) << szRequest;
-        EXPECT_EQ(szRequest, text(jRequest_));
-        EXPECT_EQ(R"({"id":7})", text(jOut_));
-        EXPECT_EQ(Lines(), takeLog());
-        EXPECT_EQ(Lines(), takeStatements());
-    }
-    EXPECT_EQ(1, get(R"({"id":2})"));
-}
-
-TEST_F(GetOne, WaitsForALockAndTakesTheFirstRowOfAll)
-{
-    lock(3);
-    EXPECT_EQ(1, get(R"({"id":3})"));
-    EXPECT_EQ("O'Brien", jOut_["name"].asString());
-    EXPECT_EQ(4U, takeStatements().size());
-    EXPECT_EQ(3U, doubles::state().sleeps.size());
-    EXPECT_EQ(Lines(), takeLog());
-}
-
-class GetOneLocked : public RecordsInFileTest {};
-
-TEST_F(GetOneLocked, GivesUpAfterEveryAttempt)
-{
-    Json::Value jRequest;
-    Json::Value jOut = "mine";
-    EXPECT_EQ(-1, table_.api.recGetOne(jRequest, jOut));
-    EXPECT_EQ(
-        (Lines{runFailed("database is locked", select(";"), 500), kNotRun, plain("jRecParam=null"),
-               sqlError("database is locked", select(";")), kNoList}),
-        takeLog());
-    expectEveryAttempt(select(";"));
-    EXPECT_EQ("mine", jOut.asString());
+    for (const char* szRequest : {R"("x")", "[]", "[1]", "5", "true"})
+        expectFailure(get(szRequest, R"({"id":7})"), {kNoObjectOrNull}, 0);
+    expectSqlFailure(get(R"({"tags":[]})", R"({"id":7})"), select(" WHERE  ( );"),
+                     kNearParenthesis);
+    for (const char* szRequest : {R"({"sort_by":5})", R"({"flag":"x"})", R"({"name":{}})"})
+        expectThrow(get(szRequest, R"({"id":7})"));
 }
 
 }  // namespace

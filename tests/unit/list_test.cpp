@@ -1,27 +1,15 @@
 // SPDX-License-Identifier: MIT
-// Listing: the composed statement, what is appended, wrong kinds and exceptions.
+// recList: the composed statement, what is appended, and every failure.
 
-#include "support/records.h"
+#include "support/record_calls.h"
 
 namespace {
 
-class List : public RecordsTest {
-protected:
-    int list(const std::string& strRequest, Json::Value& jArray)
-    {
-        Json::Value jRequest = json(strRequest);
-        const int iResult = table_.api.recList(jRequest, jArray);
-        EXPECT_EQ(json(strRequest), jRequest) << "the request was changed";
-        return iResult;
-    }
+const std::string kNoArray =
+    failed("jRecArrayOut.type() != Json::nullValue && jRecArrayOut.type() != Json::arrayValue");
+const std::string kNoPaging = failed("0 > SqlFilterConditionFromJson(jRecParam, strSqlLimit)");
 
-    static std::string ids(const Json::Value& jArray)
-    {
-        std::string strIds;
-        for (const Json::Value& jRecord : jArray) strIds += jRecord["id"].asString();
-        return strIds;
-    }
-};
+class List : public RecordsTest {};
 
 TEST_F(List, ComposesOneStatement)
 {
@@ -55,7 +43,9 @@ TEST_F(List, ComposesOneStatement)
         {R"({"limit":-1,"offset":2})", " LIMIT -1 OFFSET 2;", "3"},
         {R"({"offset":1})", ";", "123"},
         {R"({"sort_direction":"desc"})", ";", "123"},
+        {R"({"sort_direction":{}})", ";", "123"},
         {R"({"sort_by":"name"})", " order by 'name';", "123"},
+        {R"({"sort_by":"id","sort_direction":null})", " order by 'id' ASC;", "123"},
         // Kept: the key is a text literal, so the rows keep their order.
         {R"({"sort_by":"id","sort_direction":"desc"})", " order by 'id' DESC;", "123"},
         {R"({"sort_by":"a'b","sort_direction":"DESC"})", " order by 'a''b' ASC;", "123"},
@@ -63,136 +53,114 @@ TEST_F(List, ComposesOneStatement)
          " WHERE  (flag=1 ) order by 'id' ASC LIMIT 1 OFFSET 1;", "3"},
         {R"({"id":2,"vornSqlWhereFilter":"1) or (1"})", " WHERE  (id=2 and  1) or (1  );", "123"},
     };
-    for (const auto& row : cases) {
-        Json::Value jArray;
-        EXPECT_EQ(0, list(row.szRequest, jArray)) << row.szRequest;
-        EXPECT_EQ(std::vector<std::string>{select(row.szTail)}, takeStatements()) << row.szRequest;
-        EXPECT_EQ(row.szIds, ids(jArray)) << row.szRequest;
-        EXPECT_EQ(Lines(), takeLog()) << row.szRequest;
-    }
-}
-
-TEST_F(List, GivesEveryDeclaredMemberThatIsNotNull)
-{
-    Json::Value jArray;
-    EXPECT_EQ(0, list("null", jArray));
-    EXPECT_EQ(json(R"([{"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]},
-                       {"flag":false,"id":2,"name":"Bob"},
-                       {"flag":true,"id":3,"name":"O'Brien"}])"),
-              jArray);
-}
-
-TEST_F(List, ARowOfNullsIsAnEmptyRecord)
-{
-    Table table(database_, R"({"a":{"cpptype":"string"},"b":{"cpptype":"double"}})", "a, b");
-    database_.run("insert into " + table.strName + " values (NULL,NULL)");
-    Json::Value jRequest;
-    Json::Value jArray;
-    EXPECT_EQ(0, table.api.recList(jRequest, jArray));
-    EXPECT_EQ("[{}]", text(jArray));
-    EXPECT_EQ(Lines(), takeLog());
+    for (const auto& row : cases)
+        expectOutput(list(row.szRequest), 0, select(row.szTail), listed(row.szIds));
 }
 
 TEST_F(List, ADeclaredMemberOffsetIsConditionAndPagingAtOnce)
 {
     Table table(database_, R"({"offset":{"cpptype":"int"}})", "offset integer");
+    pTable_ = &table;
     database_.run("insert into " + table.strName + " values (1),(1),(2)");
-    Json::Value jRequest = json(R"({"offset":1})");
-    Json::Value jArray;
-    EXPECT_EQ(0, table.api.recList(jRequest, jArray));
-    EXPECT_EQ(R"([{"offset":1},{"offset":1}])", text(jArray));
-    jRequest["limit"] = 5;
-    EXPECT_EQ(0, table.api.recList(jRequest, jArray));
-    EXPECT_EQ(R"([{"offset":1},{"offset":1},{"offset":1}])", text(jArray));
-    EXPECT_EQ(
-        (std::vector<std::string>{
-            "SELECT offset FROM " + table.strName + "  WHERE  (offset=1 );",
-            "SELECT offset FROM " + table.strName + "  WHERE  (offset=1 ) LIMIT 5 OFFSET 1;"}),
-        takeStatements());
-    EXPECT_EQ(Lines(), takeLog());
+    expectOutput(list(R"({"offset":1})"), 0, "SELECT offset FROM $  WHERE  (offset=1 );",
+                 R"([7,{"offset":1},{"offset":1}])");
+    expectOutput(list(R"({"limit":5,"offset":1})"), 0,
+                 "SELECT offset FROM $  WHERE  (offset=1 ) LIMIT 5 OFFSET 1;",
+                 R"([7,{"offset":1}])");
 }
 
-TEST_F(List, AppendsAndNeverClears)
+TEST_F(List, MakesAnArrayOfNullWithTheFirstRow)
 {
-    Json::Value jArray = json(R"(["mine"])");
-    EXPECT_EQ(0, list(R"({"id":2})", jArray));
-    EXPECT_EQ(0, list(R"({"id":9})", jArray));
-    EXPECT_EQ(0, list(R"({"id":2})", jArray));
-    EXPECT_EQ(json(R"(["mine",{"flag":false,"id":2,"name":"Bob"},
-                       {"flag":false,"id":2,"name":"Bob"}])"),
-              jArray);
+    expectOutput(list(R"({"id":9})", "null"), 0, select(" WHERE  (id=9 );"), "null");
+    expectOutput(list(R"({"id":9})", "[]"), 0, select(" WHERE  (id=9 );"), "[]");
+    expectOutput(list(R"({"id":2})", "null"), 0, select(" WHERE  (id=2 );"),
+                 std::string("[") + record('2') + "]");
 }
 
-TEST_F(List, ANullArrayBecomesOneWithTheFirstRow)
-{
-    Json::Value jArray;
-    EXPECT_EQ(0, list(R"({"id":9})", jArray));
-    EXPECT_TRUE(jArray.isNull());
-    EXPECT_EQ(0, list(R"({"id":2})", jArray));
-    EXPECT_TRUE(jArray.isArray());
-    EXPECT_EQ(1U, jArray.size());
-
-    Json::Value jEmptyArray(Json::arrayValue);
-    EXPECT_EQ(0, list(R"({"id":9})", jEmptyArray));
-    EXPECT_EQ("[]", text(jEmptyArray));
-}
-
-TEST_F(List, RefusesARequestOfAnotherKind)
+TEST_F(List, RefusesARequestOfAnotherKindBeforeTheArray)
 {
     for (const char* szRequest :
-         {R"("x")", R"("")", "[]", "[1]", R"([{"id":1}])", "5", "0", "1.5", "true", "false"}) {
-        Json::Value jArray = json("[7]");
-        EXPECT_EQ(-1, list(szRequest, jArray)) << szRequest;
-        EXPECT_EQ("[7]", text(jArray)) << szRequest;
-        EXPECT_EQ((Lines{kNoObjectOrNull, plain(std::string("jRecParam=") + szRequest)}),
-                  takeLog());
-    }
-    EXPECT_EQ(Lines(), takeStatements());
+         {R"("x")", R"("")", "[]", "[1]", R"([{"id":1}])", "5", "0", "1.5", "true", "false"})
+        for (const char* szArray : {"[7]", "{}"})
+            expectFailure(list(szRequest, szArray), {kNoObjectOrNull});
 }
 
-TEST_F(List, RefusesAnArrayOfAnotherKind)
+TEST_F(List, RefusesAnArrayOfAnotherKindBeforeWhatTheRequestHolds)
 {
-    // The array is looked at after the request's kind and before what the request holds.
-    const std::string strRequest = R"({"sort_by":5,"vornSqlWhereFilter":5})";
-    for (const char* szArray : {R"("x")", "{}", R"({"id":1})", "5", "1.5", "true", "false"}) {
-        Json::Value jArray = json(szArray);
-        EXPECT_EQ(-1, list(strRequest, jArray)) << szArray;
-        EXPECT_EQ(json(szArray), jArray) << szArray;
-        EXPECT_EQ((Lines{failed("jRecArrayOut.type() != Json::nullValue && "
-                                "jRecArrayOut.type() != Json::arrayValue"),
-                         plain("jRecParam=" + strRequest)}),
-                  takeLog());
-        EXPECT_EQ(-1, list("[1]", jArray)) << szArray;
-        EXPECT_EQ((Lines{kNoObjectOrNull, plain("jRecParam=[1]")}), takeLog());
-    }
-    EXPECT_EQ(Lines(), takeStatements());
+    for (const char* szArray : {R"("x")", "{}", R"({"id":1})", "5", "1.5", "true", "false"})
+        expectFailure(list(R"({"sort_by":5,"vornSqlWhereFilter":5})", szArray), {kNoArray});
 }
 
-TEST_F(List, WhatAnAccessorThrowsReachesTheHost)
+TEST_F(List, PassesOnWhatAnAccessorThrows)
 {
     for (const char* szRequest :
          {R"({"sort_by":5})", R"({"sort_by":null})", R"({"sort_by":{}})", R"({"sort_by":["id"]})",
           R"({"sort_by":"id","sort_direction":[]})", R"({"sort_by":"id","sort_direction":{}})",
           R"({"flag":"x"})", R"({"flag":{}})", R"({"flag":1e10})", R"({"name":{}})",
-          R"({"name":[{}]})", R"({"id":{}})", R"({"id":[[1]]})"}) {
-        Json::Value jArray = json("[7]");
-        EXPECT_THROW(list(szRequest, jArray), Json::LogicError) << szRequest;
-        EXPECT_EQ("[7]", text(jArray)) << szRequest;
-        EXPECT_EQ(Lines(), takeLog()) << szRequest;
-        EXPECT_EQ(Lines(), takeStatements()) << szRequest;
-        EXPECT_EQ(0, list(R"({"id":2})", jArray)) << szRequest;
-        EXPECT_EQ(2U, jArray.size()) << szRequest;
-        takeStatements();
-    }
+          R"({"name":[{}]})", R"({"id":{}})", R"({"id":[[1]]})"})
+        expectThrow(list(szRequest));
 }
 
-TEST_F(List, ReadsADirectionOnlyWithAKey)
+TEST_F(List, RefusesARawFilterOfAnotherKindBeforeThePaging)
 {
-    Json::Value jArray;
-    EXPECT_EQ(0, list(R"({"sort_direction":{}})", jArray));
-    EXPECT_EQ(0, list(R"({"sort_by":"id","sort_direction":null})", jArray));
-    EXPECT_EQ((Lines{select(";"), select(" order by 'id' ASC;")}), takeStatements());
-    EXPECT_EQ(6U, jArray.size());
+    for (const char* szFilter : {"5", "null", "true", "1.5", "[]", R"(["id=1"])", "{}"})
+        expectFailure(list(std::string(R"({"sort_by":5,"vornSqlWhereFilter":)") + szFilter + "}"),
+                      {kFilterIsNoText, kNoRequestConditions});
+}
+
+TEST_F(List, FailsWhereMemoryRunsOut)
+{
+    prepare_ = [] { doubles::state().iFailMprintf = 1; };
+    expectFailure(list(R"({"name":"Ann"})"), kNoMemoryForText + Lines{kNoRequestConditions});
+    expectFailure(list(R"({"name":["Ann"]})"), kNoMemoryForItem + Lines{kNoRequestConditions});
+    expectFailure(list(R"({"sort_by":"id"})"), {failed("!szSql"), kNoPaging});
+    prepare_ = [] { doubles::state().iFailMprintf = 2; };
+    expectFailure(list(R"({"name":"Ann","sort_by":"id"})"), {failed("!szSql"), kNoPaging});
+}
+
+TEST_F(List, FailsWhereSqliteRefuses)
+{
+    const struct {
+        const char* szRequest;
+        const char* szTail;
+        const char* szError;
+    } cases[] = {
+        {R"({"tags":[]})", " WHERE  ( );", kNearParenthesis},
+        {R"({"name":"x","tags":[]})", " WHERE  (name='x' and  );", kNearParenthesis},
+        {R"({"vornSqlWhereFilter":""})", " WHERE  (   );", kNearParenthesis},
+        {R"({"vornSqlWhereFilter":"absent = 1"})", " WHERE  ( absent = 1  );",
+         "no such column: absent"},
+        {R"({"id":""})", " WHERE  (id= );", kNearParenthesis},
+        {R"({"limit":null})", " LIMIT null;", "datatype mismatch"},
+        {R"({"limit":1.5})", " LIMIT 1.5;", "datatype mismatch"},
+        {R"({"limit":[]})", " LIMIT [];", "no such column: "},
+        {R"({"limit":1,"offset":{}})", " LIMIT 1 OFFSET {};", R"(unrecognized token: "{")"},
+    };
+    for (const auto& row : cases)
+        expectSqlFailure(list(row.szRequest), select(row.szTail), row.szError);
+}
+
+// Rows with NULL in a member of a word that no row is read through are records.
+TEST_F(List, KeepsTheRowsBeforeTheBadOne)
+{
+    Table table(database_, R"({"id":{"cpptype":"int"},"real":{"cpptype":"double"}})", "id, real");
+    pTable_ = &table;
+    database_.run("insert into " + table.strName + " values (NULL,NULL),(1,NULL),(2,2.5)");
+    const std::string strError = sqlite3_errstr(SQLITE_ABORT);
+    const Lines causes = {
+        error("type error, strType=double"),
+        failed("0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))"),
+        plain("column_name[1]=real"), plain("column_value[1]=2.5"),
+        failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)")};
+    const std::string strSelect = "SELECT id,real FROM $ ";
+    expect(list("null", "[7]"),
+           {-1, strSelect + ";", R"([7,{},{"id":1}])", nullptr, strError, causes, 0});
+    expect(list("null", "null"),
+           {-1, strSelect + ";", R"([{},{"id":1}])", nullptr, strError, causes, 0});
+    expectSqlFailure(list(R"({"id":2})", "null"), strSelect + " WHERE  (id=2 );", strError, causes);
+    expectSqlFailure(get("null"), strSelect + ";", strError, causes);
+    expectOutput(get(R"({"limit":1,"offset":1})"), 1, strSelect + " LIMIT 1 OFFSET 1;",
+                 R"({"id":1})");
 }
 
 }  // namespace

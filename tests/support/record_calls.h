@@ -1,0 +1,158 @@
+// SPDX-License-Identifier: MIT
+// A table of three records, the calls of the record operations, and all that has to come of a call.
+#pragma once
+
+#include "support/database.h"
+#include "support/records.h"
+
+#include <functional>
+#include <string>
+#include <vector>
+
+class RecordsTest : public HostTest {
+protected:
+    static constexpr char kBefore[] = "1Ann1,2Bob0,3O'Brien1";
+    static constexpr char kAnySql[] = "*";
+    // The level of an operation itself, above those of the operations that it calls.
+    static constexpr std::size_t kOutermost = static_cast<std::size_t>(-1);
+    static constexpr int kThrows = -99;
+
+    // A call of one operation.
+    struct Call {
+        std::string strName;
+        // The second argument is the output, where there is one, and strOut its text before.
+        std::function<int(VornJsonDbApi&, Json::Value&)> run;
+        // How its log ends when it fails: for each level, the innermost first, the check of what
+        // the level below gives (the first: of what SQLite gives) and the lines that follow any
+        // check.
+        std::vector<Lines> levels;
+        std::string strOut = "null";
+        bool blTellsDuplicate = false;
+        bool blTracesCount = false;
+    };
+
+    // The statement of a save: strValues ends in ") " where the list closes.
+    static std::string saved(bool blCreate, const std::string& strColumns,
+                             const std::string& strValues)
+    {
+        return (blCreate ? "INSERT" : "REPLACE") + (" INTO $ (" + strColumns) + ") VALUES (" +
+               strValues + ";select * from $ where rowid == last_insert_rowid();";
+    }
+
+    // What every listing begins with.
+    static std::string select(const std::string& strTail)
+    {
+        return "SELECT data,flag,id,name,tags FROM $ " + strTail;
+    }
+
+    static Call save(const std::string& strRecord, bool blCreate);
+    // strFilled is the record with its defaults.
+    static Call create(const std::string& strRecord, const std::string& strFilled = "");
+    static Call list(const std::string& strRequest, const std::string& strArray = "[7]");
+    static Call get(const std::string& strRequest, const std::string& strOut = "null");
+    static Call updateByWhere(const std::string& strRecord, const std::string& strWhere);
+    static Call updateByFilter(const std::string& strFilter, const std::string& strValues);
+    static Call remove(const std::string& strRequest, bool blDeleteAll = false);
+    static Call removeAll();
+    static Call removeByArray(const std::vector<std::string>& texts, const char* szKey);
+    static Call removeByName(const std::string& strValue, const char* szKey);
+
+    // What comes of a call; "$" is the name of the table, "$types" are its member types.
+    struct Outcome {
+        int iResult = -1;
+        std::string strSql = "";           // the statement that is run; empty for none
+        const char* szOut = nullptr;       // the output; null where it is left alone
+        const char* szContents = nullptr;  // see contents(); null where they are not looked at
+        std::string strError = "";         // of the statement
+        Lines causes = {};                 // the lines before those of the failed level
+        std::size_t nLevel = kOutermost;
+        std::string strComposed = "";  // of a statement that is not run, as a line shows it
+    };
+
+    // Makes the call in a transaction that is rolled back, once for each kind of earlier error text
+    // that the handle may hold, with debug lines and on standard output as well, and checks the
+    // result, the output, the arguments, the statements, the whole log, the message, the error text
+    // that the handle holds afterwards, and that a failure leaves the table alone (but for
+    // blWritten_).
+    void expect(const Call& call, const Outcome& outcome);
+
+    // expect() for a call that gives an output, one that changes the table, one that fails without
+    // SQL, one that fails after its statement (strError is empty where SQLite took it), and one
+    // that passes on the exception of an accessor.
+    void expectOutput(const Call& call, int iResult, const std::string& strSql,
+                      const std::string& strOut)
+    {
+        expect(call, {iResult, strSql, strOut.c_str()});
+    }
+    void expectContents(const Call& call, int iResult, const std::string& strSql,
+                        const std::string& strContents)
+    {
+        expect(call, {iResult, strSql, nullptr, strContents.c_str()});
+    }
+    void expectFailure(const Call& call, const Lines& causes, std::size_t nLevel = kOutermost,
+                       const std::string& strComposed = "")
+    {
+        expect(call, {-1, "", nullptr, nullptr, "", causes, nLevel, strComposed});
+    }
+    void expectSqlFailure(const Call& call, const std::string& strSql, const std::string& strError,
+                          const Lines& causes = {})
+    {
+        expect(call, {-1, strSql, nullptr, nullptr, strError, causes, 0});
+    }
+    void expectThrow(const Call& call) { expect(call, {kThrows}); }
+
+    // "1Ann1,2Bob0,3O'Brien1", or all columns of another table.
+    std::string contents();
+
+    // What one record of the table looks like, and the array [7] with the records of these ids.
+    static const char* record(char cId);
+    static std::string listed(const std::string& strIds);
+
+    // The statement finds the database locked nAttempts times.
+    void lock(std::size_t nAttempts);
+
+    Database database_;
+    Table table_{database_,
+                 R"({"data":{"cpptype":"Json::objectValue"},"flag":{"cpptype":"bool"},
+                     "id":{"cpptype":"int"},"name":{"cpptype":"string"},
+                     "tags":{"cpptype":"Json::arrayValue"}})",
+                 "id integer primary key, name text unique, flag integer, data text, tags text"};
+    // The table that calls work on.
+    Table* pTable_ = &table_;
+    // Runs just before the call, to set the doubles.
+    std::function<void()> prepare_ = [] {};
+    // The retries of the statement.
+    std::size_t nRetries_ = 0;
+    // Whether calls that fail change the table all the same.
+    bool blWritten_ = false;
+
+    RecordsTest();
+
+private:
+    std::string in(std::string strText);
+    Lines in(Lines lines);
+    Rows rows();
+    void hold(const std::string& strError);
+    Lines expectedLog(const Call& call, const Outcome& outcome, const std::string& strHeld);
+    void expectOnce(const Call& call, const Outcome& outcome, const std::string& strEarlier);
+};
+
+// Checks that several operations have in common.
+inline const std::string kNoObjectOrNull =
+    failed("jRecParam.type() != Json::objectValue && jRecParam.type() != Json::nullValue");
+inline const std::string kFilterIsNoText = failed("!jRecParam[jmFieldName[i]].isString()");
+inline const std::string kNoRequestConditions =
+    failed("0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND)");
+// The lines of a text, and of an item of a list, that find no memory.
+inline const Lines kNoMemoryForText = {
+    failed(R"(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))"),
+    failed("0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut)")};
+inline const Lines kNoMemoryForItem = {
+    failed(R"(NULL == (szSql = sqlite3_mprintf("%q", jList[i].asString().c_str())))"),
+    failed("0 > SqlMakeByListField(jmFieldName[i].c_str(), jTmp, strSqlWhereOut)")};
+
+inline Lines operator+(Lines lines, const Lines& more)
+{
+    lines.insert(lines.end(), more.begin(), more.end());
+    return lines;
+}

@@ -1,0 +1,173 @@
+// SPDX-License-Identifier: MIT
+#include "support/record_calls.h"
+#include "support/rows.h"
+
+#include <algorithm>
+
+RecordsTest::RecordsTest()
+{
+    database_.run("insert into " + table_.strName + " values (1,'Ann',1,'{\"k\":1}','[1]')," +
+                  "(2,'Bob',0,NULL,NULL),(3,'O''Brien',1,NULL,NULL)");
+}
+
+const char* RecordsTest::record(char cId)
+{
+    if ('1' == cId) return R"({"data":{"k":1},"flag":true,"id":1,"name":"Ann","tags":[1]})";
+    return '2' == cId ? R"({"flag":false,"id":2,"name":"Bob"})"
+                      : R"({"flag":true,"id":3,"name":"O'Brien"})";
+}
+
+std::string RecordsTest::listed(const std::string& strIds)
+{
+    std::string strArray = "[7";
+    for (const char cId : strIds) strArray.append(",").append(record(cId));
+    return strArray + "]";
+}
+
+void RecordsTest::lock(std::size_t nAttempts)
+{
+    nRetries_ = nAttempts;
+    prepare_ = [nAttempts] {
+        doubles::state().exec = [nLeft = nAttempts](sqlite3* pDb, const char* szSql,
+                                                    doubles::RowCallback callback, void* arg,
+                                                    char** errText) mutable {
+            if (0 == nLeft) return doubles::realExec(pDb, szSql, callback, arg, errText);
+            --nLeft;
+            *errText = doubles::errorText("database is locked");
+            return SQLITE_BUSY;
+        };
+    };
+}
+
+std::string RecordsTest::in(std::string strText)
+{
+    const std::size_t i = strText.find('$');
+    if (std::string::npos == i) return strText;
+    if (0 != strText.compare(i, 6, "$types")) return in(strText.replace(i, 1, pTable_->strName));
+    const Json::Value& jTypes = VORN_JSON_DB::recType(pTable_->jDefinition, pTable_->strName);
+    return in(strText.replace(i, 6, text(jTypes)));
+}
+
+Lines RecordsTest::in(Lines lines)
+{
+    for (std::string& strLine : lines) strLine = in(strLine);
+    return lines;
+}
+
+Rows RecordsTest::rows()
+{
+    return database_.rows(in("select * from $"));
+}
+
+std::string RecordsTest::contents()
+{
+    std::string strContents;
+    for (std::vector<std::string> row : rows()) {
+        if (pTable_ == &table_) row.resize(3);
+        strContents += strContents.empty() ? "" : ",";
+        for (const std::string& strValue : row) strContents += strValue;
+    }
+    return strContents;
+}
+
+// Makes the handle hold that error text, or none.
+void RecordsTest::hold(const std::string& strError)
+{
+    doubles::state().exec = strError.empty() ? execOfStatus(SQLITE_OK, nullptr)
+                                             : execOfStatus(SQLITE_ERROR, strError.c_str());
+    pTable_->api.runSqlEx("an earlier statement");
+    doubles::reset();
+}
+
+Lines RecordsTest::expectedLog(const Call& call, const Outcome& outcome, const std::string& strHeld)
+{
+    Lines lines;
+    for (std::size_t i = 0; blDebugOutput && i < nRetries_; ++i)
+        lines.push_back(plain("retry, i=" + std::to_string(i) + ", errno=?, run sql failed, " +
+                              "error=database is locked, sql=" + outcome.strSql));
+    if (-1 != outcome.iResult) {
+        if (call.blTracesCount && blDebugOutput && 0 <= outcome.iResult)
+            lines.push_back(plain("delete rec number=" + std::to_string(outcome.iResult)));
+        return lines;
+    }
+    lines = lines + outcome.causes;
+    if (!outcome.strError.empty()) {
+        lines.push_back(runFailed(strHeld, outcome.strSql, static_cast<int>(nRetries_)));
+        if (blDebugOutput)
+            lines.push_back(
+                plain("run sql fail, err=" + ("Unknow Error!!" == strHeld ? "(null)" : strHeld)));
+        lines.push_back(call.levels[0][0]);
+    }
+    const std::size_t nLevel = std::min(outcome.nLevel, call.levels.size() - 1);
+    lines = lines + Lines(call.levels[nLevel].begin() + 1, call.levels[nLevel].end());
+    if (0 == nLevel && !strHeld.empty())
+        lines.push_back(sqlError(strHeld, outcome.strSql + outcome.strComposed));
+    for (std::size_t i = nLevel + 1; i < call.levels.size(); ++i) lines = lines + call.levels[i];
+    return lines;
+}
+
+void RecordsTest::expectOnce(const Call& call, const Outcome& outcome,
+                             const std::string& strEarlier)
+{
+    VornJsonDbApi& api = pTable_->api;
+    const Rows before = rows();
+    Json::Value jOut = json(call.strOut);
+    int iResult = kThrows;
+    hold(strEarlier);
+    api.setErrMsg("the host's");
+    prepare_();
+    try {
+        iResult = call.run(api, jOut);
+    } catch (const Json::LogicError&) {
+    }
+    const Lines log = takeLog();
+    const Lines statements = takeStatements();
+    const std::vector<unsigned> sleeps = doubles::state().sleeps;
+    doubles::reset();
+
+    const std::string strHeld = in(outcome.strSql.empty() ? strEarlier : outcome.strError);
+    EXPECT_EQ(outcome.iResult, iResult);
+    EXPECT_EQ(in(expectedLog(call, outcome, strHeld)), log);
+    EXPECT_EQ(text(json(nullptr == outcome.szOut ? call.strOut : outcome.szOut)), text(jOut));
+    EXPECT_EQ(outcome.strSql.empty() ? 0 : std::min<std::size_t>(nRetries_ + 1, 500),
+              statements.size());
+    EXPECT_EQ(std::vector<unsigned>(nRetries_, 10000), sleeps);
+    for (const std::string& strSql : statements)
+        EXPECT_EQ(kAnySql == outcome.strSql ? strSql : in(outcome.strSql), strSql);
+    const bool blDuplicate = std::string::npos != strHeld.find("UNIQUE constraint failed");
+    EXPECT_EQ(-1 == iResult && call.blTellsDuplicate && blDuplicate ? "DUPLICATE_PRIMARY_KEY"
+                                                                    : "the host's",
+              api.getErrMsg());
+    const std::string strContents = contents();
+    EXPECT_EQ(nullptr == outcome.szContents ? strContents : outcome.szContents, strContents);
+    if (0 > outcome.iResult) {
+        EXPECT_EQ(blWritten_, before != rows()) << "whether the table was changed";
+    }
+
+    // The error text that it holds now, as a request of a wrong kind shows it.
+    Json::Value jNoRequest;
+    EXPECT_EQ(-1, api.recDelete(jNoRequest));
+    Lines held{failed("jRecParam.type() != Json::objectValue")};
+    if (!strHeld.empty()) held.push_back(sqlError(strHeld, ""));
+    EXPECT_EQ(held, takeLog());
+}
+
+void RecordsTest::expect(const Call& call, const Outcome& outcome)
+{
+    const struct {
+        const char* szEarlier;  // what the handle holds from an earlier call
+        bool blDebug;
+        bool blStdout;
+    } hosts[] = {{"", false, false},
+                 {"an earlier error", true, false},
+                 {"UNIQUE constraint failed: an earlier one", false, true}};
+    for (const auto& host : hosts) {
+        SCOPED_TRACE(call.strName + "; held before: " + host.szEarlier);
+        blDebugOutput = host.blDebug;
+        blLogToStdout = host.blStdout;
+        database_.run("begin");
+        expectOnce(call, outcome, host.szEarlier);
+        database_.run("rollback");
+    }
+    blDebugOutput = blLogToStdout = false;
+}
