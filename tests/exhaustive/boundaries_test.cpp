@@ -2,14 +2,14 @@
 // The bounds of 32 and 64 bits for every integer word: what is written, checked, asked for and
 // read.
 
-#include "support/matrix.h"
+#include "calls.h"
+
+#include <functional>
 
 namespace {
 
-const char* const kSignedWords[] = {"int", "long", "long long"};
-const char* const kUnsignedWords[] = {"unsigned int", "unsigned", "unsigned long",
-                                      "unsigned long long"};
-const char* const kCheckedWords[] = {"int", "long long", "uid_t", "time_t"};
+const std::string kSigned = "int|long|long long";
+const std::string kUnsigned = "unsigned int|unsigned|unsigned long|unsigned long long";
 
 // What a value becomes: T for a Json::LogicError.
 struct Written {
@@ -62,85 +62,62 @@ const Written kWritten[] = {
 
 class Boundaries : public TableTest {
 protected:
-    std::unique_ptr<Table> tableOf(const char* szWord)
+    std::unique_ptr<Table> tableOf(const std::string& strWord)
     {
-        return std::make_unique<Table>(database_,
-                                       std::string(R"({"m":{"cpptype":")") + szWord + "\"}}", "m");
+        return std::make_unique<Table>(database_, R"({"m":{"cpptype":")" + strWord + "\"}}", "m");
     }
 
-    template <typename Check>
-    void forEach(const char* szWord, Check check)
+    // The call with each value at "$", on a table of each word: its end and output.
+    void expect(const std::string& strWords, const std::string& strCall,
+                const std::function<std::string(const Written& row)>& expected)
     {
-        const auto pTable = tableOf(szWord);
-        for (const Written& row : kWritten) {
-            SCOPED_TRACE(std::string(szWord) + " " + row.szValue);
-            check(*pTable, row, filledIn(R"({"m":$})", row.szValue));
-        }
-    }
-
-    static std::string valueList(Table& table, Json::Value jRecord)
-    {
-        std::string strOut = "(";
-        const std::string strEnd =
-            endOf([&] { return table.api.SqlExpandMemberSymbol(strOut, jRecord); });
-        if ("0" != strEnd) {
-            EXPECT_EQ("(", strOut);
-            return strEnd;
-        }
-        return strOut.substr(1, strOut.size() - 3);
-    }
-
-    void expectReadBack(const char* szWord, const char* Written::*pszExpected)
-    {
-        forEach(szWord, [&](Table& table, const Written& row, Json::Value jRecord) {
-            const std::string strEnd = endOf([&] { return table.api.recSave(jRecord, true); });
-            EXPECT_EQ(nullptr == row.*pszExpected ? "T" : "0", strEnd);
-            if ("0" == strEnd && nullptr != row.*pszExpected) {
-                EXPECT_EQ(row.*pszExpected, text(jRecord["m"]));
+        for (const std::string& strWord : split(strWords, '|')) {
+            const auto pTable = tableOf(strWord);
+            for (const Written& row : kWritten) {
+                SCOPED_TRACE(strWord + " " + row.szValue);
+                const Ended ended = called(pTable->api, replaced(strCall, '$', row.szValue));
+                EXPECT_EQ(expected(row),
+                          ended.strEnd + (ended.strOut.empty() ? "" : " " + ended.strOut));
+                EXPECT_EQ("-1" == ended.strEnd, !takeLog().empty());
             }
+        }
+    }
+
+    void expectReadBack(const char* szWord, const char* Written::*pszRead)
+    {
+        expect(szWord, R"(recSave {"m":$} insert)", [pszRead](const Written& row) -> std::string {
+            if (nullptr == row.*pszRead) return "T";
+            const std::string strRead = row.*pszRead;
+            return row.szValue == strRead ? "0" : R"(0 {"m":)" + strRead + "}";
         });
     }
 };
 
 TEST_F(Boundaries, OfIntegersInValueLists)
 {
-    for (const char* szWord : kSignedWords)
-        forEach(szWord, [](Table& table, const Written& row, const Json::Value& jRecord) {
-            EXPECT_EQ(row.szSigned, valueList(table, jRecord));
-        });
-    for (const char* szWord : kUnsignedWords)
-        forEach(szWord, [](Table& table, const Written& row, const Json::Value& jRecord) {
-            EXPECT_EQ(row.szUnsigned, valueList(table, jRecord));
-        });
+    const auto literal = [](const std::string& strValue) {
+        return "T" == strValue ? strValue : "0 " + strValue + ") ";
+    };
+    const char szCall[] = R"(SqlExpandMemberSymbol before {"m":$})";
+    expect(kSigned, szCall, [&](const Written& row) { return literal(row.szSigned); });
+    expect(kUnsigned, szCall, [&](const Written& row) { return literal(row.szUnsigned); });
 }
 
 TEST_F(Boundaries, OfIntegersInTheTypeCheck)
 {
-    for (const char* szWord : kCheckedWords)
-        forEach(szWord, [](Table& table, const Written& row, Json::Value jRecord) {
-            EXPECT_EQ(row.blChecked ? 0 : -1, table.api.checkJsonType(jRecord));
-            EXPECT_EQ(row.blChecked, takeLog().empty());
-        });
-    for (const char* szWord : kUnsignedWords)
-        forEach(szWord, [](Table& table, const Written&, Json::Value jRecord) {
-            EXPECT_EQ(-1, table.api.checkJsonType(jRecord));
-            EXPECT_EQ(Lines{error("type not found!!, key=m")}, takeLog());
-        });
+    const char szCall[] = R"(checkJsonType {"m":$})";
+    expect("int|long long|uid_t|time_t", szCall,
+           [](const Written& row) { return row.blChecked ? "0" : "-1"; });
+    expect(kUnsigned, szCall, [](const Written&) { return "-1"; });
 }
 
 TEST_F(Boundaries, OfIntegersInConditions)
 {
-    for (const char* szWord : {"int", "long", "long long", "unsigned int", "unsigned",
-                               "unsigned long", "unsigned long long", "uid_t", "time_t"})
-        forEach(szWord, [](Table& table, const Written& row, Json::Value jRecord) {
-            std::string strField = "m";
-            std::string strOut;
-            EXPECT_EQ(0, table.api.SqlMakeByMatchField(strField, jRecord["m"], strOut));
-            Json::Value jList(Json::arrayValue);
-            jList.append(jRecord["m"]);
-            EXPECT_EQ(0, table.api.SqlMakeByListField("m", jList, strOut));
-            EXPECT_EQ(std::string("m=") + row.szBare + "m in (" + row.szBare + " )", strOut);
-        });
+    const std::string strWords = kSigned + "|" + kUnsigned + "|uid_t|time_t";
+    expect(strWords, "SqlMakeByMatchField m $",
+           [](const Written& row) { return std::string("0 m=") + row.szBare; });
+    expect(strWords, "SqlMakeByListField m [$]",
+           [](const Written& row) { return std::string("0 m in (") + row.szBare + " )"; });
 }
 
 TEST_F(Boundaries, OfIntegersSavedAndReadBack)

@@ -39,10 +39,11 @@ std::vector<std::string> split(const std::string& strText, char cSeparator);
 // The text with every c replaced.
 std::string replaced(std::string strText, char c, const std::string& strBy);
 
-inline Lines operator+(Lines lines, const Lines& more)
+template <typename Item>
+std::vector<Item> operator+(std::vector<Item> items, const std::vector<Item>& more)
 {
-    lines.insert(lines.end(), more.begin(), more.end());
-    return lines;
+    items.insert(items.end(), more.begin(), more.end());
+    return items;
 }
 
 // Calls on tables of one record, {"a":"a","m":5,"z":"z"}: two texts and a member of any type word.

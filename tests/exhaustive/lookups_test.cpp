@@ -1,180 +1,225 @@
 // SPDX-License-Identifier: MIT
-// The look-ups of member types behind recSave and recCreate, on definitions that have none or not
-// all: every look-up happens and logs, line by line.
+// The look-ups of member types behind every operation, on types that are missing, of a wrong kind
+// or partial: the result, the whole log and what is left in the table.
 
-#include "support/lookups.h"
+#include "lookup_cases.h"
+
+#include <utility>
 
 namespace {
 
-class LookUps : public LookUpsTest {
-protected:
-    // What a save logs after its look-ups when its lists are empty.
-    static Lines emptyLists(const std::string& strVerb, const std::string& strRecord)
-    {
-        const std::string strSql =
-            strVerb + " INTO $ () VALUES (;select * from $ where rowid == last_insert_rowid();";
-        const std::string strError = "near \")\": syntax error";
-        return {plain("i=0,errno=?, run sql failed, error=" + strError + ", sql=" + strSql),
-                failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
-                plain(std::string("blCreate=") + ("INSERT" == strVerb ? "1" : "0") +
-                      ", jRecInOut=" + strRecord),
-                plain("jType=null"), plain("sql error, err=" + strError + ", sql=" + strSql)};
-    }
+const std::string kPoisoned = "jType[strJsonName].type() != Json::objectValue";
+const std::string kNoWord = R"(!jTableDef[strJsonName]["member"][strKey].isMember("cpptype"))";
+const std::string kWordIsNoText =
+    R"(!jTableDef[strJsonName]["member"][strKey]["cpptype"].isString())";
 
-    static Lines createFailed(const std::string& strRecord)
-    {
-        return {failed("0 > recSave(jParam, true)"), plain("call create rec, rec=" + strRecord)};
-    }
-
-    int save(VornJsonDbApi& api, bool blCreate, const char* szRecord)
-    {
-        Json::Value jRecord = json(szRecord);
-        const int iResult = api.recSave(jRecord, blCreate);
-        EXPECT_EQ(json(szRecord), jRecord);
-        return iResult;
-    }
-
-    int create(VornJsonDbApi& api, const char* szRecord)
-    {
-        Json::Value jRecord = json(szRecord);
-        Json::Value jStored = "untouched";
-        const int iResult = api.recCreate(jRecord, jStored);
-        EXPECT_EQ(Json::Value("untouched"), jStored);
-        return iResult;
-    }
-
-    std::string strCreate_ = "create table if not exists " + strName_ + " (a, b)";
+const struct {
+    const char* szDefinition;
+    const char* szLater;  // after the column list looked for its members
+    const char* szCondition;
+} kBadDefinitions[] = {
+    {"null", R"({"$":{"member":null}})", "jTableDef.empty()"},
+    {"{}", R"({"$":{"member":null}})", "jTableDef.empty()"},
+    {"[]", "[]", "jTableDef.empty()"},
+    {R"(["$"])", R"(["$"])", "!jTableDef.isMember(strJsonName)"},
+    {R"({"-":{}})", R"({"-":{},"$":{"member":null}})", "!jTableDef.isMember(strJsonName)"},
+    {R"({"$":null})", R"({"$":{"member":null}})", "!jTableDef[strJsonName].isObject()"},
+    {R"({"$":"member"})", R"({"$":"member"})", "!jTableDef[strJsonName].isObject()"},
+    {R"({"$":{"x":1}})", R"({"$":{"member":null,"x":1}})",
+     R"(!jTableDef[strJsonName].isMember("member"))"},
+    {R"({"$":{"member":["a"]}})", R"({"$":{"member":["a"]}})",
+     R"(!jTableDef[strJsonName]["member"].isObject())"},
+    {R"({"$":{"member":{}}})", R"({"$":{"member":{}}})",
+     "jType == Json::nullValue || !jType.isMember(strJsonName)"},
 };
 
-TEST_F(LookUps, OfASaveWithABadDefinition)
+std::string typesOf(const std::string& strA)
 {
-    for (const BadDefinition& bad : kBadDefinitions) {
-        SCOPED_TRACE(bad.szName);
-        strName_ = freshName();
-        strCreate_ = "create table " + strName_ + " (a, b)";
-        Json::Value jDefinition = json(named(bad.szDefinition));
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-        takeLog();
+    return R"({"a":)" + strA + R"(,"b":{"cpptype":"string"},"c":{"cpptype":"string"}})";
+}
 
-        // recSave's own look-up, then the value list's, which finds what the first has left.
-        EXPECT_EQ(-1, save(api, true, R"({"a":1})"));
-        EXPECT_EQ(
-            named(lookUp(bad.szCondition, bad.szDefinition, "-") +
-                  lookUp(kPoisoned, bad.szLater, "null") + emptyLists("INSERT", R"({"a":1})")),
-            takeOwnLog());
-        EXPECT_EQ(-1, save(api, false, R"({"a":1})"));
-        EXPECT_EQ(
-            named(lookUp(kPoisoned, bad.szLater, "null") + lookUp(kPoisoned, bad.szLater, "null") +
-                  emptyLists("REPLACE", R"({"a":1})")),
-            takeOwnLog());
+std::string defined(const std::string& strMembers)
+{
+    return R"({"$":{"member":)" + strMembers + "}}";
+}
+
+const std::string kWhole = defined(typesOf(R"({"cpptype":"string"})"));
+
+// Four lines of a look-up that fails; the entry of the table, or "-" where there is none.
+Lines lookUp(const std::string& strCondition, const std::string& strDefinition,
+             const std::string& strEntry)
+{
+    return {utilFailed(strCondition), utilPlain("strJsonName=$"),
+            utilPlain("jTableDef=" + strDefinition), utilPlain("jType=" + strEntry)};
+}
+
+// What the look-ups log: the first on a table, those before and after the columns were listed.
+struct LookUpLines {
+    Lines first, early, later, decoder;
+};
+
+class LookUps : public TableTest {
+protected:
+    // Each case on a table of its own, and once more where later look-ups log other lines. Where
+    // strEntry is given, the host has put it in place of the table's types.
+    void expect(const Cases& cases, const std::string& strDefinition, const LookUpLines& lookUps,
+                const std::string& strEntry = "")
+    {
+        const bool blChanges = lookUps.first != lookUps.later;
+        strName_ = freshName();
+        for (const Case& c : cases) {
+            SCOPED_TRACE(c.strCall + " on " + strDefinition + strEntry);
+            if (blChanges) strName_ = freshName();
+            const auto pApi = handleOf(strDefinition, strEntry);
+            expectCase(c, *pApi, lookUps);
+            if (blChanges)
+                expectCase(c, *pApi,
+                           {lookUps.later, lookUps.later, lookUps.later, lookUps.decoder});
+        }
+    }
+
+    std::unique_ptr<VornJsonDbApi> handleOf(const std::string& strDefinition,
+                                            const std::string& strEntry = "")
+    {
+        std::string strCreate = "create table if not exists " + strName_ + " (a, b, c)";
+        Json::Value jDefinition = json(replaced(strDefinition, '$', strName_));
+        auto pApi =
+            std::make_unique<VornJsonDbApi>(database_.get(), strName_, jDefinition, strCreate);
+        if (!strEntry.empty()) VORN_JSON_DB::recType(jDefinition, strName_) = json(strEntry);
+        takeLog();
+        return pApi;
+    }
+
+    void expectLog(const Lines& expected)
+    {
+        Lines named;
+        for (const std::string& strLine : expected)
+            named.push_back(replaced(strLine, '$', strName_));
+        EXPECT_EQ(named, takeOwnLog());
+    }
+
+    std::string strName_ = freshName();
+
+private:
+    void expectCase(const Case& c, VornJsonDbApi& api, const LookUpLines& lookUps)
+    {
+        database_.run("delete from " + strName_ + ";insert into " + strName_ +
+                      " values ('x','y','z'),('u','v','w')");
+        const Ended ended = called(api, c.strCall);
+        EXPECT_EQ(c.szEnd, ended.strEnd + (ended.strOut.empty() ? "" : " " + ended.strOut));
+        Lines expected;
+        Lines look = lookUps.first;
+        for (const std::string& strLine : c.lines) {
+            if (kLookUp == strLine)
+                expected = expected + std::exchange(look, lookUps.later);
+            else if (kEarlyLookUp == strLine)
+                expected = expected + lookUps.early;
+            else
+                expected = expected + (kDecoder == strLine ? lookUps.decoder : Lines{strLine});
+        }
+        expectLog(expected);
+        EXPECT_EQ(c.szContents, database_.value("select group_concat(a||b||c) from " + strName_));
+    }
+
+    // The log. A dump of all tables' types is reduced to the entry of this table.
+    Lines takeOwnLog()
+    {
+        const std::string strDump = utilPlain("jType=");
+        const std::string strKey = '"' + strName_ + "\":";
+        Lines lines = takeLog();
+        for (std::string& strLine : lines) {
+            if (0 != strLine.compare(0, strDump.size(), strDump)) continue;
+            const std::size_t nKey = strLine.find(strKey);
+            // The reader leaves what follows the entry.
+            strLine = strDump + (std::string::npos == nKey
+                                     ? "-"
+                                     : text(leftByReader(strLine.substr(nKey + strKey.size()))));
+        }
+        return lines;
+    }
+};
+
+TEST_F(LookUps, FailOnABadDefinition)
+{
+    std::string strCondition;
+    for (const auto& bad : kBadDefinitions) {
+        const Lines first = lookUp(bad.szCondition, bad.szDefinition, "-");
+        const Lines early = lookUp(kPoisoned, bad.szDefinition, "null");
+        const Lines later = lookUp(kPoisoned, bad.szLater, "null");
+        // The column list leaves the table in the handle's copy.
+        expect(withoutColumns(), bad.szDefinition, {first, early, later, {}});
+        // One of the definitions that fail the same check tells the rest.
+        if (std::exchange(strCondition, bad.szCondition) == bad.szCondition) continue;
+        expect(withoutTypes(), bad.szDefinition, {first, early, early, {}});
     }
 }
 
-TEST_F(LookUps, OfACreateWithABadDefinition)
+TEST_F(LookUps, FailOnTypesOfAWrongKind)
 {
-    for (const BadDefinition& bad : kBadDefinitions) {
-        SCOPED_TRACE(bad.szName);
-        strName_ = freshName();
-        strCreate_ = "create table " + strName_ + " (a, b)";
-        Json::Value jDefinition = json(named(bad.szDefinition));
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-        takeLog();
-
-        // Defaults, type check, recSave and the value list look up once each.
-        EXPECT_EQ(-1, create(api, R"({"a":1})"));
-        EXPECT_EQ(named(lookUp(bad.szCondition, bad.szDefinition, "-") +
-                        lookUp(kPoisoned, bad.szDefinition, "null") +
-                        lookUp(kPoisoned, bad.szDefinition, "null") +
-                        lookUp(kPoisoned, bad.szLater, "null") +
-                        emptyLists("INSERT", R"({"a":1})") + createFailed(R"({"a":1})")),
-                  takeOwnLog());
-        EXPECT_EQ(-1, create(api, R"({"a":1})"));
-        const Lines again = lookUp(kPoisoned, bad.szLater, "null");
-        EXPECT_EQ(named(again + again + again + again + emptyLists("INSERT", R"({"a":1})") +
-                        createFailed(R"({"a":1})")),
-                  takeOwnLog());
-        // No look-up is reached by an empty record, two by one that is no object.
-        EXPECT_EQ(-1, create(api, "{}"));
-        EXPECT_EQ((Lines{failed("jRecIn.empty()"), plain("call create rec, rec={}")}), takeLog());
-        EXPECT_EQ(-1, create(api, "[1]"));
-        EXPECT_EQ(named(again + again +
-                        Lines{failed("!jRecParam.isObject()"), failed("0 > checkJsonType(jParam)"),
-                              plain("call create rec, rec=[1]")}),
-                  takeOwnLog());
+    for (const char* szEntry : {"null", "[{\"a\":1}]", "\"a\"", "5", "true"}) {
+        const Lines look = lookUp(kPoisoned, kWhole, szEntry);
+        const LookUpLines lookUps = {look, look, look, lookUp(kPoisoned, "null", szEntry)};
+        expect(withoutTypes() + withColumns(szEntry), kWhole, lookUps, szEntry);
     }
 }
 
-TEST_F(LookUps, OfASaveWithoutAnyWord)
+TEST_F(LookUps, EndAtAMemberWithoutAWord)
 {
-    const char szDefinition[] = R"({"$":{"member":{"a":{},"b":{"cpptype":"int"}}}})";
-    Json::Value jDefinition = json(named(szDefinition));
-    VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-    const Lines failure = {failed("!jType.isMember(strKey)"),
-                           failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
-                           plain(R"(blCreate=1, jRecInOut={"a":1,"b":2})"), plain("jType=null")};
-    EXPECT_EQ(-1, save(api, true, R"({"a":1,"b":2})"));
-    EXPECT_EQ(named(lookUp(kNoWord, szDefinition, "-") + lookUp(kPoisoned, szDefinition, "null") +
-                    failure),
-              takeOwnLog());
-    EXPECT_EQ(-1, create(api, R"({"a":1,"b":2})"));
-    const Lines again = lookUp(kPoisoned, szDefinition, "null");
-    EXPECT_EQ(named(again + again + again + again + failure + createFailed(R"({"a":1,"b":2})")),
-              takeOwnLog());
+    const std::pair<std::string, std::string> cases[] = {{"{}", kNoWord},
+                                                         {"\"int\"", kNoWord},
+                                                         {"null", kNoWord},
+                                                         {R"({"cpptype":5})", kWordIsNoText}};
+    for (const auto& [strMember, strCondition] : cases) {
+        // The first member: no types.
+        const std::string strNone = defined(typesOf(strMember));
+        const Lines later = lookUp(kPoisoned, strNone, "null");
+        expect(
+            withoutTypes() + withColumns("null"), strNone,
+            {lookUp(strCondition, strNone, "-"), later, later, lookUp(kPoisoned, "null", "null")});
+        // The second one: those of the first.
+        const std::string strA = R"({"a":{"cppDefaultValue":"d","cpptype":"string"})";
+        const std::string strPartial =
+            defined(strA + R"(,"b":)" + strMember + R"(,"c":{"cpptype":"string"}})");
+        expect(withPartialTypes(strA + "}"), strPartial,
+               {lookUp(strCondition, strPartial, strA + "}"), {}, {}, {}});
+    }
 }
 
-TEST_F(LookUps, OfARecordWithPartialTypes)
+TEST_F(LookUps, FailOnTypesThatLackAColumn)
 {
-    const struct {
-        const char* szMember;
-        const char* szCondition;
-    } cases[] = {
-        {"{}", kNoWord},
-        {"\"int\"", kNoWord},
-        {"null", kNoWord},
-        {R"({"cpptype":5})", kWordIsNoText},
+    const std::pair<const char*, Lines> cases[] = {
+        {R"({"b":{"cpptype":"string"},"c":{"cpptype":"string"}})", {}},
+        {R"({"a":{"cpptype":"string"},"c":{"cpptype":"string"}})",
+         {plain("column_name[1]=b"), plain("column_value[1]=y")}},
+        {R"({"a":{"cpptype":"string"},"b":{"cpptype":"string"}})",
+         {plain("column_name[2]=c"), plain("column_value[2]=z")}},
+        {"{}", {}},
     };
-    const std::string strEntry = R"({"a":{"cppDefaultValue":7,"cpptype":"int"}})";
-    for (const auto& c : cases) {
-        SCOPED_TRACE(c.szMember);
-        strName_ = freshName();
-        strCreate_ = "create table " + strName_ + " (a, b, c)";
-        const std::string strDefinition =
-            std::string(R"({"$":{"member":{"a":{"cppDefaultValue":7,"cpptype":"int"},"b":)") +
-            c.szMember + R"(,"c":{"cpptype":"int"}}}})";
-        Json::Value jDefinition = json(named(strDefinition));
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-
-        const Lines first = lookUp(c.szCondition, strDefinition, strEntry);
-        const auto failure = [&](const std::string& strRecord) {
-            return Lines{failed("!jType.isMember(strKey)"),
-                         failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
-                         plain("blCreate=1, jRecInOut=" + strRecord), plain("jType=" + strEntry)};
-        };
-        // The first look-up fails half-way and is the only one that says so.
-        EXPECT_EQ(-1, create(api, R"({"b":1,"c":2})"));
-        EXPECT_EQ(named(first + failure(R"({"a":7,"b":1,"c":2})") +
-                        createFailed(R"({"a":7,"b":1,"c":2})")),
-                  takeOwnLog());
-        EXPECT_EQ(-1, create(api, R"({"x":1})"));
-        EXPECT_EQ(named(failure(R"({"a":7,"x":1})") + createFailed(R"({"a":7,"x":1})")),
-                  takeOwnLog());
-        EXPECT_EQ(-1, save(api, true, R"({"a":1})"));
-        EXPECT_EQ(named(failure(R"({"a":1})")), takeOwnLog());
-        EXPECT_EQ(Lines(), takeLog());
+    for (const auto& [szEntry, traced] : cases) {
+        const Lines refused = rowRefused(kNoColumn, traced, "null", "SELECT a,b,c FROM $ ;");
+        expect({{"recList null", "-1", refused}, {"recGetOne null", "-1", refused + kNoOne}},
+               kWhole, {}, szEntry);
     }
 }
 
-TEST_F(LookUps, HealWhereTheHostMendsTheEntry)
+TEST_F(LookUps, TakeAMemberOfAWrongKindForOneOfAnUnknownWord)
 {
-    Json::Value jDefinition = json(named(R"({"$":{"member":{"a":{"cpptype":"int"}}}})"));
-    VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
+    for (const char* szA : {"{}", "null", R"({"cpptype":null})", "5", "\"string\"", "[\"string\"]"})
+        expect(withoutAWord(), kWhole, {}, typesOf(szA));
+    for (const char* szA : {R"({"cpptype":["string"]})", R"({"cpptype":{}})"})
+        expect(withAWordThatThrows(), kWhole, {}, typesOf(szA));
+}
+
+TEST_F(LookUps, SucceedOnceTheHostHasRepairedTheEntry)
+{
+    const auto pApi = handleOf(kWhole);
     Json::Value jNone;
     Json::Value& jEntry = VORN_JSON_DB::recType(jNone, strName_);
     EXPECT_TRUE(jEntry.isNull());
-    EXPECT_EQ(named(lookUp("jTableDef.empty()", "null", "-")), takeOwnLog());
-    jEntry = json(R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})");
-    Json::Value jRecord = json(R"({"a":1})");
-    EXPECT_EQ(0, api.recSave(jRecord, true));
+    expectLog(lookUp("jTableDef.empty()", "null", "-"));
+    jEntry = json(typesOf(R"({"cpptype":"int"})"));
+    const char szSave[] = R"(recSave {"a":1,"b":"y","c":"z"} insert)";
+    EXPECT_EQ("0", called(*pApi, szSave).strEnd);
     EXPECT_EQ(Lines(), takeLog());
 }
 
