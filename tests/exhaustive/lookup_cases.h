@@ -258,13 +258,14 @@ inline Cases withAWordThatThrows()
         {"recDeleteAll", "2", {}, "NULL"},
         {"fillDefaultValue {} fill", "0", {}},
         {R"(SqlExpandMemberSymbol before {"b":"y"})", "0 'y',", {}},
+        {R"(SqlExpandMemberList {"a":"x"} before 1)", "T  (", {}},
     };
     for (const char* szCall :
          {R"(recList {"a":"x"})", R"(recList {"b":"y"})", R"(recGetOne {"b":"y"})",
           R"(recUpdateByFilter {"a":"x"} {"b":"n"})", R"(recUpdateByFilter {"b":"y"} {"a":"n"})",
           R"(recUpdateByWhere {"a":"n"} 1)", R"(recDelete {"a":"x"})",
           R"(recDeleteByArray ["x"] a)", "recDeleteByName x a", R"(checkJsonType {"a":"x"})",
-          R"(SqlExpandMemberSymbol before {"a":"x"})", R"(SqlExpandMemberList {"a":"x"} before 1)",
+          R"(SqlExpandMemberSymbol before {"a":"x"})",
           R"(SqlMakeByMatchField a "x")", R"(SqlMakeByListField a ["x"])"})
         cases.push_back({szCall, "T", {}});
     return cases;
