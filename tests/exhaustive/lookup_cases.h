@@ -11,262 +11,217 @@ inline const std::string kLookUp = "look-up";
 inline const std::string kEarlyLookUp = "look-up before the columns";
 inline const std::string kDecoder = "look-up of the row decoder";
 
-// A call on the rows xyz and uvw of the table "$" (a, b, c).
+inline constexpr char kRows[] = "xyz,uvw";
+
+// Calls on those rows, each for itself, of the table "$" (a, b, c).
 struct Case {
-    std::string strCall;
-    const char* szEnd;  // the result and the output, if it changes
-    Lines lines;
-    const char* szContents = "xyz,uvw";  // of the table afterwards
+    std::string strCalls;        // between bars
+    const char* szEnd;           // the result and the output, if it changes
+    Lines lines;                 // up to the failed check; the call tells what follows
+    const char* szRows = kRows;  // of the table afterwards
+    // The statement that SQLite refuses, and why.
+    std::string strSql = "";
+    std::string strError = kNearWhere;
 };
 using Cases = std::vector<Case>;
 
-inline Lines listRefused(const std::string& strError, const std::string& strRequest,
-                         const std::string& strSql)
+// What the operation of that check logs where its statement is refused; the request or record is
+// shown, if any.
+inline Lines refused(const Case& c, const char* szCheck, const std::string& strShown = "")
 {
-    return {runFailed(strError, strSql),
-            failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
-            plain("jRecParam=" + strRequest), sqlError(strError, strSql)};
+    const Lines shown = strShown.empty() ? Lines() : Lines{plain(strShown)};
+    return Lines{runFailed(c.strError, c.strSql), failed(szCheck)} + shown +
+           Lines{sqlError(c.strError, c.strSql)};
+}
+
+// What a save logs after the failed check or statement, beside the look-ups.
+inline Lines notSaved(const Case& c, const std::string& strRecord, const std::string& strTypes)
+{
+    const std::string strShown =
+        std::string("blCreate=") + ('R' == c.strSql[0] ? "0" : "1") + ", jRecInOut=" + strRecord;
+    const Lines shown = {plain(strShown), plain("jType=" + strTypes)};
+    if (c.strSql.empty())
+        return Lines{failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)")} + shown;
+    return Lines{runFailed(c.strError, c.strSql),
+                 failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)")} +
+           shown + Lines{sqlError(c.strError, c.strSql)};
+}
+
+// What the operation logs after the failed check or statement. A record is shown as it is written,
+// with its defaults.
+inline Lines linesAfter(const Case& c, const std::vector<std::string>& words,
+                        const std::string& strTypes)
+{
+    const std::string& strCall = words[0];
+    const bool blRan = !c.strSql.empty();
+    const std::string strCreate = "call create rec, rec=";
+    if ("recSave" == strCall) return notSaved(c, words[1], strTypes);
+    if ("recCreate" == strCall && 3 == words.size())
+        return notSaved(c, words[2], strTypes) +
+               Lines{failed("0 > recSave(jParam, true)"), plain(strCreate + words[2])};
+    if ("recCreate" == strCall) return {plain(strCreate + words[1])};
+    const char szList[] = "0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)";
+    if ("recList" == strCall) return refused(c, szList, "jRecParam=" + words[1]);
+    if ("recGetOne" == strCall)
+        return refused(c, szList, "jRecParam=" + words[1]) +
+               Lines{failed("0 > recList(jRecParam, jRecArray)")};
+    if ("recDelete" == strCall)
+        return blRan ? refused(c, "0 > (err = runSqlEx(strSqlRun))") : Lines();
+    const std::string strKey = "name=" + words.back();
+    if ("recDeleteByArray" == strCall)
+        return {plain("recDeleteByArray failed, " + strKey + ", strVector=x")};
+    if ("recDeleteByName" == strCall)
+        return {plain("recDeleteByName failed, " + strKey + ", strValue=x")};
+    const char szUpdate[] = "0 > runSqlEx(strSql, NULL, NULL)";
+    if ("recUpdateByWhere" == strCall) return refused(c, szUpdate, "jRecIn=" + words[1]);
+    if ("recUpdateByFilter" != strCall) return {};
+    const Lines updated = blRan ? refused(c, szUpdate, "jRecIn=" + words[2]) +
+                                      Lines{failed("0 > recUpdateByWhere(jParamIn, strSql)")}
+                                : Lines();
+    return updated + Lines{plain("recUpdateByFilter failed, jParamIn=" + words[2])};
 }
 
 // A row whose column the decoder refuses with that line; the first column is not traced.
-inline Lines rowRefused(const std::string& strLine, const Lines& traced,
-                        const std::string& strRequest, const std::string& strSql)
+inline Lines rowRefused(const std::string& strLine, const Lines& traced = {})
 {
     const char szField[] = "0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))";
     return Lines{strLine, failed(szField)} + traced +
-           Lines{failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)")} +
-           listRefused("query aborted", strRequest, strSql);
+           Lines{failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)")};
 }
 
-inline Lines updateRefused(const std::string& strError, const std::string& strValues,
-                           const std::string& strSql)
-{
-    return {runFailed(strError, strSql), failed("0 > runSqlEx(strSql, NULL, NULL)"),
-            plain("jRecIn=" + strValues), sqlError(strError, strSql)};
-}
-
-inline Lines filterRefused(const std::string& strCondition, const std::string& strValues)
-{
-    return {failed(strCondition), plain("recUpdateByFilter failed, jParamIn=" + strValues)};
-}
-
-inline Lines arrayRefused(const std::string& strCondition, const std::string& strKey)
-{
-    return {failed(strCondition),
-            plain("recDeleteByArray failed, name=" + strKey + ", strVector=x")};
-}
-
-inline Lines nameRefused(const std::string& strCondition, const std::string& strKey)
-{
-    return {failed(strCondition), plain("recDeleteByName failed, name=" + strKey + ", strValue=x")};
-}
-
-// A save without any column.
-inline Lines emptyLists(const char* szCreate, const std::string& strVerb)
-{
-    const std::string strSql =
-        strVerb + " INTO $ () VALUES (;select * from $ where rowid == last_insert_rowid();";
-    return {runFailed(kNearParenthesis, strSql),
-            failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
-            plain(std::string("blCreate=") + szCreate + R"(, jRecInOut={"a":1})"),
-            plain("jType=null"), sqlError(kNearParenthesis, strSql)};
-}
-
-// A save whose value list meets a column without a type.
-inline Lines noValue(const std::string& strRecord, const std::string& strTypes)
-{
-    return {failed("!jType.isMember(strKey)"),
-            failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
-            plain("blCreate=1, jRecInOut=" + strRecord), plain("jType=" + strTypes)};
-}
-
-inline Lines createFailed(const std::string& strRecord,
-                          const std::string& strCondition = "0 > recSave(jParam, true)")
-{
-    return {failed(strCondition), plain("call create rec, rec=" + strRecord)};
-}
-
-inline const Lines kCreateLookUps = {kLookUp, kEarlyLookUp, kEarlyLookUp, kLookUp};
-inline const Lines kNoOne = {failed("0 > recList(jRecParam, jRecArray)")};
+inline constexpr char kNoX[] = "no such column: x";
+inline constexpr char kAborted[] = "query aborted";
+inline constexpr char kSelect[] = "SELECT a,b,c FROM $ ;";
 inline const std::string kNoColumn = failed("!jType.isMember(strName)");
-inline const Lines kNoKey = {kLookUp, failed("!jType.isMember(strKey)")};
+inline const std::string kNoKey = failed("!jType.isMember(strKey)");
+inline const Lines kFound = {kLookUp};
+inline const Lines kNoMember = {kLookUp, failed("!jType.isMember(szKey)")};
 inline const Lines kNoField = {kLookUp, failed("!jType.isMember(strField)")};
 inline const Lines kNoListField = {kLookUp, failed("!jType.isMember(szField)")};
 inline const Lines kNoCondition = {kLookUp, failed("strSql.empty()")};
-inline constexpr char kNoMember[] = "!jType.isMember(szKey)";
-inline constexpr char kNoUpdate[] = "0 > recUpdateByWhere(jParamIn, strSql)";
-inline constexpr char kNewA[] = R"({"a":"n"})";
-inline constexpr char kNewB[] = R"({"b":"n"})";
+inline const Lines kSave = {kLookUp, kLookUp};
+inline const Lines kCreate = {kLookUp, kEarlyLookUp, kEarlyLookUp, kLookUp};
 
 // Of no types at all, beside the operations that list columns.
-inline Cases withoutTypes()
-{
-    return {
-        {R"(recUpdateByFilter {"a":"x"} {"a":"n"})", "-1",
-         Lines{kLookUp} + filterRefused("strSql.empty()", kNewA)},
-        {R"(recUpdateByFilter {"vornSqlWhereFilter":"1"} {"a":"n"})", "-1",
-         Lines{kLookUp, kLookUp, kLookUp} +
-             updateRefused(kNearWhere, kNewA, "UPDATE $ SET  WHERE  ( 1  );") +
-             filterRefused(kNoUpdate, kNewA)},
-        {R"(recUpdateByWhere {"a":"n"} 1)", "-1",
-         Lines{kLookUp} + updateRefused(kNearWhere, kNewA, "UPDATE $ SET  WHERE 1;")},
-        {"recDelete [1]", "-1", {failed("jRecParam.type() != Json::objectValue")}},
-        {R"(recDelete {"a":"x"})", "-1", kNoCondition},
-        {R"(recDelete {"a":"x","vornSqlWhereFilter":"a='u'"})", "1", {kLookUp}, "xyz"},
-        {"recDeleteAll", "2", {kLookUp}, "NULL"},
-        {R"(recDeleteByArray ["x"] a)", "-1", Lines{kLookUp} + arrayRefused(kNoMember, "a")},
-        {"recDeleteByName x a", "-1", Lines{kLookUp} + nameRefused(kNoMember, "a")},
-        {"recCreate {}", "-1", createFailed("{}", "jRecIn.empty()")},
-        {"recCreate [1]", "-1",
-         Lines{kLookUp, kLookUp, failed("!jRecParam.isObject()")} +
-             createFailed("[1]", "0 > checkJsonType(jParam)")},
-        {"fillDefaultValue {} fill", "0", {kLookUp}},
-        {"fillDefaultValue {} check", "0", {kLookUp}},
-        {R"(checkJsonType {"a":5})", "0", {kLookUp}},
-        {R"(SqlExpandMemberList {"a":"x"} before 1)", "1", {kLookUp}},
-        {R"(SqlMakeByMatchField a "x")", "-1", kNoField},
-        {R"(SqlMakeByListField a ["x"])", "-1", kNoListField},
-    };
-}
+inline const Cases kWithoutTypes = {
+    {R"(recUpdateByFilter {"a":"x"} {"a":"n"}|recDelete {"a":"x"})", "-1", kNoCondition},
+    {R"(recUpdateByFilter {"vornSqlWhereFilter":"1"} {"a":"n"})",
+     "-1",
+     {kLookUp, kLookUp, kLookUp},
+     kRows,
+     "UPDATE $ SET  WHERE  ( 1  );"},
+    {R"(recUpdateByWhere {"a":"n"} 1)", "-1", kFound, kRows, "UPDATE $ SET  WHERE 1;"},
+    {"recDelete [1]", "-1", {failed("jRecParam.type() != Json::objectValue")}},
+    {R"(recDelete {"a":"x","vornSqlWhereFilter":"a='u'"})", "1", kFound, "xyz"},
+    {"recDeleteAll", "2", kFound, "NULL"},
+    {R"(recDeleteByArray ["x"] a|recDeleteByName x a)", "-1", kNoMember},
+    {"recCreate {}", "-1", {failed("jRecIn.empty()")}},
+    {"recCreate [1]",
+     "-1",
+     {kLookUp, kLookUp, failed("!jRecParam.isObject()"), failed("0 > checkJsonType(jParam)")}},
+    {R"(fillDefaultValue {} fill|fillDefaultValue {} check|checkJsonType {"a":5})", "0", kFound},
+    {R"(SqlExpandMemberList {"a":"x"} before 1)", "1", kFound},
+    {R"(SqlMakeByMatchField a "x")", "-1", kNoField},
+    {R"(SqlMakeByListField a ["x"])", "-1", kNoListField},
+};
 
 // Of no types and a definition without columns.
-inline Cases withoutColumns()
-{
-    const Lines refused = Lines{kLookUp} + listRefused("near \"FROM\": syntax error",
-                                                       R"({"a":"x"})", "SELECT  FROM $ ;");
-    return {
-        {R"(recSave {"a":1} insert)", "-1", Lines{kLookUp, kLookUp} + emptyLists("1", "INSERT")},
-        {R"(recSave {"a":1} replace)", "-1", Lines{kLookUp, kLookUp} + emptyLists("0", "REPLACE")},
-        {R"(recCreate {"a":1})", "-1",
-         kCreateLookUps + emptyLists("1", "INSERT") + createFailed(R"({"a":1})")},
-        {R"(recList {"a":"x"})", "-1", refused},
-        {R"(recGetOne {"a":"x"})", "-1", refused + kNoOne},
-        {"SqlExpandMemberName", "0", {}},
-        {R"(SqlExpandMemberSymbol before {"a":"x"})", "0", {kLookUp}},
-    };
-}
+inline const std::string kInto =
+    " INTO $ () VALUES (;select * from $ where rowid == last_insert_rowid();";
+inline const Cases kWithoutColumns = {
+    {R"(recSave {"a":1} insert)", "-1", kSave, kRows, "INSERT" + kInto, kNearParenthesis},
+    {R"(recSave {"a":1} replace)", "-1", kSave, kRows, "REPLACE" + kInto, kNearParenthesis},
+    {R"(recCreate {"a":1} {"a":1})", "-1", kCreate, kRows, "INSERT" + kInto, kNearParenthesis},
+    {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1", kFound, kRows, "SELECT  FROM $ ;",
+     "near \"FROM\": syntax error"},
+    {"SqlExpandMemberName", "0", {}},
+    {R"(SqlExpandMemberSymbol before {"a":"x"})", "0", kFound},
+};
 
-// Of those types, which are no object, and a definition with columns: none of them is found.
-inline Cases withColumns(const std::string& strTypes)
-{
-    const Lines refused = Lines{kLookUp, kDecoder} +
-                          rowRefused(kNoColumn, {}, R"({"a":"x"})", "SELECT a,b,c FROM $ ;");
-    const Lines notSaved = noValue(R"({"a":"x"})", strTypes);
-    return {
-        {R"(recSave {"a":"x"} insert)", "-1", Lines{kLookUp, kLookUp} + notSaved},
-        {R"(recCreate {"a":"x"})", "-1", kCreateLookUps + notSaved + createFailed(R"({"a":"x"})")},
-        {R"(recList {"a":"x"})", "-1", refused},
-        {R"(recGetOne {"a":"x"})", "-1", refused + kNoOne},
-        {"SqlExpandMemberName", "0 a,b,c", {}},
-        {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", kNoKey},
-    };
-}
+// Of types that are no object and a definition with columns: none of them is found.
+inline const Cases kWithColumns = {
+    {R"(recSave {"a":"x"} insert)", "-1", kSave + Lines{kNoKey}},
+    {R"(recCreate {"a":"x"} {"a":"x"})", "-1", kCreate + Lines{kNoKey}},
+    {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1",
+     Lines{kLookUp, kDecoder} + rowRefused(kNoColumn), kRows, kSelect, kAborted},
+    {"SqlExpandMemberName", "0 a,b,c", {}},
+    {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {kLookUp, kNoKey}},
+};
 
 // Of types that end before b; only the first look-up says so. What is asked of b is not asked.
-inline Cases withPartialTypes(const std::string& strTypes)
-{
-    const Lines traced = {plain("column_name[1]=b"), plain("column_value[1]=y")};
-    const Lines one = Lines{kLookUp} + rowRefused(kNoColumn, traced, R"({"a":"x"})",
-                                                  "SELECT a,b,c FROM $  WHERE  (a='x' );");
-    const Lines every =
-        Lines{kLookUp} + rowRefused(kNoColumn, traced, R"({"b":"-"})", "SELECT a,b,c FROM $ ;");
-    const char szBadA[] = R"(type failed, strKey=a, jRecParam={"a":5,"b":5})";
-    const char szFilled[] = R"({"a":"d","b":1,"c":2})";
-    return {
-        {R"(recSave {"a":"n"} insert)", "-1", Lines{kLookUp} + noValue(kNewA, strTypes)},
-        {R"(recCreate {"b":1,"c":2})", "-1",
-         Lines{kLookUp} + noValue(szFilled, strTypes) + createFailed(szFilled)},
-        {R"(recList {"a":"x"})", "-1", one},
-        {R"(recList {"b":"-"})", "-1", every},
-        {R"(recList {"a":"-"})", "0", {kLookUp}},
-        {R"(recList {"a":{}})", "T", {kLookUp}},
-        {R"(recGetOne {"a":"x"})", "-1", one + kNoOne},
-        {R"(recGetOne {"b":"-"})", "-1", every + kNoOne},
-        {R"(recUpdateByFilter {"a":"x"} {"b":"n"})", "-1",
-         Lines{kLookUp} + updateRefused(kNearWhere, kNewB, "UPDATE $ SET  WHERE  (a='x' );") +
-             filterRefused(kNoUpdate, kNewB)},
-        {R"(recUpdateByFilter {"b":"y"} {"a":"n"})", "-1",
-         Lines{kLookUp} + filterRefused("strSql.empty()", kNewA)},
-        {R"(recUpdateByFilter {"a":"x"} {"a":"n","b":"n"})", "0", {kLookUp}, "nyz,uvw"},
-        {R"(recUpdateByFilter {"a":{}} {"a":"n"})", "T", {kLookUp}},
-        {R"(recUpdateByWhere {"b":"n"} 1)", "-1",
-         Lines{kLookUp} + updateRefused(kNearWhere, kNewB, "UPDATE $ SET  WHERE 1;")},
-        {R"(recUpdateByWhere {"a":"n","b":"n"} 1)", "0", {kLookUp}, "nyz,nvw"},
-        {R"(recDelete {"b":"y"})", "-1", kNoCondition},
-        {R"(recDelete {"a":"x","b":"-"})", "1", {kLookUp}, "uvw"},
-        {R"(recDelete {"a":{}})", "T", {kLookUp}},
-        {"recDeleteAll", "2", {kLookUp}, "NULL"},
-        {R"(recDeleteByArray ["x"] b)", "-1", Lines{kLookUp} + arrayRefused(kNoMember, "b")},
-        {R"(recDeleteByArray ["x"] a)", "1", {kLookUp}, "uvw"},
-        {"recDeleteByName x b", "-1", Lines{kLookUp} + nameRefused(kNoMember, "b")},
-        {"recDeleteByName x a", "1", {kLookUp}, "uvw"},
-        {"fillDefaultValue {} fill", R"(0 {"a":"d"})", {kLookUp}},
-        {R"(fillDefaultValue {"a":"x"} check)", "0", {kLookUp}},
-        {"fillDefaultValue {} check", "-1", {kLookUp, error("lost data member=a")}},
-        {R"(checkJsonType {"b":5})", "0", {kLookUp}},
-        {R"(checkJsonType {"a":5,"b":5})", "-1", {kLookUp, error(szBadA)}},
-        {"SqlExpandMemberName", "0 a,b,c", {}},
-        {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", kNoKey},
-        {R"(SqlExpandMemberList {"a":"x","b":"y"} before 1)", "0  (a='x' )", {kLookUp}},
-        {R"(SqlExpandMemberList {"b":"y"} before 1)", "1", {kLookUp}},
-        {R"(SqlMakeByMatchField b "y")", "-1", kNoField},
-        {R"(SqlMakeByListField b ["y"])", "-1", kNoListField},
-    };
-}
+inline const Lines kRefusedB =
+    kFound + rowRefused(kNoColumn, {plain("column_name[1]=b"), plain("column_value[1]=y")});
+inline const Cases kWithPartialTypes = {
+    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2} {"a":"d","b":1,"c":2}|)"
+     R"(SqlExpandMemberSymbol before {"a":"x"})",
+     "-1",
+     {kLookUp, kNoKey}},
+    {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1", kRefusedB, kRows,
+     "SELECT a,b,c FROM $  WHERE  (a='x' );", kAborted},
+    {R"(recList {"b":"-"}|recGetOne {"b":"-"})", "-1", kRefusedB, kRows, kSelect, kAborted},
+    {R"(recList {"a":"-"}|fillDefaultValue {"a":"x"} check|checkJsonType {"b":5})", "0", kFound},
+    {R"(recList {"a":{}}|recUpdateByFilter {"a":{}} {"a":"n"}|recDelete {"a":{}})", "T", kFound},
+    {R"(recUpdateByFilter {"a":"x"} {"b":"n"})", "-1", kFound, kRows,
+     "UPDATE $ SET  WHERE  (a='x' );"},
+    {R"(recUpdateByFilter {"b":"y"} {"a":"n"}|recDelete {"b":"y"})", "-1", kNoCondition},
+    {R"(recUpdateByFilter {"a":"x"} {"a":"n","b":"n"})", "0", kFound, "nyz,uvw"},
+    {R"(recUpdateByWhere {"b":"n"} 1)", "-1", kFound, kRows, "UPDATE $ SET  WHERE 1;"},
+    {R"(recUpdateByWhere {"a":"n","b":"n"} 1)", "0", kFound, "nyz,nvw"},
+    {R"(recDelete {"a":"x","b":"-"}|recDeleteByArray ["x"] a|recDeleteByName x a)", "1", kFound,
+     "uvw"},
+    {"recDeleteAll", "2", kFound, "NULL"},
+    {R"(recDeleteByArray ["x"] b|recDeleteByName x b)", "-1", kNoMember},
+    {"fillDefaultValue {} fill", R"(0 {"a":"d"})", kFound},
+    {"fillDefaultValue {} check", "-1", {kLookUp, error("lost data member=a")}},
+    {R"(checkJsonType {"a":5,"b":5})",
+     "-1",
+     {kLookUp, error(R"(type failed, strKey=a, jRecParam={"a":5,"b":5})")}},
+    {"SqlExpandMemberName", "0 a,b,c", {}},
+    {R"(SqlExpandMemberList {"a":"x","b":"y"} before 1)", "0  (a='x' )", kFound},
+    {R"(SqlExpandMemberList {"b":"y"} before 1)", "1", kFound},
+    {R"(SqlMakeByMatchField b "y")", "-1", kNoField},
+    {R"(SqlMakeByListField b ["y"])", "-1", kNoListField},
+};
 
 // Of types whose a has no word, which is an unknown one.
-inline Cases withoutAWord()
-{
-    const Lines row = rowRefused(error("type error, strType="), {}, R"({"b":"y"})",
-                                 "SELECT a,b,c FROM $  WHERE  (b='y' );");
-    const Lines noText = arrayRefused(R"(jType[szKey]["cpptype"].asString() != "string")", "a");
-    const std::string strNoX = "no such column: x";
-    const std::string strDelete = "DELETE FROM $  WHERE  (a=x );";
-    return {
-        {R"(recList {"b":"y"})", "-1", row},
-        {R"(recList {"a":"x"})", "-1",
-         listRefused(strNoX, R"({"a":"x"})", "SELECT a,b,c FROM $  WHERE  (a=x );")},
-        {R"(recGetOne {"b":"y"})", "-1", row + kNoOne},
-        {R"(recUpdateByFilter {"b":"y"} {"a":"n"})", "-1",
-         Lines{error("type not found!!, key=a")} +
-             filterRefused("0 > checkJsonType(jParamIn)", kNewA)},
-        {R"(recUpdateByWhere {"a":"n"} 1)", "-1",
-         updateRefused("no such column: n", kNewA, "UPDATE $ SET a=n WHERE 1;")},
-        {R"(recDelete {"a":"x"})",
-         "-1",
-         {runFailed(strNoX, strDelete), failed("0 > (err = runSqlEx(strSqlRun))"),
-          sqlError(strNoX, strDelete)}},
-        {"recDeleteAll", "2", {}, "NULL"},
-        {R"(recDeleteByArray ["x"] a)", "-1", noText},
-        {"recDeleteByName x a", "-1",
-         noText + nameRefused("0 > (err = recDeleteByArray(strVector, szKey))", "a")},
-        {"fillDefaultValue {} fill", "0", {}},
-        {"fillDefaultValue {} check", "-1", {error("lost data member=a")}},
-        {R"(checkJsonType {"a":"x"})", "-1", {error("type not found!!, key=a")}},
-        {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {error("cannot support this type=")}},
-        {R"(SqlExpandMemberSymbol before {"b":"y"})", "0 'y',", {}},
-        {R"(SqlExpandMemberList {"a":"x"} before 1)", "0  (a=x )", {}},
-        {R"(SqlMakeByMatchField a "x")", "0 a=x", {}},
-        {R"(SqlMakeByListField a ["x"])", "0 a in (x )", {}},
-    };
-}
+inline const std::string kNoText = failed(R"(jType[szKey]["cpptype"].asString() != "string")");
+inline const std::string kNoCheck = error("type not found!!, key=a");
+inline const Cases kWithoutAWord = {
+    {R"(recList {"b":"y"}|recGetOne {"b":"y"})", "-1", rowRefused(error("type error, strType=")),
+     kRows, "SELECT a,b,c FROM $  WHERE  (b='y' );", kAborted},
+    {R"(recList {"a":"x"})", "-1", {}, kRows, "SELECT a,b,c FROM $  WHERE  (a=x );", kNoX},
+    {R"(recUpdateByFilter {"b":"y"} {"a":"n"})",
+     "-1",
+     {kNoCheck, failed("0 > checkJsonType(jParamIn)")}},
+    {R"(recUpdateByWhere {"a":"x"} 1)", "-1", {}, kRows, "UPDATE $ SET a=x WHERE 1;", kNoX},
+    {R"(recDelete {"a":"x"})", "-1", {}, kRows, "DELETE FROM $  WHERE  (a=x );", kNoX},
+    {"recDeleteAll", "2", {}, "NULL"},
+    {R"(recDeleteByArray ["x"] a)", "-1", {kNoText}},
+    {"recDeleteByName x a",
+     "-1",
+     {kNoText, plain("recDeleteByArray failed, name=a, strVector=x"),
+      failed("0 > (err = recDeleteByArray(strVector, szKey))")}},
+    {"fillDefaultValue {} fill", "0", {}},
+    {"fillDefaultValue {} check", "-1", {error("lost data member=a")}},
+    {R"(checkJsonType {"a":"x"})", "-1", {kNoCheck}},
+    {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {error("cannot support this type=")}},
+    {R"(SqlExpandMemberSymbol before {"b":"y"})", "0 'y',", {}},
+    {R"(SqlExpandMemberList {"a":"x"} before 1)", "0  (a=x )", {}},
+    {R"(SqlMakeByMatchField a "x")", "0 a=x", {}},
+    {R"(SqlMakeByListField a ["x"])", "0 a in (x )", {}},
+};
 
 // Of types whose a has a word that is no text and has none: nothing is logged before it is thrown.
-inline Cases withAWordThatThrows()
-{
-    Cases cases = {
-        {"recDeleteAll", "2", {}, "NULL"},
-        {"fillDefaultValue {} fill", "0", {}},
-        {R"(SqlExpandMemberSymbol before {"b":"y"})", "0 'y',", {}},
-        {R"(SqlExpandMemberList {"a":"x"} before 1)", "T  (", {}},
-    };
-    for (const char* szCall :
-         {R"(recList {"a":"x"})", R"(recList {"b":"y"})", R"(recGetOne {"b":"y"})",
-          R"(recUpdateByFilter {"a":"x"} {"b":"n"})", R"(recUpdateByFilter {"b":"y"} {"a":"n"})",
-          R"(recUpdateByWhere {"a":"n"} 1)", R"(recDelete {"a":"x"})",
-          R"(recDeleteByArray ["x"] a)", "recDeleteByName x a", R"(checkJsonType {"a":"x"})",
-          R"(SqlExpandMemberSymbol before {"a":"x"})",
-          R"(SqlMakeByMatchField a "x")", R"(SqlMakeByListField a ["x"])"})
-        cases.push_back({szCall, "T", {}});
-    return cases;
-}
+inline const Cases kWithAWordThatThrows = {
+    {R"(recList {"a":"x"}|recList {"b":"y"}|recGetOne {"b":"y"}|recDelete {"a":"x"}|)"
+     R"(recUpdateByFilter {"a":"x"} {"b":"n"}|recUpdateByFilter {"b":"y"} {"a":"n"}|)"
+     R"(recUpdateByWhere {"a":"n"} 1|recDeleteByArray ["x"] a|recDeleteByName x a|)"
+     R"(checkJsonType {"a":"x"}|SqlExpandMemberSymbol before {"a":"x"}|)"
+     R"(SqlMakeByMatchField a "x"|SqlMakeByListField a ["x"])",
+     "T",
+     {}},
+    {"recDeleteAll", "2", {}, "NULL"},
+    {"fillDefaultValue {} fill", "0", {}},
+    {R"(SqlExpandMemberSymbol before {"b":"y"})", "0 'y',", {}},
+    {R"(SqlExpandMemberList {"a":"x"} before 1)", "T  (", {}},
+};
