@@ -4,6 +4,9 @@
 
 #include "calls.h"
 
+#include <algorithm>
+#include <climits>
+#include <cstdlib>
 #include <functional>
 
 namespace {
@@ -76,8 +79,7 @@ protected:
             for (const Written& row : kWritten) {
                 SCOPED_TRACE(strWord + " " + row.szValue);
                 const Ended ended = called(pTable->api, replaced(strCall, '$', row.szValue));
-                EXPECT_EQ(expected(row),
-                          ended.strEnd + (ended.strOut.empty() ? "" : " " + ended.strOut));
+                EXPECT_EQ(expected(row), ended.whole());
                 EXPECT_EQ("-1" == ended.strEnd, !takeLog().empty());
             }
         }
@@ -131,36 +133,23 @@ TEST_F(Boundaries, OfIntegersSavedAndReadBack)
 // Integers that another program stored, as text.
 TEST_F(Boundaries, OfIntegersInARow)
 {
-    const struct {
-        const char* szStored;
-        const char* szOf32Bits;
-        const char* szOf64Bits;
-    } cases[] = {
-        {"-99999999999999999999", "-2147483648", "-9223372036854775808"},
-        {"-9223372036854775809", "-2147483648", "-9223372036854775808"},
-        {"-9223372036854775808", "-2147483648", "-9223372036854775808"},
-        {"-2147483649", "-2147483648", "-2147483649"},
-        {"-2147483648", "-2147483648", "-2147483648"},
-        {"2147483647", "2147483647", "2147483647"},
-        {"2147483648", "2147483647", "2147483648"},
-        {"4294967295", "2147483647", "4294967295"},
-        {"4294967296", "2147483647", "4294967296"},
-        {"9223372036854775807", "2147483647", "9223372036854775807"},
-        {"9223372036854775808", "2147483647", "9223372036854775807"},
-        {"18446744073709551615", "2147483647", "9223372036854775807"},
-        {"18446744073709551616", "2147483647", "9223372036854775807"},
-    };
     for (const char* szWord : {"int", "unsigned int", "long long", "unsigned long long"}) {
         const auto pTable = tableOf(szWord);
         const bool blLong = std::string::npos != std::string(szWord).find("long");
-        for (const auto& row : cases) {
-            SCOPED_TRACE(std::string(szWord) + " " + row.szStored);
+        for (const char* szStored :
+             {"-99999999999999999999", "-9223372036854775809", "-9223372036854775808",
+              "-2147483649", "-2147483648", "2147483647", "2147483648", "4294967295", "4294967296",
+              "9223372036854775807", "9223372036854775808", "18446744073709551615",
+              "18446744073709551616"}) {
+            SCOPED_TRACE(std::string(szWord) + " " + szStored);
             database_.run("delete from " + pTable->strName + "; insert into " + pTable->strName +
-                          " values ('" + row.szStored + "')");
+                          " values ('" + szStored + "')");
             Json::Value jRequest;
             Json::Value jRecord;
             EXPECT_EQ(1, pTable->api.recGetOne(jRequest, jRecord));
-            EXPECT_EQ(blLong ? row.szOf64Bits : row.szOf32Bits, text(jRecord["m"]));
+            const long long iRead = strtoll(szStored, nullptr, 10);
+            EXPECT_EQ(blLong ? iRead : std::clamp<long long>(iRead, INT_MIN, INT_MAX),
+                      jRecord["m"].asInt64());
             EXPECT_EQ(Json::intValue, jRecord["m"].type());
         }
     }

@@ -17,6 +17,8 @@ inline constexpr const char* kKinds[] = {"null", "true", "-1",        "184467440
 struct Ended {
     std::string strEnd;  // the result, or T where the call threw Json::LogicError
     std::string strOut;  // an output that was changed: its JSON, or what was appended to its text
+
+    std::string whole() const { return strOut.empty() ? strEnd : strEnd + " " + strOut; }
 };
 
 inline bool isFailure(const std::string& strEnd)
@@ -52,9 +54,9 @@ protected:
     Table& tableOf(const std::string& strWord);
 
     // The call by a handle on the table ends so, with W for a failure that has written all the
-    // same. It logs exactly when it gives -1. Returns the output.
-    std::string checkCall(Table& table, VornJsonDbApi& api, const std::string& strCall,
-                          const std::string& strEnd);
+    // same. It logs exactly when it gives -1. An output is compared where one is expected.
+    void checkCall(Table& table, VornJsonDbApi& api, const std::string& strCall,
+                   const std::string& strExpected);
 
     // Handle and connection work.
     void expectSound(Table& table);

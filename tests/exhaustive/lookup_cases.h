@@ -5,6 +5,8 @@
 #include "calls.h"
 #include "support/records.h"
 
+#include <map>
+
 // In the expected lines: a look-up of the operation, one before the operation has listed columns,
 // and one of the row decoder, which has no definition. Each stands for the lines that it logs.
 inline const std::string kLookUp = "look-up";
@@ -17,7 +19,7 @@ inline constexpr char kRows[] = "xyz,uvw";
 struct Case {
     std::string strCalls;        // between bars
     const char* szEnd;           // the result and the output, if it changes
-    Lines lines;                 // up to the failed check; the call tells what follows
+    Lines lines;                 // up to the failed check; kAfter tells what follows
     const char* szRows = kRows;  // of the table afterwards
     // The statement that SQLite refuses, and why.
     std::string strSql = "";
@@ -25,60 +27,61 @@ struct Case {
 };
 using Cases = std::vector<Case>;
 
-// What the operation of that check logs where its statement is refused; the request or record is
-// shown, if any.
-inline Lines refused(const Case& c, const char* szCheck, const std::string& strShown = "")
-{
-    const Lines shown = strShown.empty() ? Lines() : Lines{plain(strShown)};
-    return Lines{runFailed(c.strError, c.strSql), failed(szCheck)} + shown +
-           Lines{sqlError(c.strError, c.strSql)};
-}
+// Parts of the lines below, of which those with a "!" stand for a refused statement alone.
+inline const std::string kRefused = "!statement";
+inline const std::string kError = "!error";
+inline const Lines kListed = {kRefused,
+                              failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
+                              plain("jRecParam=<1>"), kError};
+inline const std::string kUpdated = failed("0 > runSqlEx(strSql, NULL, NULL)");
+inline const std::string kSaved = failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)");
+inline const std::string kCreated = plain("call create rec, rec=<1>");
 
-// What a save logs after the failed check or statement, beside the look-ups.
-inline Lines notSaved(const Case& c, const std::string& strRecord, const std::string& strTypes)
-{
-    const std::string strShown =
-        std::string("blCreate=") + ('R' == c.strSql[0] ? "0" : "1") + ", jRecInOut=" + strRecord;
-    const Lines shown = {plain(strShown), plain("jType=" + strTypes)};
-    if (c.strSql.empty())
-        return Lines{failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)")} + shown;
-    return Lines{runFailed(c.strError, c.strSql),
-                 failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)")} +
-           shown + Lines{sqlError(c.strError, c.strSql)};
-}
+// What each operation logs after the failed check or statement. <1> is an argument; recCreate gets
+// its record with the defaults as its second one.
+inline const std::map<std::string, Lines> kAfter = {
+    {"recList", kListed},
+    {"recGetOne", kListed + Lines{failed("0 > recList(jRecParam, jRecArray)")}},
+    {"recDelete", {kRefused, "!" + failed("0 > (err = runSqlEx(strSqlRun))"), kError}},
+    {"recDeleteByArray", {plain("recDeleteByArray failed, name=<2>, strVector=x")}},
+    {"recDeleteByName", {plain("recDeleteByName failed, name=<2>, strValue=x")}},
+    {"recUpdateByWhere", {kRefused, kUpdated, plain("jRecIn=<1>"), kError}},
+    {"recUpdateByFilter",
+     {kRefused, "!" + kUpdated, "!" + plain("jRecIn=<2>"), kError,
+      "!" + failed("0 > recUpdateByWhere(jParamIn, strSql)"),
+      plain("recUpdateByFilter failed, jParamIn=<2>")}},
+    {"recSave",
+     {kRefused, "!" + kSaved, plain("blCreate=<2>, jRecInOut=<1>"), plain("jType=<types>"),
+      kError}},
+    {"recCreate",
+     {kRefused, "!" + kSaved, plain("blCreate=1, jRecInOut=<2>"), plain("jType=<types>"), kError,
+      failed("0 > recSave(jParam, true)"), plain("call create rec, rec=<2>")}},
+    {"recCreate {}", {kCreated}},
+    {"recCreate [1]", {kCreated}},
+};
 
-// What the operation logs after the failed check or statement. A record is shown as it is written,
-// with its defaults.
-inline Lines linesAfter(const Case& c, const std::vector<std::string>& words,
-                        const std::string& strTypes)
+// Every line of the call, which finds those types.
+inline Lines linesOf(const Case& c, const std::string& strCall, const std::string& strTypes)
 {
-    const std::string& strCall = words[0];
-    const bool blRan = !c.strSql.empty();
-    const std::string strCreate = "call create rec, rec=";
-    if ("recSave" == strCall) return notSaved(c, words[1], strTypes);
-    if ("recCreate" == strCall && 3 == words.size())
-        return notSaved(c, words[2], strTypes) +
-               Lines{failed("0 > recSave(jParam, true)"), plain(strCreate + words[2])};
-    if ("recCreate" == strCall) return {plain(strCreate + words[1])};
-    const char szList[] = "0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)";
-    if ("recList" == strCall) return refused(c, szList, "jRecParam=" + words[1]);
-    if ("recGetOne" == strCall)
-        return refused(c, szList, "jRecParam=" + words[1]) +
-               Lines{failed("0 > recList(jRecParam, jRecArray)")};
-    if ("recDelete" == strCall)
-        return blRan ? refused(c, "0 > (err = runSqlEx(strSqlRun))") : Lines();
-    const std::string strKey = "name=" + words.back();
-    if ("recDeleteByArray" == strCall)
-        return {plain("recDeleteByArray failed, " + strKey + ", strVector=x")};
-    if ("recDeleteByName" == strCall)
-        return {plain("recDeleteByName failed, " + strKey + ", strValue=x")};
-    const char szUpdate[] = "0 > runSqlEx(strSql, NULL, NULL)";
-    if ("recUpdateByWhere" == strCall) return refused(c, szUpdate, "jRecIn=" + words[1]);
-    if ("recUpdateByFilter" != strCall) return {};
-    const Lines updated = blRan ? refused(c, szUpdate, "jRecIn=" + words[2]) +
-                                      Lines{failed("0 > recUpdateByWhere(jParamIn, strSql)")}
-                                : Lines();
-    return updated + Lines{plain("recUpdateByFilter failed, jParamIn=" + words[2])};
+    std::map<std::string, std::string> texts = {{"<types>", strTypes}};
+    const std::vector<std::string> words = split(strCall, ' ');
+    for (std::size_t i = 1; i < words.size(); ++i) texts["<" + std::to_string(i) + ">"] = words[i];
+    if ("recSave" == words[0]) texts["<2>"] = "insert" == words[2] ? "1" : "0";
+    const auto own = kAfter.find(strCall);
+    const auto after = kAfter.end() == own ? kAfter.find(words[0]) : own;
+    Lines lines = c.lines;
+    if (kAfter.end() == after || '-' != c.szEnd[0]) return lines;
+    for (std::string strLine : after->second) {
+        if ('!' == strLine[0] && c.strSql.empty()) continue;
+        if (kRefused == strLine) strLine = runFailed(c.strError, c.strSql);
+        if (kError == strLine) strLine = sqlError(c.strError, c.strSql);
+        if ('!' == strLine[0]) strLine.erase(0, 1);
+        for (const auto& [strName, strText] : texts)
+            if (const std::size_t n = strLine.find(strName); std::string::npos != n)
+                strLine.replace(n, strName.size(), strText);
+        lines.push_back(strLine);
+    }
+    return lines;
 }
 
 // A row whose column the decoder refuses with that line; the first column is not traced.
@@ -94,6 +97,7 @@ inline constexpr char kAborted[] = "query aborted";
 inline constexpr char kSelect[] = "SELECT a,b,c FROM $ ;";
 inline const std::string kNoColumn = failed("!jType.isMember(strName)");
 inline const std::string kNoKey = failed("!jType.isMember(strKey)");
+inline const std::string kNoValue = failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)");
 inline const Lines kFound = {kLookUp};
 inline const Lines kNoMember = {kLookUp, failed("!jType.isMember(szKey)")};
 inline const Lines kNoField = {kLookUp, failed("!jType.isMember(strField)")};
@@ -101,6 +105,8 @@ inline const Lines kNoListField = {kLookUp, failed("!jType.isMember(szField)")};
 inline const Lines kNoCondition = {kLookUp, failed("strSql.empty()")};
 inline const Lines kSave = {kLookUp, kLookUp};
 inline const Lines kCreate = {kLookUp, kEarlyLookUp, kEarlyLookUp, kLookUp};
+
+// clang-format off
 
 // Of no types at all, beside the operations that list columns.
 inline const Cases kWithoutTypes = {
@@ -140,8 +146,8 @@ inline const Cases kWithoutColumns = {
 
 // Of types that are no object and a definition with columns: none of them is found.
 inline const Cases kWithColumns = {
-    {R"(recSave {"a":"x"} insert)", "-1", kSave + Lines{kNoKey}},
-    {R"(recCreate {"a":"x"} {"a":"x"})", "-1", kCreate + Lines{kNoKey}},
+    {R"(recSave {"a":"x"} insert)", "-1", kSave + Lines{kNoKey, kNoValue}},
+    {R"(recCreate {"a":"x"} {"a":"x"})", "-1", kCreate + Lines{kNoKey, kNoValue}},
     {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1",
      Lines{kLookUp, kDecoder} + rowRefused(kNoColumn), kRows, kSelect, kAborted},
     {"SqlExpandMemberName", "0 a,b,c", {}},
@@ -152,10 +158,8 @@ inline const Cases kWithColumns = {
 inline const Lines kRefusedB =
     kFound + rowRefused(kNoColumn, {plain("column_name[1]=b"), plain("column_value[1]=y")});
 inline const Cases kWithPartialTypes = {
-    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2} {"a":"d","b":1,"c":2}|)"
-     R"(SqlExpandMemberSymbol before {"a":"x"})",
-     "-1",
-     {kLookUp, kNoKey}},
+    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2} {"a":"d","b":1,"c":2})", "-1", {kLookUp, kNoKey, kNoValue}},
+    {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {kLookUp, kNoKey}},
     {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1", kRefusedB, kRows,
      "SELECT a,b,c FROM $  WHERE  (a='x' );", kAborted},
     {R"(recList {"b":"-"}|recGetOne {"b":"-"})", "-1", kRefusedB, kRows, kSelect, kAborted},

@@ -109,12 +109,10 @@ private:
         database_.run("delete from " + strName_ + ";insert into " + strName_ +
                       " values ('x','y','z'),('u','v','w')");
         const Ended ended = called(api, strCall);
-        EXPECT_EQ(c.szEnd, ended.strEnd + (ended.strOut.empty() ? "" : " " + ended.strOut));
-        const Lines after =
-            "-1" == ended.strEnd ? linesAfter(c, split(strCall, ' '), lookUps.strTypes) : Lines();
+        EXPECT_EQ(c.szEnd, ended.whole());
         Lines expected;
         Lines look = lookUps.first;
-        for (const std::string& strLine : c.lines + after) {
+        for (const std::string& strLine : linesOf(c, strCall, lookUps.strTypes)) {
             if (kLookUp == strLine)
                 expected = expected + std::exchange(look, lookUps.later);
             else if (kEarlyLookUp == strLine)
