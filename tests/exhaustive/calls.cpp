@@ -51,16 +51,14 @@ int ignoreRow(void*, int, char**, char**)
     return 0;
 }
 
-int setAndGetMessage(VornJsonDbApi& api, const std::string& strMessage)
-{
-    api.setErrMsg("x");
-    api.setErrMsg(strMessage);
-    return strMessage == api.getErrMsg() ? 0 : -1;
-}
-
 const std::map<std::string, int (*)(Call& c)> kFunctions = {
     {"tableCreate", [](Call& c) { return c.api.tableCreate(); }},
-    {"setErrMsg", [](Call& c) { return setAndGetMessage(c.api, c.text(1)); }},
+    {"setErrMsg",
+     [](Call& c) {
+         c.api.setErrMsg("x");
+         c.api.setErrMsg(c.text(1));
+         return c.text(1) == c.api.getErrMsg() ? 0 : -1;
+     }},
     {"runSqlEx",
      [](Call& c) {
          return c.api.runSqlEx(c.text(1), c.is(2, "callback") ? ignoreRow : nullptr,

@@ -111,19 +111,15 @@ inline const Lines kCreate = {kLookUp, kEarlyLookUp, kEarlyLookUp, kLookUp};
 // Of no types at all, beside the operations that list columns.
 inline const Cases kWithoutTypes = {
     {R"(recUpdateByFilter {"a":"x"} {"a":"n"}|recDelete {"a":"x"})", "-1", kNoCondition},
-    {R"(recUpdateByFilter {"vornSqlWhereFilter":"1"} {"a":"n"})",
-     "-1",
-     {kLookUp, kLookUp, kLookUp},
-     kRows,
-     "UPDATE $ SET  WHERE  ( 1  );"},
+    {R"(recUpdateByFilter {"vornSqlWhereFilter":"1"} {"a":"n"})", "-1",
+     {kLookUp, kLookUp, kLookUp}, kRows, "UPDATE $ SET  WHERE  ( 1  );"},
     {R"(recUpdateByWhere {"a":"n"} 1)", "-1", kFound, kRows, "UPDATE $ SET  WHERE 1;"},
     {"recDelete [1]", "-1", {failed("jRecParam.type() != Json::objectValue")}},
     {R"(recDelete {"a":"x","vornSqlWhereFilter":"a='u'"})", "1", kFound, "xyz"},
     {"recDeleteAll", "2", kFound, "NULL"},
     {R"(recDeleteByArray ["x"] a|recDeleteByName x a)", "-1", kNoMember},
     {"recCreate {}", "-1", {failed("jRecIn.empty()")}},
-    {"recCreate [1]",
-     "-1",
+    {"recCreate [1]", "-1",
      {kLookUp, kLookUp, failed("!jRecParam.isObject()"), failed("0 > checkJsonType(jParam)")}},
     {R"(fillDefaultValue {} fill|fillDefaultValue {} check|checkJsonType {"a":5})", "0", kFound},
     {R"(SqlExpandMemberList {"a":"x"} before 1)", "1", kFound},
@@ -158,7 +154,8 @@ inline const Cases kWithColumns = {
 inline const Lines kRefusedB =
     kFound + rowRefused(kNoColumn, {plain("column_name[1]=b"), plain("column_value[1]=y")});
 inline const Cases kWithPartialTypes = {
-    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2} {"a":"d","b":1,"c":2})", "-1", {kLookUp, kNoKey, kNoValue}},
+    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2} {"a":"d","b":1,"c":2})", "-1",
+     {kLookUp, kNoKey, kNoValue}},
     {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {kLookUp, kNoKey}},
     {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1", kRefusedB, kRows,
      "SELECT a,b,c FROM $  WHERE  (a='x' );", kAborted},
@@ -177,8 +174,7 @@ inline const Cases kWithPartialTypes = {
     {R"(recDeleteByArray ["x"] b|recDeleteByName x b)", "-1", kNoMember},
     {"fillDefaultValue {} fill", R"(0 {"a":"d"})", kFound},
     {"fillDefaultValue {} check", "-1", {kLookUp, error("lost data member=a")}},
-    {R"(checkJsonType {"a":5,"b":5})",
-     "-1",
+    {R"(checkJsonType {"a":5,"b":5})", "-1",
      {kLookUp, error(R"(type failed, strKey=a, jRecParam={"a":5,"b":5})")}},
     {"SqlExpandMemberName", "0 a,b,c", {}},
     {R"(SqlExpandMemberList {"a":"x","b":"y"} before 1)", "0  (a='x' )", kFound},
@@ -194,15 +190,13 @@ inline const Cases kWithoutAWord = {
     {R"(recList {"b":"y"}|recGetOne {"b":"y"})", "-1", rowRefused(error("type error, strType=")),
      kRows, "SELECT a,b,c FROM $  WHERE  (b='y' );", kAborted},
     {R"(recList {"a":"x"})", "-1", {}, kRows, "SELECT a,b,c FROM $  WHERE  (a=x );", kNoX},
-    {R"(recUpdateByFilter {"b":"y"} {"a":"n"})",
-     "-1",
+    {R"(recUpdateByFilter {"b":"y"} {"a":"n"})", "-1",
      {kNoCheck, failed("0 > checkJsonType(jParamIn)")}},
     {R"(recUpdateByWhere {"a":"x"} 1)", "-1", {}, kRows, "UPDATE $ SET a=x WHERE 1;", kNoX},
     {R"(recDelete {"a":"x"})", "-1", {}, kRows, "DELETE FROM $  WHERE  (a=x );", kNoX},
     {"recDeleteAll", "2", {}, "NULL"},
     {R"(recDeleteByArray ["x"] a)", "-1", {kNoText}},
-    {"recDeleteByName x a",
-     "-1",
+    {"recDeleteByName x a", "-1",
      {kNoText, plain("recDeleteByArray failed, name=a, strVector=x"),
       failed("0 > (err = recDeleteByArray(strVector, szKey))")}},
     {"fillDefaultValue {} fill", "0", {}},
@@ -221,11 +215,11 @@ inline const Cases kWithAWordThatThrows = {
      R"(recUpdateByFilter {"a":"x"} {"b":"n"}|recUpdateByFilter {"b":"y"} {"a":"n"}|)"
      R"(recUpdateByWhere {"a":"n"} 1|recDeleteByArray ["x"] a|recDeleteByName x a|)"
      R"(checkJsonType {"a":"x"}|SqlExpandMemberSymbol before {"a":"x"}|)"
-     R"(SqlMakeByMatchField a "x"|SqlMakeByListField a ["x"])",
-     "T",
+     R"(SqlMakeByMatchField a "x"|SqlMakeByListField a ["x"])", "T",
      {}},
     {"recDeleteAll", "2", {}, "NULL"},
     {"fillDefaultValue {} fill", "0", {}},
     {R"(SqlExpandMemberSymbol before {"b":"y"})", "0 'y',", {}},
     {R"(SqlExpandMemberList {"a":"x"} before 1)", "T  (", {}},
 };
+// clang-format on

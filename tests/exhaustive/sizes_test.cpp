@@ -2,7 +2,7 @@
 // How wide, long and deep records may be. Each failed look-up of member types logs those of all
 // tables, so the tests of look-ups run before the wide tables here.
 
-#include "support/matrix.h"
+#include "calls.h"
 
 #include <pthread.h>
 #include <functional>
@@ -11,75 +11,62 @@ namespace {
 
 class LargeRecords : public TableTest {};
 
-// SQLite's default limit.
-constexpr int kMaxColumns = 2000;
-
-// A definition of that many members, "c0000" and so on.
+// A definition of that many columns, "c0000" and so on, and a record of them, as JSON.
 struct Wide {
     explicit Wide(int nColumns)
     {
         for (int i = 0; i < nColumns; ++i) {
-            char szName[16];
-            snprintf(szName, sizeof(szName), "c%04d", i);
-            jMembers[szName]["cpptype"] = 0 == i % 2 ? "int" : "string";
-            strColumns += std::string(0 == i ? "" : ",") + szName;
-            jRecord[szName] =
-                0 == i % 2 ? Json::Value(i) : Json::Value("it's " + std::to_string(i));
+            const std::string strComma = 0 == i ? "" : ",";
+            const std::string strName = "c" + std::to_string(10000 + i);
+            const bool blText = 0 != i % 2;
+            strColumns += strComma + strName;
+            strMembers += strComma + '"' + strName + "\":{\"cpptype\":\"" +
+                          (blText ? "string" : "int") + "\"}";
+            strRecord += strComma + '"' + strName +
+                         "\":" + (blText ? "\"it's" + std::to_string(i) + '"' : std::to_string(i));
+            // SQLite's limit for the depth of an expression is 1,000.
+            if (899 == i) strRequest = "{" + strRecord + "}";
         }
+        strMembers = "{" + strMembers + "}";
+        strRecord = "{" + strRecord + "}";
     }
 
-    Json::Value jMembers;
-    std::string strColumns;
-    Json::Value jRecord;
+    std::string strColumns, strMembers, strRecord, strRequest;
 };
+
+// SQLite's default limit.
+constexpr int kMaxColumns = 2000;
 
 TEST_F(LargeRecords, MayHaveAsManyColumnsAsSqliteTakes)
 {
     const Wide wide(kMaxColumns);
-    Table table(database_, text(wide.jMembers), wide.strColumns);
-    Json::Value jRecord = wide.jRecord;
-    Json::Value jStored;
-    EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
-    EXPECT_EQ(wide.jRecord, jStored);
-    Json::Value jRequest;
-    Json::Value jFetched;
-    EXPECT_EQ(1, table.api.recGetOne(jRequest, jFetched));
-    EXPECT_EQ(wide.jRecord, jFetched);
-    EXPECT_EQ(0, table.api.recSave(jRecord, true));
-    std::string strWhere = "1";
-    EXPECT_EQ(0, table.api.recUpdateByWhere(jRecord, strWhere));
-    // SQLite's limit for the depth of an expression is 1,000.
-    for (const std::string& strName : wide.jRecord.getMemberNames())
-        if (jRequest.size() < 900) jRequest[strName] = wide.jRecord[strName];
-    Json::Value jRecords;
-    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
-    ASSERT_EQ(2U, jRecords.size());
-    for (const Json::Value& jListed : jRecords) EXPECT_EQ(wide.jRecord, jListed);
+    const std::string& strRecord = wide.strRecord;
+    Table table(database_, wide.strMembers, wide.strColumns);
+    const auto end = [&](const std::string& strCall) { return called(table.api, strCall).whole(); };
+    EXPECT_EQ("0 " + strRecord, end("recCreate " + strRecord + " {}"));
+    EXPECT_EQ("1 " + strRecord, end("recGetOne null {}"));
+    EXPECT_EQ("0", end("recSave " + strRecord + " insert"));
+    EXPECT_EQ("0", end("recUpdateByWhere " + strRecord + " 1"));
+    EXPECT_EQ("0 [" + strRecord + "," + strRecord + "]", end("recList " + wide.strRequest + " []"));
     EXPECT_EQ(Lines(), takeLog());
-    EXPECT_EQ(-1, table.api.recList(jRecord, jRecords));
-    EXPECT_EQ(-1, table.api.recDelete(jRecord));
+    EXPECT_EQ("-1", end("recList " + strRecord));
+    EXPECT_EQ("-1", end("recDelete " + strRecord));
     takeLog();
     EXPECT_EQ("2", database_.value("select count(*) from " + table.strName));
-    expectSound(database_, table.api, text(wide.jRecord));
+    expectSound(database_, table.api, strRecord);
 }
 
 TEST_F(LargeRecords, MayNotHaveOneColumnMore)
 {
     const Wide wide(kMaxColumns + 1);
     std::string strName = freshName();
-    Json::Value jDefinition;
-    jDefinition[strName]["member"] = wide.jMembers;
+    Json::Value jDefinition = json("{\"" + strName + "\":{\"member\":" + wide.strMembers + "}}");
     std::string strCreate = "create table " + strName + " (" + wide.strColumns + ")";
     VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
     EXPECT_EQ(plain("sql error, err=too many columns on " + strName + ", sql=" + strCreate),
               takeLog().at(2));
-    Json::Value jRecord = wide.jRecord;
-    Json::Value jStored;
-    EXPECT_EQ(-1, api.recCreate(jRecord, jStored));
-    EXPECT_EQ(wide.jRecord, jRecord);
-    Json::Value jRequest;
-    EXPECT_EQ(-1, api.recList(jRequest, jStored));
-    EXPECT_TRUE(jStored.isNull());
+    EXPECT_EQ("-1", called(api, "recCreate " + wide.strRecord).whole());
+    EXPECT_EQ("-1", called(api, "recList null").whole());
     EXPECT_LE(3U, takeLog().size());
     Table sound(database_, R"({"z":{"cpptype":"string"}})", "z");
     expectSound(database_, sound.api, R"({"z":"sound"})");
@@ -116,9 +103,7 @@ TEST_F(LargeRecords, MayHoldATextOfAMebibyte)
     Json::Value jByJson;
     jByJson["o"] = jRecord["o"];
     Json::Value jByFilter;
-    char* szFilter = sqlite3_mprintf("s = %Q", longText().c_str());
-    jByFilter["vornSqlWhereFilter"] = szFilter;
-    sqlite3_free(szFilter);
+    jByFilter["vornSqlWhereFilter"] = "s = '" + replaced(longText(), '\'', "''") + "'";
     for (Json::Value* pjRequest : {&jByText, &jByItem, &jByJson, &jByFilter}) {
         Json::Value jFound;
         EXPECT_EQ(0, table.api.recList(*pjRequest, jFound));
@@ -169,7 +154,7 @@ void onKnownStack(std::function<void()> work)
     pthread_attr_destroy(&attributes);
 }
 
-// [[[]]] or {"k":{"k":{}}}, as value and as text.
+// [[[]]] or {"k":{"k":{}}}
 Json::Value nested(Json::ValueType type, std::size_t nLevels)
 {
     Json::Value jValue(type);
@@ -181,23 +166,14 @@ Json::Value nested(Json::ValueType type, std::size_t nLevels)
     return jValue;
 }
 
-std::string nestedText(Json::ValueType type, std::size_t nLevels)
-{
-    const bool blArray = Json::arrayValue == type;
-    std::string strText = blArray ? "[]" : "{}";
-    std::string strOpening;
-    for (std::size_t i = 1; i < nLevels; ++i) strOpening += blArray ? "[" : "{\"k\":";
-    return strOpening + strText + std::string(nLevels - 1, blArray ? ']' : '}');
-}
-
 void storeAndAsk(Database& database, Table& table, std::size_t nLevels)
 {
     SCOPED_TRACE(nLevels);
-    const std::string strArrays = nestedText(Json::arrayValue, nLevels);
-    const std::string strObjects = nestedText(Json::objectValue, nLevels);
     Json::Value jRecord;
     jRecord["a"] = nested(Json::arrayValue, nLevels);
     jRecord["o"] = nested(Json::objectValue, nLevels);
+    const std::string strArrays = text(jRecord["a"]);
+    const std::string strObjects = text(jRecord["o"]);
     Json::Value jStored;
     EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
     EXPECT_EQ((Rows{{strArrays, strObjects}}), database.rows("select a, o from " + table.strName));
