@@ -38,8 +38,7 @@ Ended called(VornJsonDbApi& api, const std::string& strCall);
 // The parts between the separators that are not empty.
 std::vector<std::string> split(const std::string& strText, char cSeparator);
 
-// The text with every c replaced.
-std::string replaced(std::string strText, char c, const std::string& strBy);
+std::string replaced(const std::string& strText, char cOld, const std::string& strNew);
 
 template <typename Item>
 std::vector<Item> operator+(std::vector<Item> items, const std::vector<Item>& more)

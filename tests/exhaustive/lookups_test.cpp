@@ -198,11 +198,10 @@ TEST_F(LookUps, FailOnTypesThatLackAColumn)
          {plain("column_name[2]=c"), plain("column_value[2]=z")}},
         {"{}", {}},
     };
-    for (const auto& [szEntry, traced] : cases) {
-        expect({{"recList null|recGetOne null", "-1", rowRefused(kNoColumn, traced), kRows, kSelect,
-                 kAborted}},
-               kWhole, {}, szEntry);
-    }
+    const char szCalls[] = "recList null|recGetOne null";
+    for (const auto& [szEntry, traced] : cases)
+        expect({{szCalls, "-1", rowRefused(kNoColumn, traced), kRows, kSelect, kAborted}}, kWhole,
+               {}, szEntry);
 }
 
 TEST_F(LookUps, TakeAMemberOfAWrongKindForOneOfAnUnknownWord)
