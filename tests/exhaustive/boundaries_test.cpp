@@ -84,9 +84,9 @@ const struct {
     {"unsigned long long", kSave, &Written::szUnsignedLongLong, R"(0 {"m":)", "}"},
 };
 
-class Boundaries : public TableTest {};
+class IntegerBounds : public TableTest {};
 
-TEST_F(Boundaries, OfIntegersInCalls)
+TEST_F(IntegerBounds, HoldInEveryCall)
 {
     for (const auto& call : kCalls)
         for (const std::string& strWord : split(call.strWords, '|')) {
@@ -104,7 +104,7 @@ TEST_F(Boundaries, OfIntegersInCalls)
 }
 
 // Integers that another program stored, as text.
-TEST_F(Boundaries, OfIntegersInRows)
+TEST_F(IntegerBounds, HoldInRowsOfAnotherProgram)
 {
     for (const char* szWord : {"int", "unsigned int", "long long", "unsigned long long"}) {
         Table table(database_, std::string(R"({"m":{"cpptype":")") + szWord + "\"}}", "m");

@@ -168,12 +168,13 @@ const Row kMembers[] = {
 };
 // clang-format on
 
-// The value is at "$" and the table's name at "!". An end of each kind of value.
+// A definition with the value at "$" and the table's name at "!", and the ends of calls by a
+// handle with it.
 struct DefinitionRow {
     const char* szDefinition;
     const char* szList;
     const char* szSave;
-    const char* szDelete;  // and recType: null where it fails
+    const char* szDelete;  // recType gives null where it fails
 };
 
 constexpr char kFails[] = "-1 -1 -1 -1 -1 -1 -1 -1 -1 -1 -1";
@@ -194,7 +195,7 @@ const DefinitionRow kDefinitions[] = {
     {R"({"!":{"member":{"m":{"cpptype":"int"},"n":$}}})", kFails, kFails, kWorks},
 };
 
-class Matrix : public CallTest {
+class EveryCall : public CallTest {
 protected:
     void check(const Row& row, const std::vector<std::string>& kinds)
     {
@@ -261,7 +262,7 @@ private:
     }
 };
 
-TEST_F(Matrix, OfJsonArguments)
+TEST_F(EveryCall, TakesAnyKindOfJsonValue)
 {
     std::vector<std::string> kinds(std::begin(kKinds), std::end(kKinds));
     kinds.emplace_back("@");
@@ -269,7 +270,7 @@ TEST_F(Matrix, OfJsonArguments)
     printFigure("matrix cells, JSON arguments", nCells_);
 }
 
-TEST_F(Matrix, OfMembersByTypeWord)
+TEST_F(EveryCall, TakesAnyKindOfMemberOfAnyTypeWord)
 {
     for (const Row& row : kMembers) check(row, {std::begin(kKinds), std::end(kKinds)});
     for (const auto& [strCall, words] : words_)
@@ -278,7 +279,7 @@ TEST_F(Matrix, OfMembersByTypeWord)
     printFigure("matrix cells, members by type word", nCells_);
 }
 
-TEST_F(Matrix, OfDefinitions)
+TEST_F(EveryCall, TakesADefinitionWithAnyKindOfValue)
 {
     for (const DefinitionRow& row : kDefinitions)
         for (std::size_t i = 0; i < std::size(kKinds); ++i) {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Null and empty for every text and pointer of every function, and handles made of nothing.
+// Null and empty for every text and pointer of every function, and for those of the constructor.
 
 #include "calls.h"
 
@@ -40,9 +40,9 @@ const struct Row {
     {"convert2ReadableTime 0 before 0|getTimeAfterNow 0 before 0", "-1", "-1"},
 };
 
-class Texts : public CallTest {};
+class EmptyArguments : public CallTest {};
 
-TEST_F(Texts, MayBeNullOrEmpty)
+TEST_F(EmptyArguments, AreSafeForEveryCall)
 {
     Table& table = tableOf("int");
     VornJsonDbApi unconnected(nullptr, table.strName, table.jDefinition, table.strCreate);
@@ -91,7 +91,7 @@ void checkHandleWithout(int iMissing, Database& database, Table& table)
         }
 }
 
-TEST_F(Texts, MayBeMissingInAHandle)
+TEST_F(EmptyArguments, AreSafeForAHandle)
 {
     constexpr int kChoices = 16;
     // In a process of its own, because the member types of the empty name would stay.
