@@ -4,6 +4,7 @@
 
 #include "lookup_cases.h"
 
+#include <map>
 #include <utility>
 
 namespace {
@@ -53,41 +54,39 @@ Lines lookUp(const std::string& strCondition, const std::string& strDefinition,
             utilPlain("jTableDef=" + strDefinition), utilPlain("jType=" + strEntry)};
 }
 
-// What the look-ups log: the first on a table, those before and after the columns were listed.
-struct LookUpLines {
-    Lines first, early, later, decoder;
-    std::string strTypes = "null";  // that are found then
+// The types that calls meet.
+struct Types {
+    std::string strDefinition;
+    std::string strCondition = "";  // of the look-up that fails, if any
+    std::string strFirst = "-";     // the table's entry when the first look-up fails
+    std::string strEntry = "null";  // and afterwards; it fails again where it is no object
+    std::string strLater = "";      // the definition after the column list, if it differs
+    bool blByHost = false;          // has put the entry there before the call
 };
 
 class LookUps : public TableTest {
 protected:
-    // Each case on a table of its own, and once more where later look-ups log other lines. Where
-    // strEntry is given, the host has put it in place of the table's types.
-    void expect(const Cases& cases, const std::string& strDefinition, const LookUpLines& lookUps,
-                const std::string& strEntry = "")
+    // Each call on a table of its own, and once more where later look-ups log other lines.
+    void expect(const Cases& cases, const Types& types)
     {
-        const bool blChange = lookUps.first != lookUps.later;
-        const LookUpLines later = {lookUps.later, lookUps.later, lookUps.later, lookUps.decoder,
-                                   lookUps.strTypes};
         strName_ = freshName();
         for (const Case& c : cases)
             for (const std::string& strCall : split(c.strCalls, '|')) {
-                SCOPED_TRACE(strCall + " on " + strDefinition + strEntry);
-                if (blChange) strName_ = freshName();
-                const auto pApi = handleOf(strDefinition, strEntry);
-                expectCall(c, strCall, *pApi, lookUps);
-                if (blChange) expectCall(c, strCall, *pApi, later);
+                SCOPED_TRACE(strCall + " on " + types.strDefinition + types.strEntry);
+                if (!types.blByHost) strName_ = freshName();
+                const auto pApi = handleOf(types);
+                expectCall(c, strCall, *pApi, types, !types.blByHost);
+                if (!types.blByHost) expectCall(c, strCall, *pApi, types, false);
             }
     }
 
-    std::unique_ptr<VornJsonDbApi> handleOf(const std::string& strDefinition,
-                                            const std::string& strEntry = "")
+    std::unique_ptr<VornJsonDbApi> handleOf(const Types& types)
     {
         std::string strCreate = "create table if not exists " + strName_ + " (a, b, c)";
-        Json::Value jDefinition = json(replaced(strDefinition, '$', strName_));
+        Json::Value jDefinition = json(replaced(types.strDefinition, '$', strName_));
         auto pApi =
             std::make_unique<VornJsonDbApi>(database_.get(), strName_, jDefinition, strCreate);
-        if (!strEntry.empty()) VORN_JSON_DB::recType(jDefinition, strName_) = json(strEntry);
+        if (types.blByHost) VORN_JSON_DB::recType(jDefinition, strName_) = json(types.strEntry);
         takeLog();
         return pApi;
     }
@@ -104,21 +103,27 @@ protected:
 
 private:
     void expectCall(const Case& c, const std::string& strCall, VornJsonDbApi& api,
-                    const LookUpLines& lookUps)
+                    const Types& types, bool blFirst)
     {
         database_.run("delete from " + strName_ + ";insert into " + strName_ +
                       " values ('x','y','z'),('u','v','w')");
         const Ended ended = called(api, strCall);
         EXPECT_EQ(c.szEnd, ended.whole());
+        const auto again = [&](const std::string& strDefinition) {
+            return '{' == types.strEntry[0] ? Lines()
+                                            : lookUp(kPoisoned, strDefinition, types.strEntry);
+        };
+        const Lines later = again(types.strLater.empty() ? types.strDefinition : types.strLater);
+        std::map<std::string, Lines> lookUps = {
+            {kEarlyLookUp, blFirst ? again(types.strDefinition) : later},
+            {kDecoder, again("null")}};
+        lookUps[kLookUp] =
+            blFirst ? lookUp(types.strCondition, types.strDefinition, types.strFirst) : later;
         Lines expected;
-        Lines look = lookUps.first;
-        for (const std::string& strLine : linesOf(c, strCall, lookUps.strTypes)) {
-            if (kLookUp == strLine)
-                expected = expected + std::exchange(look, lookUps.later);
-            else if (kEarlyLookUp == strLine)
-                expected = expected + lookUps.early;
-            else
-                expected = expected + (kDecoder == strLine ? lookUps.decoder : Lines{strLine});
+        for (const std::string& strLine : linesOf(c, strCall, types.strEntry)) {
+            const auto look = lookUps.find(strLine);
+            expected = expected + (lookUps.end() == look ? Lines{strLine} : look->second);
+            if (kLookUp == strLine) look->second = later;
         }
         expectLog(expected);
         EXPECT_EQ(c.szRows, database_.value("select group_concat(a||b||c) from " + strName_));
@@ -145,43 +150,30 @@ private:
 TEST_F(LookUps, FailOnABadDefinition)
 {
     for (const auto& bad : kBadDefinitions) {
-        const Lines first = lookUp(bad.szCondition, bad.szDefinition, "-");
-        const Lines early = lookUp(kPoisoned, bad.szDefinition, "null");
-        const Lines later = lookUp(kPoisoned, bad.szLater, "null");
+        expect(kWithoutTypes, {bad.szDefinition, bad.szCondition});
         // The column list leaves the table in the handle's copy.
-        expect(kWithoutColumns, bad.szDefinition, {first, early, later, {}});
-        expect(kWithoutTypes, bad.szDefinition, {first, early, early, {}});
+        expect(kWithoutColumns, {bad.szDefinition, bad.szCondition, "-", "null", bad.szLater});
     }
 }
 
 TEST_F(LookUps, FailOnTypesOfAWrongKind)
 {
-    for (const char* szEntry : {"null", "[{\"a\":1}]", "\"a\"", "5", "true"}) {
-        const Lines look = lookUp(kPoisoned, kWhole, szEntry);
-        const LookUpLines lookUps = {look, look, look, lookUp(kPoisoned, "null", szEntry), szEntry};
-        expect(kWithoutTypes + kWithColumns, kWhole, lookUps, szEntry);
-    }
+    for (const char* szEntry : {"null", "[{\"a\":1}]", "\"a\"", "5", "true"})
+        expect(kWithoutTypes + kWithColumns, {kWhole, "", "", szEntry, "", true});
 }
 
 TEST_F(LookUps, EndAtAMemberWithoutAWord)
 {
-    const std::pair<std::string, std::string> cases[] = {{"{}", kNoWord},
-                                                         {"\"int\"", kNoWord},
-                                                         {"null", kNoWord},
-                                                         {R"({"cpptype":5})", kWordIsNoText}};
-    for (const auto& [strMember, strCondition] : cases) {
+    for (const char* szMember : {"{}", "\"int\"", "null", R"({"cpptype":5})"}) {
+        const std::string strMember = szMember;
+        const std::string strCondition =
+            std::string::npos == strMember.find("cpptype") ? kNoWord : kWordIsNoText;
         // The first member: no types.
-        const std::string strNone = defined(typesOf(strMember));
-        const Lines later = lookUp(kPoisoned, strNone, "null");
-        expect(
-            kWithoutTypes + kWithColumns, strNone,
-            {lookUp(strCondition, strNone, "-"), later, later, lookUp(kPoisoned, "null", "null")});
+        expect(kWithoutTypes + kWithColumns, {defined(typesOf(strMember)), strCondition});
         // The second one: those of the first.
         const std::string strA = R"({"a":{"cppDefaultValue":"d","cpptype":"string"})";
-        const std::string strPartial =
-            defined(strA + R"(,"b":)" + strMember + R"(,"c":{"cpptype":"string"}})");
-        expect(kWithPartialTypes, strPartial,
-               {lookUp(strCondition, strPartial, strA + "}"), {}, {}, {}, strA + "}"});
+        const std::string strRest = R"(,"b":)" + strMember + R"(,"c":{"cpptype":"string"}})";
+        expect(kWithPartialTypes, {defined(strA + strRest), strCondition, strA + "}", strA + "}"});
     }
 }
 
@@ -197,21 +189,21 @@ TEST_F(LookUps, FailOnTypesThatLackAColumn)
     };
     const char szCalls[] = "recList null|recGetOne null";
     for (const auto& [szEntry, traced] : cases)
-        expect({{szCalls, "-1", rowRefused(kNoColumn, traced), kRows, kSelect, kAborted}}, kWhole,
-               {}, szEntry);
+        expect({{szCalls, "-1", rowRefused(kNoColumn, traced), kRows, kSelect, kAborted}},
+               {kWhole, "", "", szEntry, "", true});
 }
 
 TEST_F(LookUps, TakeAMemberOfAWrongKindForOneOfAnUnknownWord)
 {
     for (const char* szA : {"{}", "null", R"({"cpptype":null})", "5", "\"string\"", "[\"string\"]"})
-        expect(kWithoutAWord, kWhole, {}, typesOf(szA));
+        expect(kWithoutAWord, {kWhole, "", "", typesOf(szA), "", true});
     for (const char* szA : {R"({"cpptype":["string"]})", R"({"cpptype":{}})"})
-        expect(kWithAWordThatThrows, kWhole, {}, typesOf(szA));
+        expect(kWithAWordThatThrows, {kWhole, "", "", typesOf(szA), "", true});
 }
 
 TEST_F(LookUps, SucceedOnceTheHostHasRepairedTheEntry)
 {
-    const auto pApi = handleOf(kWhole);
+    const auto pApi = handleOf({kWhole});
     Json::Value jNone;
     Json::Value& jEntry = VORN_JSON_DB::recType(jNone, strName_);
     EXPECT_TRUE(jEntry.isNull());
