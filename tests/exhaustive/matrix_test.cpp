@@ -215,8 +215,6 @@ protected:
             }
     }
 
-    std::map<std::string, std::set<std::string>> words_;  // of each call that was checked
-
     void checkDefinition(const DefinitionRow& row, std::size_t iKind)
     {
         std::string strName = freshName();
@@ -239,13 +237,15 @@ protected:
             EXPECT_EQ(isFailure(strEnd), !takeLog().empty()) << szCall;
         }
         const bool blKnown = "0" == split(row.szDelete, ' ').at(iKind);
-        const Json::Value& jTypes = VORN_JSON_DB::recType(jGiven, strName);
-        EXPECT_EQ(blKnown ? Json::objectValue : Json::nullValue, jTypes.type());
+        EXPECT_EQ(blKnown ? Json::objectValue : Json::nullValue,
+                  VORN_JSON_DB::recType(jGiven, strName).type());
         EXPECT_EQ(jDefinition, jGiven);
         takeLog();
         expectSound(tableOf("string"));
         nCells_ += std::size(calls) + 2;
     }
+
+    std::map<std::string, std::set<std::string>> words_;  // of each call that was checked
 
 private:
     static std::string withValue(const std::string& strCall, const std::string& strValue)

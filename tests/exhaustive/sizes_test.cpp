@@ -81,38 +81,40 @@ std::string longText()
     return strText;
 }
 
+Json::Value member(const char* szName, const Json::Value& jValue)
+{
+    Json::Value jObject;
+    jObject[szName] = jValue;
+    return jObject;
+}
+
 TEST_F(LargeRecords, MayHoldATextOfAMebibyte)
 {
     Table table(
         database_,
         R"({"n":{"cpptype":"int"},"o":{"cpptype":"Json::objectValue"},"s":{"cpptype":"string"}})",
         "n, o, s");
-    Json::Value jRecord;
+    Json::Value jRecord = member("o", member("k", longText()));
     jRecord["n"] = 1;
-    jRecord["o"]["k"] = longText();
     jRecord["s"] = longText();
     Json::Value jStored;
     EXPECT_EQ(0, table.api.recCreate(jRecord, jStored));
     EXPECT_EQ(jRecord, jStored);
     table.create(R"({"n":2,"o":{},"s":"other"})");
 
-    Json::Value jByText;
-    jByText["s"] = longText();
-    Json::Value jByItem;
-    jByItem["s"].append(longText());
-    Json::Value jByJson;
-    jByJson["o"] = jRecord["o"];
-    Json::Value jByFilter;
-    jByFilter["vornSqlWhereFilter"] = "s = '" + replaced(longText(), '\'', "''") + "'";
-    for (Json::Value* pjRequest : {&jByText, &jByItem, &jByJson, &jByFilter}) {
+    Json::Value jText = member("s", longText());
+    Json::Value jItem;
+    jItem.append(longText());
+    const std::string strFilter = "s = '" + replaced(longText(), '\'', "''") + "'";
+    for (Json::Value jRequest : {jText, member("s", jItem), member("o", jRecord["o"]),
+                                 member("vornSqlWhereFilter", strFilter)}) {
         Json::Value jFound;
-        EXPECT_EQ(0, table.api.recList(*pjRequest, jFound));
+        EXPECT_EQ(0, table.api.recList(jRequest, jFound));
         ASSERT_EQ(1U, jFound.size());
         EXPECT_EQ(jRecord, jFound[0]);
-        EXPECT_EQ(0, table.api.recUpdateByFilter(*pjRequest, jByText));
+        EXPECT_EQ(0, table.api.recUpdateByFilter(jRequest, jText));
     }
-    Json::Value jSorted;
-    jSorted["sort_by"] = longText();
+    Json::Value jSorted = member("sort_by", longText());
     EXPECT_EQ(0, table.api.recList(jSorted, jStored = Json::Value()));
     EXPECT_EQ(2U, jStored.size());
     std::string strValue = longText();
@@ -122,8 +124,7 @@ TEST_F(LargeRecords, MayHoldATextOfAMebibyte)
     EXPECT_EQ(longText(), table.api.getErrMsg());
 
     // A line of the log may be as long.
-    Json::Value jBad;
-    jBad["n"] = longText();
+    Json::Value jBad = member("n", longText());
     EXPECT_EQ(-1, table.api.recCreate(jBad, jStored));
     EXPECT_EQ(
         (Lines{error("type failed, strKey=n, jRecParam=" + text(jBad)),
@@ -200,8 +201,7 @@ void storeAndAsk(Database& database, Table& table, std::size_t nLevels)
     EXPECT_EQ(Lines(), takeLog());
 
     // A refused record goes into the log as deep as it is.
-    Json::Value jBad;
-    jBad["o"] = jRecord["a"];
+    Json::Value jBad = member("o", jRecord["a"]);
     EXPECT_EQ(-1, table.api.recCreate(jBad, jStored));
     EXPECT_EQ(plain("call create rec, rec={\"o\":" + strArrays + "}"), takeLog().back());
     Json::Value jCopy;
