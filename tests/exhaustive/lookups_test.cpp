@@ -1,180 +1,216 @@
 // SPDX-License-Identifier: MIT
-// The look-ups of member types behind recSave and recCreate, on definitions that have none or not
-// all: every look-up happens and logs, line by line.
+// The look-ups of member types behind every operation, on types that are missing, of a wrong kind
+// or partial: the result, the whole log and what is left in the table.
 
-#include "support/lookups.h"
+#include "lookup_cases.h"
+
+#include <map>
+#include <utility>
 
 namespace {
 
-class LookUps : public LookUpsTest {
-protected:
-    // What a save logs after its look-ups when its lists are empty.
-    static Lines emptyLists(const std::string& strVerb, const std::string& strRecord)
-    {
-        const std::string strSql =
-            strVerb + " INTO $ () VALUES (;select * from $ where rowid == last_insert_rowid();";
-        const std::string strError = "near \")\": syntax error";
-        return {plain("i=0,errno=?, run sql failed, error=" + strError + ", sql=" + strSql),
-                failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
-                plain(std::string("blCreate=") + ("INSERT" == strVerb ? "1" : "0") +
-                      ", jRecInOut=" + strRecord),
-                plain("jType=null"), plain("sql error, err=" + strError + ", sql=" + strSql)};
-    }
+const std::string kPoisoned = "jType[strJsonName].type() != Json::objectValue";
+const std::string kNoWord = R"(!jTableDef[strJsonName]["member"][strKey].isMember("cpptype"))";
+const std::string kWordIsNoText =
+    R"(!jTableDef[strJsonName]["member"][strKey]["cpptype"].isString())";
 
-    static Lines createFailed(const std::string& strRecord)
-    {
-        return {failed("0 > recSave(jParam, true)"), plain("call create rec, rec=" + strRecord)};
-    }
-
-    int save(VornJsonDbApi& api, bool blCreate, const char* szRecord)
-    {
-        Json::Value jRecord = json(szRecord);
-        const int iResult = api.recSave(jRecord, blCreate);
-        EXPECT_EQ(json(szRecord), jRecord);
-        return iResult;
-    }
-
-    int create(VornJsonDbApi& api, const char* szRecord)
-    {
-        Json::Value jRecord = json(szRecord);
-        Json::Value jStored = "untouched";
-        const int iResult = api.recCreate(jRecord, jStored);
-        EXPECT_EQ(Json::Value("untouched"), jStored);
-        return iResult;
-    }
-
-    std::string strCreate_ = "create table if not exists " + strName_ + " (a, b)";
+const struct {
+    const char* szDefinition;
+    const char* szLater;  // after the column list looked for its members
+    const char* szCondition;
+} kBadDefinitions[] = {
+    {"null", R"({"$":{"member":null}})", "jTableDef.empty()"},
+    {"{}", R"({"$":{"member":null}})", "jTableDef.empty()"},
+    {"[]", "[]", "jTableDef.empty()"},
+    {R"(["$"])", R"(["$"])", "!jTableDef.isMember(strJsonName)"},
+    {R"({"-":{}})", R"({"-":{},"$":{"member":null}})", "!jTableDef.isMember(strJsonName)"},
+    {R"({"$":null})", R"({"$":{"member":null}})", "!jTableDef[strJsonName].isObject()"},
+    {R"({"$":"member"})", R"({"$":"member"})", "!jTableDef[strJsonName].isObject()"},
+    {R"({"$":{"x":1}})", R"({"$":{"member":null,"x":1}})",
+     R"(!jTableDef[strJsonName].isMember("member"))"},
+    {R"({"$":{"member":["a"]}})", R"({"$":{"member":["a"]}})",
+     R"(!jTableDef[strJsonName]["member"].isObject())"},
+    {R"({"$":{"member":{}}})", R"({"$":{"member":{}}})",
+     "jType == Json::nullValue || !jType.isMember(strJsonName)"},
 };
 
-TEST_F(LookUps, OfASaveWithABadDefinition)
+std::string typesOf(const std::string& strA)
 {
-    for (const BadDefinition& bad : kBadDefinitions) {
-        SCOPED_TRACE(bad.szName);
-        strName_ = freshName();
-        strCreate_ = "create table " + strName_ + " (a, b)";
-        Json::Value jDefinition = json(named(bad.szDefinition));
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-        takeLog();
+    return R"({"a":)" + strA + R"(,"b":{"cpptype":"string"},"c":{"cpptype":"string"}})";
+}
 
-        // recSave's own look-up, then the value list's, which finds what the first has left.
-        EXPECT_EQ(-1, save(api, true, R"({"a":1})"));
-        EXPECT_EQ(
-            named(lookUp(bad.szCondition, bad.szDefinition, "-") +
-                  lookUp(kPoisoned, bad.szLater, "null") + emptyLists("INSERT", R"({"a":1})")),
-            takeOwnLog());
-        EXPECT_EQ(-1, save(api, false, R"({"a":1})"));
-        EXPECT_EQ(
-            named(lookUp(kPoisoned, bad.szLater, "null") + lookUp(kPoisoned, bad.szLater, "null") +
-                  emptyLists("REPLACE", R"({"a":1})")),
-            takeOwnLog());
+std::string defined(const std::string& strMembers)
+{
+    return R"({"$":{"member":)" + strMembers + "}}";
+}
+
+const std::string kWhole = defined(typesOf(R"({"cpptype":"string"})"));
+
+// Four lines of a look-up that fails; the entry of the table, or "-" where there is none.
+Lines lookUp(const std::string& strCondition, const std::string& strDefinition,
+             const std::string& strEntry)
+{
+    return {utilFailed(strCondition), utilPlain("strJsonName=$"),
+            utilPlain("jTableDef=" + strDefinition), utilPlain("jType=" + strEntry)};
+}
+
+// The types that calls meet.
+struct Types {
+    std::string strDefinition;
+    std::string strCondition = "";  // of the look-up that fails, if any
+    std::string strFirst = "-";     // the table's entry when the first look-up fails
+    std::string strEntry = "null";  // and afterwards; it fails again where it is no object
+    std::string strLater = "";      // the definition after the column list, if it differs
+    bool blByHost = false;          // has put the entry there before the call
+};
+
+class LookUps : public TableTest {
+protected:
+    // Each call on a table of its own, and once more where later look-ups log other lines.
+    void expect(const Cases& cases, const Types& types)
+    {
+        strName_ = freshName();
+        for (const Case& c : cases)
+            for (const std::string& strCall : split(c.strCalls, '|')) {
+                SCOPED_TRACE(strCall + " on " + types.strDefinition + types.strEntry);
+                if (!types.blByHost) strName_ = freshName();
+                const auto pApi = handleOf(types);
+                expectCall(c, strCall, *pApi, types, !types.blByHost);
+                if (!types.blByHost) expectCall(c, strCall, *pApi, types, false);
+            }
     }
-}
 
-TEST_F(LookUps, OfACreateWithABadDefinition)
-{
-    for (const BadDefinition& bad : kBadDefinitions) {
-        SCOPED_TRACE(bad.szName);
-        strName_ = freshName();
-        strCreate_ = "create table " + strName_ + " (a, b)";
-        Json::Value jDefinition = json(named(bad.szDefinition));
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
+    std::unique_ptr<VornJsonDbApi> handleOf(const Types& types)
+    {
+        std::string strCreate = "create table if not exists " + strName_ + " (a, b, c)";
+        Json::Value jDefinition = json(replaced(types.strDefinition, '$', strName_));
+        auto pApi =
+            std::make_unique<VornJsonDbApi>(database_.get(), strName_, jDefinition, strCreate);
+        if (types.blByHost) VORN_JSON_DB::recType(jDefinition, strName_) = json(types.strEntry);
         takeLog();
-
-        // Defaults, type check, recSave and the value list look up once each.
-        EXPECT_EQ(-1, create(api, R"({"a":1})"));
-        EXPECT_EQ(named(lookUp(bad.szCondition, bad.szDefinition, "-") +
-                        lookUp(kPoisoned, bad.szDefinition, "null") +
-                        lookUp(kPoisoned, bad.szDefinition, "null") +
-                        lookUp(kPoisoned, bad.szLater, "null") +
-                        emptyLists("INSERT", R"({"a":1})") + createFailed(R"({"a":1})")),
-                  takeOwnLog());
-        EXPECT_EQ(-1, create(api, R"({"a":1})"));
-        const Lines again = lookUp(kPoisoned, bad.szLater, "null");
-        EXPECT_EQ(named(again + again + again + again + emptyLists("INSERT", R"({"a":1})") +
-                        createFailed(R"({"a":1})")),
-                  takeOwnLog());
-        // No look-up is reached by an empty record, two by one that is no object.
-        EXPECT_EQ(-1, create(api, "{}"));
-        EXPECT_EQ((Lines{failed("jRecIn.empty()"), plain("call create rec, rec={}")}), takeLog());
-        EXPECT_EQ(-1, create(api, "[1]"));
-        EXPECT_EQ(named(again + again +
-                        Lines{failed("!jRecParam.isObject()"), failed("0 > checkJsonType(jParam)"),
-                              plain("call create rec, rec=[1]")}),
-                  takeOwnLog());
+        return pApi;
     }
-}
 
-TEST_F(LookUps, OfASaveWithoutAnyWord)
-{
-    const char szDefinition[] = R"({"$":{"member":{"a":{},"b":{"cpptype":"int"}}}})";
-    Json::Value jDefinition = json(named(szDefinition));
-    VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-    const Lines failure = {failed("!jType.isMember(strKey)"),
-                           failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
-                           plain(R"(blCreate=1, jRecInOut={"a":1,"b":2})"), plain("jType=null")};
-    EXPECT_EQ(-1, save(api, true, R"({"a":1,"b":2})"));
-    EXPECT_EQ(named(lookUp(kNoWord, szDefinition, "-") + lookUp(kPoisoned, szDefinition, "null") +
-                    failure),
-              takeOwnLog());
-    EXPECT_EQ(-1, create(api, R"({"a":1,"b":2})"));
-    const Lines again = lookUp(kPoisoned, szDefinition, "null");
-    EXPECT_EQ(named(again + again + again + again + failure + createFailed(R"({"a":1,"b":2})")),
-              takeOwnLog());
-}
+    void expectLog(const Lines& expected)
+    {
+        Lines named;
+        for (const std::string& strLine : expected)
+            named.push_back(replaced(strLine, '$', strName_));
+        EXPECT_EQ(named, takeOwnLog());
+    }
 
-TEST_F(LookUps, OfARecordWithPartialTypes)
-{
-    const struct {
-        const char* szMember;
-        const char* szCondition;
-    } cases[] = {
-        {"{}", kNoWord},
-        {"\"int\"", kNoWord},
-        {"null", kNoWord},
-        {R"({"cpptype":5})", kWordIsNoText},
-    };
-    const std::string strEntry = R"({"a":{"cppDefaultValue":7,"cpptype":"int"}})";
-    for (const auto& c : cases) {
-        SCOPED_TRACE(c.szMember);
-        strName_ = freshName();
-        strCreate_ = "create table " + strName_ + " (a, b, c)";
-        const std::string strDefinition =
-            std::string(R"({"$":{"member":{"a":{"cppDefaultValue":7,"cpptype":"int"},"b":)") +
-            c.szMember + R"(,"c":{"cpptype":"int"}}}})";
-        Json::Value jDefinition = json(named(strDefinition));
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
+    std::string strName_ = freshName();
 
-        const Lines first = lookUp(c.szCondition, strDefinition, strEntry);
-        const auto failure = [&](const std::string& strRecord) {
-            return Lines{failed("!jType.isMember(strKey)"),
-                         failed("0 > SqlExpandMemberSymbol(strSql, jRecInOut)"),
-                         plain("blCreate=1, jRecInOut=" + strRecord), plain("jType=" + strEntry)};
+private:
+    void expectCall(const Case& c, const std::string& strCall, VornJsonDbApi& api,
+                    const Types& types, bool blFirst)
+    {
+        database_.run("delete from " + strName_ + ";insert into " + strName_ +
+                      " values ('x','y','z'),('u','v','w')");
+        const Ended ended = called(api, strCall);
+        EXPECT_EQ(c.szEnd, ended.whole());
+        const auto again = [&](const std::string& strDefinition) {
+            return '{' == types.strEntry[0] ? Lines()
+                                            : lookUp(kPoisoned, strDefinition, types.strEntry);
         };
-        // The first look-up fails half-way and is the only one that says so.
-        EXPECT_EQ(-1, create(api, R"({"b":1,"c":2})"));
-        EXPECT_EQ(named(first + failure(R"({"a":7,"b":1,"c":2})") +
-                        createFailed(R"({"a":7,"b":1,"c":2})")),
-                  takeOwnLog());
-        EXPECT_EQ(-1, create(api, R"({"x":1})"));
-        EXPECT_EQ(named(failure(R"({"a":7,"x":1})") + createFailed(R"({"a":7,"x":1})")),
-                  takeOwnLog());
-        EXPECT_EQ(-1, save(api, true, R"({"a":1})"));
-        EXPECT_EQ(named(failure(R"({"a":1})")), takeOwnLog());
-        EXPECT_EQ(Lines(), takeLog());
+        const Lines later = again(types.strLater.empty() ? types.strDefinition : types.strLater);
+        std::map<std::string, Lines> lookUps = {
+            {kEarlyLookUp, blFirst ? again(types.strDefinition) : later},
+            {kDecoder, again("null")}};
+        lookUps[kLookUp] =
+            blFirst ? lookUp(types.strCondition, types.strDefinition, types.strFirst) : later;
+        Lines expected;
+        for (const std::string& strLine : linesOf(c, strCall, types.strEntry)) {
+            const auto look = lookUps.find(strLine);
+            expected = expected + (lookUps.end() == look ? Lines{strLine} : look->second);
+            if (kLookUp == strLine) look->second = later;
+        }
+        expectLog(expected);
+        EXPECT_EQ(c.szRows, database_.value("select group_concat(a||b||c) from " + strName_));
+    }
+
+    // The log. A dump of all tables' types is reduced to the entry of this table.
+    Lines takeOwnLog()
+    {
+        const std::string strDump = utilPlain("jType=");
+        const std::string strKey = '"' + strName_ + "\":";
+        Lines lines = takeLog();
+        for (std::string& strLine : lines) {
+            if (0 != strLine.compare(0, strDump.size(), strDump)) continue;
+            const std::size_t nKey = strLine.find(strKey);
+            // The reader leaves what follows the entry.
+            strLine = strDump + (std::string::npos == nKey
+                                     ? "-"
+                                     : text(leftByReader(strLine.substr(nKey + strKey.size()))));
+        }
+        return lines;
+    }
+};
+
+TEST_F(LookUps, FailOnABadDefinition)
+{
+    for (const auto& bad : kBadDefinitions) {
+        expect(kWithoutTypes, {bad.szDefinition, bad.szCondition});
+        // The column list leaves the table in the handle's copy.
+        expect(kWithoutColumns, {bad.szDefinition, bad.szCondition, "-", "null", bad.szLater});
     }
 }
 
-TEST_F(LookUps, HealWhereTheHostMendsTheEntry)
+TEST_F(LookUps, FailOnTypesOfAWrongKind)
 {
-    Json::Value jDefinition = json(named(R"({"$":{"member":{"a":{"cpptype":"int"}}}})"));
-    VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
+    for (const char* szEntry : {"null", "[{\"a\":1}]", "\"a\"", "5", "true"})
+        expect(kWithoutTypes + kWithColumns, {kWhole, "", "", szEntry, "", true});
+}
+
+TEST_F(LookUps, EndAtAMemberWithoutAWord)
+{
+    for (const char* szMember : {"{}", "\"int\"", "null", R"({"cpptype":5})"}) {
+        const std::string strMember = szMember;
+        const std::string strCondition =
+            std::string::npos == strMember.find("cpptype") ? kNoWord : kWordIsNoText;
+        // The first member: no types.
+        expect(kWithoutTypes + kWithColumns, {defined(typesOf(strMember)), strCondition});
+        // The second one: those of the first.
+        const std::string strA = R"({"a":{"cppDefaultValue":"d","cpptype":"string"})";
+        const std::string strRest = R"(,"b":)" + strMember + R"(,"c":{"cpptype":"string"}})";
+        expect(kWithPartialTypes, {defined(strA + strRest), strCondition, strA + "}", strA + "}"});
+    }
+}
+
+TEST_F(LookUps, FailOnTypesThatLackAColumn)
+{
+    const std::pair<const char*, Lines> cases[] = {
+        {R"({"b":{"cpptype":"string"},"c":{"cpptype":"string"}})", {}},
+        {R"({"a":{"cpptype":"string"},"c":{"cpptype":"string"}})",
+         {plain("column_name[1]=b"), plain("column_value[1]=y")}},
+        {R"({"a":{"cpptype":"string"},"b":{"cpptype":"string"}})",
+         {plain("column_name[2]=c"), plain("column_value[2]=z")}},
+        {"{}", {}},
+    };
+    const char szCalls[] = "recList null|recGetOne null";
+    for (const auto& [szEntry, traced] : cases)
+        expect({{szCalls, "-1", rowRefused(kNoColumn, traced), kRows, kSelect, kAborted}},
+               {kWhole, "", "", szEntry, "", true});
+}
+
+TEST_F(LookUps, TakeAMemberOfAWrongKindForOneOfAnUnknownWord)
+{
+    for (const char* szA : {"{}", "null", R"({"cpptype":null})", "5", "\"string\"", "[\"string\"]"})
+        expect(kWithoutAWord, {kWhole, "", "", typesOf(szA), "", true});
+    for (const char* szA : {R"({"cpptype":["string"]})", R"({"cpptype":{}})"})
+        expect(kWithAWordThatThrows, {kWhole, "", "", typesOf(szA), "", true});
+}
+
+TEST_F(LookUps, SucceedOnceTheHostHasRepairedTheEntry)
+{
+    const auto pApi = handleOf({kWhole});
     Json::Value jNone;
     Json::Value& jEntry = VORN_JSON_DB::recType(jNone, strName_);
     EXPECT_TRUE(jEntry.isNull());
-    EXPECT_EQ(named(lookUp("jTableDef.empty()", "null", "-")), takeOwnLog());
-    jEntry = json(R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})");
-    Json::Value jRecord = json(R"({"a":1})");
-    EXPECT_EQ(0, api.recSave(jRecord, true));
+    expectLog(lookUp("jTableDef.empty()", "null", "-"));
+    jEntry = json(typesOf(R"({"cpptype":"int"})"));
+    const char szSave[] = R"(recSave {"a":1,"b":"y","c":"z"} insert)";
+    EXPECT_EQ("0", called(*pApi, szSave).strEnd);
     EXPECT_EQ(Lines(), takeLog());
 }
 

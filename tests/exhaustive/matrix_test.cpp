@@ -1,250 +1,292 @@
 // SPDX-License-Identifier: MIT
-// Every JSON argument of every call as every kind of JSON value: how the call ends, that it leaves
-// its outputs and the table alone where it fails, and that handle and connection go on working.
+// Every argument of every function as every kind of JSON value, a member of every type word among
+// them: how the call ends, that it leaves alone what it should, and that handle and connection go
+// on working.
 
 #include "support/matrix.h"
+#include "calls.h"
 
-#include <algorithm>
+#include <map>
+#include <memory>
+#include <set>
 
 namespace {
 
-using VORN_JSON_DB::jsonCopyMember;
+// In a call, $ is the value in question, # a record with it as a member and @ the record of the
+// table. kByDefault creates a record without the member, whose default is the value.
+const std::string kRecordOf = R"({"a":"a","m":$,"z":"z"})";
+const std::string kByDefault = "recCreate by default";
 
-struct Scene {
-    VornJsonDbApi& api;
-    Outputs out;
-};
-
-// Whether the argument in question is an output, and what happens to the text that a call appends
-// to where it fails.
-enum class Way { kInput, kOutput, kAppends };
-
-struct Call {
-    const char* szName;
-    Way way;
-    int (*run)(Scene& scene, Json::Value& jArgument);
-};
-
-int copied(Json::Value& jIn, Json::Value& jSubSet)
-{
-    const int iResult = jsonCopyMember(jIn, jSubSet, false);
-    EXPECT_EQ(iResult, jsonCopyMember(jIn, jSubSet, true));
-    return iResult;
-}
-
-std::string strOfMember = "m";
-std::string strOfWhere = "1";
-std::vector<std::string> strOfVector = {"a", "b"};
-
-int updateWhere(Scene& scene, Json::Value& jArgument)
-{
-    return scene.api.recUpdateByWhere(jArgument, strOfWhere);
-}
-
-template <int iJoiner>
-int expandList(Scene& scene, Json::Value& jArgument)
-{
-    return scene.api.SqlExpandMemberList(jArgument, scene.out.strText, iJoiner);
-}
-
-Json::Value& sound()
-{
-    static Json::Value jRecord;
-    return jRecord = json(kRecord);
-}
-
-Json::Value& noMatch()
-{
-    static Json::Value jRequest;
-    return jRequest = json(R"({"m":6})");
-}
-
-const Call kCalls[] = {
-    {"checkJsonType", Way::kInput, [](Scene& s, Json::Value& j) { return s.api.checkJsonType(j); }},
-    {"fillDefaultValue, fill", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.fillDefaultValue(j, false); }},
-    {"fillDefaultValue, check", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.fillDefaultValue(j, true); }},
-    {"recSave, insert", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.recSave(j, true); }},
-    {"recSave, replace", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.recSave(j, false); }},
-    {"recCreate, in", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recCreate(j, s.out.jObject); }},
-    {"recCreate, out", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.recCreate(sound(), j); }},
-    {"recList, request", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recList(j, s.out.jArray); }},
-    {"recList, out", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.recList(sound(), j); }},
-    {"recGetOne, request", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recGetOne(j, s.out.jObject); }},
-    {"recGetOne, out", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.recGetOne(sound(), j); }},
-    {"recList, out, no match", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.recList(noMatch(), j); }},
-    {"recGetOne, out, no match", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recGetOne(noMatch(), j); }},
-    {"recUpdateByWhere", Way::kInput, updateWhere},
-    {"recUpdateByFilter, filter", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recUpdateByFilter(j, sound()); }},
-    {"recUpdateByFilter, values", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recUpdateByFilter(sound(), j); }},
-    {"recDelete", Way::kInput, [](Scene& s, Json::Value& j) { return s.api.recDelete(j); }},
-    {"recDelete, all", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.recDelete(j, true); }},
-    {"SqlExpandMemberName", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.SqlExpandMemberName(s.out.strText, &j); }},
-    {"SqlExpandMemberSymbol", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.SqlExpandMemberSymbol(s.out.strText, j); }},
-    {"SqlExpandMemberList, or", Way::kAppends, expandList<VORN_SQL_WHERE_TYPE_OR>},
-    {"SqlExpandMemberList, and", Way::kAppends, expandList<VORN_SQL_WHERE_TYPE_AND>},
-    {"SqlExpandMemberList, comma", Way::kAppends, expandList<VORN_SQL_WHERE_TYPE_COMMA>},
-    {"SqlExpandMemberList, 3", Way::kInput, expandList<3>},
-    {"SqlMakeByMatchField", Way::kInput,
-     [](Scene& s, Json::Value& j) {
-         return s.api.SqlMakeByMatchField(strOfMember, j, s.out.strText);
-     }},
-    {"SqlMakeByListField", Way::kInput,
-     [](Scene& s, Json::Value& j) { return s.api.SqlMakeByListField("m", j, s.out.strText); }},
-    {"VectorParamToJson", Way::kOutput,
-     [](Scene& s, Json::Value& j) { return s.api.VectorParamToJson(strOfVector, "m", j); }},
-    {"SqlFilterConditionFromJson", Way::kAppends,
-     [](Scene& s, Json::Value& j) { return s.api.SqlFilterConditionFromJson(j, s.out.strText); }},
-    {"jsonCopyMember, into", Way::kOutput,
-     [](Scene&, Json::Value& j) { return copied(j, sound()); }},
-    {"jsonCopyMember, from", Way::kInput,
-     [](Scene& s, Json::Value& j) { return copied(s.out.jObject, j); }},
-};
-
-// The value in question stands at "$" of the argument. An end is the result, or T for a
-// Json::LogicError; "rec" is {"m":5,"z":"z"}, the record that the table holds.
+// An end is the result, T for a Json::LogicError or W for a failure that has written all the same.
 struct Row {
-    const char* szCalls;  // between bars
-    const char* szArgument;
+    std::string strCalls;  // between bars, as the words
+    std::string strWords;  // of the member m
     const char* szEnds;
 };
 
+// The calls with an argument of that shape.
+std::string with(const char* szArgument, const std::string& strCalls)
+{
+    return replaced(strCalls, '$', szArgument);
+}
+
+const std::string kUpdates = "|recUpdateByWhere $ 1|recUpdateByFilter @ $";
+const std::string kCheckOrSave =
+    "checkJsonType $|fillDefaultValue $ fill|recSave $ insert|recSave $ replace|recCreate $";
+const std::string kConditions =
+    "recList $|recGetOne $|recDelete $|recDelete $ all|recUpdateByFilter $ @";
+const std::string kExpandLists =
+    "SqlExpandMemberList $ before 0|SqlExpandMemberList $ before 1|SqlExpandMemberList $ before 2";
+const std::string kPage = "SqlFilterConditionFromJson $";
+
+// Of a table whose m is an int. SQLite refuses an empty raw filter and one of an unknown column,
+// and wants whole numbers of 64 bits for paging.
 // clang-format off
-const Row kRows[] = {
-    //                                                       null true  -1 2^64-1 1.5  ""  "x"   []  [1]   {} {"k":1} rec
-    {"checkJsonType",               "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
-    {"fillDefaultValue, fill",      "$",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"fillDefaultValue, check",     "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    0"},
-    {"recSave, insert|recSave, replace|recCreate, in|recUpdateByWhere|recUpdateByFilter, filter|recUpdateByFilter, values",
-                                    "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    0"},
-    {"recCreate, out",              "$",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"recList, request",            "$",                    "  0   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
-    {"recGetOne, out, no match",    "$",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"recList, out|recList, out, no match",
-                                    "$",                    "  0   -1   -1   -1   -1   -1   -1    0    0   -1   -1   -1"},
-    {"recGetOne, request|recGetOne, out",
-                                    "$",                    "  1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    1"},
-    {"recDelete",                   "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    1"},
-    {"recDelete, all",              "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    1"},
-    {"SqlExpandMemberName|SqlExpandMemberSymbol",
-                                    "$",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"SqlExpandMemberList, or|SqlExpandMemberList, and|SqlExpandMemberList, comma",
-                                    "$",                    "  1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    0"},
-    {"SqlExpandMemberList, 3",      "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
-    {"SqlMakeByMatchField",         "$",                    "  0    0    0    0    0    0    0    T    T    T    T    T"},
-    {"SqlMakeByListField",          "$",                    " -1   -1   -1   -1   -1   -1   -1    0    0   -1   -1   -1"},
-    {"SqlMakeByListField",          "[$]",                  "  0    0    0    0    0    0    0    T    T    T    T    T"},
-    {"SqlMakeByListField",          "[2,$]",                "  0    0    0    0    0    0    0    T    T    T    T    T"},
-    {"VectorParamToJson|SqlFilterConditionFromJson|jsonCopyMember, into",
-                                    "$",                    "  0   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
-    {"jsonCopyMember, from",        "$",                    " -1   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
-    {"jsonCopyMember, into|jsonCopyMember, from",
-                                    R"({"m":$})",           "  0    0    0    0    0    0    0    0    0    0    0    0"},
+const Row kArguments[] = {
+    //                                              null true  -1 2^64-1 1.5  ""  "x"   []  [1]   {} {"k":1} @
+    {"checkJsonType $",                    "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
+    {"fillDefaultValue $ fill|recCreate @ $|SqlExpandMemberName before $|SqlExpandMemberSymbol before $",
+                                           "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {"fillDefaultValue $ check",           "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    0"},
+    {"recSave $ insert|recSave $ replace|recCreate $|recUpdateByFilter $ @" + kUpdates,
+                                           "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    0"},
+    {"recList $",                          "int",  "  0   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
+    {R"(recGetOne {"m":6} $)",             "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {R"(recList @ $|recList {"m":6} $)",   "int",  "  0   -1   -1   -1   -1   -1   -1    0    0   -1   -1   -1"},
+    {"recGetOne $|recGetOne @ $",          "int",  "  1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    1"},
+    {"recDelete $",                        "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1    1"},
+    {"recDelete $ all",                    "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    1"},
+    {kExpandLists,                         "int",  "  1   -1   -1   -1   -1   -1   -1   -1   -1    1    1    0"},
+    {"SqlExpandMemberList $ before 3",     "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+    {"SqlMakeByListField m $",             "int",  " -1   -1   -1   -1   -1   -1   -1    0    0   -1   -1   -1"},
+    {"SqlMakeByListField m [2,$]",         "int",  "  0    0    0    0    0    0    0    T    T    T    T    T"},
+    {R"(VectorParamToJson ["a","b"] m $|jsonCopyMember $ @ keep|jsonCopyMember $ @ overwrite|)" + kPage,
+                                           "int",  "  0   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
+    {R"(jsonCopyMember {"k":1} $ keep|jsonCopyMember {"k":1} $ overwrite)",
+                                           "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1    0    0    0"},
+    {"jsonCopyMember # @ keep|jsonCopyMember # @ overwrite|jsonCopyMember @ # keep|jsonCopyMember @ # overwrite",
+                                           "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
     // Members that no table declares.
-    {"checkJsonType|fillDefaultValue, fill|recSave, insert|recSave, replace|recCreate, in|recUpdateByWhere|recUpdateByFilter, values",
-                                    R"({"m":5,"x":$,"z":"z"})",
-                                                            "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"recList, request|recUpdateByFilter, filter",
-                                    R"({"m":5,"x":$})",     "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"recGetOne, request|recDelete",R"({"m":5,"x":$})",     "  1    1    1    1    1    1    1    1    1    1    1    1"},
-    // The raw filter; SQLite refuses an empty one and one of an unknown column.
-    {"SqlExpandMemberList, or|SqlExpandMemberList, and|SqlExpandMemberList, comma",
-                      R"({"m":5,"vornSqlWhereFilter":$})",  " -1   -1   -1   -1   -1    0    0   -1   -1   -1   -1   -1"},
-    {"recList, request|recGetOne, request|recDelete|recDelete, all|recUpdateByFilter, filter",
-                      R"({"m":5,"vornSqlWhereFilter":$})",  " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
-    {"recUpdateByWhere|recUpdateByFilter, values",
-                      R"({"m":5,"vornSqlWhereFilter":$})",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    // Sorting and paging; SQLite wants whole numbers of 64 bits.
-    {"SqlFilterConditionFromJson|recList, request",
-                      R"({"sort_by":$})",                   "  T    T    T    T    T    0    0    T    T    T    T    T"},
-    {"recGetOne, request",
-                      R"({"sort_by":$})",                   "  T    T    T    T    T    1    1    T    T    T    T    T"},
-    {"SqlFilterConditionFromJson|recList, request",
-                      R"({"sort_by":"z","sort_direction":$})",
-                                                            "  0    0    0    0    0    0    0    T    T    T    T    T"},
-    {"SqlFilterConditionFromJson|recList, request",
-                      R"({"sort_direction":$})",            "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"SqlFilterConditionFromJson",
-                      R"({"limit":$})",                     "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"SqlFilterConditionFromJson",
-                      R"({"limit":1,"offset":$})",          "  0    0    0    0    0    0    0    0    0    0    0    0"},
-    {"recList, request",
-                      R"({"limit":$})",                     " -1    0    0   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
-    {"recList, request",
-                      R"({"limit":1,"offset":$})",          " -1    0    0   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
-    {"recList, request",
-                      R"({"offset":$})",                    "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {with(R"({"a":"a","m":5,"x":$,"z":"z"})", kCheckOrSave + kUpdates),
+                                           "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {with(R"({"m":5,"x":$})", "recList $|recUpdateByFilter $ @"),
+                                           "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {with(R"({"m":5,"x":$})", "recGetOne $|recDelete $"),
+                                           "int",  "  1    1    1    1    1    1    1    1    1    1    1    1"},
+    // The raw filter, sorting and paging.
+    {with(R"({"m":5,"vornSqlWhereFilter":$})", kExpandLists),
+                                           "int",  " -1   -1   -1   -1   -1    0    0   -1   -1   -1   -1   -1"},
+    {with(R"({"m":5,"vornSqlWhereFilter":$})", kConditions),
+                                           "int",  " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+    {with(R"({"m":5,"vornSqlWhereFilter":$})", kUpdates),
+                                           "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {with(R"({"sort_by":$})", "recList $|" + kPage),
+                                           "int",  "  T    T    T    T    T    0    0    T    T    T    T    T"},
+    {R"(recGetOne {"sort_by":$})",         "int",  "  T    T    T    T    T    1    1    T    T    T    T    T"},
+    {with(R"({"sort_by":"z","sort_direction":$})", "recList $|" + kPage),
+                                           "int",  "  0    0    0    0    0    0    0    T    T    T    T    T"},
+    {with(R"({"sort_direction":$})", "recList $|" + kPage) + R"(|recList {"offset":$}|)" +
+     with(R"({"limit":$})", kPage) + "|" + with(R"({"limit":1,"offset":$})", kPage),
+                                           "int",  "  0    0    0    0    0    0    0    0    0    0    0    0"},
+    {R"(recList {"limit":$}|recList {"limit":1,"offset":$})",
+                                           "int",  " -1    0    0   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+};
+
+const char kEveryWord[] =
+    "string|int|long long|long|bool|unsigned int|unsigned|unsigned long long|float|unsigned long|double|"
+    "Json::Value|uid_t|Json::objectValue|time_t|Json::arrayValue|no such word";
+const std::string kJson = "Json::Value|Json::objectValue|Json::arrayValue";
+const std::string kNumbers =
+    "int|long long|long|unsigned int|unsigned long long|unsigned|unsigned long|float|double|uid_t|time_t|no such word";
+
+const std::string kCreates = "recCreate #|" + kByDefault;
+const std::string kCreatesAndCheck = "checkJsonType #|" + kCreates;
+const std::string kLiteral = "SqlExpandMemberSymbol before #";
+const std::string kSave = "recSave # insert";
+const std::string kListField = "SqlMakeByListField m [$]";
+const std::string kMemberList = R"(SqlExpandMemberList {"m":$} before 1)";
+const std::string kFinds = R"(recList {"m":$}|recGetOne {"m":$}|recDelete {"m":$}|recDelete {"m":$} all|)"
+                           R"(recUpdateByFilter {"m":$} {"z":"y"})";
+const std::string kUpdateWhere = R"(recUpdateByWhere {"m":$} z='z')";
+const std::string kUpdateValues = R"(recUpdateByFilter {"z":"z"} {"m":$})";
+
+// Of a member of that type word. No value is the one in the table.
+const Row kMembers[] = {
+    //                                                     null true  -1 2^64-1 1.5  ""  "x"   []  [1]   {} {"k":1}
+    {"checkJsonType #", "int|long long|uid_t|time_t",     " -1   -1    0    0   -1   -1   -1   -1   -1   -1   -1"},
+    {kCreatesAndCheck, "bool",                            " -1    0   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+    {kCreatesAndCheck, "string",                          " -1   -1   -1   -1   -1    0    0   -1   -1   -1   -1"},
+    {kCreatesAndCheck, "Json::arrayValue",                " -1   -1   -1   -1   -1   -1   -1    0    0   -1   -1"},
+    {kCreatesAndCheck, "Json::objectValue",               " -1   -1   -1   -1   -1   -1   -1   -1   -1    0    0"},
+    {kCreatesAndCheck + "|" + kUpdateValues,
+     "unsigned int|unsigned|long|unsigned long|unsigned long long|float|double|Json::Value|no such word",
+                                                          " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+    // What passes the check may still be too large to be written, or of a word that is never written.
+    {kCreates, "int|long long",                           " -1   -1    0    T   -1   -1   -1   -1   -1   -1   -1"},
+    {kCreates, "uid_t|time_t",                            " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+
+    {kLiteral + "|" + kSave, "string",                    "  0    0    0    0    0    0    0    T    T    T    T"},
+    {kLiteral + "|" + kSave, "int|long long|bool",        "  0    0    0    T    0    T    T    T    T    T    T"},
+    {kLiteral, "long",                                    "  0    0    0    T    0    T    T    T    T    T    T"},
+    {kLiteral + "|" + kSave, "unsigned int|unsigned long long",
+                                                          "  0    0    T    0    0    T    T    T    T    T    T"},
+    {kLiteral, "unsigned|unsigned long",                  "  0    0    T    0    0    T    T    T    T    T    T"},
+    {kLiteral, "float|double",                            "  0    0    0    0    0    T    T    T    T    T    T"},
+    {kLiteral + "|" + kSave, "Json::objectValue|Json::arrayValue",
+                                                          "  0    0    0    0    0    0    0    0    0    0    0"},
+    {kLiteral + "|" + kSave, "Json::Value|uid_t|time_t|no such word",
+                                                          " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+    // Written, and not read back.
+    {kSave, "long",                                       "  W    W    W    T    W    T    T    T    T    T    T"},
+    {kSave, "unsigned|unsigned long",                     "  W    W    T    W    W    T    T    T    T    T    T"},
+    {kSave, "float|double",                               "  W    W    W    W    W    T    T    T    T    T    T"},
+
+    {"SqlMakeByMatchField m $", "string|" + kNumbers,     "  0    0    0    0    0    0    0    T    T    T    T"},
+    {"SqlMakeByMatchField m $", "bool",                   "  0    0    0    T    0    T    T    T    T    T    T"},
+    {kListField, "string|bool|" + kNumbers,               "  0    0    0    0    0    0    0    T    T    T    T"},
+    {kMemberList, "string|" + kNumbers,                   "  0    0    0    0    0    0    0    0    0    T    T"},
+    {kMemberList, "bool",                                 "  0    0    0    T    0    T    T    0    0    T    T"},
+    {"SqlMakeByMatchField m $|" + kListField + "|" + kMemberList, kJson,
+                                                          "  0    0    0    0    0    0    0    0    0    0    0"},
+
+    // SQLite refuses an empty list, a bare value that is missing and a bare text that is no column.
+    {kFinds, "string",                                    "  0    0    0    0    0    0    0   -1    0    T    T"},
+    {kFinds, kNumbers,                                    " -1    0    0    0    0   -1   -1   -1    0    T    T"},
+    {kFinds, "bool",                                      "  0    0    0    T    0    T    T   -1    0    T    T"},
+    {kFinds, kJson,                                       "  0    0    0    0    0    0    0   -1    0    0    0"},
+
+    // A list is no value to set.
+    {kUpdateWhere, "string",                              "  0    0    0    0    0    0    0   -1   -1    T    T"},
+    {kUpdateWhere, kNumbers,                              " -1    0    0    0    0   -1   -1   -1   -1    T    T"},
+    {kUpdateWhere, "bool",                                "  0    0    0    T    0    T    T   -1   -1    T    T"},
+    {kUpdateWhere, kJson,                                 "  0    0    0    0    0    0    0   -1   -1    0    0"},
+    {kUpdateValues, "string",                             " -1   -1   -1   -1   -1    0    0   -1   -1   -1   -1"},
+    {kUpdateValues, "int|long long|uid_t|time_t",         " -1   -1    0    0   -1   -1   -1   -1   -1   -1   -1"},
+    {kUpdateValues, "bool",                               " -1    0   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
+    {kUpdateValues, "Json::objectValue",                  " -1   -1   -1   -1   -1   -1   -1   -1   -1    0    0"},
+    {kUpdateValues, "Json::arrayValue",                   " -1   -1   -1   -1   -1   -1   -1   -1   -1   -1   -1"},
 };
 // clang-format on
 
-class Matrix : public TableTest {
-protected:
-    Rows contents() { return database_.rows("select m, z from " + table_.strName); }
-
-    void check(const Call& call, const char* szTemplate, const std::string& strKind,
-               const std::string& strExpected)
-    {
-        SCOPED_TRACE(std::string(call.szName) + " " + szTemplate + " " + strKind);
-        database_.run("delete from " + table_.strName);
-        database_.run("insert into " + table_.strName + " values (5, 'z')");
-        const Rows before = contents();
-        Scene scene{table_.api, {}};
-        Json::Value jArgument = filledIn(szTemplate, strKind);
-        const Json::Value jBefore = jArgument;
-
-        const std::string strEnd = endOf([&] { return call.run(scene, jArgument); });
-        EXPECT_EQ(strExpected, strEnd);
-        EXPECT_EQ("-1" == strEnd, !takeLog().empty());
-        if (Way::kOutput != call.way || isFailure(strEnd)) {
-            EXPECT_EQ(jBefore, jArgument);
-            EXPECT_EQ(jBefore.type(), jArgument.type());
-        }
-        if (isFailure(strEnd)) {
-            EXPECT_EQ(before, contents());
-            if (Way::kAppends == call.way) scene.out.strText.resize(6);
-            scene.out.expectUntouched();
-        }
-        expectSound(database_, table_.api, kRecord);
-        ++nCells_;
-    }
-
-    Table table_{database_, R"({"m":{"cpptype":"int"},"z":{"cpptype":"string"}})", "m, z"};
-    std::size_t nCells_ = 0;
-    UnwatchedLog unwatched_;
+// A definition with the value at "$" and the table's name at "!", and the ends of calls by a
+// handle with it.
+struct DefinitionRow {
+    const char* szDefinition;
+    const char* szList;
+    const char* szSave;
+    const char* szDelete;  // recType gives null where it fails
 };
 
-TEST_F(Matrix, OfJsonArguments)
+constexpr char kFails[] = "-1 -1 -1 -1 -1 -1 -1 -1 -1 -1 -1";
+constexpr char kWorks[] = "0 0 0 0 0 0 0 0 0 0 0";
+// Any text is a type word. null true -1 2^64-1 1.5 "" "x" [] [1] {} {"k":1}
+constexpr char kOfTexts[] = "-1 -1 -1 -1 -1 0 0 -1 -1 -1 -1";
+
+const DefinitionRow kDefinitions[] = {
+    {"$", kFails, kFails, kFails},
+    {R"({"!":$})", kFails, kFails, kFails},
+    {R"({"!":{"member":$}})", kFails, kFails, kFails},
+    {R"({"!":{"member":{"m":$}}})", kFails, kFails, kFails},
+    {R"({"!":{"member":{"m":{"cpptype":$}}}})", kOfTexts, kFails, kOfTexts},
+    {R"({"!":{"member":{"m":{"cpptype":"int","cppDefaultValue":$}}}})", kWorks, kWorks, kWorks},
+    // What nobody reads.
+    {R"({"!":{"member":{"m":{"cpptype":"int","x":$}},"x":$},"x":$})", kWorks, kWorks, kWorks},
+    // The members before a bad one are known, but the column of the bad one is asked for.
+    {R"({"!":{"member":{"m":{"cpptype":"int"},"n":$}}})", kFails, kFails, kWorks},
+};
+
+class EveryCall : public CallTest {
+protected:
+    void check(const Row& row, const std::vector<std::string>& kinds)
+    {
+        const std::vector<std::string> ends = split(row.szEnds, ' ');
+        ASSERT_EQ(kinds.size(), ends.size()) << row.strCalls;
+        for (const std::string& strWord : split(row.strWords, '|'))
+            for (const std::string& strCall : split(row.strCalls, '|')) {
+                EXPECT_TRUE(words_[strCall].insert(strWord).second) << strCall << " " << strWord;
+                Table& table = tableOf(strWord);
+                for (std::size_t i = 0; i < kinds.size(); ++i) {
+                    SCOPED_TRACE(strWord + ", " + strCall + ", " + kinds[i]);
+                    if (kByDefault == strCall)
+                        checkDefault(table, kinds[i], ends[i]);
+                    else
+                        checkCall(table, table.api, withValue(strCall, kinds[i]), ends[i]);
+                }
+            }
+    }
+
+    void checkDefinition(const DefinitionRow& row, std::size_t iKind)
+    {
+        std::string strName = freshName();
+        std::string strCreate = "create table if not exists " + strName + " (m)";
+        database_.run(strCreate + "; insert into " + strName + " values (null)");
+        const Json::Value jDefinition =
+            json(replaced(replaced(row.szDefinition, '!', strName), '$', kKinds[iKind]));
+        Json::Value jGiven = jDefinition;
+        VornJsonDbApi api(database_.get(), strName, jGiven, strCreate);
+        EXPECT_EQ(jDefinition.empty() ? Lines{plain("Failed [jTableDef.empty()]")} : Lines(),
+                  takeLog());
+        const std::pair<const char*, const char*> calls[] = {
+            {"recList null", row.szList},
+            {R"(recSave {"m":1} insert)", row.szSave},
+            {R"(recDelete {"m":1})", row.szDelete}};
+        for (const auto& [szCall, szEnds] : calls) {
+            database_.run("delete from " + strName + " where m");
+            const std::string strEnd = split(szEnds, ' ').at(iKind);
+            EXPECT_EQ(strEnd, called(api, szCall).strEnd) << szCall;
+            EXPECT_EQ(isFailure(strEnd), !takeLog().empty()) << szCall;
+        }
+        const bool blKnown = "0" == split(row.szDelete, ' ').at(iKind);
+        EXPECT_EQ(blKnown ? Json::objectValue : Json::nullValue,
+                  VORN_JSON_DB::recType(jGiven, strName).type());
+        EXPECT_EQ(jDefinition, jGiven);
+        takeLog();
+        expectSound(tableOf("string"));
+        nCells_ += std::size(calls) + 2;
+    }
+
+    std::map<std::string, std::set<std::string>> words_;  // of each call that was checked
+
+private:
+    static std::string withValue(const std::string& strCall, const std::string& strValue)
+    {
+        return replaced(replaced(strCall, '#', kRecordOf), '$', strValue);
+    }
+
+    void checkDefault(Table& table, const std::string& strValue, const std::string& strEnd)
+    {
+        Json::Value& jMember = VORN_JSON_DB::recType(table.jDefinition, table.strName)["m"];
+        jMember["cppDefaultValue"] = json(strValue);
+        checkCall(table, table.api, R"(recCreate {"a":"a","z":"z"})", strEnd);
+        jMember.removeMember("cppDefaultValue");
+    }
+};
+
+TEST_F(EveryCall, TakesAnyKindOfJsonValue)
 {
     std::vector<std::string> kinds(std::begin(kKinds), std::end(kKinds));
-    kinds.emplace_back(kRecord);
-    for (const Row& row : kRows) {
-        const std::vector<std::string> ends = split(row.szEnds, ' ');
-        ASSERT_EQ(kinds.size(), ends.size()) << row.szCalls << " " << row.szArgument;
-        for (const std::string& strCall : split(row.szCalls, '|')) {
-            const auto call = std::find_if(std::begin(kCalls), std::end(kCalls),
-                                           [&](const Call& c) { return strCall == c.szName; });
-            ASSERT_NE(std::end(kCalls), call) << strCall;
-            for (std::size_t i = 0; i < kinds.size(); ++i)
-                check(*call, row.szArgument, kinds[i], ends[i]);
-        }
-    }
+    kinds.emplace_back("@");
+    for (const Row& row : kArguments) check(row, kinds);
     printFigure("matrix cells, JSON arguments", nCells_);
+}
+
+TEST_F(EveryCall, TakesAnyKindOfMemberOfAnyTypeWord)
+{
+    for (const Row& row : kMembers) check(row, {std::begin(kKinds), std::end(kKinds)});
+    for (const auto& [strCall, words] : words_)
+        for (const std::string& strWord : split(kEveryWord, '|'))
+            EXPECT_EQ(1U, words.count(strWord)) << strCall << " " << strWord;
+    printFigure("matrix cells, members by type word", nCells_);
+}
+
+TEST_F(EveryCall, TakesADefinitionWithAnyKindOfValue)
+{
+    for (const DefinitionRow& row : kDefinitions)
+        for (std::size_t i = 0; i < std::size(kKinds); ++i) {
+            SCOPED_TRACE(std::string(row.szDefinition) + " " + kKinds[i]);
+            checkDefinition(row, i);
+        }
+    printFigure("matrix cells, definitions", nCells_);
 }
 
 }  // namespace

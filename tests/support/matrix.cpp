@@ -3,28 +3,6 @@
 
 #include <cstdlib>
 #include <filesystem>
-#include <sstream>
-
-std::vector<std::string> split(const std::string& strText, char cSeparator)
-{
-    std::vector<std::string> parts;
-    std::istringstream stream(strText);
-    for (std::string strPart; std::getline(stream, strPart, cSeparator);)
-        if (!strPart.empty()) parts.push_back(strPart);
-    return parts;
-}
-
-Json::Value filledIn(std::string strTemplate, const std::string& strValue)
-{
-    return json(strTemplate.replace(strTemplate.find('$'), 1, strValue));
-}
-
-void Outputs::expectUntouched() const
-{
-    EXPECT_EQ("before", strText);
-    EXPECT_EQ(R"({"kept":1})", text(jObject));
-    EXPECT_EQ(R"(["kept"])", text(jArray));
-}
 
 void expectSound(Database& database, VornJsonDbApi& api, const std::string& strRecord)
 {
