@@ -2,7 +2,7 @@
 // Every hostile string in the roles of a text that is data: it comes back as it was, and finds and
 // deletes the record that holds it.
 
-#include "support/hostile_roles.h"
+#include "hostile/hostile_roles.h"
 
 #include <algorithm>
 #include <climits>
@@ -12,41 +12,44 @@ namespace {
 
 class HostileData : public HostileRoleTest {
 protected:
-    // The member of record 1 as a fetch gives it.
-    Json::Value fetched(const char* szMember)
-    {
-        Json::Value jRequest = json(R"({"n":1})");
-        Json::Value jRecord;
-        EXPECT_EQ(1, table_.api.recGetOne(jRequest, jRecord));
-        EXPECT_EQ(3U, jRecord.size());
-        return jRecord[szMember];
-    }
+    std::size_t rowCount() { return database_.rows("select 1 from " + table_.strName).size(); }
 
-    // Sets the member of record 1.
-    void update(const char* szMember, const Json::Value& jValue)
+    // Makes record 1 anew, with that value of the member.
+    void store(const char* szMember, const Json::Value& jValue)
     {
-        Json::Value jFilter = json(R"({"n":1})");
+        database_.run("delete from " + table_.strName + " where n=1; insert into " +
+                      table_.strName + " values (1,'{}','')");
+        Json::Value jFilter = member("n", 1);
         Json::Value jValues = member(szMember, jValue);
         EXPECT_EQ(0, table_.api.recUpdateByFilter(jFilter, jValues));
         EXPECT_EQ(member(szMember, jValue), jValues);
     }
 
-    // The request means record 1 alone.
-    void expectFinds(const Json::Value& jAsked)
+    // The value is stored in record 1 and fetched; as a condition, or as the item of a list, it
+    // means record 1 alone.
+    void expectFinds(const char* szMember, const Json::Value& jValue, const Json::Value& jFetched)
     {
-        Json::Value jRequest = jAsked;
-        Json::Value jRecords;
-        EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
-        ASSERT_EQ(1U, jRecords.size());
-        EXPECT_EQ(1, jRecords[0]["n"].asInt());
-        EXPECT_EQ(1, table_.api.recDelete(jRequest));
-        EXPECT_EQ(jAsked, jRequest);
-        EXPECT_EQ(1U, rowCount());
-        EXPECT_TRUE(doubles::state().log.empty());
+        for (const Json::Value& jCondition : {jValue, listOf(jValue)}) {
+            store(szMember, jValue);
+            Json::Value jRequest = member("n", 1);
+            Json::Value jRecord;
+            EXPECT_EQ(1, table_.api.recGetOne(jRequest, jRecord));
+            EXPECT_EQ(3U, jRecord.size());
+            EXPECT_EQ(jFetched, jRecord[szMember]);
+
+            const Json::Value jAsked = member(szMember, jCondition);
+            Json::Value jRecords;
+            EXPECT_EQ(0, table_.api.recList(jRequest = jAsked, jRecords));
+            EXPECT_EQ(listOf(jRecord), jRecords);
+            EXPECT_EQ(1, table_.api.recDelete(jRequest));
+            EXPECT_EQ(jAsked, jRequest);
+            EXPECT_EQ(1U, rowCount());
+            EXPECT_TRUE(doubles::state().log.empty());
+        }
     }
 };
 
-TEST_F(HostileData, TextOfANewRecord)
+TEST_F(HostileData, IsStoredInANewRecord)
 {
     forEachString([&](const std::string& strHostile) {
         Json::Value jRecord = json(R"({"n":3,"o":{}})");
@@ -61,11 +64,9 @@ TEST_F(HostileData, TextOfANewRecord)
     });
 }
 
-TEST_F(HostileData, TextOfAnUpdate)
+TEST_F(HostileData, IsStoredByAnUpdate)
 {
     forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        EXPECT_EQ(Json::Value(upToNul(strHostile)), fetched("s"));
         Json::Value jValues = member("s", strHostile);
         std::string strWhere = "n=2";
         EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
@@ -74,7 +75,7 @@ TEST_F(HostileData, TextOfAnUpdate)
     });
 }
 
-TEST_F(HostileData, DefaultValue)
+TEST_F(HostileData, IsStoredAsADefault)
 {
     Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
     forEachString([&](const std::string& strHostile) {
@@ -89,73 +90,47 @@ TEST_F(HostileData, DefaultValue)
     });
 }
 
+TEST_F(HostileData, FindsAndDeletesItsRecord)
+{
+    forEachString(
+        [&](const std::string& strHostile) { expectFinds("s", strHostile, upToNul(strHostile)); });
+}
+
 // In JSON text a NUL is spelt out and stays.
-TEST_F(HostileData, JsonMember)
+TEST_F(HostileData, FindsAndDeletesItsRecordByAJsonMember)
 {
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jObject;
-        jObject[strHostile].append(strHostile);
-        update("o", jObject);
-        EXPECT_EQ(jObject, fetched("o"));
-        expectFinds(member("o", jObject));
-    });
+    forEachString(
+        [&](const std::string& strHostile) {
+            for (const Json::Value& jObject :
+                 {member(strHostile, listOf(strHostile)), member("k", strHostile)})
+                expectFinds("o", jObject, jObject);
+        },
+        4);
 }
 
-TEST_F(HostileData, Condition)
+TEST_F(HostileData, DeletesItsRecordByName)
 {
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        expectFinds(member("s", strHostile));
-    });
+    forEachString(
+        [&](const std::string& strHostile) {
+            store("s", strHostile);
+            std::string strValue = strHostile;
+            EXPECT_EQ(strHostile.empty() ? -1 : 1, table_.api.recDeleteByName(strValue, "s"));
+            EXPECT_EQ(strHostile.empty() ? 2U : 1U, rowCount());
+            EXPECT_EQ(strHostile, strValue);
+
+            store("s", strHostile);
+            std::vector<std::string> values = {strHostile};
+            EXPECT_EQ(1, table_.api.recDeleteByArray(values, "s"));
+            EXPECT_EQ(1U, rowCount());
+            EXPECT_EQ(std::vector<std::string>{strHostile}, values);
+        },
+        2);
 }
 
-TEST_F(HostileData, ListItem)
+TEST_F(HostileData, IsAConstantAsSortKeyAndDirection)
 {
     forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        Json::Value jList(Json::arrayValue);
-        jList.append(strHostile);
-        expectFinds(member("s", jList));
-    });
-}
-
-TEST_F(HostileData, ListItemOfAJsonMember)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("o", member("k", strHostile));
-        Json::Value jList(Json::arrayValue);
-        jList.append(member("k", strHostile));
-        expectFinds(member("o", jList));
-    });
-}
-
-TEST_F(HostileData, ValueOfADeleteByArray)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        std::vector<std::string> values = {strHostile};
-        EXPECT_EQ(1, table_.api.recDeleteByArray(values, "s"));
-        EXPECT_EQ(1U, rowCount());
-        EXPECT_EQ(std::vector<std::string>{strHostile}, values);
-    });
-}
-
-TEST_F(HostileData, ValueOfADeleteByName)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        std::string strValue = strHostile;
-        EXPECT_EQ(strHostile.empty() ? -1 : 1, table_.api.recDeleteByName(strValue, "s"));
-        EXPECT_EQ(strHostile.empty() ? 2U : 1U, rowCount());
-        EXPECT_EQ(strHostile, strValue);
-    });
-}
-
-TEST_F(HostileData, SortKeyAndDirection)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRequest;
-        jRequest["sort_by"] = strHostile;
+        Json::Value jRequest = member("sort_by", strHostile);
         jRequest["sort_direction"] = strHostile;
         std::string strOut;
         EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
@@ -171,35 +146,20 @@ long long number(const std::string& strText)
     return strtoll(strText.c_str(), nullptr, 10);
 }
 
-Json::Value asText(const std::string& strText)
-{
-    return strText.c_str();
-}
-
-Json::Value asInt(const std::string& strText)
-{
-    return static_cast<int>(std::clamp<long long>(number(strText), INT_MIN, INT_MAX));
-}
-
-Json::Value asInt64(const std::string& strText)
-{
-    return Json::Int64(number(strText));
-}
-
-Json::Value asBool(const std::string& strText)
-{
-    return 1 == number(strText);
-}
-
-Json::Value asJson(const std::string& strText)
-{
-    return leftByReader(strText.c_str());
-}
+// What a stored text comes back as.
+const auto asText = [](const std::string& strText) { return Json::Value(strText.c_str()); };
+const auto asInt = [](const std::string& strText) {
+    return Json::Value(static_cast<int>(std::clamp<long long>(number(strText), INT_MIN, INT_MAX)));
+};
+const auto asInt64 = [](const std::string& strText) {
+    return Json::Value(Json::Int64(number(strText)));
+};
+const auto asBool = [](const std::string& strText) { return Json::Value(1 == number(strText)); };
+const auto asJson = [](const std::string& strText) { return leftByReader(strText.c_str()); };
 
 struct Word {
     const char* szWord;
-    // What a stored text comes back as; null where no column can be decoded.
-    Json::Value (*value)(const std::string& strText);
+    Json::Value (*value)(const std::string& strText);  // null where no column can be decoded
 };
 
 const Word kWords[] = {
@@ -210,16 +170,14 @@ const Word kWords[] = {
     {"unknown", nullptr},    {"Json::arrayValue", asJson},
 };
 
-// The text of a column, stored by somebody else.
-TEST_F(HostileData, StoredTextUnderEveryWord)
+TEST_F(HostileData, IsReadFromAColumnOfEachType)
 {
     for (const Word& word : kWords) {
         SCOPED_TRACE(word.szWord);
         Table stored(database_, std::string(R"({"v":{"cpptype":")") + word.szWord + R"("}})", "v");
         forEachString([&](const std::string& strHostile) {
-            database_.run("delete from " + stored.strName);
-            database_.run("insert into " + stored.strName + " values ('" + doubled(strHostile) +
-                          "')");
+            database_.run("delete from " + stored.strName + "; insert into " + stored.strName +
+                          " values ('" + doubled(strHostile) + "')");
             const bool blDecoded = nullptr != word.value;
             Json::Value jRequest;
             Json::Value jRecords(Json::arrayValue);
@@ -233,44 +191,33 @@ TEST_F(HostileData, StoredTextUnderEveryWord)
     }
 }
 
-TEST_F(HostileData, MessageOfTheHost)
+TEST_F(HostileData, IsKeptByWhatRunsNoStatement)
 {
-    forEachString([&](const std::string& strHostile) {
-        table_.api.setErrMsg(strHostile);
-        EXPECT_EQ(strHostile, table_.api.getErrMsg());
-        table_.api.setErrMsg("");
-    });
-}
+    forEachString(
+        [&](const std::string& strHostile) {
+            table_.api.setErrMsg(strHostile);
+            EXPECT_EQ(strHostile, table_.api.getErrMsg());
+            table_.api.setErrMsg("");
 
-TEST_F(HostileData, NameAndValueOfCopiedMembers)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jFrom;
-        jFrom[strHostile] = strHostile;
-        Json::Value jInto;
-        EXPECT_EQ(0, VORN_JSON_DB::jsonCopyMember(jInto, jFrom, true));
-        EXPECT_EQ(jFrom, jInto);
+            Json::Value jFrom = member(strHostile, strHostile);
+            Json::Value jInto;
+            EXPECT_EQ(0, VORN_JSON_DB::jsonCopyMember(jInto, jFrom, true));
+            EXPECT_EQ(jFrom, jInto);
 
-        std::vector<std::string> values = {strHostile, strHostile};
-        Json::Value jParam;
-        const bool blNoKey = upToNul(strHostile).empty();
-        EXPECT_EQ(blNoKey ? -1 : 0,
-                  table_.api.VectorParamToJson(values, strHostile.c_str(), jParam));
-        if (!blNoKey) {
-            EXPECT_EQ(Json::Value(strHostile), jParam[strHostile.c_str()][1]);
-        }
-    });
-}
+            std::vector<std::string> values = {strHostile, strHostile};
+            Json::Value jParam;
+            const std::string strKey = upToNul(strHostile);
+            EXPECT_EQ(strKey.empty() ? -1 : 0,
+                      table_.api.VectorParamToJson(values, strHostile.c_str(), jParam));
+            EXPECT_EQ(strKey.empty() ? Json::Value() : Json::Value(strHostile), jParam[strKey][1]);
 
-TEST_F(HostileData, TextThatATimeReplaces)
-{
-    forEachString([&](const std::string& strHostile) {
-        std::string strOut = strHostile;
-        EXPECT_EQ(-1, VORN_JSON_DB::convert2ReadableTime(0, strOut, 1));
-        EXPECT_EQ(strHostile, strOut);
-        EXPECT_EQ(0, VORN_JSON_DB::convert2ReadableTime(0, strOut, 5));
-        EXPECT_EQ("1970-01-01 00:00:00", strOut);
-    });
+            std::string strOut = strHostile;
+            EXPECT_EQ(-1, VORN_JSON_DB::convert2ReadableTime(0, strOut, 1));
+            EXPECT_EQ(strHostile, strOut);
+            EXPECT_EQ(0, VORN_JSON_DB::convert2ReadableTime(0, strOut, 5));
+            EXPECT_EQ("1970-01-01 00:00:00", strOut);
+        },
+        3);
 }
 
 }  // namespace

@@ -1,14 +1,14 @@
 // SPDX-License-Identifier: MIT
-// Every hostile string in the roles of a text that becomes SQL as it stands, or decides how values
-// are read: the call ends with a result, logs a failure, and handle and connection go on working.
+// Every hostile string in the roles of a text that becomes SQL as it is, or decides how values are
+// read: the call ends with a result, logs a failure, and handle and connection go on working.
 
-#include "support/hostile_roles.h"
+#include "hostile/hostile_roles.h"
 
 namespace {
 
 class HostileSql : public HostileRoleTest {
 protected:
-    // As many of the calls that take a request as can read this one.
+    // The calls that take a request.
     void expectRequestEnds(const Json::Value& jAsked)
     {
         Json::Value jRequest = jAsked;
@@ -21,12 +21,22 @@ protected:
         EXPECT_EQ(jAsked, jRequest);
     }
 
-    // The rest of the process sees the table's own types again.
-    void restoreTypes()
+    // All calls that take a record or a request, with one member.
+    static void expectRecordEnds(VornJsonDbApi& api, const std::string& strMember)
     {
-        VORN_JSON_DB::recType(table_.jDefinition, table_.strName) =
-            table_.jDefinition[table_.strName]["member"];
+        const Json::Value jAsked = member(strMember, "x");
+        Json::Value jRecord;
+        Json::Value jOut;
+        expectEnds(api.recSave(jRecord = jAsked, true));
+        expectEnds(api.recCreate(jRecord = jAsked, jOut));
+        expectEnds(api.recList(jRecord = jAsked, jOut = Json::Value()));
+        expectEnds(api.recUpdateByFilter(jRecord, jRecord));
+        expectEnds(api.recDelete(jRecord));
+        EXPECT_EQ(jAsked, jRecord);
     }
+
+    Json::Value& types() { return VORN_JSON_DB::recType(table_.jDefinition, table_.strName); }
+    const Json::Value jTypes_ = types();
 };
 
 TEST_F(HostileSql, ConditionOnANumber)
@@ -44,8 +54,7 @@ TEST_F(HostileSql, ConditionOnANumber)
 TEST_F(HostileSql, ListItemOfANumber)
 {
     forEachString([&](const std::string& strHostile) {
-        Json::Value jList(Json::arrayValue);
-        jList.append(strHostile);
+        Json::Value jList = listOf(strHostile);
         std::string strOut;
         EXPECT_EQ(0, table_.api.SqlMakeByListField("n", jList, strOut));
         EXPECT_EQ("n in (" + doubled(strHostile) + " )", strOut);
@@ -90,13 +99,10 @@ TEST_F(HostileSql, LimitAndOffset)
 
 TEST_F(HostileSql, NameOfAMember)
 {
-    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
     forEachString([&](const std::string& strHostile) {
-        Json::Value jDefinition;
-        jDefinition[table_.strName]["member"][strHostile]["cpptype"] = "string";
-        jTypes = jDefinition[table_.strName]["member"];
+        types() = member(strHostile, member("cpptype", "string"));
+        Json::Value jDefinition = member(table_.strName, member("member", types()));
         VornJsonDbApi api(database_.get(), table_.strName, jDefinition, table_.strCreate);
-
         std::string strOut;
         EXPECT_EQ(0, api.SqlExpandMemberName(strOut));
         EXPECT_EQ(strHostile, strOut);
@@ -105,28 +111,18 @@ TEST_F(HostileSql, NameOfAMember)
         strOut.clear();
         EXPECT_EQ(0, api.SqlMakeByMatchField(strField, jValue, strOut));
         EXPECT_EQ(strHostile + "='x'", strOut);
-
-        Json::Value jRecord;
-        jRecord[strHostile] = "x";
-        expectEnds(api.recSave(jRecord, true));
-        jRecord = Json::Value();
-        jRecord[strHostile] = "x";
-        Json::Value jRecords;
-        expectEnds(api.recList(jRecord, jRecords));
-        expectEnds(api.recUpdateByFilter(jRecord, jRecord));
-        expectEnds(api.recDelete(jRecord));
+        expectRecordEnds(api, strHostile);
         std::string strValue = "x";
         expectEnds(api.recDeleteByName(strValue, strHostile.c_str()));
-        restoreTypes();
+        types() = jTypes_;
     });
 }
 
 TEST_F(HostileSql, TypeWord)
 {
-    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
     const Json::Value jRecord = json(R"({"s":"x"})");
     forEachString([&](const std::string& strHostile) {
-        jTypes["s"]["cpptype"] = strHostile;
+        types()["s"]["cpptype"] = strHostile;
         Json::Value jIn = jRecord;
         EXPECT_EQ(-1, table_.api.checkJsonType(jIn));
         EXPECT_EQ(Lines{error("type not found!!, key=s")}, takeLog());
@@ -146,39 +142,29 @@ TEST_F(HostileSql, TypeWord)
         std::string strKey = "one";
         EXPECT_EQ(-1, table_.api.recDeleteByName(strKey, "s"));
         EXPECT_EQ(jRecord, jIn);
-        restoreTypes();
+        types() = jTypes_;
     });
 }
 
-TEST_F(HostileSql, CreateStatement)
-{
-    forEachString([&](const std::string& strHostile) {
-        Database database;
-        database.run(table_.strCreate);
-        std::string strCreate = strHostile;
-        VornJsonDbApi api(database.get(), table_.strName, table_.jDefinition, strCreate);
-        doubles::state().log.clear();
-        EXPECT_EQ("", api.getErrMsg());
-        expectEnds(api.tableCreate());
-        EXPECT_EQ(strHostile, strCreate);
-        Json::Value jRecord = json(kSound);
-        EXPECT_EQ(0, api.recSave(jRecord, true));
-        EXPECT_EQ(json(kSound), jRecord);
-        EXPECT_EQ(nullptr, sqlite3_next_stmt(database.get(), nullptr));
-    });
-}
-
-TEST_F(HostileSql, TextToRun)
+TEST_F(HostileSql, CreateStatementAndTextToRun)
 {
     const auto ignore = [](void*, int, char**, char**) { return 0; };
-    forEachString([&](const std::string& strHostile) {
-        Database database;
-        VornJsonDbApi api(database.get(), table_.strName, table_.jDefinition, table_.strCreate);
-        expectEnds(api.runSqlEx(strHostile));
-        expectEnds(api.runSqlEx(strHostile, ignore));
-        Json::Value jRecord = json(kSound);
-        EXPECT_EQ(0, api.recSave(jRecord, true));
-    });
+    forEachString(
+        [&](const std::string& strHostile) {
+            Database database;
+            database.run(table_.strCreate);
+            std::string strCreate = strHostile;
+            VornJsonDbApi api(database.get(), table_.strName, table_.jDefinition, strCreate);
+            doubles::state().log.clear();
+            EXPECT_EQ("", api.getErrMsg());
+            expectEnds(api.tableCreate());
+            EXPECT_EQ(strHostile, strCreate);
+            expectEnds(api.runSqlEx(strHostile));
+            expectEnds(api.runSqlEx(strHostile, ignore));
+            if (0 == sqlite3_get_autocommit(database.get())) database.run("rollback");
+            expectSound(database, api, kSound);
+        },
+        2);
 }
 
 // In a process of its own, because the member types of the names would stay.
@@ -191,19 +177,12 @@ TEST_F(HostileSql, NameOfATable)
         jDefinition[strName]["member"] = json(R"({"s":{"cpptype":"string"}})");
         std::string strCreate = "create table if not exists " + strName + " (s text)";
         VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
-        doubles::state().log.clear();
         const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
         EXPECT_EQ(strHostile.empty(), jTypes.isNull());
         doubles::state().log.clear();
         if (strHostile.empty()) return;
-
         expectEnds(api.tableCreate());
-        Json::Value jRecord = json(R"({"s":"x"})");
-        Json::Value jOut;
-        expectEnds(api.recCreate(jRecord, jOut));
-        expectEnds(api.recList(jRecord, jOut = Json::Value()));
-        expectEnds(api.recUpdateByFilter(jRecord, jRecord));
-        expectEnds(api.recDelete(jRecord));
+        expectRecordEnds(api, "s");
         expectEnds(api.recDeleteAll());
         EXPECT_EQ(strHostile, strName);
     };
@@ -213,7 +192,6 @@ TEST_F(HostileSql, NameOfATable)
             endProcess(database_);
         },
         testing::ExitedWithCode(0), "");
-    printFigure("hostile strings in roles, names of tables", hostileStrings().size());
 }
 
 }  // namespace
