@@ -132,11 +132,12 @@ TEST_F(HostileData, IsAConstantAsSortKeyAndDirection)
     forEachString([&](const std::string& strHostile) {
         Json::Value jRequest = member("sort_by", strHostile);
         jRequest["sort_direction"] = strHostile;
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-        EXPECT_EQ(" order by '" + doubled(strHostile) + "' ASC", strOut);
+        takeStatements();
         Json::Value jRecords;
         EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
+        EXPECT_EQ(
+            "SELECT n,o,s FROM " + table_.strName + "  order by '" + doubled(strHostile) + "' ASC;",
+            takeStatements().at(0));
         EXPECT_EQ(2U, jRecords.size());
     });
 }

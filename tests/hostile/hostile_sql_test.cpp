@@ -8,19 +8,6 @@ namespace {
 
 class HostileSql : public HostileRoleTest {
 protected:
-    // The calls that take a request.
-    void expectRequestEnds(const Json::Value& jAsked)
-    {
-        Json::Value jRequest = jAsked;
-        Json::Value jRecords;
-        expectEnds(table_.api.recList(jRequest, jRecords));
-        EXPECT_TRUE(jRecords.isNull() || jRecords.isArray());
-        Json::Value jValues = json(R"({"s":"new"})");
-        expectEnds(table_.api.recUpdateByFilter(jRequest, jValues));
-        expectEnds(table_.api.recDelete(jRequest));
-        EXPECT_EQ(jAsked, jRequest);
-    }
-
     // All calls that take a record or a request, with one member.
     static void expectRecordEnds(VornJsonDbApi& api, const std::string& strMember)
     {
@@ -39,62 +26,39 @@ protected:
     const Json::Value jTypes_ = types();
 };
 
-TEST_F(HostileSql, ConditionOnANumber)
+TEST_F(HostileSql, Request)
 {
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jValue(strHostile);
-        std::string strField = "n";
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlMakeByMatchField(strField, jValue, strOut));
-        EXPECT_EQ("n=" + doubled(strHostile), strOut);
-        expectRequestEnds(member("n", strHostile));
-    });
-}
-
-TEST_F(HostileSql, ListItemOfANumber)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jList = listOf(strHostile);
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlMakeByListField("n", jList, strOut));
-        EXPECT_EQ("n in (" + doubled(strHostile) + " )", strOut);
-        expectRequestEnds(member("n", jList));
-    });
-}
-
-TEST_F(HostileSql, RawFilter)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRequest = member("vornSqlWhereFilter", strHostile);
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlExpandMemberList(jRequest, strOut, VORN_SQL_WHERE_TYPE_AND));
-        EXPECT_EQ(" ( " + strHostile + "  )", strOut);
-        expectRequestEnds(jRequest);
-    });
-}
-
-TEST_F(HostileSql, ConditionOfAnUpdate)
-{
-    forEachString([&](const std::string& strHostile) {
-        std::string strWhere = strHostile;
-        Json::Value jValues = json(R"({"s":"new"})");
-        expectEnds(table_.api.recUpdateByWhere(jValues, strWhere));
-        EXPECT_EQ(strHostile, strWhere);
-    });
-}
-
-TEST_F(HostileSql, LimitAndOffset)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRequest = member("limit", strHostile);
-        jRequest["offset"] = strHostile;
-        const std::string strText = text(strHostile);
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-        EXPECT_EQ(" LIMIT " + strText + " OFFSET " + strText, strOut);
-        Json::Value jRecords;
-        expectEnds(table_.api.recList(jRequest, jRecords));
-    });
+    forEachString(
+        [&](const std::string& strHostile) {
+            const std::string strNumber = doubled(strHostile);
+            const std::string strPage = text(strHostile);
+            Json::Value jPage = member("limit", strHostile);
+            jPage["offset"] = strHostile;
+            const std::pair<Json::Value, std::string> requests[] = {
+                {member("n", strHostile), " WHERE  (n=" + strNumber + " );"},
+                {member("n", listOf(strHostile)), " WHERE  (n in (" + strNumber + " ) );"},
+                {member("vornSqlWhereFilter", strHostile), " WHERE  ( " + strHostile + "  );"},
+                {jPage, " LIMIT " + strPage + " OFFSET " + strPage + ";"},
+            };
+            for (const auto& [jAsked, strTail] : requests) {
+                takeStatements();
+                Json::Value jRequest = jAsked;
+                Json::Value jRecords;
+                expectEnds(table_.api.recList(jRequest, jRecords));
+                EXPECT_TRUE(jRecords.isNull() || jRecords.isArray());
+                EXPECT_EQ(upToNul("SELECT n,o,s FROM " + table_.strName + " " + strTail),
+                          takeStatements().at(0));
+                Json::Value jValues = member("s", "new");
+                expectEnds(table_.api.recUpdateByFilter(jRequest, jValues));
+                expectEnds(table_.api.recDelete(jRequest));
+                EXPECT_EQ(jAsked, jRequest);
+            }
+            std::string strWhere = strHostile;
+            Json::Value jValues = member("s", "new");
+            expectEnds(table_.api.recUpdateByWhere(jValues, strWhere));
+            EXPECT_EQ(strHostile, strWhere);
+        },
+        5);
 }
 
 TEST_F(HostileSql, NameOfAMember)

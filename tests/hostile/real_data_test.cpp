@@ -3,7 +3,7 @@
 // record compared whole with its entry in the source file. Members that an entry lacks are absent
 // in the record too: no defaults are declared, and the columns are then NULL.
 
-#include "support/database.h"
+#include "support/matrix.h"
 
 #include <fstream>
 #include <iterator>
@@ -18,7 +18,7 @@ struct Source {
     std::size_t nAtLeast;
     const char* szKey;       // the member that is the primary key
     const char* szOptional;  // one that many entries lack
-    std::vector<std::string> members;
+    const char* szMembers;
     std::vector<std::string> conditions;  // members that are searched by every value they have
 };
 
@@ -28,15 +28,14 @@ const Source kSources[] = {
      7000,
      "alpha_3",
      "common_name",
-     {"alpha_2", "alpha_3", "bibliographic", "common_name", "inverted_name", "name", "scope",
-      "type"},
+     "alpha_2 alpha_3 bibliographic common_name inverted_name name scope type",
      {"bibliographic", "scope", "type"}},
     {"iso_3166-2.json",
      "3166-2",
      5000,
      "code",
      "parent",
-     {"code", "name", "parent", "type"},
+     "code name parent type",
      {"parent", "type"}},
 };
 
@@ -78,7 +77,7 @@ public:
 
         Json::Value jMembers;
         std::string strColumns = std::string("primary key (") + source_.szKey + ")";
-        for (const std::string& strMember : source_.members) {
+        for (const std::string& strMember : split(source_.szMembers, ' ')) {
             jMembers[strMember]["cpptype"] = "string";
             strColumns.insert(0, strMember + " text,");
         }
