@@ -13,7 +13,7 @@ protected:
     void attack(Layers layers, bool blHit)
     {
         World world(layers, attack_.uMoreNotes);
-        for (const std::string& strLine : attack_.lines) world.send(strLine);
+        world.send(attack_.strLines);
         const bool blGuard = Layers::kGuard == layers || Layers::kBoth == layers;
         if (blGuard && Attack::Guard::kRefuses == attack_.guard) {
             EXPECT_TRUE(world.answers.at(0).isMember("refused")) << text(world.answers[0]);
@@ -27,7 +27,7 @@ protected:
         if (Layers::kNone == layers) return;
         EXPECT_EQ("s3cr3t", world.database.value("select secret from vault"));
         // An update by itself is not wrong, but what the host makes of it later.
-        if (!blHit && (blGuard || kHostSavesAgain != attack_.lines.back())) {
+        if (!blHit && (blGuard || std::string::npos == attack_.strLines.find(kHostSavesAgain))) {
             EXPECT_EQ(world.strBefore, world.contents());
         }
     }

@@ -10,7 +10,7 @@
 
 struct Attack {
     std::string strName;
-    std::vector<std::string> lines;
+    std::string strLines;
     // Whether it reached its aim in a world that was stopped.
     std::function<bool(World& world)> worked;
     unsigned uMoreNotes = 0;  // in the table beforehand

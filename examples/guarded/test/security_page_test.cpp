@@ -52,7 +52,7 @@ std::string literal(const std::string& strReason)
 std::string refusal(const Attack& attack)
 {
     World world(World::Layers::kBoth, attack.uMoreNotes);
-    world.send(attack.lines.at(0));
+    world.send(attack.strLines);
     world.stop();
     return world.answers.at(0)["refused"].asString();
 }

@@ -4,7 +4,8 @@
 #include "examples/guarded/guard.h"
 
 #include <json/reader.h>
-#include <json/writer.h>
+
+#include <sstream>
 
 namespace {
 
@@ -108,15 +109,18 @@ Json::Value World::answer(const std::string& strLine)
     }
 }
 
-void World::send(const std::string& strLine)
+void World::send(const std::string& strLines)
 {
-    try {
-        if (kHostSavesAgain == strLine)
-            saveAgain();
-        else
-            answers.push_back(answer(strLine));
-    } catch (const std::exception&) {
-        blThrown = true;
+    std::istringstream stream(strLines);
+    for (std::string strLine; std::getline(stream, strLine);) {
+        try {
+            if (kHostSavesAgain == strLine)
+                saveAgain();
+            else
+                answers.push_back(answer(strLine));
+        } catch (const std::exception&) {
+            blThrown = true;
+        }
     }
     blTransaction = 0 == sqlite3_get_autocommit(database.get());
 }

@@ -39,8 +39,8 @@ public:
 
     explicit World(Layers layers, unsigned uMoreNotes = 0);
 
-    // Sends a line and keeps its answer. Without the guard the reader takes what it can.
-    void send(const std::string& strLine);
+    // Sends the lines and keeps their answers. Without the guard the reader takes what it can.
+    void send(const std::string& strLines);
 
     // Takes the layers away, so that a test can look at the database.
     void stop();
