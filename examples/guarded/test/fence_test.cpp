@@ -67,8 +67,8 @@ TEST_F(FenceTest, GivesEachAccessWhatItNeeds)
     const std::pair<Access, const char*> statements[] = {
         {Access::kRead, "select id,text from note where id=1 order by 'id' limit 1"},
         {Access::kInsert,
-         "insert into note (id,text) values (3,'c'); select * from note where rowid == "
-         "last_insert_rowid()"},
+         "insert into note (id,text) values (3,'c');"
+         "select * from note where rowid == last_insert_rowid()"},
         {Access::kInsert, "replace into note (id,text) values (3,'d')"},
         {Access::kUpdate, "update note set text='z' where (id=1)"},
         {Access::kDelete, "delete from note where (id=2)"},
@@ -77,13 +77,24 @@ TEST_F(FenceTest, GivesEachAccessWhatItNeeds)
     EXPECT_EQ("1z,3d", notes());
 }
 
-TEST_F(FenceTest, GivesNoneMore)
+TEST_F(FenceTest, GivesNoneMoreAndNothingBetweenTwoCalls)
 {
     const char* kSelect = "select * from note";
     const char* kInsert = "insert into note (id) values (3)";
     const char* kUpdate = "update note set text='z' where id=1";
     const char* kDelete = "delete from note where id=1";
     const char* kRowid = "select last_insert_rowid() from note";
+    const std::vector<std::string> never = {
+        // Other tables, and the names and numbers of SQLite.
+        "select * from vault", "select count(*) from vault", "insert into vault values ('x')",
+        "update vault set secret=''", "delete from vault", "drop table vault",
+        "select * from sqlite_sequence", "insert into sqlite_sequence values ('note',9)",
+        "update sqlite_sequence set seq=0", "delete from sqlite_sequence",
+        "select * from sqlite_master",
+        // The schema, and the connection with its transactions.
+        "create table x (a)", "create temp table note (a)", "alter table vault add column b",
+        "pragma user_version=1", "attach ':memory:' as x", "commit", "savepoint x", "release x",
+        "analyze", "create trigger x after insert on note begin delete from vault; end"};
     const std::pair<Access, std::vector<std::string>> cases[] = {
         {Access::kRead, {kInsert, kUpdate, kDelete, kRowid, "select count(*) from note"}},
         {Access::kInsert, {kUpdate, kDelete, "select length(text) from note"}},
@@ -96,67 +107,34 @@ TEST_F(FenceTest, GivesNoneMore)
         {Access::kNothing, {kSelect, kInsert, kUpdate, kDelete, kRowid, "begin"}},
     };
     for (const auto& [access, statements] : cases) {
+        EXPECT_EQ(0, run(Access::kRead, kSelect));
+        for (const char* szSql : {kSelect, "begin", "savepoint x"})
+            EXPECT_EQ(kRefused, execute(szSql)) << "between two calls: " << szSql;
         expectNotAuthorized(access, statements);
-        expectNotAuthorized(access,
-                            {"select * from vault",
-                             "select count(*) from vault",
-                             "insert into vault values ('x')",
-                             "update vault set secret=''",
-                             "delete from vault",
-                             "drop table vault",
-                             "select * from sqlite_sequence",
-                             "insert into sqlite_sequence values ('note',9)",
-                             "update sqlite_sequence set seq=0",
-                             "delete from sqlite_sequence",
-                             "select * from sqlite_master",
-                             "create table x (a)",
-                             "create temp table note (a)",
-                             "alter table vault add column b",
-                             "pragma user_version=1",
-                             "attach ':memory:' as x",
-                             "commit",
-                             "savepoint x",
-                             "release x",
-                             "analyze",
-                             "create trigger x after insert on note begin delete from vault; end"});
+        expectNotAuthorized(access, never);
     }
     EXPECT_EQ("1a,2b", notes());
     EXPECT_EQ("s", database_.value("select secret from vault"));
 }
 
-TEST_F(FenceTest, GivesNothingBetweenTwoCalls)
-{
-    EXPECT_EQ(kRefused, execute("select 1"));
-    for (const Access access : {Access::kRead, Access::kInsert}) {
-        for (const char* szSql : {"select id from note", "nonsense"}) run(access, szSql);
-        for (const char* szSql : {"select id from note", "begin", "savepoint x"})
-            EXPECT_EQ(kRefused, execute(szSql)) << szSql;
-    }
-    EXPECT_EQ("1a,2b", notes());
-}
-
 // Whoever can write a trigger into the file writes as the host does, but not inside the fence.
-TEST_F(FenceTest, GivesNothingToTriggers)
+// Another table of that name, of the connection or of an attached file, is not the host's.
+TEST_F(FenceTest, GivesNothingToTriggersAndOtherDatabases)
 {
     rebuild(
+        "attach ':memory:' as x; create table x.note (id integer primary key, text text);"
         "create trigger x after insert on note when new.id < 9 "
         "begin insert into note values (9,'x'); end");
-    expectNotAuthorized(Access::kInsert, {"insert into note values (3,'c')"});
-    EXPECT_EQ("1a,2b", notes());
-}
-
-// Another table of that name, of the connection or of an attached file, is not the host's.
-TEST_F(FenceTest, KnowsTheMainDatabaseOnly)
-{
-    rebuild("attach ':memory:' as x; create table x.note (id integer primary key, text text)");
     EXPECT_EQ(0, run(Access::kRead, "select * from note"));
     expectNotAuthorized(Access::kRead, {"select * from x.note"});
-    expectNotAuthorized(Access::kInsert, {"insert into x.note values (1,'x')"});
-
+    expectNotAuthorized(Access::kInsert,
+                        {"insert into note values (3,'c')", "insert into x.note values (1,'x')"});
     rebuild("create temp table note (id integer primary key, text text)");
     EXPECT_EQ(0, run(Access::kRead, "select * from main.note"));
     expectNotAuthorized(Access::kRead, {"select * from note"});
     expectNotAuthorized(Access::kDelete, {"delete from note where id=1"});
+    rebuild("drop table temp.note");
+    EXPECT_EQ("1a,2b", notes());
 }
 
 TEST_F(FenceTest, TakesBackMoreThanOneChangeAndWhatFails)
@@ -214,24 +192,17 @@ TEST_F(FenceTest, LimitsStatements)
 TEST_F(FenceTest, StopsNobodyWhenItIsGone)
 {
     pFence_.reset();
-    database_.run(
-        "insert into note values (3,'c'),(4,'d'),(5,'e'),(6,'f'),(7,'g'),(8,'h'),(9,'i')");
-    const std::string strAll = "note a, note b, note c, note d, note e, note f";
-    EXPECT_EQ("531441", database_.value("select count(*) from " + strAll));
-}
-
-// The authorizer refuses first what this would.
-TEST_F(FenceTest, IsDefensive)
-{
-    int iDefensive = 0;
-    sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_DEFENSIVE, -1, &iDefensive);
-    EXPECT_EQ(1, iDefensive);
+    EXPECT_EQ("524288", database_.value("select count(*) from note" + repeated(18, " join note")));
 }
 
 // Whoever can write a CHECK into the file calls the host's own functions with it, and the
 // authorizer is not asked about those.
-TEST_F(FenceTest, DoesNotTrustTheSchema)
+TEST_F(FenceTest, IsDefensiveAndDoesNotTrustTheSchema)
 {
+    int iDefensive = 0;  // the authorizer refuses first what this would
+    sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_DEFENSIVE, -1, &iDefensive);
+    EXPECT_EQ(1, iDefensive);
+
     const auto one = [](sqlite3_context* pContext, int, sqlite3_value**) {
         sqlite3_result_int(pContext, 1);
     };
@@ -246,76 +217,52 @@ TEST_F(FenceTest, DoesNotTrustTheSchema)
     EXPECT_EQ("1a", notes());
 }
 
-// The guard lets these through: they are good requests, but for the size of the table.
-TEST_F(HostTest, FencedScansOfALargeTableEnd)
+// The guard lets these through: they are good requests, but for the size of the table. Each call
+// has all its steps.
+TEST_F(HostTest, FencedScansEndWhereTheTableIsLarge)
 {
-    World world(World::Layers::kBoth, 200000);
+    World large(World::Layers::kBoth, 200000);
+    World medium(World::Layers::kBoth, 10000);
+    for (int i = 0; i < 10; ++i) {
+        medium.send(list(R"({"offset":9000,"limit":1})"));
+        EXPECT_EQ(1U, medium.answers.back()["records"].size());
+    }
     for (const char* szRequest : {R"({"offset":190000})", R"({"offset":190000,"limit":1})"}) {
-        world.send(list(szRequest));
-        EXPECT_EQ(R"({"error":"failed"})", text(world.answers.back()));
+        large.send(list(szRequest));
+        EXPECT_EQ(R"({"error":"failed"})", text(large.answers.back()));
     }
-    world.send(list(R"({"id":200000})"));
-    EXPECT_EQ(1U, world.answers.back()["records"].size());
-    world.stop();
+    large.send(list(R"({"id":200000})"));
+    EXPECT_EQ(1U, large.answers.back()["records"].size());
 }
 
-// Each call has all its steps.
-TEST_F(HostTest, FencedScansOfAMediumSizeGoOnForEver)
+// The library alone would try 500 times to get a lock.
+TEST_F(HostTest, FencedAnswersBesideAnotherConnection)
 {
-    World world(World::Layers::kBoth, 10000);
-    for (int i = 0; i < 10; ++i) world.send(list(R"({"offset":9000,"limit":1})"));
-    for (const Json::Value& jAnswer : world.answers) EXPECT_EQ(1U, jAnswer["records"].size());
-    world.stop();
-}
-
-// A host on a file, beside another connection to it, which begins something.
-class FencedFile : public HostTest {
-protected:
-    FencedFile() { EXPECT_EQ(SQLITE_OK, sqlite3_open(database_.path().c_str(), &pOther_)); }
-    ~FencedFile() override { EXPECT_EQ(SQLITE_OK, sqlite3_close(pOther_)); }
-
-    void other(const char* szSql)
-    {
-        EXPECT_EQ(SQLITE_OK, doubles::realExec(pOther_, szSql, nullptr, nullptr, nullptr));
-    }
-    std::string answer(const std::string& strLine) { return text(host_.answer(strLine)); }
-
-    const std::string kCreate = create(R"({"text":"once"})");
-    static constexpr char kFailed[] = R"({"error":"failed"})";
-    static constexpr char kNone[] = R"({"records":null,"result":0})";
-
-    Database database_{Database::Place::kFile};
-    Host host_{database_.get()};
-    sqlite3* pOther_ = nullptr;
-};
-
-// Nor does it wait for a lock: the library alone would try 500 times.
-TEST_F(FencedFile, AnswersBesideAnotherConnection)
-{
+    Database database(Database::Place::kFile);
+    Host host(database.get());
+    Database other(database.path());
+    const char* kFailed = R"({"error":"failed"})";
+    const char* kNone = R"({"records":null,"result":0})";
+    const std::string strCreate = create(R"({"text":"once"})");
     const std::pair<const char*, const char*> cases[] = {
         {"begin exclusive", kFailed},
         {"begin immediate", kNone},
-        // A reader keeps the commit from the file.
-        {"begin; select * from note", kNone},
+        {"begin; select * from note", kNone},  // a reader keeps the commit from the file
     };
     for (const auto& [szSql, szListed] : cases) {
         SCOPED_TRACE(szSql);
-        other(szSql);
-        EXPECT_EQ(kFailed, answer(kCreate));
-        EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
-        EXPECT_EQ(szListed, answer(list(R"({"id":1})")));
-        other("commit");
+        other.run(szSql);
+        EXPECT_EQ(kFailed, text(host.answer(strCreate)));
+        EXPECT_EQ(1, sqlite3_get_autocommit(database.get()));
+        EXPECT_EQ(szListed, text(host.answer(list(R"({"id":1})"))));
+        other.run("commit");
     }
     EXPECT_EQ(0U, doubles::state().sleeps.size());
-    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
-}
 
-TEST_F(FencedFile, TellsOfADuplicate)
-{
-    other("create unique index one on note (text)");
-    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
-    EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", answer(kCreate));
-    EXPECT_EQ(kFailed, answer(update(R"({"id":1})", R"({"topics":[1]})")));
+    other.run("create unique index one on note (text)");
+    EXPECT_EQ(0, host.answer(strCreate)["result"].asInt());
+    EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", text(host.answer(strCreate)));
+    EXPECT_EQ(kFailed, text(host.answer(update(R"({"id":1})", R"({"topics":[1]})"))));
 }
 
 }  // namespace
