@@ -49,45 +49,36 @@ protected:
     }
 };
 
-TEST_F(HostileData, IsStoredInANewRecord)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRecord = json(R"({"n":3,"o":{}})");
-        jRecord["s"] = strHostile;
-        Json::Value jExpected = jRecord;
-        jExpected["s"] = upToNul(strHostile);
-        Json::Value jStored;
-        EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
-        EXPECT_EQ(jExpected, jStored);
-        EXPECT_EQ(0, table_.api.recSave(jRecord, false));
-        EXPECT_EQ(jExpected, jRecord);
-    });
-}
-
-TEST_F(HostileData, IsStoredByAnUpdate)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jValues = member("s", strHostile);
-        std::string strWhere = "n=2";
-        EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
-        EXPECT_EQ(upToNul(strHostile),
-                  database_.value("select s from " + table_.strName + " where n=2"));
-    });
-}
-
-TEST_F(HostileData, IsStoredAsADefault)
+TEST_F(HostileData, IsStored)
 {
     Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
-    forEachString([&](const std::string& strHostile) {
-        jTypes["s"]["cppDefaultValue"] = strHostile;
-        Json::Value jRecord = json(R"({"n":3,"o":{}})");
-        Json::Value jStored;
-        EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
-        EXPECT_EQ(Json::Value(upToNul(strHostile)), jStored["s"]);
-        EXPECT_EQ(0, table_.api.fillDefaultValue(jRecord, false));
-        EXPECT_EQ(Json::Value(strHostile), jRecord["s"]);
-        jTypes["s"].removeMember("cppDefaultValue");
-    });
+    forEachString(
+        [&](const std::string& strHostile) {
+            const Json::Value jWithout = json(R"({"n":3,"o":{}})");
+            Json::Value jExpected = jWithout;
+            jExpected["s"] = upToNul(strHostile);
+            Json::Value jRecord = jWithout;
+            jRecord["s"] = strHostile;
+            Json::Value jStored;
+            EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
+            EXPECT_EQ(jExpected, jStored);
+            EXPECT_EQ(0, table_.api.recSave(jRecord, false));
+            EXPECT_EQ(jExpected, jRecord);
+
+            jTypes["s"]["cppDefaultValue"] = strHostile;
+            EXPECT_EQ(0, table_.api.recCreate(jRecord = jWithout, jStored));
+            EXPECT_EQ(jExpected, jStored);
+            EXPECT_EQ(0, table_.api.fillDefaultValue(jRecord = jWithout, false));
+            EXPECT_EQ(Json::Value(strHostile), jRecord["s"]);
+            jTypes["s"].removeMember("cppDefaultValue");
+
+            Json::Value jValues = member("s", strHostile);
+            std::string strWhere = "n=2";
+            EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
+            EXPECT_EQ(upToNul(strHostile),
+                      database_.value("select s from " + table_.strName + " where n=2"));
+        },
+        3);
 }
 
 TEST_F(HostileData, FindsAndDeletesItsRecord)

@@ -20,21 +20,13 @@ struct Type {
     bool blDecoded = true;
 };
 
-const Type kTypes[] = {
-    {"string", "\"m\""},
-    {"int", "42"},
-    {"unsigned int", "42"},
-    {"unsigned", "42", false},
-    {"long", "42", false},
-    {"unsigned long", "42", false},
-    {"long long", "42"},
-    {"unsigned long long", "42"},
-    {"float", "1.5", false},
-    {"double", "2.5", false},
-    {"bool", "true"},
-    {"Json::objectValue", R"({"k":1})"},
-    {"Json::arrayValue", "[1]"},
-};
+const Type kTypes[] = {{"string", "\"m\""},        {"int", "42"},
+                       {"unsigned int", "42"},     {"unsigned", "42", false},
+                       {"long", "42", false},      {"unsigned long", "42", false},
+                       {"long long", "42"},        {"unsigned long long", "42"},
+                       {"float", "1.5", false},    {"double", "2.5", false},
+                       {"bool", "true"},           {"Json::objectValue", R"({"k":1})"},
+                       {"Json::arrayValue", "[1]"}};
 
 class HostileRecords : public TableTest {
 protected:
