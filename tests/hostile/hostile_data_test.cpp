@@ -52,75 +52,64 @@ protected:
 TEST_F(HostileData, IsStored)
 {
     Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
-    forEachString(
-        [&](const std::string& strHostile) {
-            const Json::Value jWithout = json(R"({"n":3,"o":{}})");
-            Json::Value jExpected = jWithout;
-            jExpected["s"] = upToNul(strHostile);
-            Json::Value jRecord = jWithout;
-            jRecord["s"] = strHostile;
-            Json::Value jStored;
-            EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
-            EXPECT_EQ(jExpected, jStored);
-            EXPECT_EQ(0, table_.api.recSave(jRecord, false));
-            EXPECT_EQ(jExpected, jRecord);
+    forEachString(3, [&](const std::string& strHostile) {
+        const Json::Value jWithout = json(R"({"n":3,"o":{}})");
+        Json::Value jExpected = jWithout;
+        jExpected["s"] = upToNul(strHostile);
+        Json::Value jRecord = jWithout;
+        jRecord["s"] = strHostile;
+        Json::Value jStored;
+        EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
+        EXPECT_EQ(jExpected, jStored);
+        EXPECT_EQ(0, table_.api.recSave(jRecord, false));
+        EXPECT_EQ(jExpected, jRecord);
 
-            jTypes["s"]["cppDefaultValue"] = strHostile;
-            EXPECT_EQ(0, table_.api.recCreate(jRecord = jWithout, jStored));
-            EXPECT_EQ(jExpected, jStored);
-            EXPECT_EQ(0, table_.api.fillDefaultValue(jRecord = jWithout, false));
-            EXPECT_EQ(Json::Value(strHostile), jRecord["s"]);
-            jTypes["s"].removeMember("cppDefaultValue");
+        jTypes["s"]["cppDefaultValue"] = strHostile;
+        EXPECT_EQ(0, table_.api.recCreate(jRecord = jWithout, jStored));
+        EXPECT_EQ(jExpected, jStored);
+        EXPECT_EQ(0, table_.api.fillDefaultValue(jRecord = jWithout, false));
+        EXPECT_EQ(Json::Value(strHostile), jRecord["s"]);
+        jTypes["s"].removeMember("cppDefaultValue");
 
-            Json::Value jValues = member("s", strHostile);
-            std::string strWhere = "n=2";
-            EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
-            EXPECT_EQ(upToNul(strHostile),
-                      database_.value("select s from " + table_.strName + " where n=2"));
-        },
-        3);
-}
-
-TEST_F(HostileData, FindsAndDeletesItsRecord)
-{
-    forEachString(
-        [&](const std::string& strHostile) { expectFinds("s", strHostile, upToNul(strHostile)); });
+        Json::Value jValues = member("s", strHostile);
+        std::string strWhere = "n=2";
+        EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
+        EXPECT_EQ(upToNul(strHostile),
+                  database_.value("select s from " + table_.strName + " where n=2"));
+    });
 }
 
 // In JSON text a NUL is spelt out and stays.
-TEST_F(HostileData, FindsAndDeletesItsRecordByAJsonMember)
+TEST_F(HostileData, FindsAndDeletesItsRecord)
 {
-    forEachString(
-        [&](const std::string& strHostile) {
-            for (const Json::Value& jObject :
-                 {member(strHostile, listOf(strHostile)), member("k", strHostile)})
-                expectFinds("o", jObject, jObject);
-        },
-        4);
+    forEachString(6, [&](const std::string& strHostile) {
+        expectFinds("s", strHostile, upToNul(strHostile));
+        for (const Json::Value& jObject :
+             {member(strHostile, listOf(strHostile)), member("k", strHostile)})
+            expectFinds("o", jObject, jObject);
+    });
 }
 
 TEST_F(HostileData, DeletesItsRecordByName)
 {
-    forEachString(
-        [&](const std::string& strHostile) {
-            store("s", strHostile);
-            std::string strValue = strHostile;
-            EXPECT_EQ(strHostile.empty() ? -1 : 1, table_.api.recDeleteByName(strValue, "s"));
-            EXPECT_EQ(strHostile.empty() ? 2U : 1U, rowCount());
-            EXPECT_EQ(strHostile, strValue);
+    forEachString(2, [&](const std::string& strHostile) {
+        store("s", strHostile);
+        std::string strValue = strHostile;
+        EXPECT_EQ(strHostile.empty() ? -1 : 1, table_.api.recDeleteByName(strValue, "s"));
+        EXPECT_EQ(strHostile.empty() ? 2U : 1U, rowCount());
+        EXPECT_EQ(strHostile, strValue);
 
-            store("s", strHostile);
-            std::vector<std::string> values = {strHostile};
-            EXPECT_EQ(1, table_.api.recDeleteByArray(values, "s"));
-            EXPECT_EQ(1U, rowCount());
-            EXPECT_EQ(std::vector<std::string>{strHostile}, values);
-        },
-        2);
+        store("s", strHostile);
+        std::vector<std::string> values = {strHostile};
+        EXPECT_EQ(1, table_.api.recDeleteByArray(values, "s"));
+        EXPECT_EQ(1U, rowCount());
+        EXPECT_EQ(std::vector<std::string>{strHostile}, values);
+    });
 }
 
 TEST_F(HostileData, IsAConstantAsSortKeyAndDirection)
 {
-    forEachString([&](const std::string& strHostile) {
+    forEachString(1, [&](const std::string& strHostile) {
         Json::Value jRequest = member("sort_by", strHostile);
         jRequest["sort_direction"] = strHostile;
         takeStatements();
@@ -133,25 +122,23 @@ TEST_F(HostileData, IsAConstantAsSortKeyAndDirection)
     });
 }
 
-long long number(const std::string& strText)
+long long number(const char* szText)
 {
-    return strtoll(strText.c_str(), nullptr, 10);
+    return strtoll(szText, nullptr, 10);
 }
 
 // What a stored text comes back as.
-const auto asText = [](const std::string& strText) { return Json::Value(strText.c_str()); };
-const auto asInt = [](const std::string& strText) {
-    return Json::Value(static_cast<int>(std::clamp<long long>(number(strText), INT_MIN, INT_MAX)));
+const auto asText = [](const char* szText) { return Json::Value(szText); };
+const auto asInt = [](const char* szText) {
+    return Json::Value(static_cast<int>(std::clamp<long long>(number(szText), INT_MIN, INT_MAX)));
 };
-const auto asInt64 = [](const std::string& strText) {
-    return Json::Value(Json::Int64(number(strText)));
-};
-const auto asBool = [](const std::string& strText) { return Json::Value(1 == number(strText)); };
-const auto asJson = [](const std::string& strText) { return leftByReader(strText.c_str()); };
+const auto asInt64 = [](const char* szText) { return Json::Value(Json::Int64(number(szText))); };
+const auto asBool = [](const char* szText) { return Json::Value(1 == number(szText)); };
+const auto asJson = [](const char* szText) { return leftByReader(szText); };
 
 struct Word {
     const char* szWord;
-    Json::Value (*value)(const std::string& strText);  // null where no column can be decoded
+    Json::Value (*value)(const char* szText);  // null where no column can be decoded
 };
 
 const Word kWords[] = {
@@ -167,7 +154,7 @@ TEST_F(HostileData, IsReadFromAColumnOfEachType)
     for (const Word& word : kWords) {
         SCOPED_TRACE(word.szWord);
         Table stored(database_, std::string(R"({"v":{"cpptype":")") + word.szWord + R"("}})", "v");
-        forEachString([&](const std::string& strHostile) {
+        forEachString(1, [&](const std::string& strHostile) {
             database_.run("delete from " + stored.strName + "; insert into " + stored.strName +
                           " values ('" + doubled(strHostile) + "')");
             const bool blDecoded = nullptr != word.value;
@@ -177,7 +164,7 @@ TEST_F(HostileData, IsReadFromAColumnOfEachType)
             EXPECT_EQ(blDecoded, doubles::state().log.empty());
             ASSERT_EQ(blDecoded ? 1U : 0U, jRecords.size());
             if (blDecoded) {
-                EXPECT_EQ(text(word.value(strHostile)), text(jRecords[0]["v"]));
+                EXPECT_EQ(text(word.value(strHostile.c_str())), text(jRecords[0]["v"]));
             }
         });
     }
@@ -185,31 +172,29 @@ TEST_F(HostileData, IsReadFromAColumnOfEachType)
 
 TEST_F(HostileData, IsKeptByWhatRunsNoStatement)
 {
-    forEachString(
-        [&](const std::string& strHostile) {
-            table_.api.setErrMsg(strHostile);
-            EXPECT_EQ(strHostile, table_.api.getErrMsg());
-            table_.api.setErrMsg("");
+    forEachString(3, [&](const std::string& strHostile) {
+        table_.api.setErrMsg(strHostile);
+        EXPECT_EQ(strHostile, table_.api.getErrMsg());
+        table_.api.setErrMsg("");
 
-            Json::Value jFrom = member(strHostile, strHostile);
-            Json::Value jInto;
-            EXPECT_EQ(0, VORN_JSON_DB::jsonCopyMember(jInto, jFrom, true));
-            EXPECT_EQ(jFrom, jInto);
+        Json::Value jFrom = member(strHostile, strHostile);
+        Json::Value jInto;
+        EXPECT_EQ(0, VORN_JSON_DB::jsonCopyMember(jInto, jFrom, true));
+        EXPECT_EQ(jFrom, jInto);
 
-            std::vector<std::string> values = {strHostile, strHostile};
-            Json::Value jParam;
-            const std::string strKey = upToNul(strHostile);
-            EXPECT_EQ(strKey.empty() ? -1 : 0,
-                      table_.api.VectorParamToJson(values, strHostile.c_str(), jParam));
-            EXPECT_EQ(strKey.empty() ? Json::Value() : Json::Value(strHostile), jParam[strKey][1]);
+        std::vector<std::string> values = {strHostile, strHostile};
+        Json::Value jParam;
+        const std::string strKey = upToNul(strHostile);
+        EXPECT_EQ(strKey.empty() ? -1 : 0,
+                  table_.api.VectorParamToJson(values, strHostile.c_str(), jParam));
+        EXPECT_EQ(strKey.empty() ? Json::Value() : Json::Value(strHostile), jParam[strKey][1]);
 
-            std::string strOut = strHostile;
-            EXPECT_EQ(-1, VORN_JSON_DB::convert2ReadableTime(0, strOut, 1));
-            EXPECT_EQ(strHostile, strOut);
-            EXPECT_EQ(0, VORN_JSON_DB::convert2ReadableTime(0, strOut, 5));
-            EXPECT_EQ("1970-01-01 00:00:00", strOut);
-        },
-        3);
+        std::string strOut = strHostile;
+        EXPECT_EQ(-1, VORN_JSON_DB::convert2ReadableTime(0, strOut, 1));
+        EXPECT_EQ(strHostile, strOut);
+        EXPECT_EQ(0, VORN_JSON_DB::convert2ReadableTime(0, strOut, 5));
+        EXPECT_EQ("1970-01-01 00:00:00", strOut);
+    });
 }
 
 }  // namespace

@@ -19,7 +19,7 @@ protected:
     // The check for each string, on a table of two records, n=1 and n=2; then handle and connection
     // have to be sound. The check puts the string into nRoles.
     template <typename Check>
-    void forEachString(Check check, std::size_t nRoles = 1)
+    void forEachString(std::size_t nRoles, Check check)
     {
         for (const std::string& strHostile : hostileStrings()) {
             SCOPED_TRACE(testing::PrintToString(strHostile.substr(0, 100)));

@@ -28,42 +28,40 @@ protected:
 
 TEST_F(HostileSql, Request)
 {
-    forEachString(
-        [&](const std::string& strHostile) {
-            const std::string strNumber = doubled(strHostile);
-            const std::string strPage = text(strHostile);
-            Json::Value jPage = member("limit", strHostile);
-            jPage["offset"] = strHostile;
-            const std::pair<Json::Value, std::string> requests[] = {
-                {member("n", strHostile), " WHERE  (n=" + strNumber + " );"},
-                {member("n", listOf(strHostile)), " WHERE  (n in (" + strNumber + " ) );"},
-                {member("vornSqlWhereFilter", strHostile), " WHERE  ( " + strHostile + "  );"},
-                {jPage, " LIMIT " + strPage + " OFFSET " + strPage + ";"},
-            };
-            for (const auto& [jAsked, strTail] : requests) {
-                takeStatements();
-                Json::Value jRequest = jAsked;
-                Json::Value jRecords;
-                expectEnds(table_.api.recList(jRequest, jRecords));
-                EXPECT_TRUE(jRecords.isNull() || jRecords.isArray());
-                EXPECT_EQ(upToNul("SELECT n,o,s FROM " + table_.strName + " " + strTail),
-                          takeStatements().at(0));
-                Json::Value jValues = member("s", "new");
-                expectEnds(table_.api.recUpdateByFilter(jRequest, jValues));
-                expectEnds(table_.api.recDelete(jRequest));
-                EXPECT_EQ(jAsked, jRequest);
-            }
-            std::string strWhere = strHostile;
+    forEachString(5, [&](const std::string& strHostile) {
+        const std::string strNumber = doubled(strHostile);
+        const std::string strPage = text(strHostile);
+        Json::Value jPage = member("limit", strHostile);
+        jPage["offset"] = strHostile;
+        const std::pair<Json::Value, std::string> requests[] = {
+            {member("n", strHostile), " WHERE  (n=" + strNumber + " );"},
+            {member("n", listOf(strHostile)), " WHERE  (n in (" + strNumber + " ) );"},
+            {member("vornSqlWhereFilter", strHostile), " WHERE  ( " + strHostile + "  );"},
+            {jPage, " LIMIT " + strPage + " OFFSET " + strPage + ";"},
+        };
+        for (const auto& [jAsked, strTail] : requests) {
+            takeStatements();
+            Json::Value jRequest = jAsked;
+            Json::Value jRecords;
+            expectEnds(table_.api.recList(jRequest, jRecords));
+            EXPECT_TRUE(jRecords.isNull() || jRecords.isArray());
+            EXPECT_EQ(upToNul("SELECT n,o,s FROM " + table_.strName + " " + strTail),
+                      takeStatements().at(0));
             Json::Value jValues = member("s", "new");
-            expectEnds(table_.api.recUpdateByWhere(jValues, strWhere));
-            EXPECT_EQ(strHostile, strWhere);
-        },
-        5);
+            expectEnds(table_.api.recUpdateByFilter(jRequest, jValues));
+            expectEnds(table_.api.recDelete(jRequest));
+            EXPECT_EQ(jAsked, jRequest);
+        }
+        std::string strWhere = strHostile;
+        Json::Value jValues = member("s", "new");
+        expectEnds(table_.api.recUpdateByWhere(jValues, strWhere));
+        EXPECT_EQ(strHostile, strWhere);
+    });
 }
 
 TEST_F(HostileSql, NameOfAMember)
 {
-    forEachString([&](const std::string& strHostile) {
+    forEachString(1, [&](const std::string& strHostile) {
         types() = member(strHostile, member("cpptype", "string"));
         Json::Value jDefinition = member(table_.strName, member("member", types()));
         VornJsonDbApi api(database_.get(), table_.strName, jDefinition, table_.strCreate);
@@ -85,7 +83,7 @@ TEST_F(HostileSql, NameOfAMember)
 TEST_F(HostileSql, TypeWord)
 {
     const Json::Value jRecord = json(R"({"s":"x"})");
-    forEachString([&](const std::string& strHostile) {
+    forEachString(1, [&](const std::string& strHostile) {
         types()["s"]["cpptype"] = strHostile;
         Json::Value jIn = jRecord;
         EXPECT_EQ(-1, table_.api.checkJsonType(jIn));
@@ -113,22 +111,20 @@ TEST_F(HostileSql, TypeWord)
 TEST_F(HostileSql, CreateStatementAndTextToRun)
 {
     const auto ignore = [](void*, int, char**, char**) { return 0; };
-    forEachString(
-        [&](const std::string& strHostile) {
-            Database database;
-            database.run(table_.strCreate);
-            std::string strCreate = strHostile;
-            VornJsonDbApi api(database.get(), table_.strName, table_.jDefinition, strCreate);
-            doubles::state().log.clear();
-            EXPECT_EQ("", api.getErrMsg());
-            expectEnds(api.tableCreate());
-            EXPECT_EQ(strHostile, strCreate);
-            expectEnds(api.runSqlEx(strHostile));
-            expectEnds(api.runSqlEx(strHostile, ignore));
-            if (0 == sqlite3_get_autocommit(database.get())) database.run("rollback");
-            expectSound(database, api, kSound);
-        },
-        2);
+    forEachString(2, [&](const std::string& strHostile) {
+        Database database;
+        database.run(table_.strCreate);
+        std::string strCreate = strHostile;
+        VornJsonDbApi api(database.get(), table_.strName, table_.jDefinition, strCreate);
+        doubles::state().log.clear();
+        EXPECT_EQ("", api.getErrMsg());
+        expectEnds(api.tableCreate());
+        EXPECT_EQ(strHostile, strCreate);
+        expectEnds(api.runSqlEx(strHostile));
+        expectEnds(api.runSqlEx(strHostile, ignore));
+        if (0 == sqlite3_get_autocommit(database.get())) database.run("rollback");
+        expectSound(database, api, kSound);
+    });
 }
 
 // In a process of its own, because the member types of the names would stay.
@@ -152,7 +148,7 @@ TEST_F(HostileSql, NameOfATable)
     };
     EXPECT_EXIT(
         {
-            forEachString(useName);
+            forEachString(1, useName);
             endProcess(database_);
         },
         testing::ExitedWithCode(0), "");
