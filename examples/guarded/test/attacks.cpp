@@ -90,7 +90,7 @@ std::string nested(unsigned uLevels)
 // Guard and fence stop each of them, either of the two alone.
 std::vector<Attack> againstEither()
 {
-    // What follows the cut text stands outside quotes: ('x,7,' and then the text.
+    // What follows the cut text is outside of quotes: ('x,7,' and then the text.
     const std::string strCut = R"({"author":"x%y","id":7,"text":)";
     const std::string strDelete = R"(",0,7,1,1); delete from vault; --"})";
     return {
