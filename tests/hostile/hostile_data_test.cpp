@@ -2,7 +2,7 @@
 // Every hostile string in the roles of a text that is data: it comes back as it was, and finds and
 // deletes the record that holds it.
 
-#include "support/hostile_roles.h"
+#include "hostile/hostile_roles.h"
 
 #include <algorithm>
 #include <climits>
@@ -12,60 +12,65 @@ namespace {
 
 class HostileData : public HostileRoleTest {
 protected:
-    // The member of record 1 as a fetch gives it.
-    Json::Value fetched(const char* szMember)
-    {
-        Json::Value jRequest = json(R"({"n":1})");
-        Json::Value jRecord;
-        EXPECT_EQ(1, table_.api.recGetOne(jRequest, jRecord));
-        EXPECT_EQ(3U, jRecord.size());
-        return jRecord[szMember];
-    }
+    std::size_t rowCount() { return database_.rows("select 1 from " + table_.strName).size(); }
 
-    // Sets the member of record 1.
-    void update(const char* szMember, const Json::Value& jValue)
+    // Makes record 1 anew, with that value of the member.
+    void store(const char* szMember, const Json::Value& jValue)
     {
-        Json::Value jFilter = json(R"({"n":1})");
+        database_.run("delete from " + table_.strName + " where n=1; insert into " +
+                      table_.strName + " values (1,'{}','')");
+        Json::Value jFilter = member("n", 1);
         Json::Value jValues = member(szMember, jValue);
         EXPECT_EQ(0, table_.api.recUpdateByFilter(jFilter, jValues));
         EXPECT_EQ(member(szMember, jValue), jValues);
     }
 
-    // The request means record 1 alone.
-    void expectFinds(const Json::Value& jAsked)
+    // The value is stored in record 1 and fetched; as a condition, or as the item of a list, it
+    // means record 1 alone.
+    void expectFinds(const char* szMember, const Json::Value& jValue, const Json::Value& jFetched)
     {
-        Json::Value jRequest = jAsked;
-        Json::Value jRecords;
-        EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
-        ASSERT_EQ(1U, jRecords.size());
-        EXPECT_EQ(1, jRecords[0]["n"].asInt());
-        EXPECT_EQ(1, table_.api.recDelete(jRequest));
-        EXPECT_EQ(jAsked, jRequest);
-        EXPECT_EQ(1U, rowCount());
-        EXPECT_TRUE(doubles::state().log.empty());
+        for (const Json::Value& jCondition : {jValue, listOf(jValue)}) {
+            store(szMember, jValue);
+            Json::Value jRequest = member("n", 1);
+            Json::Value jRecord;
+            EXPECT_EQ(1, table_.api.recGetOne(jRequest, jRecord));
+            EXPECT_EQ(3U, jRecord.size());
+            EXPECT_EQ(jFetched, jRecord[szMember]);
+
+            const Json::Value jAsked = member(szMember, jCondition);
+            Json::Value jRecords;
+            EXPECT_EQ(0, table_.api.recList(jRequest = jAsked, jRecords));
+            EXPECT_EQ(listOf(jRecord), jRecords);
+            EXPECT_EQ(1, table_.api.recDelete(jRequest));
+            EXPECT_EQ(jAsked, jRequest);
+            EXPECT_EQ(1U, rowCount());
+            EXPECT_TRUE(doubles::state().log.empty());
+        }
     }
 };
 
-TEST_F(HostileData, TextOfANewRecord)
+TEST_F(HostileData, IsStored)
 {
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRecord = json(R"({"n":3,"o":{}})");
-        jRecord["s"] = strHostile;
-        Json::Value jExpected = jRecord;
+    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
+    forEachString(3, [&](const std::string& strHostile) {
+        const Json::Value jWithout = json(R"({"n":3,"o":{}})");
+        Json::Value jExpected = jWithout;
         jExpected["s"] = upToNul(strHostile);
+        Json::Value jRecord = jWithout;
+        jRecord["s"] = strHostile;
         Json::Value jStored;
         EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
         EXPECT_EQ(jExpected, jStored);
         EXPECT_EQ(0, table_.api.recSave(jRecord, false));
         EXPECT_EQ(jExpected, jRecord);
-    });
-}
 
-TEST_F(HostileData, TextOfAnUpdate)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        EXPECT_EQ(Json::Value(upToNul(strHostile)), fetched("s"));
+        jTypes["s"]["cppDefaultValue"] = strHostile;
+        EXPECT_EQ(0, table_.api.recCreate(jRecord = jWithout, jStored));
+        EXPECT_EQ(jExpected, jStored);
+        EXPECT_EQ(0, table_.api.fillDefaultValue(jRecord = jWithout, false));
+        EXPECT_EQ(Json::Value(strHostile), jRecord["s"]);
+        jTypes["s"].removeMember("cppDefaultValue");
+
         Json::Value jValues = member("s", strHostile);
         std::string strWhere = "n=2";
         EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
@@ -74,65 +79,27 @@ TEST_F(HostileData, TextOfAnUpdate)
     });
 }
 
-TEST_F(HostileData, DefaultValue)
-{
-    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
-    forEachString([&](const std::string& strHostile) {
-        jTypes["s"]["cppDefaultValue"] = strHostile;
-        Json::Value jRecord = json(R"({"n":3,"o":{}})");
-        Json::Value jStored;
-        EXPECT_EQ(0, table_.api.recCreate(jRecord, jStored));
-        EXPECT_EQ(Json::Value(upToNul(strHostile)), jStored["s"]);
-        EXPECT_EQ(0, table_.api.fillDefaultValue(jRecord, false));
-        EXPECT_EQ(Json::Value(strHostile), jRecord["s"]);
-        jTypes["s"].removeMember("cppDefaultValue");
-    });
-}
-
 // In JSON text a NUL is spelt out and stays.
-TEST_F(HostileData, JsonMember)
+TEST_F(HostileData, FindsAndDeletesItsRecord)
 {
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jObject;
-        jObject[strHostile].append(strHostile);
-        update("o", jObject);
-        EXPECT_EQ(jObject, fetched("o"));
-        expectFinds(member("o", jObject));
+    forEachString(6, [&](const std::string& strHostile) {
+        expectFinds("s", strHostile, upToNul(strHostile));
+        for (const Json::Value& jObject :
+             {member(strHostile, listOf(strHostile)), member("k", strHostile)})
+            expectFinds("o", jObject, jObject);
     });
 }
 
-TEST_F(HostileData, Condition)
+TEST_F(HostileData, DeletesItsRecordByName)
 {
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        expectFinds(member("s", strHostile));
-    });
-}
+    forEachString(2, [&](const std::string& strHostile) {
+        store("s", strHostile);
+        std::string strValue = strHostile;
+        EXPECT_EQ(strHostile.empty() ? -1 : 1, table_.api.recDeleteByName(strValue, "s"));
+        EXPECT_EQ(strHostile.empty() ? 2U : 1U, rowCount());
+        EXPECT_EQ(strHostile, strValue);
 
-TEST_F(HostileData, ListItem)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        Json::Value jList(Json::arrayValue);
-        jList.append(strHostile);
-        expectFinds(member("s", jList));
-    });
-}
-
-TEST_F(HostileData, ListItemOfAJsonMember)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("o", member("k", strHostile));
-        Json::Value jList(Json::arrayValue);
-        jList.append(member("k", strHostile));
-        expectFinds(member("o", jList));
-    });
-}
-
-TEST_F(HostileData, ValueOfADeleteByArray)
-{
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
+        store("s", strHostile);
         std::vector<std::string> values = {strHostile};
         EXPECT_EQ(1, table_.api.recDeleteByArray(values, "s"));
         EXPECT_EQ(1U, rowCount());
@@ -140,66 +107,38 @@ TEST_F(HostileData, ValueOfADeleteByArray)
     });
 }
 
-TEST_F(HostileData, ValueOfADeleteByName)
+TEST_F(HostileData, IsAConstantAsSortKeyAndDirection)
 {
-    forEachString([&](const std::string& strHostile) {
-        update("s", strHostile);
-        std::string strValue = strHostile;
-        EXPECT_EQ(strHostile.empty() ? -1 : 1, table_.api.recDeleteByName(strValue, "s"));
-        EXPECT_EQ(strHostile.empty() ? 2U : 1U, rowCount());
-        EXPECT_EQ(strHostile, strValue);
-    });
-}
-
-TEST_F(HostileData, SortKeyAndDirection)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRequest;
-        jRequest["sort_by"] = strHostile;
+    forEachString(1, [&](const std::string& strHostile) {
+        Json::Value jRequest = member("sort_by", strHostile);
         jRequest["sort_direction"] = strHostile;
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-        EXPECT_EQ(" order by '" + doubled(strHostile) + "' ASC", strOut);
+        takeStatements();
         Json::Value jRecords;
         EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
+        EXPECT_EQ(
+            "SELECT n,o,s FROM " + table_.strName + "  order by '" + doubled(strHostile) + "' ASC;",
+            takeStatements().at(0));
         EXPECT_EQ(2U, jRecords.size());
     });
 }
 
-long long number(const std::string& strText)
+long long number(const char* szText)
 {
-    return strtoll(strText.c_str(), nullptr, 10);
+    return strtoll(szText, nullptr, 10);
 }
 
-Json::Value asText(const std::string& strText)
-{
-    return strText.c_str();
-}
-
-Json::Value asInt(const std::string& strText)
-{
-    return static_cast<int>(std::clamp<long long>(number(strText), INT_MIN, INT_MAX));
-}
-
-Json::Value asInt64(const std::string& strText)
-{
-    return Json::Int64(number(strText));
-}
-
-Json::Value asBool(const std::string& strText)
-{
-    return 1 == number(strText);
-}
-
-Json::Value asJson(const std::string& strText)
-{
-    return leftByReader(strText.c_str());
-}
+// What a stored text comes back as.
+const auto asText = [](const char* szText) { return Json::Value(szText); };
+const auto asInt = [](const char* szText) {
+    return Json::Value(static_cast<int>(std::clamp<long long>(number(szText), INT_MIN, INT_MAX)));
+};
+const auto asInt64 = [](const char* szText) { return Json::Value(Json::Int64(number(szText))); };
+const auto asBool = [](const char* szText) { return Json::Value(1 == number(szText)); };
+const auto asJson = [](const char* szText) { return leftByReader(szText); };
 
 struct Word {
     const char* szWord;
-    // What a stored text comes back as; null where no column can be decoded.
-    Json::Value (*value)(const std::string& strText);
+    Json::Value (*value)(const char* szText);  // null where no column can be decoded
 };
 
 const Word kWords[] = {
@@ -210,16 +149,14 @@ const Word kWords[] = {
     {"unknown", nullptr},    {"Json::arrayValue", asJson},
 };
 
-// The text of a column, stored by somebody else.
-TEST_F(HostileData, StoredTextUnderEveryWord)
+TEST_F(HostileData, IsReadFromAColumnOfEachType)
 {
     for (const Word& word : kWords) {
         SCOPED_TRACE(word.szWord);
         Table stored(database_, std::string(R"({"v":{"cpptype":")") + word.szWord + R"("}})", "v");
-        forEachString([&](const std::string& strHostile) {
-            database_.run("delete from " + stored.strName);
-            database_.run("insert into " + stored.strName + " values ('" + doubled(strHostile) +
-                          "')");
+        forEachString(1, [&](const std::string& strHostile) {
+            database_.run("delete from " + stored.strName + "; insert into " + stored.strName +
+                          " values ('" + doubled(strHostile) + "')");
             const bool blDecoded = nullptr != word.value;
             Json::Value jRequest;
             Json::Value jRecords(Json::arrayValue);
@@ -227,44 +164,31 @@ TEST_F(HostileData, StoredTextUnderEveryWord)
             EXPECT_EQ(blDecoded, doubles::state().log.empty());
             ASSERT_EQ(blDecoded ? 1U : 0U, jRecords.size());
             if (blDecoded) {
-                EXPECT_EQ(text(word.value(strHostile)), text(jRecords[0]["v"]));
+                EXPECT_EQ(text(word.value(strHostile.c_str())), text(jRecords[0]["v"]));
             }
         });
     }
 }
 
-TEST_F(HostileData, MessageOfTheHost)
+TEST_F(HostileData, IsKeptByWhatRunsNoStatement)
 {
-    forEachString([&](const std::string& strHostile) {
+    forEachString(3, [&](const std::string& strHostile) {
         table_.api.setErrMsg(strHostile);
         EXPECT_EQ(strHostile, table_.api.getErrMsg());
         table_.api.setErrMsg("");
-    });
-}
 
-TEST_F(HostileData, NameAndValueOfCopiedMembers)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jFrom;
-        jFrom[strHostile] = strHostile;
+        Json::Value jFrom = member(strHostile, strHostile);
         Json::Value jInto;
         EXPECT_EQ(0, VORN_JSON_DB::jsonCopyMember(jInto, jFrom, true));
         EXPECT_EQ(jFrom, jInto);
 
         std::vector<std::string> values = {strHostile, strHostile};
         Json::Value jParam;
-        const bool blNoKey = upToNul(strHostile).empty();
-        EXPECT_EQ(blNoKey ? -1 : 0,
+        const std::string strKey = upToNul(strHostile);
+        EXPECT_EQ(strKey.empty() ? -1 : 0,
                   table_.api.VectorParamToJson(values, strHostile.c_str(), jParam));
-        if (!blNoKey) {
-            EXPECT_EQ(Json::Value(strHostile), jParam[strHostile.c_str()][1]);
-        }
-    });
-}
+        EXPECT_EQ(strKey.empty() ? Json::Value() : Json::Value(strHostile), jParam[strKey][1]);
 
-TEST_F(HostileData, TextThatATimeReplaces)
-{
-    forEachString([&](const std::string& strHostile) {
         std::string strOut = strHostile;
         EXPECT_EQ(-1, VORN_JSON_DB::convert2ReadableTime(0, strOut, 1));
         EXPECT_EQ(strHostile, strOut);

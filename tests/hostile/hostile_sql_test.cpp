@@ -1,102 +1,70 @@
 // SPDX-License-Identifier: MIT
-// Every hostile string in the roles of a text that becomes SQL as it stands, or decides how values
-// are read: the call ends with a result, logs a failure, and handle and connection go on working.
+// Every hostile string in the roles of a text that becomes SQL as it is, or decides how values are
+// read: the call ends with a result, logs a failure, and handle and connection go on working.
 
-#include "support/hostile_roles.h"
+#include "hostile/hostile_roles.h"
 
 namespace {
 
 class HostileSql : public HostileRoleTest {
 protected:
-    // As many of the calls that take a request as can read this one.
-    void expectRequestEnds(const Json::Value& jAsked)
+    // All calls that take a record or a request, with one member.
+    static void expectRecordEnds(VornJsonDbApi& api, const std::string& strMember)
     {
-        Json::Value jRequest = jAsked;
-        Json::Value jRecords;
-        expectEnds(table_.api.recList(jRequest, jRecords));
-        EXPECT_TRUE(jRecords.isNull() || jRecords.isArray());
-        Json::Value jValues = json(R"({"s":"new"})");
-        expectEnds(table_.api.recUpdateByFilter(jRequest, jValues));
-        expectEnds(table_.api.recDelete(jRequest));
-        EXPECT_EQ(jAsked, jRequest);
+        const Json::Value jAsked = member(strMember, "x");
+        Json::Value jRecord;
+        Json::Value jOut;
+        expectEnds(api.recSave(jRecord = jAsked, true));
+        expectEnds(api.recCreate(jRecord = jAsked, jOut));
+        expectEnds(api.recList(jRecord = jAsked, jOut = Json::Value()));
+        expectEnds(api.recUpdateByFilter(jRecord, jRecord));
+        expectEnds(api.recDelete(jRecord));
+        EXPECT_EQ(jAsked, jRecord);
     }
 
-    // The rest of the process sees the table's own types again.
-    void restoreTypes()
-    {
-        VORN_JSON_DB::recType(table_.jDefinition, table_.strName) =
-            table_.jDefinition[table_.strName]["member"];
-    }
+    Json::Value& types() { return VORN_JSON_DB::recType(table_.jDefinition, table_.strName); }
+    const Json::Value jTypes_ = types();
 };
 
-TEST_F(HostileSql, ConditionOnANumber)
+TEST_F(HostileSql, Request)
 {
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jValue(strHostile);
-        std::string strField = "n";
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlMakeByMatchField(strField, jValue, strOut));
-        EXPECT_EQ("n=" + doubled(strHostile), strOut);
-        expectRequestEnds(member("n", strHostile));
-    });
-}
-
-TEST_F(HostileSql, ListItemOfANumber)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jList(Json::arrayValue);
-        jList.append(strHostile);
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlMakeByListField("n", jList, strOut));
-        EXPECT_EQ("n in (" + doubled(strHostile) + " )", strOut);
-        expectRequestEnds(member("n", jList));
-    });
-}
-
-TEST_F(HostileSql, RawFilter)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRequest = member("vornSqlWhereFilter", strHostile);
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlExpandMemberList(jRequest, strOut, VORN_SQL_WHERE_TYPE_AND));
-        EXPECT_EQ(" ( " + strHostile + "  )", strOut);
-        expectRequestEnds(jRequest);
-    });
-}
-
-TEST_F(HostileSql, ConditionOfAnUpdate)
-{
-    forEachString([&](const std::string& strHostile) {
+    forEachString(5, [&](const std::string& strHostile) {
+        const std::string strNumber = doubled(strHostile);
+        const std::string strPage = text(strHostile);
+        Json::Value jPage = member("limit", strHostile);
+        jPage["offset"] = strHostile;
+        const std::pair<Json::Value, std::string> requests[] = {
+            {member("n", strHostile), " WHERE  (n=" + strNumber + " );"},
+            {member("n", listOf(strHostile)), " WHERE  (n in (" + strNumber + " ) );"},
+            {member("vornSqlWhereFilter", strHostile), " WHERE  ( " + strHostile + "  );"},
+            {jPage, " LIMIT " + strPage + " OFFSET " + strPage + ";"},
+        };
+        for (const auto& [jAsked, strTail] : requests) {
+            takeStatements();
+            Json::Value jRequest = jAsked;
+            Json::Value jRecords;
+            expectEnds(table_.api.recList(jRequest, jRecords));
+            EXPECT_TRUE(jRecords.isNull() || jRecords.isArray());
+            EXPECT_EQ(upToNul("SELECT n,o,s FROM " + table_.strName + " " + strTail),
+                      takeStatements().at(0));
+            Json::Value jValues = member("s", "new");
+            expectEnds(table_.api.recUpdateByFilter(jRequest, jValues));
+            expectEnds(table_.api.recDelete(jRequest));
+            EXPECT_EQ(jAsked, jRequest);
+        }
         std::string strWhere = strHostile;
-        Json::Value jValues = json(R"({"s":"new"})");
+        Json::Value jValues = member("s", "new");
         expectEnds(table_.api.recUpdateByWhere(jValues, strWhere));
         EXPECT_EQ(strHostile, strWhere);
     });
 }
 
-TEST_F(HostileSql, LimitAndOffset)
-{
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jRequest = member("limit", strHostile);
-        jRequest["offset"] = strHostile;
-        const std::string strText = text(strHostile);
-        std::string strOut;
-        EXPECT_EQ(0, table_.api.SqlFilterConditionFromJson(jRequest, strOut));
-        EXPECT_EQ(" LIMIT " + strText + " OFFSET " + strText, strOut);
-        Json::Value jRecords;
-        expectEnds(table_.api.recList(jRequest, jRecords));
-    });
-}
-
 TEST_F(HostileSql, NameOfAMember)
 {
-    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
-    forEachString([&](const std::string& strHostile) {
-        Json::Value jDefinition;
-        jDefinition[table_.strName]["member"][strHostile]["cpptype"] = "string";
-        jTypes = jDefinition[table_.strName]["member"];
+    forEachString(1, [&](const std::string& strHostile) {
+        types() = member(strHostile, member("cpptype", "string"));
+        Json::Value jDefinition = member(table_.strName, member("member", types()));
         VornJsonDbApi api(database_.get(), table_.strName, jDefinition, table_.strCreate);
-
         std::string strOut;
         EXPECT_EQ(0, api.SqlExpandMemberName(strOut));
         EXPECT_EQ(strHostile, strOut);
@@ -105,28 +73,18 @@ TEST_F(HostileSql, NameOfAMember)
         strOut.clear();
         EXPECT_EQ(0, api.SqlMakeByMatchField(strField, jValue, strOut));
         EXPECT_EQ(strHostile + "='x'", strOut);
-
-        Json::Value jRecord;
-        jRecord[strHostile] = "x";
-        expectEnds(api.recSave(jRecord, true));
-        jRecord = Json::Value();
-        jRecord[strHostile] = "x";
-        Json::Value jRecords;
-        expectEnds(api.recList(jRecord, jRecords));
-        expectEnds(api.recUpdateByFilter(jRecord, jRecord));
-        expectEnds(api.recDelete(jRecord));
+        expectRecordEnds(api, strHostile);
         std::string strValue = "x";
         expectEnds(api.recDeleteByName(strValue, strHostile.c_str()));
-        restoreTypes();
+        types() = jTypes_;
     });
 }
 
 TEST_F(HostileSql, TypeWord)
 {
-    Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
     const Json::Value jRecord = json(R"({"s":"x"})");
-    forEachString([&](const std::string& strHostile) {
-        jTypes["s"]["cpptype"] = strHostile;
+    forEachString(1, [&](const std::string& strHostile) {
+        types()["s"]["cpptype"] = strHostile;
         Json::Value jIn = jRecord;
         EXPECT_EQ(-1, table_.api.checkJsonType(jIn));
         EXPECT_EQ(Lines{error("type not found!!, key=s")}, takeLog());
@@ -146,13 +104,14 @@ TEST_F(HostileSql, TypeWord)
         std::string strKey = "one";
         EXPECT_EQ(-1, table_.api.recDeleteByName(strKey, "s"));
         EXPECT_EQ(jRecord, jIn);
-        restoreTypes();
+        types() = jTypes_;
     });
 }
 
-TEST_F(HostileSql, CreateStatement)
+TEST_F(HostileSql, CreateStatementAndTextToRun)
 {
-    forEachString([&](const std::string& strHostile) {
+    const auto ignore = [](void*, int, char**, char**) { return 0; };
+    forEachString(2, [&](const std::string& strHostile) {
         Database database;
         database.run(table_.strCreate);
         std::string strCreate = strHostile;
@@ -161,23 +120,10 @@ TEST_F(HostileSql, CreateStatement)
         EXPECT_EQ("", api.getErrMsg());
         expectEnds(api.tableCreate());
         EXPECT_EQ(strHostile, strCreate);
-        Json::Value jRecord = json(kSound);
-        EXPECT_EQ(0, api.recSave(jRecord, true));
-        EXPECT_EQ(json(kSound), jRecord);
-        EXPECT_EQ(nullptr, sqlite3_next_stmt(database.get(), nullptr));
-    });
-}
-
-TEST_F(HostileSql, TextToRun)
-{
-    const auto ignore = [](void*, int, char**, char**) { return 0; };
-    forEachString([&](const std::string& strHostile) {
-        Database database;
-        VornJsonDbApi api(database.get(), table_.strName, table_.jDefinition, table_.strCreate);
         expectEnds(api.runSqlEx(strHostile));
         expectEnds(api.runSqlEx(strHostile, ignore));
-        Json::Value jRecord = json(kSound);
-        EXPECT_EQ(0, api.recSave(jRecord, true));
+        if (0 == sqlite3_get_autocommit(database.get())) database.run("rollback");
+        expectSound(database, api, kSound);
     });
 }
 
@@ -191,29 +137,21 @@ TEST_F(HostileSql, NameOfATable)
         jDefinition[strName]["member"] = json(R"({"s":{"cpptype":"string"}})");
         std::string strCreate = "create table if not exists " + strName + " (s text)";
         VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
-        doubles::state().log.clear();
         const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
         EXPECT_EQ(strHostile.empty(), jTypes.isNull());
         doubles::state().log.clear();
         if (strHostile.empty()) return;
-
         expectEnds(api.tableCreate());
-        Json::Value jRecord = json(R"({"s":"x"})");
-        Json::Value jOut;
-        expectEnds(api.recCreate(jRecord, jOut));
-        expectEnds(api.recList(jRecord, jOut = Json::Value()));
-        expectEnds(api.recUpdateByFilter(jRecord, jRecord));
-        expectEnds(api.recDelete(jRecord));
+        expectRecordEnds(api, "s");
         expectEnds(api.recDeleteAll());
         EXPECT_EQ(strHostile, strName);
     };
     EXPECT_EXIT(
         {
-            forEachString(useName);
+            forEachString(1, useName);
             endProcess(database_);
         },
         testing::ExitedWithCode(0), "");
-    printFigure("hostile strings in roles, names of tables", hostileStrings().size());
 }
 
 }  // namespace

@@ -19,7 +19,7 @@ struct Reads {
     std::string strFirst;  // the first conversion that reads: its length and type, "lld"
 };
 
-// A number of at most kMaxField, or digits that are none; moves past it.
+// Moves past the digits there, if any. False where they are a number above kMaxField.
 bool smallNumber(const std::string& strText, std::size_t& i)
 {
     const std::size_t nEnd = std::min(strText.find_first_not_of("0123456789", i), strText.size());
@@ -83,18 +83,15 @@ bool formatter_oracle::isComparable(const std::string& strFormat, const Value& v
 
 std::string formatter_oracle::described(const std::string& strFormat, const Value& value)
 {
-    const char* szFormat = strFormat.c_str();
-    char* szText = nullptr;
-    if (value.jValue.isString())
-        szText = sqlite3_mprintf(szFormat, value.jValue.asCString());
-    else if (0 == strcmp("%lld", value.szConversion))
-        szText = sqlite3_mprintf(szFormat, static_cast<long long>(value.jValue.asInt64()));
-    else if (0 == strcmp("%llu", value.szConversion))
-        szText =
-            sqlite3_mprintf(szFormat, static_cast<unsigned long long>(value.jValue.asUInt64()));
-    else
-        szText = sqlite3_mprintf(szFormat, value.jValue.asDouble());
-    const std::string strText = szText;
-    sqlite3_free(szText);
-    return strText;
+    const auto printed = [&](auto argument) {
+        char* szText = sqlite3_mprintf(strFormat.c_str(), argument);
+        const std::string strText = szText;
+        sqlite3_free(szText);
+        return strText;
+    };
+    const std::string strConversion = value.szConversion;
+    if ("%Q" == strConversion) return printed(value.jValue.asCString());
+    if ("%lld" == strConversion) return printed(static_cast<long long>(value.jValue.asInt64()));
+    if ("%lf" == strConversion) return printed(value.jValue.asDouble());
+    return printed(static_cast<unsigned long long>(value.jValue.asUInt64()));
 }

@@ -1,20 +1,73 @@
 // SPDX-License-Identifier: MIT
 #include "attacks.h"
 
-#include "aims.h"
-
-using namespace aims;
+#include <algorithm>
 
 namespace {
 
-std::string operation(const char* szName, const std::string& strRest)
+using Aim = std::function<bool(World& world)>;
+
+// The query gives 1.
+Aim holds(const char* szQuery)
 {
-    return std::string(R"({"op":")") + szName + "\"," + strRest + "}";
+    return [szQuery](World& world) { return "1" == world.database.value(szQuery); };
 }
 
-std::string list(const std::string& strRequest)
+Aim isLogged(const char* szText)
 {
-    return operation("list", R"("request":)" + strRequest);
+    return [szText](World&) {
+        const auto& log = doubles::state().log;
+        return std::any_of(log.begin(), log.end(), [szText](const doubles::LogRecord& record) {
+            return std::string::npos != record.strText.find(szText);
+        });
+    };
+}
+
+// The first answer lists more records than that.
+Aim listsMoreThan(unsigned uRecords)
+{
+    return [uRecords](World& world) { return uRecords < world.answers.at(0)["records"].size(); };
+}
+
+// SQLite took more than that many thousands of steps.
+Aim takesMoreThan(int iSteps)
+{
+    return [iSteps](World& world) { return iSteps < world.iSteps; };
+}
+
+const Aim kVaultIsEmpty = holds("select count(*) = 0 from vault");
+const Aim kVaultIsGone = holds("select count(*) = 0 from sqlite_master where name = 'vault'");
+const Aim kEveryNoteIsDeleted = holds("select count(*) = 0 from note");
+const Aim kNoteTwoIsDeleted = holds("select count(*) = 0 from note where id = 2");
+const Aim kNoteIsHuge = holds("select count(*) from note where length(text || author) > 4000000");
+const Aim kIdsAreUsedUp = holds("select max(id) = 2147483647 from note");
+const Aim kNoteIsEves = holds("select count(*) from note where id = 1 and author = 'Eve'");
+
+bool secretIsTold(World& world)
+{
+    return std::any_of(world.answers.begin(), world.answers.end(), [](const Json::Value& jAnswer) {
+        return std::string::npos != text(jAnswer).find("s3cr3t");
+    });
+}
+
+bool connectionIsReadOnly(World& world)
+{
+    const bool blReadOnly = "1" == world.database.value("pragma query_only");
+    world.database.run("pragma query_only=0");
+    return blReadOnly;
+}
+
+bool hostIsThrownAt(World& world)
+{
+    return world.blThrown;
+}
+
+// The call succeeded, and the member is null.
+bool topicsAreLost(World& world)
+{
+    const Json::Value& jAnswer = world.answers.at(0);
+    return 0 == jAnswer["result"].asInt() && jAnswer["record"].isMember("topics") &&
+           jAnswer["record"]["topics"].isNull();
 }
 
 std::string filter(const std::string& strFilter)
@@ -22,31 +75,10 @@ std::string filter(const std::string& strFilter)
     return list(R"({"vornSqlWhereFilter":")" + strFilter + R"("})");
 }
 
-std::string remove(const std::string& strRequest)
+// A note that is there already, so that the call fails.
+std::string failing(const std::string& strText)
 {
-    return operation("delete", R"("request":)" + strRequest);
-}
-
-std::string create(const std::string& strRecord)
-{
-    return operation("create", R"("record":)" + strRecord);
-}
-
-std::string save(const std::string& strRecord)
-{
-    return operation("save", R"("record":)" + strRecord);
-}
-
-std::string update(const std::string& strRequest, const std::string& strValues)
-{
-    return operation("update", R"("request":)" + strRequest + R"(,"values":)" + strValues);
-}
-
-std::string repeated(unsigned uTimes, const std::string& strText)
-{
-    std::string strAll;
-    for (unsigned i = 0; i < uTimes; ++i) strAll += strText;
-    return strAll;
+    return create(R"({"id":1,"text":")" + strText + "\"}");
 }
 
 std::string nested(unsigned uLevels)
@@ -55,239 +87,118 @@ std::string nested(unsigned uLevels)
                   "}");
 }
 
-constexpr auto kStops = Attack::Fence::kStops;
-constexpr auto kLetsThrough = Attack::Fence::kLetsThrough;
-
-// A note that is there already, so that the call fails.
-Attack logged(const char* szName, const std::string& strText)
+// Guard and fence stop each of them, either of the two alone.
+std::vector<Attack> againstEither()
 {
-    return {
-        szName, {create(R"({"id":1,"text":")" + strText + "\"}")}, logHasControls, kLetsThrough};
-}
-
-std::vector<Attack> rawFilters()
-{
-    return {
-        {"raw_filter_deletes_all",
-         {remove(R"({"id":1,"vornSqlWhereFilter":"1 or 1"})")},
-         everyNoteIsDeleted,
-         kStops},
-        {"raw_filter_other_record",
-         {remove(R"({"vornSqlWhereFilter":"id=2"})")},
-         noteTwoIsDeleted,
-         kLetsThrough},
-        {"raw_filter_stacked", {filter("1); delete from vault; --")}, vaultIsEmpty, kStops},
-        {"raw_filter_drop", {filter("1); drop table vault; --")}, vaultIsGone, kStops},
-        {"raw_filter_union",
-         {filter("0) union select secret,0,1,'x','[]' from vault --")},
-         secretIsTold,
-         kStops},
-        {"raw_filter_subselect",
-         {filter("(select secret from vault) like 's3%'")},
-         answersTheQuestion,
-         kStops},
-        {"raw_filter_pragma",
-         {filter("1); pragma query_only=1; --")},
-         connectionIsReadOnly,
-         kStops},
-        {"raw_filter_transaction", {filter("1); begin; --")}, transactionIsOpen, kStops},
-        {"raw_filter_insert",
-         {filter("1); insert into note (id,text) values (7,'forged'); --")},
-         noteIsForged,
-         kStops},
-        {"raw_filter_time",
-         {filter("exists (select 1 from note a, note b, note c where a.id+b.id+c.id < 0)")},
-         sqliteIsBusy,
-         kStops,
-         Attack::Guard::kRefuses,
-         150},
-    };
-}
-
-std::vector<Attack> numbers()
-{
-    return {
-        {"number_text_deletes_all", {remove(R"({"id":"0 or 1"})")}, everyNoteIsDeleted, kStops},
-        {"number_text_stacked",
-         {list(R"({"id":"1); delete from vault; --"})")},
-         vaultIsEmpty,
-         kStops},
-        {"number_text_update",
-         {update(R"({"id":"1); delete from vault; --"})", R"({"done":true})")},
-         vaultIsEmpty,
-         kStops},
-        {"number_text_get",
-         {operation("get", R"x("request":{"id":"0) union select secret,0,1,1,1 from vault --"})x")},
-         secretIsTold,
-         kStops},
-        {"number_text_tells_all", {list(R"({"id":"0 or 1"})")}, everyNoteIsTold, kLetsThrough},
-        {"number_text_in_list",
-         {list(R"({"id":["1)); delete from vault; --"]})")},
-         vaultIsEmpty,
-         kStops},
-        {"bool_text_in_list",
-         {list(R"({"done":["1)); delete from vault; --"]})")},
-         vaultIsEmpty,
-         kStops},
-        {"number_beyond_64_bits",
-         {create(R"({"id":18446744073709551615})")},
-         hostIsThrownAt,
-         kLetsThrough},
-        {"number_text_in_record", {save(R"({"id":"seven"})")}, hostIsThrownAt, kLetsThrough},
-        {"bool_text_in_request", {list(R"({"done":"yes"})")}, hostIsThrownAt, kLetsThrough},
-    };
-}
-
-std::vector<Attack> pages()
-{
-    return {
-        {"limit_text",
-         {list(R"({"limit":"1\" is null; delete from vault; --"})")},
-         vaultIsEmpty,
-         kStops},
-        {"offset_text",
-         {list(R"({"limit":1,"offset":"1\" is null; delete from vault; --"})")},
-         vaultIsEmpty,
-         kStops},
-        {"limit_negative",
-         {list(R"({"limit":-1})")},
-         thousandsAreTold,
-         kStops,
-         Attack::Guard::kRefuses,
-         20000},
-        {"limit_huge",
-         {list(R"({"limit":1000000})")},
-         thousandsAreTold,
-         kStops,
-         Attack::Guard::kRefuses,
-         20000},
-        {"no_limit", {list("{}")}, thousandsAreTold, kStops, Attack::Guard::kLimits, 20000},
-        {"sort_by_number", {list(R"({"sort_by":1})")}, hostIsThrownAt, kLetsThrough},
-        {"sort_direction_object",
-         {list(R"({"sort_by":"id","sort_direction":{}})")},
-         hostIsThrownAt,
-         kLetsThrough},
-    };
-}
-
-std::vector<Attack> percents()
-{
-    // What follows the cut text stands outside quotes: ('x,7,' and then the text.
+    // What follows the cut text is outside of quotes: ('x,7,' and then the text.
     const std::string strCut = R"({"author":"x%y","id":7,"text":)";
     const std::string strDelete = R"(",0,7,1,1); delete from vault; --"})";
     return {
-        {"percent_cut_create", {create(strCut + strDelete)}, vaultIsEmpty, kStops},
-        {"percent_cut_save", {save(strCut + strDelete)}, vaultIsEmpty, kStops},
+        {"raw_filter_deletes_all", erase(R"({"id":1,"vornSqlWhereFilter":"1 or 1"})"),
+         kEveryNoteIsDeleted},
+        {"raw_filter_stacked", filter("1); delete from vault; --"), kVaultIsEmpty},
+        {"raw_filter_drop", filter("1); drop table vault; --"), kVaultIsGone},
+        {"raw_filter_union", filter("0) union select secret,0,1,'x','[]' from vault --"),
+         secretIsTold},
+        {"raw_filter_subselect", filter("(select secret from vault) like 's3%'"), listsMoreThan(0)},
+        {"raw_filter_pragma", filter("1); pragma query_only=1; --"), connectionIsReadOnly},
+        {"raw_filter_transaction", filter("1); begin; --"),
+         [](World& world) { return world.blTransaction; }},
+        {"raw_filter_insert", filter("1); insert into note (id,text) values (7,'forged'); --"),
+         holds("select count(*) from note where text = 'forged'")},
+        {"raw_filter_time",
+         filter("exists (select 1 from note a, note b, note c where a.id+b.id+c.id < 0)"),
+         takesMoreThan(10000), 150},
+        {"number_text_deletes_all", erase(R"({"id":"0 or 1"})"), kEveryNoteIsDeleted},
+        {"number_text_stacked", list(R"({"id":"1); delete from vault; --"})"), kVaultIsEmpty},
+        {"number_text_update", update(R"({"id":"1); delete from vault; --"})", R"({"done":true})"),
+         kVaultIsEmpty},
+        {"number_text_get", get(R"x({"id":"0) union select secret,0,1,1,1 from vault --"})x"),
+         secretIsTold},
+        {"number_text_in_list", list(R"({"id":["1)); delete from vault; --"]})"), kVaultIsEmpty},
+        {"bool_text_in_list", list(R"({"done":["1)); delete from vault; --"]})"), kVaultIsEmpty},
+        {"limit_text", list(R"({"limit":"1\" is null; delete from vault; --"})"), kVaultIsEmpty},
+        {"offset_text", list(R"({"limit":1,"offset":"1\" is null; delete from vault; --"})"),
+         kVaultIsEmpty},
+        {"limit_negative", list(R"({"limit":-1})"), listsMoreThan(1000), 20000},
+        {"limit_huge", list(R"({"limit":1000000})"), listsMoreThan(1000), 20000},
+        {"no_limit", list("{}"), listsMoreThan(1000), 20000, Attack::Guard::kLimits},
+        {"percent_cut_create", create(strCut + strDelete), kVaultIsEmpty},
+        {"percent_cut_save", save(strCut + strDelete), kVaultIsEmpty},
         {"percent_cut_reads",
-         {create(strCut + R"(",0,7,(select secret from vault),1) --"})"), list(R"({"id":7})")},
-         secretIsTold,
-         kStops},
+         create(strCut + R"(",0,7,(select secret from vault),1) --"})") + "\n" +
+             list(R"({"id":7})"),
+         secretIsTold},
         {"percent_s_reads",
-         {create(
-              R"({"id":7,"text":"%s","topics":["',(select json_array(secret) from vault)) --"]})"),
-          list(R"({"id":7})")},
-         secretIsTold,
-         kStops},
+         create(
+             R"({"id":7,"text":"%s","topics":["',(select json_array(secret) from vault)) --"]})") +
+             "\n" + list(R"({"id":7})"),
+         secretIsTold},
         {"percent_update_saved_again",
-         {update(R"({"id":1})", R"({"author":"x%y","text":",0,1,1,1); delete from vault; --"})"),
-          kHostSavesAgain},
-         vaultIsEmpty,
-         kStops},
-        {"percent_changes_values",
-         {create(R"({"author":"50%s","id":7})")},
-         authorIsAnother,
-         kLetsThrough},
-        {"percent_swells",
-         {create(R"({"id":7,"author":")" + repeated(1000, "%4096d") + R"("})")},
-         noteIsHuge,
-         kStops},
+         update(R"({"id":1})", R"({"author":"x%y","text":",0,1,1,1); delete from vault; --"})") +
+             "\n" + kHostSavesAgain,
+         kVaultIsEmpty},
+        {"percent_swells", create(R"({"id":7,"author":")" + repeated(1000, "%4096d") + R"("})"),
+         kNoteIsHuge},
+        {"request_selects_many", erase(R"({"done":false})"), kEveryNoteIsDeleted},
+        {"undeclared_member_deletes", erase(R"({"done":false,"ID":1})"), kEveryNoteIsDeleted},
+        {"huge_text", create(R"({"id":7,"text":")" + std::string(8000000, 'x') + R"("})"),
+         kNoteIsHuge},
+        {"list_without_index", list(R"({"text":"none"})"), takesMoreThan(100), 40000},
+        {"order_without_index", list(R"({"sort_by":"id"})"), takesMoreThan(100), 40000},
     };
 }
 
-std::vector<Attack> shapes()
-{
-    return {
-        {"request_selects_many", {remove(R"({"done":false})")}, everyNoteIsDeleted, kStops},
-        {"list_of_two", {remove(R"({"id":[1,2]})")}, noteTwelveIsDeleted, kLetsThrough},
-        {"undeclared_member_deletes",
-         {remove(R"({"done":false,"ID":1})")},
-         everyNoteIsDeleted,
-         kStops},
-        {"undeclared_member_tells_all",
-         {list(R"({"writer":"Ann"})")},
-         everyNoteIsTold,
-         kLetsThrough},
-        {"member_name_as_sql", {list(R"({"author='Ann' --":1})")}, everyNoteIsTold, kLetsThrough},
-        {"member_name_twice", {remove(R"({"id":1,"id":2})")}, noteTwoIsDeleted, kLetsThrough},
-        {"nul_in_record",
-         {create(R"({"id":7,"author":"Ann\u0000, guest"})")},
-         annIsImitated,
-         kLetsThrough},
-        {"nul_in_request", {list(R"({"author":"Ann\u0000, guest"})")}, annIsTold, kLetsThrough},
-        {"depth_1001", {nested(1001)}, topicsAreLost, kLetsThrough},
-        {"depth_10000", {nested(10000)}, topicsAreLost, kLetsThrough},
-        {"huge_text",
-         {create(R"({"id":7,"text":")" + std::string(8000000, 'x') + R"("})")},
-         noteIsHuge,
-         kStops},
-        {"log_line",
-         {create(R"({"id":1,"text":"\nroot logged in"})")},
-         logLineIsForged,
-         kLetsThrough},
-        logged("log_next_line", "\\u0085root logged in"),
-        logged("log_line_separator", "\\u2028root logged in"),
-        logged("log_direction", "\\u202enimda"),
-        logged("log_escape_sequence", "\\u009b2J"),
-        {"not_utf8", {create("{\"author\":\"\xff\"}")}, authorIsNoUtf8, kLetsThrough},
-    };
-}
-
-// Each command is a good one by itself.
-std::vector<Attack> shares()
+// The fence alone does not stop these. Some are a good command by itself.
+std::vector<Attack> againstTheGuard()
 {
     const char* kGreatest = R"({"id":2147483647})";
-    std::vector<std::string> hundred(100,
-                                     create(R"({"text":")" + std::string(60000, 'x') + R"("})"));
-    hundred.push_back(list("{}"));
+    const std::string strLarge = create(R"({"text":")" + std::string(60000, 'x') + R"("})") + "\n";
     return {
-        {"create_with_id", {create(kGreatest)}, idsAreUsedUp, kLetsThrough},
-        {"update_of_id", {update(R"({"id":1})", kGreatest)}, idsAreUsedUp, kLetsThrough},
-        {"save_with_new_id", {save(kGreatest)}, idsAreUsedUp, kLetsThrough},
-        {"update_of_author",
-         {update(R"({"id":1})", R"({"author":"Eve"})")},
-         noteIsEves,
-         kLetsThrough},
-        {"save_of_other_author", {save(R"({"id":1,"author":"Eve"})")}, noteIsEves, kLetsThrough},
+        {"raw_filter_other_record", erase(R"({"vornSqlWhereFilter":"id=2"})"), kNoteTwoIsDeleted},
+        {"number_text_tells_all", list(R"({"id":"0 or 1"})"), listsMoreThan(2)},
+        {"number_beyond_64_bits", create(R"({"id":18446744073709551615})"), hostIsThrownAt},
+        {"number_text_in_record", save(R"({"id":"seven"})"), hostIsThrownAt},
+        {"bool_text_in_request", list(R"({"done":"yes"})"), hostIsThrownAt},
+        {"sort_by_number", list(R"({"sort_by":1})"), hostIsThrownAt},
+        {"sort_direction_object", list(R"({"sort_by":"id","sort_direction":{}})"), hostIsThrownAt},
+        {"percent_changes_values", create(R"({"author":"50%s","id":7})"),
+         holds("select count(*) from note where id = 7 and author <> '50%s'")},
+        {"list_of_two", erase(R"({"id":[1,2]})"),
+         holds("select count(*) = 0 from note where id = 12")},
+        {"undeclared_member_tells_all", list(R"({"writer":"Ann"})"), listsMoreThan(2)},
+        {"member_name_as_sql", list(R"({"author='Ann' --":1})"), listsMoreThan(2)},
+        {"member_name_twice", erase(R"({"id":1,"id":2})"), kNoteTwoIsDeleted},
+        {"nul_in_record", create(R"({"id":7,"author":"Ann\u0000, guest"})"),
+         holds("select count(*) = 2 from note where author = 'Ann'")},
+        {"nul_in_request", list(R"({"author":"Ann\u0000, guest"})"), listsMoreThan(0)},
+        {"depth_1001", nested(1001), topicsAreLost},
+        {"depth_10000", nested(10000), topicsAreLost},
+        {"log_line", failing("\\nroot logged in"), isLogged("\nroot logged in")},
+        {"log_next_line", failing("\\u0085root logged in"), isLogged("\u0085")},
+        {"log_line_separator", failing("\\u2028root logged in"), isLogged("\u2028")},
+        {"log_direction", failing("\\u202enimda"), isLogged("\u202e")},
+        {"log_escape_sequence", failing("\\u009b2J"), isLogged("\u009b")},
+        {"not_utf8", create("{\"author\":\"\xff\"}"),
+         holds("select count(*) from note where hex(author) = 'FF'")},
+        {"create_with_id", create(kGreatest), kIdsAreUsedUp},
+        {"update_of_id", update(R"({"id":1})", kGreatest), kIdsAreUsedUp},
+        {"save_with_new_id", save(kGreatest), kIdsAreUsedUp},
+        {"update_of_author", update(R"({"id":1})", R"({"author":"Eve"})"), kNoteIsEves},
+        {"save_of_other_author", save(R"({"id":1,"author":"Eve"})"), kNoteIsEves},
         // Ann goes on to change her note, which is gone.
         {"delete_and_create",
-         {create(R"({"author":"Ann"})"), remove(R"({"id":13})"), create(R"({"author":"Eve"})"),
-          update(R"({"id":13})", R"({"text":"Ann"})"), remove(R"({"id":14})")},
-         newNoteIsChanged,
-         kLetsThrough,
+         create(R"({"author":"Ann"})") + "\n" + erase(R"({"id":13})") + "\n" +
+             create(R"({"author":"Eve"})") + "\n" + update(R"({"id":13})", R"({"text":"Ann"})") +
+             "\n" + erase(R"({"id":14})"),
+         holds("select count(*) from note where author = 'Eve' and text = 'Ann'"), 0,
          Attack::Guard::kLetsThrough},
-        {"notes_beyond_quota",
-         {create(R"({"author":"crowd"})")},
-         crowdGrows,
-         kLetsThrough,
-         Attack::Guard::kRefuses,
-         1000},
-        {"list_without_index",
-         {list(R"({"text":"none"})")},
-         tableIsScanned,
-         kStops,
-         Attack::Guard::kRefuses,
-         40000},
-        {"order_without_index",
-         {list(R"({"sort_by":"id"})")},
-         tableIsScanned,
-         kStops,
-         Attack::Guard::kRefuses,
-         40000},
-        {"many_values",
-         {create(R"({"topics":[0)" + repeated(4000, ",0") + "]}")},
-         noteHasManyValues,
-         kLetsThrough},
-        {"huge_answer", hundred, answerIsHuge, kLetsThrough},
+        {"notes_beyond_quota", create(R"({"author":"crowd"})"),
+         holds("select count(*) = 1001 from note where author = 'crowd'"), 1000},
+        {"many_values", create(R"({"topics":[0)" + repeated(4000, ",0") + "]}"),
+         [](World& world) { return 3000 < world.answers.at(0)["record"]["topics"].size(); }},
+        {"huge_answer", repeated(100, strLarge) + list("{}"),
+         [](World& world) { return 5000000 < text(world.answers.back()).size(); }},
     };
 }
 
@@ -296,9 +207,9 @@ std::vector<Attack> shares()
 const std::vector<Attack>& attacks()
 {
     static const std::vector<Attack> all = [] {
-        std::vector<Attack> made;
-        for (auto* part : {rawFilters, numbers, pages, percents, shapes, shares})
-            for (Attack& attack : part()) made.push_back(std::move(attack));
+        std::vector<Attack> made = againstEither();
+        for (Attack& attack : made) attack.fence = Attack::Fence::kStops;
+        for (Attack& attack : againstTheGuard()) made.push_back(std::move(attack));
         return made;
     }();
     return all;

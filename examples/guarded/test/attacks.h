@@ -4,24 +4,20 @@
 
 #include "world.h"
 
+#include <functional>
 #include <string>
 #include <vector>
 
 struct Attack {
-    // Where it ends when only SQLite's own means stand around the call.
-    enum class Fence { kStops, kLetsThrough };
-    // What the guard makes of its first line.
-    enum class Guard { kRefuses, kLimits, kLetsThrough };
-
     std::string strName;
-    std::vector<std::string> lines;
-    // Whether it reached what it aims at.
-    bool (*worked)(World& world);
-    Fence fence;
-    Guard guard = Guard::kRefuses;
+    std::string strLines;
+    // Whether it reached its aim in a world that was stopped.
+    std::function<bool(World& world)> worked;
     unsigned uMoreNotes = 0;  // in the table beforehand
+    // What the guard makes of the first line.
+    enum class Guard { kRefuses, kLimits, kLetsThrough } guard = Guard::kRefuses;
+    // Where it ends when only SQLite's own means surround the call.
+    enum class Fence { kStops, kLetsThrough } fence = Fence::kLetsThrough;
 };
-
-void PrintTo(const Attack& attack, std::ostream* pStream);
 
 const std::vector<Attack>& attacks();

@@ -1,20 +1,27 @@
 // SPDX-License-Identifier: MIT
-// What SQLite refuses behind the fence, whatever the statement comes from.
+// What SQLite refuses inside the fence, whatever the statement comes from.
 
 #include "world.h"
 
 namespace {
 
+constexpr int kRefused = -1;
+
 class FenceTest : public HostTest {
 protected:
-    static constexpr int kRefused = -1;
-
     FenceTest()
     {
-        database_.run(
+        rebuild(
             "create table note (id integer primary key autoincrement, text text);"
             "create table vault (secret text);"
             "insert into note values (1,'a'),(2,'b'); insert into vault values ('s')");
+    }
+
+    // Runs the statements without the fence, and makes it anew.
+    void rebuild(const std::string& strSql)
+    {
+        pFence_.reset();
+        database_.run(strSql);
         pFence_ = std::make_unique<Fence>(database_.get(), "note");
     }
 
@@ -32,14 +39,17 @@ protected:
         return pFence_->run(access, [&] { return execute(strSql); });
     }
 
-    void expectNotAuthorized(Access access, const std::string& strSql)
+    void expectNotAuthorized(Access access, const std::vector<std::string>& statements)
     {
-        EXPECT_EQ(kRefused, run(access, strSql)) << strSql;
-        EXPECT_TRUE(std::string::npos != strError_.find("not authorized") ||
-                    std::string::npos != strError_.find("prohibited"))
-            << strSql << ": " << strError_;
+        for (const std::string& strSql : statements) {
+            EXPECT_EQ(kRefused, run(access, strSql)) << strSql;
+            EXPECT_TRUE(std::string::npos != strError_.find("not authorized") ||
+                        std::string::npos != strError_.find("prohibited"))
+                << strSql << ": " << strError_;
+        }
     }
 
+    // Takes the fence away.
     std::string notes()
     {
         pFence_.reset();
@@ -54,28 +64,39 @@ protected:
 
 TEST_F(FenceTest, GivesEachAccessWhatItNeeds)
 {
-    EXPECT_EQ(0, run(Access::kRead, "select id,text from note where id=1 order by 'id' limit 1"));
-    EXPECT_EQ(0, run(Access::kInsert,
-                     "insert into note (id,text) values (3,'c');"
-                     "select * from note where rowid == last_insert_rowid()"));
-    EXPECT_EQ(0, run(Access::kInsert, "replace into note (id,text) values (3,'d')"));
-    EXPECT_EQ(0, run(Access::kUpdate, "update note set text='z' where (id=1)"));
-    EXPECT_EQ(0, run(Access::kDelete, "delete from note where (id=2)"));
+    const std::pair<Access, const char*> statements[] = {
+        {Access::kRead, "select id,text from note where id=1 order by 'id' limit 1"},
+        {Access::kInsert,
+         "insert into note (id,text) values (3,'c');"
+         "select * from note where rowid == last_insert_rowid()"},
+        {Access::kInsert, "replace into note (id,text) values (3,'d')"},
+        {Access::kUpdate, "update note set text='z' where (id=1)"},
+        {Access::kDelete, "delete from note where (id=2)"},
+    };
+    for (const auto& [access, szSql] : statements) EXPECT_EQ(0, run(access, szSql)) << szSql;
     EXPECT_EQ("1z,3d", notes());
 }
 
-TEST_F(FenceTest, GivesNoneMore)
+TEST_F(FenceTest, GivesNoneMoreAndNothingBetweenTwoCalls)
 {
     const char* kSelect = "select * from note";
     const char* kInsert = "insert into note (id) values (3)";
     const char* kUpdate = "update note set text='z' where id=1";
     const char* kDelete = "delete from note where id=1";
     const char* kRowid = "select last_insert_rowid() from note";
-    const struct {
-        Access access;
-        std::vector<std::string> statements;
-    } cases[] = {
-        {Access::kRead, {kInsert, kUpdate, kDelete, "select count(*) from note", kRowid}},
+    const std::vector<std::string> never = {
+        // Other tables, and the names and numbers of SQLite.
+        "select * from vault", "select count(*) from vault", "insert into vault values ('x')",
+        "update vault set secret=''", "delete from vault", "drop table vault",
+        "select * from sqlite_sequence", "insert into sqlite_sequence values ('note',9)",
+        "update sqlite_sequence set seq=0", "delete from sqlite_sequence",
+        "select * from sqlite_master",
+        // The schema, and the connection with its transactions.
+        "create table x (a)", "create temp table note (a)", "alter table vault add column b",
+        "pragma user_version=1", "attach ':memory:' as x", "commit", "savepoint x", "release x",
+        "analyze", "create trigger x after insert on note begin delete from vault; end"};
+    const std::pair<Access, std::vector<std::string>> cases[] = {
+        {Access::kRead, {kInsert, kUpdate, kDelete, kRowid, "select count(*) from note"}},
         {Access::kInsert, {kUpdate, kDelete, "select length(text) from note"}},
         {Access::kUpdate,
          {kSelect, kInsert, kDelete, "update note set text=hex(text)",
@@ -85,268 +106,163 @@ TEST_F(FenceTest, GivesNoneMore)
           "delete from note where id=last_insert_rowid()"}},
         {Access::kNothing, {kSelect, kInsert, kUpdate, kDelete, kRowid, "begin"}},
     };
-    for (const auto& row : cases)
-        for (const std::string& strSql : row.statements) expectNotAuthorized(row.access, strSql);
-
-    for (const Access access :
-         {Access::kRead, Access::kInsert, Access::kUpdate, Access::kDelete, Access::kNothing})
-        for (const char* szSql :
-             {"select * from vault",
-              "select count(*) from vault",
-              "insert into vault values ('x')",
-              "update vault set secret=''",
-              "delete from vault",
-              "drop table vault",
-              "select * from sqlite_sequence",
-              "insert into sqlite_sequence values ('note',9)",
-              "update sqlite_sequence set seq=0",
-              "delete from sqlite_sequence",
-              "select * from sqlite_master",
-              "create table x (a)",
-              "create temp table note (a)",
-              "alter table vault add column b",
-              "pragma user_version=1",
-              "attach ':memory:' as x",
-              "commit",
-              "savepoint x",
-              "release x",
-              "analyze",
-              "create trigger x after insert on note begin delete from vault; end"})
-            expectNotAuthorized(access, szSql);
-    EXPECT_EQ(kRefused, execute("select 1")) << "between two calls";
+    for (const auto& [access, statements] : cases) {
+        EXPECT_EQ(0, run(Access::kRead, kSelect));
+        for (const char* szSql : {kSelect, "begin", "savepoint x"})
+            EXPECT_EQ(kRefused, execute(szSql)) << "between two calls: " << szSql;
+        expectNotAuthorized(access, statements);
+        expectNotAuthorized(access, never);
+    }
     EXPECT_EQ("1a,2b", notes());
     EXPECT_EQ("s", database_.value("select secret from vault"));
 }
 
-// Whoever can write a trigger into the file writes as the host does, but not behind the fence.
-TEST_F(FenceTest, GivesNothingToTriggers)
+// Whoever can write a trigger into the file writes as the host does, but not inside the fence.
+// Another table of that name, of the connection or of an attached file, is not the host's.
+TEST_F(FenceTest, GivesNothingToTriggersAndOtherDatabases)
 {
-    pFence_.reset();
-    database_.run(
+    rebuild(
+        "attach ':memory:' as x; create table x.note (id integer primary key, text text);"
         "create trigger x after insert on note when new.id < 9 "
         "begin insert into note values (9,'x'); end");
-    pFence_ = std::make_unique<Fence>(database_.get(), "note");
-    expectNotAuthorized(Access::kInsert, "insert into note values (3,'c')");
+    EXPECT_EQ(0, run(Access::kRead, "select * from note"));
+    expectNotAuthorized(Access::kRead, {"select * from x.note"});
+    expectNotAuthorized(Access::kInsert,
+                        {"insert into note values (3,'c')", "insert into x.note values (1,'x')"});
+    rebuild("create temp table note (id integer primary key, text text)");
+    EXPECT_EQ(0, run(Access::kRead, "select * from main.note"));
+    expectNotAuthorized(Access::kRead, {"select * from note"});
+    expectNotAuthorized(Access::kDelete, {"delete from note where id=1"});
+    rebuild("drop table temp.note");
     EXPECT_EQ("1a,2b", notes());
 }
 
-TEST_F(FenceTest, GivesNothingBetweenTwoCalls)
+TEST_F(FenceTest, TakesBackMoreThanOneChangeAndWhatFails)
 {
-    for (const Access access : {Access::kRead, Access::kInsert}) {
-        for (const char* szSql : {"select id from note", "nonsense"}) run(access, szSql);
-        for (const char* szSql : {"select id from note", "begin", "savepoint x"})
-            EXPECT_EQ(kRefused, execute(szSql)) << szSql;
-    }
-    EXPECT_EQ("1a,2b", notes());
-}
-
-TEST_F(FenceTest, TakesBackMoreThanOneChange)
-{
-    EXPECT_EQ(kRefused, run(Access::kDelete, "delete from note"));
-    EXPECT_EQ(kRefused, run(Access::kInsert,
-                            "insert into note values (3,'c');"
-                            "insert into note values (4,'d')"));
-    EXPECT_EQ(kRefused, run(Access::kUpdate,
-                            "update note set text='z' where id=1;"
-                            "update note set text='z' where id=2"));
-    EXPECT_EQ("1a,2b", notes());
-}
-
-TEST_F(FenceTest, TakesBackWhatFails)
-{
-    EXPECT_EQ(kRefused, run(Access::kInsert, "insert into note values (3,'c'); nonsense"));
-    EXPECT_THROW(pFence_->run(Access::kInsert,
-                              [&]() -> int {
-                                  EXPECT_EQ(0, execute("insert into note values (3,'c')"));
-                                  throw std::runtime_error("late");
-                              }),
-                 std::runtime_error);
+    const std::pair<Access, const char*> calls[] = {
+        {Access::kDelete, "delete from note"},
+        {Access::kInsert, "insert into note values (3,'c'); insert into note values (4,'d')"},
+        {Access::kUpdate,
+         "update note set text='z' where id=1; update note set text='z' where id=2"},
+        {Access::kInsert, "insert into note values (3,'c'); nonsense"},
+    };
+    for (const auto& [access, szSql] : calls) EXPECT_EQ(kRefused, run(access, szSql)) << szSql;
+    const auto work = [&]() -> int {
+        EXPECT_EQ(0, execute("insert into note values (3,'c')"));
+        throw std::runtime_error("late");
+    };
+    EXPECT_THROW(pFence_->run(Access::kInsert, work), std::runtime_error);
     EXPECT_EQ(kRefused, execute("select * from note"));
     EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
     EXPECT_EQ("1a,2b", notes());
 }
 
-TEST_F(FenceTest, KnowsNoUnion)
+// How the message about a name goes on depends on the version of SQLite.
+TEST_F(FenceTest, LimitsStatements)
 {
-    EXPECT_EQ(kRefused, run(Access::kRead, "select id from note union select id from note"));
-    EXPECT_EQ(SQLITE_ERROR, iStatus_);
-}
-
-TEST_F(FenceTest, LimitsTheSizeOfStatements)
-{
-    const std::string strSelect = "select id from note where id=1";
-    EXPECT_EQ(0, run(Access::kRead, strSelect + std::string(63 * 1024, ' ')));
-    EXPECT_EQ(kRefused, run(Access::kRead, strSelect + std::string(65 * 1024, ' ')));
-    EXPECT_EQ(SQLITE_TOOBIG, iStatus_);
-}
-
-TEST_F(FenceTest, LimitsTheSizeOfTexts)
-{
-    const std::string strText(25 * 1024, 'x');
-    EXPECT_EQ(0, run(Access::kInsert, "insert into note values (3,'" + strText + "')"));
-    EXPECT_EQ(0, run(Access::kUpdate, "update note set text=text||text where id=3"));
-    EXPECT_EQ(kRefused, run(Access::kUpdate, "update note set text=text||text where id=3"));
-    EXPECT_EQ(SQLITE_TOOBIG, iStatus_);
-}
-
-TEST_F(FenceTest, LimitsTheDepthOfConditions)
-{
-    const auto select = [](int iDepth) {
-        std::string strSql = "select id from note where ";
-        while (0 < iDepth--) strSql += "not ";
-        return strSql + "id";
+    const std::string strSelect = "select id from note where ";
+    const std::string strGrow = "update note set text=text||text where id=3";
+    const struct {
+        Access access;
+        std::string strSql;
+        int iStatus;
+        const char* szError;
+    } cases[] = {
+        {Access::kRead, "select id from note union select id from note", SQLITE_ERROR, ""},
+        {Access::kRead, strSelect + "id=1" + std::string(63 * 1024, ' '), SQLITE_OK, ""},
+        {Access::kRead, strSelect + "id=1" + std::string(65 * 1024, ' '), SQLITE_TOOBIG, ""},
+        {Access::kInsert, "insert into note values (3,'" + std::string(25 * 1024, 'x') + "')",
+         SQLITE_OK, ""},
+        {Access::kUpdate, strGrow, SQLITE_OK, ""},
+        {Access::kUpdate, strGrow, SQLITE_TOOBIG, ""},
+        {Access::kRead, strSelect + repeated(15, "not ") + "id", SQLITE_OK, ""},
+        {Access::kRead, strSelect + repeated(25, "not ") + "id", SQLITE_ERROR, "maximum depth"},
+        {Access::kRead, strSelect + "text='none'", SQLITE_OK, ""},
+        {Access::kRead, strSelect + "text=\"none\"", SQLITE_ERROR, "no such column: "},
     };
-    EXPECT_EQ(0, run(Access::kRead, select(15)));
-    EXPECT_EQ(kRefused, run(Access::kRead, select(25)));
-    EXPECT_EQ(SQLITE_ERROR, iStatus_);
-    EXPECT_NE(std::string::npos, strError_.find("maximum depth")) << strError_;
-}
-
-TEST_F(FenceTest, TakesNoNameForAText)
-{
-    EXPECT_EQ(0, run(Access::kRead, "select id from note where text='none'"));
-    EXPECT_EQ(kRefused, run(Access::kRead, "select id from note where text=\"none\""));
-    // How the message goes on depends on the version of SQLite.
-    EXPECT_EQ(0U, strError_.find("no such column: ")) << strError_;
+    for (const auto& row : cases) {
+        SCOPED_TRACE(row.strSql.substr(0, 100));
+        EXPECT_EQ(SQLITE_OK == row.iStatus ? 0 : kRefused, run(row.access, row.strSql));
+        EXPECT_EQ(row.iStatus, iStatus_);
+        EXPECT_NE(std::string::npos, strError_.find(row.szError)) << strError_;
+    }
     EXPECT_NE(std::string::npos, strError_.find("none")) << strError_;
 }
 
 TEST_F(FenceTest, StopsNobodyWhenItIsGone)
 {
     pFence_.reset();
-    database_.run(
-        "insert into note values (3,'c'),(4,'d'),(5,'e'),(6,'f'),(7,'g'),(8,'h'),(9,'i')");
-    const std::string strAll = "note a, note b, note c, note d, note e, note f";
-    EXPECT_EQ("531441", database_.value("select count(*) from " + strAll));
-}
-
-// The authorizer refuses first what this would.
-TEST_F(FenceTest, IsDefensive)
-{
-    int iDefensive = 0;
-    sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_DEFENSIVE, -1, &iDefensive);
-    EXPECT_EQ(1, iDefensive);
+    EXPECT_EQ("524288", database_.value("select count(*) from note" + repeated(18, " join note")));
 }
 
 // Whoever can write a CHECK into the file calls the host's own functions with it, and the
 // authorizer is not asked about those.
-TEST_F(FenceTest, DoesNotTrustTheSchema)
+TEST_F(FenceTest, IsDefensiveAndDoesNotTrustTheSchema)
 {
-    pFence_.reset();
+    int iDefensive = 0;  // the authorizer refuses first what this would
+    sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_DEFENSIVE, -1, &iDefensive);
+    EXPECT_EQ(1, iDefensive);
+
     const auto one = [](sqlite3_context* pContext, int, sqlite3_value**) {
         sqlite3_result_int(pContext, 1);
     };
     sqlite3_create_function(database_.get(), "one", 0, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
                             one, nullptr, nullptr);
     sqlite3_db_config(database_.get(), SQLITE_DBCONFIG_TRUSTED_SCHEMA, 1, nullptr);
-    database_.run(
+    rebuild(
         "drop table note; create table note (id integer primary key, text text check (one()));"
         "insert into note values (1,'a')");
-    pFence_ = std::make_unique<Fence>(database_.get(), "note");
     EXPECT_EQ(kRefused, run(Access::kInsert, "insert into note values (3,'c')"));
     EXPECT_EQ("unsafe use of one()", strError_);
     EXPECT_EQ("1a", notes());
 }
 
-// Another table of that name, of the connection or of an attached file, is not the host's.
-TEST_F(FenceTest, KnowsTheMainDatabaseOnly)
+// The guard lets these through: they are good requests, but for the size of the table. Each call
+// has all its steps.
+TEST_F(HostTest, FencedScansEndWhereTheTableIsLarge)
 {
-    pFence_.reset();
-    database_.run(
-        "attach ':memory:' as x; create table x.note (id integer primary key, text text)");
-    pFence_ = std::make_unique<Fence>(database_.get(), "note");
-    EXPECT_EQ(0, run(Access::kRead, "select * from note"));
-    expectNotAuthorized(Access::kRead, "select * from x.note");
-    expectNotAuthorized(Access::kInsert, "insert into x.note values (1,'x')");
-
-    pFence_.reset();
-    database_.run("create temp table note (id integer primary key, text text)");
-    pFence_ = std::make_unique<Fence>(database_.get(), "note");
-    EXPECT_EQ(0, run(Access::kRead, "select * from main.note"));
-    expectNotAuthorized(Access::kRead, "select * from note");
-    expectNotAuthorized(Access::kDelete, "delete from note where id=1");
-}
-
-// The guard lets these through: they are good requests, but for the size of the table.
-TEST_F(HostTest, FencedScansOfALargeTableEnd)
-{
-    World world(World::Layers::kBoth, 200000);
-    for (const char* szRequest : {R"({"offset":190000})", R"({"offset":190000,"limit":1})"})
-        world.send(std::string(R"({"op":"list","request":)") + szRequest + "}");
-    for (const Json::Value& jAnswer : world.answers)
-        EXPECT_EQ(R"({"error":"failed"})", text(jAnswer));
-    world.send(R"({"op":"list","request":{"id":200000}})");
-    EXPECT_EQ(1U, world.answers.back()["records"].size());
-    world.stop();
-}
-
-// Each call has all its steps.
-TEST_F(HostTest, FencedScansOfAMediumSizeGoOnForEver)
-{
-    World world(World::Layers::kBoth, 10000);
-    for (int i = 0; i < 10; ++i) world.send(R"({"op":"list","request":{"offset":9000,"limit":1}})");
-    for (const Json::Value& jAnswer : world.answers) EXPECT_EQ(1U, jAnswer["records"].size());
-    world.stop();
-}
-
-// A host on a file, beside another connection to it.
-class FencedFile : public HostTest {
-protected:
-    FencedFile() { EXPECT_EQ(SQLITE_OK, sqlite3_open(database_.path().c_str(), &pOther_)); }
-    ~FencedFile() override { EXPECT_EQ(SQLITE_OK, sqlite3_close(pOther_)); }
-
-    void other(const char* szSql)
-    {
-        EXPECT_EQ(SQLITE_OK, doubles::realExec(pOther_, szSql, nullptr, nullptr, nullptr));
+    World large(World::Layers::kBoth, 200000);
+    World medium(World::Layers::kBoth, 10000);
+    for (int i = 0; i < 10; ++i) {
+        medium.send(list(R"({"offset":9000,"limit":1})"));
+        EXPECT_EQ(1U, medium.answers.back()["records"].size());
     }
-    std::string answer(const char* szLine) { return text(host_.answer(szLine)); }
+    for (const char* szRequest : {R"({"offset":190000})", R"({"offset":190000,"limit":1})"}) {
+        large.send(list(szRequest));
+        EXPECT_EQ(R"({"error":"failed"})", text(large.answers.back()));
+    }
+    large.send(list(R"({"id":200000})"));
+    EXPECT_EQ(1U, large.answers.back()["records"].size());
+}
 
-    Database database_{Database::Place::kFile};
-    Host host_{database_.get()};
-    sqlite3* pOther_ = nullptr;
-};
-
-constexpr char kCreate[] = R"({"op":"create","record":{"text":"once"}})";
-constexpr char kList[] = R"({"op":"list","request":{"id":1}})";
-constexpr char kFailed[] = R"({"error":"failed"})";
-constexpr char kNone[] = R"({"records":null,"result":0})";
-
-// The library alone would try 500 times.
-TEST_F(FencedFile, DoesNotWaitForALock)
+// The library alone would try 500 times to get a lock.
+TEST_F(HostTest, FencedAnswersBesideAnotherConnection)
 {
-    other("begin exclusive");
-    EXPECT_EQ(kFailed, answer(kCreate));
-    EXPECT_EQ(kFailed, answer(kList));
+    Database database(Database::Place::kFile);
+    Host host(database.get());
+    Database other(database.path());
+    const char* kFailed = R"({"error":"failed"})";
+    const char* kNone = R"({"records":null,"result":0})";
+    const std::string strCreate = create(R"({"text":"once"})");
+    const std::pair<const char*, const char*> cases[] = {
+        {"begin exclusive", kFailed},
+        {"begin immediate", kNone},
+        {"begin; select * from note", kNone},  // a reader keeps the commit from the file
+    };
+    for (const auto& [szSql, szListed] : cases) {
+        SCOPED_TRACE(szSql);
+        other.run(szSql);
+        EXPECT_EQ(kFailed, text(host.answer(strCreate)));
+        EXPECT_EQ(1, sqlite3_get_autocommit(database.get()));
+        EXPECT_EQ(szListed, text(host.answer(list(R"({"id":1})"))));
+        other.run("commit");
+    }
     EXPECT_EQ(0U, doubles::state().sleeps.size());
-    other("commit");
-    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
-}
 
-TEST_F(FencedFile, TellsOfADuplicate)
-{
-    other("create unique index one on note (text)");
-    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
-    EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", answer(kCreate));
-    EXPECT_EQ(kFailed, answer(R"({"op":"update","request":{"id":1},"values":{"topics":[1]}})"));
-}
-
-TEST_F(FencedFile, ReadsBesideAWriter)
-{
-    other("begin immediate");
-    EXPECT_EQ(kFailed, answer(kCreate));
-    EXPECT_EQ(kNone, answer(kList));
-    other("commit");
-}
-
-// A reader of the other connection keeps the commit from the file.
-TEST_F(FencedFile, TakesBackWhatCannotBeCommitted)
-{
-    other("begin; select * from note");
-    EXPECT_EQ(kFailed, answer(kCreate));
-    EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
-    EXPECT_EQ(kNone, answer(kList));
-    other("commit");
-    EXPECT_EQ(0, host_.answer(kCreate)["result"].asInt());
+    other.run("create unique index one on note (text)");
+    EXPECT_EQ(0, host.answer(strCreate)["result"].asInt());
+    EXPECT_EQ(R"({"error":"DUPLICATE_PRIMARY_KEY"})", text(host.answer(strCreate)));
+    EXPECT_EQ(kFailed, text(host.answer(update(R"({"id":1})", R"({"topics":[1]})"))));
 }
 
 }  // namespace

@@ -10,8 +10,6 @@
 #include <sys/wait.h>
 #include <unistd.h>
 #include <cstdio>
-#include <cstdlib>
-#include <memory>
 #include <string>
 #include <utility>
 
@@ -20,17 +18,19 @@ namespace {
 constexpr std::size_t kStack = 8 * 1024 * 1024;
 constexpr int kMostDepth = 1 << 17;
 
+using Operation = void (*)(std::size_t nDepth, bool blObject);
+
 struct Trial {
-    void (*run)(int iDepth, bool blObject);
-    int iDepth;
+    Operation run;
+    std::size_t nDepth;
     bool blObject;
 };
 
 // Built from the inside, which does not recurse. Never destroyed: that does.
-Json::Value& nested(int iDepth, bool blObject)
+Json::Value& nested(std::size_t nDepth, bool blObject)
 {
     auto* pjValue = new Json::Value(blObject ? Json::objectValue : Json::arrayValue);
-    for (int i = 1; i < iDepth; ++i) {
+    while (1 < nDepth--) {
         Json::Value jOuter;
         (blObject ? jOuter["k"] : jOuter[0U]).swap(*pjValue);
         pjValue->swap(jOuter);
@@ -38,13 +38,11 @@ Json::Value& nested(int iDepth, bool blObject)
     return *pjValue;
 }
 
-void read(int iDepth, bool blObject)
+void read(std::size_t nDepth, bool blObject)
 {
-    const auto uDepth = static_cast<std::size_t>(iDepth);
     std::string strText;
-    for (int i = 1; i < iDepth; ++i) strText += blObject ? "{\"k\":" : "[";
-    strText += blObject ? "{" : "[";
-    strText.append(uDepth, blObject ? '}' : ']');
+    for (std::size_t n = 1; n < nDepth; ++n) strText += blObject ? "{\"k\":" : "[";
+    strText += (blObject ? "{" : "[") + std::string(nDepth, blObject ? '}' : ']');
     Json::CharReaderBuilder builder;
     builder["stackLimit"] = kMostDepth + 1;
     Json::CharReader* pReader = builder.newCharReader();
@@ -53,29 +51,27 @@ void read(int iDepth, bool blObject)
         _exit(1);
 }
 
-void write(int iDepth, bool blObject)
+void write(std::size_t nDepth, bool blObject)
 {
     Json::StreamWriterBuilder builder;
     builder["indentation"] = "";
-    const std::string strText = Json::writeString(builder, nested(iDepth, blObject));
-    if (2 * static_cast<std::size_t>(iDepth) > strText.size()) _exit(1);
+    if (2 * nDepth > Json::writeString(builder, nested(nDepth, blObject)).size()) _exit(1);
 }
 
-void copy(int iDepth, bool blObject)
+void copy(std::size_t nDepth, bool blObject)
 {
-    const auto* pjCopy = new Json::Value(nested(iDepth, blObject));
-    if (nullptr == pjCopy) _exit(1);
+    if (nullptr == new Json::Value(nested(nDepth, blObject))) _exit(1);
 }
 
-void destroy(int iDepth, bool blObject)
+void destroy(std::size_t nDepth, bool blObject)
 {
-    delete &nested(iDepth, blObject);
+    delete &nested(nDepth, blObject);
 }
 
 void* runOnThread(void* arg)
 {
     const Trial& trial = *static_cast<Trial*>(arg);
-    trial.run(trial.iDepth, trial.blObject);
+    trial.run(trial.nDepth, trial.blObject);
     _exit(0);
 }
 
@@ -100,31 +96,27 @@ bool survives(Trial trial)
 }
 
 // The greatest depth that survives.
-int deepest(Trial trial)
+std::size_t deepest(Operation run, bool blObject)
 {
-    int iGood = 0;
-    for (int iStep = kMostDepth; 0 < iStep; iStep /= 2) {
-        trial.iDepth = iGood + iStep;
-        if (survives(trial)) iGood = trial.iDepth;
-    }
-    return iGood;
+    std::size_t nGood = 0;
+    for (std::size_t nStep = kMostDepth; 0 < nStep; nStep /= 2)
+        if (survives({run, nGood + nStep, blObject})) nGood += nStep;
+    return nGood;
 }
 
 }  // namespace
 
 int main(int argc, char** argv)
 {
-    const int iLeast = 1 < argc ? std::atoi(argv[1]) : 0;
-    const struct {
-        const char* szName;
-        void (*run)(int iDepth, bool blObject);
-    } operations[] = {{"reader", read}, {"writer", write}, {"copy", copy}, {"destructor", destroy}};
+    const std::size_t nLeast = 1 < argc ? std::stoul(argv[1]) : 0;
     bool blDeepEnough = true;
-    for (const auto& operation : operations) {
-        const int iArrays = deepest({operation.run, 0, false});
-        const int iObjects = deepest({operation.run, 0, true});
-        std::printf("%-10s  arrays %7d  objects %7d\n", operation.szName, iArrays, iObjects);
-        blDeepEnough = blDeepEnough && iLeast <= iArrays && iLeast <= iObjects;
+    const std::pair<const char*, Operation> operations[] = {
+        {"reader", read}, {"writer", write}, {"copy", copy}, {"destructor", destroy}};
+    for (const auto& [szName, run] : operations) {
+        const std::size_t nArrays = deepest(run, false);
+        const std::size_t nObjects = deepest(run, true);
+        std::printf("%-10s  arrays %7zu  objects %7zu\n", szName, nArrays, nObjects);
+        blDeepEnough = blDeepEnough && nLeast <= nArrays && nLeast <= nObjects;
     }
     return blDeepEnough ? 0 : 1;
 }

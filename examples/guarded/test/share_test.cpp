@@ -5,12 +5,13 @@
 #include "world.h"
 
 #include <ostream>
-#include <sstream>
 #include <streambuf>
 
 namespace {
 
 constexpr char kFailed[] = R"({"error":"failed"})";
+const std::string kGet = get(R"({"id":1})");
+const std::string kMine = create(R"({"author":"Ann","text":"mine"})");
 
 // A stream that allocates nothing.
 class Line : private std::streambuf, public std::ostream {
@@ -27,20 +28,14 @@ private:
 
 class Share : public HostTest {
 protected:
+    Share() { const VornJsonDbApi notes = openNotes(database_.get()); }
+
     void fill(const std::string& strAuthor, int iNotes)
     {
-        run("with recursive n(i) as (select 1 union all select i + 1 from n) "
+        database_.run(
+            "with recursive n(i) as (select 1 union all select i + 1 from n) "
             "insert into note (author,done,text,topics) select '" +
             strAuthor + "',0,'','[]' from n limit " + std::to_string(iNotes));
-    }
-
-    // What was in the file before the host.
-    void run(const std::string& strSql)
-    {
-        {
-            const VornJsonDbApi notes = openNotes(database_.get());
-        }
-        database_.run(strSql);
     }
 
     Host& host()
@@ -63,7 +58,7 @@ protected:
     }
 
     Database database_;
-    std::unique_ptr<Host> pHost_;
+    std::unique_ptr<Host> pHost_;  // after what was in the file before it
 };
 
 // Those that begin like one of these.
@@ -77,50 +72,41 @@ void failStatements(const std::vector<std::string>& beginnings)
     };
 }
 
-constexpr char kCreate[] = R"({"op":"create","record":{"author":"Ann","text":"mine"}})";
-constexpr char kGet[] = R"({"op":"get","request":{"id":1}})";
-
 TEST_F(Share, NotesBeyond32BitsKeepTheirIds)
 {
-    run("insert into note values ('Eve',0,2147483647,'eve','[]')");
-    const Json::Value jMade = answer(kCreate);
-    EXPECT_EQ(2147483648, jMade["record"]["id"].asInt64());
-    const std::string strSame = R"("request":{"id":2147483648})";
-    EXPECT_EQ(0, result(R"({"op":"update",)" + strSame + R"(,"values":{"text":"changed"}})"));
-    EXPECT_EQ("changed", answer(R"({"op":"get",)" + strSame + "}")["record"]["text"].asString());
-    EXPECT_EQ(1, result(R"({"op":"delete",)" + strSame + "}"));
+    database_.run("insert into note values ('Eve',0,2147483647,'eve','[]')");
+    EXPECT_EQ(2147483648, answer(kMine)["record"]["id"].asInt64());
+    const std::string strSame = R"({"id":2147483648})";
+    EXPECT_EQ(0, result(update(strSame, R"({"text":"changed"})")));
+    EXPECT_EQ("changed", answer(get(strSame))["record"]["text"].asString());
+    EXPECT_EQ(1, result(erase(strSame)));
     EXPECT_EQ(R"([{"author":"Eve","done":false,"id":2147483647,"text":"eve","topics":[]}])",
-              text(answer(R"({"op":"list","request":{}})")["records"]));
+              text(answer(list("{}"))["records"]));
 }
 
 TEST_F(Share, AuthorsSaveWhatIsTheirs)
 {
-    EXPECT_EQ(0, result(kCreate));
-    EXPECT_EQ(0, result(R"({"op":"save","record":{"id":1,"author":"Ann","text":"again"}})"));
+    EXPECT_EQ(0, result(kMine));
+    EXPECT_EQ(0, result(save(R"({"id":1,"author":"Ann","text":"again"})")));
     for (const char* szRecord : {R"({"id":1,"author":"Eve"})", R"({"id":1})", R"({"id":2})",
                                  R"({"author":"Ann"})", R"({"id":2,"author":"Ann"})"})
-        EXPECT_EQ("the author has no such note",
-                  refusal(std::string(R"({"op":"save","record":)") + szRecord + "}"))
-            << szRecord;
+        EXPECT_EQ("the author has no such note", refusal(save(szRecord))) << szRecord;
     EXPECT_EQ("again", answer(kGet)["record"]["text"].asString());
-    EXPECT_EQ(1U, answer(R"({"op":"list","request":{}})")["records"].size());
+    EXPECT_EQ(1U, answer(list("{}"))["records"].size());
 }
 
+// The default is an author, too.
 TEST_F(Share, EachAuthorHasAQuota)
 {
     for (const char* szAuthor : {"Ann", "nobody"}) fill(szAuthor, kMaxNotes - 1);
-    for (const std::string strAuthor : {"Ann", "nobody"}) {
-        SCOPED_TRACE(strAuthor);
-        // The default is an author, too.
-        const std::string strCreate =
-            "nobody" == strAuthor ? R"({"op":"create","record":{"text":"mine"}})" : kCreate;
+    for (const std::string& strCreate : {kMine, create(R"({"text":"mine"})")}) {
+        SCOPED_TRACE(strCreate);
         const Json::Value jMade = answer(strCreate);
         EXPECT_EQ(0, jMade["result"].asInt());
         EXPECT_EQ("the author has too many notes", refusal(strCreate));
-        EXPECT_EQ(0, result(R"({"op":"save","record":)" + text(jMade["record"]) + "}"));
-        EXPECT_EQ(0, result(R"({"op":"create","record":{"author":"Bob"}})"));
-        const std::string strId = text(jMade["record"]["id"]);
-        EXPECT_EQ(1, result(R"({"op":"delete","request":{"id":)" + strId + "}}"));
+        EXPECT_EQ(0, result(save(text(jMade["record"]))));
+        EXPECT_EQ(0, result(create(R"({"author":"Bob"})")));
+        EXPECT_EQ(1, result(erase(R"({"id":)" + text(jMade["record"]["id"]) + "}")));
         EXPECT_EQ(0, result(strCreate));
         EXPECT_EQ("the author has too many notes", refusal(strCreate));
     }
@@ -129,38 +115,34 @@ TEST_F(Share, EachAuthorHasAQuota)
 TEST_F(Share, CrowdDoesNotTurnTheFenceAgainstOthers)
 {
     for (int i = 0; i < 40; ++i) fill("crowd" + std::to_string(i), kMaxNotes);
-    EXPECT_EQ(0, result(kCreate));
+    EXPECT_EQ(0, result(kMine));
     for (const char* szRequest :
          {R"({"author":"Ann"})", R"({"author":["Ann"]})", R"({"author":"Ann","done":false})",
           R"({"author":"Ann","text":["mine"],"done":false,"topics":[[]]})", R"({"id":40001})",
-          R"({"id":[40001],"author":"Ann"})", R"({"author":"Ann","sort_by":"text"})"}) {
-        const Json::Value jAnswer =
-            answer(std::string(R"({"op":"list","request":)") + szRequest + "}");
-        EXPECT_EQ(1U, jAnswer["records"].size()) << szRequest << text(jAnswer);
-    }
+          R"({"id":[40001],"author":"Ann"})", R"({"author":"Ann","sort_by":"text"})"})
+        EXPECT_EQ(1U, answer(list(szRequest))["records"].size()) << szRequest;
     // The crowd's own, the whole quota read to the end; and a page of everything.
-    EXPECT_EQ(0, result(R"({"op":"list","request":{"author":"crowd7","text":"none"}})"));
-    EXPECT_EQ(0, result(R"({"op":"list","request":{"offset":1000}})"));
-    EXPECT_EQ(0, result(R"({"op":"save","record":{"id":40001,"author":"Ann"}})"));
-    EXPECT_EQ(0, result(R"({"op":"update","request":{"id":40001},"values":{"done":true}})"));
-    EXPECT_EQ(1, result(R"({"op":"delete","request":{"id":40001}})"));
+    EXPECT_EQ(0, result(list(R"({"author":"crowd7","text":"none"})")));
+    EXPECT_EQ(0, result(list(R"({"offset":1000})")));
+    EXPECT_EQ(0, result(save(R"({"id":40001,"author":"Ann"})")));
+    EXPECT_EQ(0, result(update(R"({"id":40001})", R"({"done":true})")));
+    EXPECT_EQ(1, result(erase(R"({"id":40001})")));
 }
 
 // SECURITY.md names the figure. An é takes two bytes in a command and six in an answer.
 TEST_F(Share, AnswerIsBelowFiveMegabytes)
 {
-    std::string strMuch;
-    for (int i = 0; i < 4050; ++i) strMuch += "é";
-    const std::string strCreate = R"({"op":"create","record":{"topics":[")" + strMuch + R"("]}})";
+    const std::string strMuch = repeated(4050, "é");
+    const std::string strCreate = create(R"({"topics":[")" + strMuch + R"("]})");
     EXPECT_GT(guard::kMaxLine, strCreate.size());
     EXPECT_LT(guard::kMaxLine - 100, strCreate.size());
     for (unsigned u = 1; u <= guard::kMaxRows; ++u) {
         EXPECT_EQ(0, result(strCreate));
-        EXPECT_EQ(0, result(R"({"op":"update","request":{"id":)" + std::to_string(u) +
-                            R"(},"values":{"text":")" + strMuch + R"("}})"));
+        EXPECT_EQ(0, result(update(R"({"id":)" + std::to_string(u) + "}",
+                                   R"({"text":")" + strMuch + R"("})")));
     }
     std::ostringstream stream;
-    host().serve(R"({"op":"list","request":{}})", stream);
+    host().serve(list("{}"), stream);
     EXPECT_LT(4800000U, stream.str().size());
     EXPECT_GT(5000000U, stream.str().size());
 }
@@ -168,14 +150,13 @@ TEST_F(Share, AnswerIsBelowFiveMegabytes)
 // Each allocation of operator new fails once.
 TEST_F(Share, HostGoesOnAfterALackOfMemory)
 {
-    EXPECT_EQ(0,
-              result(R"({"op":"create","record":{"author":"Ann","topics":["tea",{"cups":2}]}})"));
+    const char* kTea = R"({"author":"Ann","topics":["tea",{"cups":2}]})";
+    EXPECT_EQ(0, result(create(kTea)));
     const std::string strNote = served(kGet);
-    for (const std::string strLine :
-         {R"({"op":"list","request":{}})",
-          R"({"op":"save","record":{"id":1,"author":"Ann","topics":["tea",{"cups":2}]}})",
-          R"({"op":"update","request":{"id":1},"values":{"done":false}})",
-          R"({"op":"delete","request":{"id":7}})", R"({"op":"list","request":{"limit":101}})"}) {
+    for (const std::string& strLine :
+         {list("{}"), save(R"({"id":1,"author":"Ann","topics":["tea",{"cups":2}]})"),
+          update(R"({"id":1})", R"({"done":false})"), erase(R"({"id":7})"),
+          list(R"({"limit":101})")}) {
         SCOPED_TRACE(strLine);
         const std::string strRight = served(strLine);
         EXPECT_NE(std::string(kFailed) + "\n", strRight);
@@ -198,25 +179,18 @@ TEST_F(Share, HostGoesOnAfterALackOfMemory)
     }
 }
 
-TEST_F(Share, HostGoesOnAfterALookUpThatFails)
-{
-    EXPECT_EQ(0, result(R"({"op":"list","request":{}})"));
-    failStatements({"SELECT"});
-    EXPECT_EQ(kFailed, text(answer(kCreate)));
-    doubles::state().exec = nullptr;
-    EXPECT_EQ(0, result(kCreate));
-    EXPECT_EQ(1, answer(kGet)["record"]["id"].asInt());
-}
-
 // Even the rollback may lack memory.
-TEST_F(Share, HostGoesOnAfterARollbackThatFails)
+TEST_F(Share, HostGoesOnAfterAStatementThatFails)
 {
-    EXPECT_EQ(0, result(kCreate));
+    EXPECT_EQ(0, result(kMine));
+    failStatements({"SELECT"});
+    EXPECT_EQ(kFailed, text(answer(kMine)));
     failStatements({"commit", "rollback"});
-    EXPECT_EQ(kFailed, text(answer(R"({"op":"delete","request":{"id":1}})")));
+    EXPECT_EQ(kFailed, text(answer(erase(R"({"id":1})"))));
     doubles::state().exec = nullptr;
     EXPECT_EQ("mine", answer(kGet)["record"]["text"].asString());
-    EXPECT_EQ(1, result(R"({"op":"delete","request":{"id":1}})"));
+    EXPECT_EQ(1, result(erase(R"({"id":1})")));
+    EXPECT_EQ(2, answer(kMine)["record"]["id"].asInt());
 }
 
 }  // namespace

@@ -4,7 +4,8 @@
 #include "examples/guarded/guard.h"
 
 #include <json/reader.h>
-#include <json/writer.h>
+
+#include <sstream>
 
 namespace {
 
@@ -32,33 +33,50 @@ int countSteps(void* pWorld)
 
 }  // namespace
 
+std::string command(const char* szOperation, const std::string& strArgument,
+                    const std::string& strValues)
+{
+    const std::string strOperation = szOperation;
+    const bool blRecord = "create" == strOperation || "save" == strOperation;
+    return R"({"op":")" + strOperation + (blRecord ? R"(","record":)" : R"(","request":)") +
+           strArgument + (strValues.empty() ? "" : R"(,"values":)" + strValues) + "}";
+}
+
+std::string repeated(unsigned uTimes, const std::string& strText)
+{
+    std::string strAll;
+    for (unsigned u = 0; u < uTimes; ++u) strAll += strText;
+    return strAll;
+}
+
 World::World(Layers layers, unsigned uMoreNotes) : layers_(layers)
 {
-    database_.run("create table vault (secret text); insert into vault values ('s3cr3t')");
+    database.run("create table vault (secret text); insert into vault values ('s3cr3t')");
     // The table of a host without the guard gives out the greatest id again when its note is gone.
     if (Layers::kNone == layers_ || Layers::kFence == layers_)
-        database_.run(
+        database.run(
             "create table note (author text, done integer, id integer primary key, text text, "
             "topics text)");
     {
-        const VornJsonDbApi notes = openNotes(database_.get());
-        database_.run(
+        const VornJsonDbApi notes = openNotes(database.get());
+        database.run(
             "insert into note values ('Ann',0,1,'first','[]'),('Bob',0,2,'second','[]'),"
             "('Eve',0,12,'twelfth','[]')");
-        database_.run(
+        database.run(
             "with recursive n(i) as (select 100 union all select i + 1 from n) "
             "insert into note select 'crowd',0,i,'','[]' from n limit " +
             std::to_string(uMoreNotes));
     }
+    strBefore = contents();
     if (Layers::kBoth == layers_) {
-        pHost_ = std::make_unique<Host>(database_.get());
+        pHost_ = std::make_unique<Host>(database.get());
         return;
     }
-    pNotes_.reset(new VornJsonDbApi(openNotes(database_.get())));
+    pNotes_.reset(new VornJsonDbApi(openNotes(database.get())));
     if (Layers::kFence == layers_)
-        pFence_ = std::make_unique<Fence>(database_.get(), "note");
+        pFence_ = std::make_unique<Fence>(database.get(), "note");
     else
-        sqlite3_progress_handler(database_.get(), 1000, countSteps, this);
+        sqlite3_progress_handler(database.get(), 1000, countSteps, this);
 }
 
 Json::Value World::call(Json::Value& jCommand)
@@ -91,17 +109,20 @@ Json::Value World::answer(const std::string& strLine)
     }
 }
 
-void World::send(const std::string& strLine)
+void World::send(const std::string& strLines)
 {
-    try {
-        if (kHostSavesAgain == strLine)
-            saveAgain();
-        else
-            answers.push_back(answer(strLine));
-    } catch (const std::exception&) {
-        blThrown = true;
+    std::istringstream stream(strLines);
+    for (std::string strLine; std::getline(stream, strLine);) {
+        try {
+            if (kHostSavesAgain == strLine)
+                saveAgain();
+            else
+                answers.push_back(answer(strLine));
+        } catch (const std::exception&) {
+            blThrown = true;
+        }
     }
-    blTransaction = 0 == sqlite3_get_autocommit(database_.get());
+    blTransaction = 0 == sqlite3_get_autocommit(database.get());
 }
 
 void World::saveAgain()
@@ -118,8 +139,8 @@ void World::stop()
     pFence_.reset();
     pHost_.reset();
     pNotes_.reset();
-    sqlite3_progress_handler(database_.get(), 0, nullptr, nullptr);
-    if (blTransaction) database_.run("rollback");
+    sqlite3_progress_handler(database.get(), 0, nullptr, nullptr);
+    if (blTransaction) database.run("rollback");
 }
 
 std::string World::contents()
@@ -127,7 +148,7 @@ std::string World::contents()
     std::string strContents;
     for (const char* szSql : {"select sql from sqlite_master order by name", "select * from vault",
                               "select * from note order by id"})
-        for (const auto& row : database_.rows(szSql))
+        for (const auto& row : database.rows(szSql))
             for (const std::string& strCell : row) strContents += strCell + "|";
     return strContents;
 }
