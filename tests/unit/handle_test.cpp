@@ -3,113 +3,82 @@
 
 #include "support/rows.h"
 
-#include <type_traits>
-
 namespace {
+
+using doubles::state;
 
 class Handle : public TableTest {
 protected:
+    // The lines of a table that was not created.
+    static Lines createFailed(const std::string& strError, const std::string& strSql)
+    {
+        Lines lines = {runFailedLine(strError, strSql),
+                       error("create table failed, sql=" + strSql)};
+        if (!strError.empty())
+            lines.push_back(plain("sql error, err=" + strError + ", sql=" + strSql));
+        return lines;
+    }
+
+    void expectSaved(VornJsonDbApi& api)
+    {
+        Json::Value jRecord = json(R"({"a":"x"})");
+        EXPECT_EQ(0, api.recSave(jRecord, true));
+        EXPECT_EQ("x", database_.value("select a from " + strName_));
+        EXPECT_EQ(Lines(), takeLog());
+    }
+
     std::string strName_ = freshName();
     std::string strCreate_ = "create table " + strName_ + " (a text)";
     Json::Value jDefinition_ =
         json(R"({")" + strName_ + R"(":{"member":{"a":{"cpptype":"string"}}}})");
-    std::string strEmpty_;
-    Json::Value jEmpty_;
 };
 
-TEST_F(Handle, RunsTheCreateStatementUnchangedAndOnce)
+TEST_F(Handle, ReportsEachArgumentThatIsMissingAndIsMadeAllTheSame)
 {
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    EXPECT_EQ(Lines{strCreate_}, takeStatements());
-    EXPECT_EQ("0", database_.value("select count(*) from " + strName_));
-    EXPECT_EQ(Lines(), takeLog());
-    EXPECT_EQ("", api.getErrMsg());
-}
+    for (unsigned uMissing = 0; uMissing < 16; ++uMissing) {
+        const bool blNoDatabase = 0 != (uMissing & 8U);
+        for (const char* szDefinition : {"null", "{}", "[]"}) {
+            SCOPED_TRACE(uMissing);
+            std::string strName = 0 != (uMissing & 4U) ? "" : strName_;
+            Json::Value jDefinition = 0 != (uMissing & 2U) ? json(szDefinition) : jDefinition_;
+            std::string strCreate = 0 != (uMissing & 1U) ? "" : strCreate_;
+            VornJsonDbApi api(blNoDatabase ? nullptr : database_.get(), strName, jDefinition,
+                              strCreate);
 
-TEST_F(Handle, LogsEveryEmptyArgumentAndIsMadeAllTheSame)
-{
-    VornJsonDbApi api(database_.get(), strEmpty_, jEmpty_, strEmpty_);
-    EXPECT_EQ((Lines{plain("Failed [strName.empty()]"), plain("Failed [jTableDef.empty()]"),
-                     plain("Failed [strSqlCreate.empty()]"), failed("0 >= strSql.length()"),
-                     plain("i=0,errno=?, run sql failed, error=Unknow Error!!, sql="),
-                     error("create table failed, sql="),
-                     plain("sql error, err=Unknow Error!!, sql="), failed("0 > tableCreate()")}),
-              takeLog());
-    EXPECT_EQ("", api.getErrMsg());
-    EXPECT_EQ(Lines(), takeStatements());
-}
-
-TEST_F(Handle, LogsEmptyObjectAndArrayDefinitions)
-{
-    for (const char* szDefinition : {"{}", "[]"}) {
-        database_.run("drop table if exists " + strName_);
-        Json::Value jDefinition = json(szDefinition);
-        VornJsonDbApi api(database_.get(), strName_, jDefinition, strCreate_);
-        EXPECT_EQ(Lines{plain("Failed [jTableDef.empty()]")}, takeLog()) << szDefinition;
+            Lines lines;
+            if (blNoDatabase) lines.push_back(plain("Failed [!pDb]"));
+            if (strName.empty()) lines.push_back(plain("Failed [strName.empty()]"));
+            if (jDefinition.empty()) lines.push_back(plain("Failed [jTableDef.empty()]"));
+            if (strCreate.empty()) {
+                lines.push_back(plain("Failed [strSqlCreate.empty()]"));
+                lines.push_back(failed("0 >= strSql.length()"));
+            }
+            if (blNoDatabase || strCreate.empty()) {
+                for (const std::string& strLine : createFailed("Unknow Error!!", strCreate))
+                    lines.push_back(strLine);
+                lines.push_back(failed("0 > tableCreate()"));
+            }
+            EXPECT_EQ(lines, takeLog());
+            EXPECT_EQ(strCreate.empty() ? Lines() : Lines{strCreate}, takeStatements());
+            EXPECT_EQ("", api.getErrMsg());
+            Json::Value jRecord = json(R"({"a":"x"})");
+            EXPECT_EQ(0 == uMissing ? 0 : -1, api.recSave(jRecord, true));
+            takeLog();
+            takeStatements();
+            database_.run("drop table if exists " + strName_);
+        }
     }
-}
-
-TEST_F(Handle, SurvivesANullConnection)
-{
-    VornJsonDbApi api(nullptr, strName_, jDefinition_, strCreate_);
-    const Lines lines = takeLog();
-    ASSERT_EQ(5U, lines.size());
-    EXPECT_EQ(plain("Failed [!pDb]"), lines[0]);
-    EXPECT_EQ(plain("i=0,errno=?, run sql failed, error=Unknow Error!!, sql=" + strCreate_),
-              lines[1]);
-    EXPECT_EQ(error("create table failed, sql=" + strCreate_), lines[2]);
-    EXPECT_EQ(plain("sql error, err=Unknow Error!!, sql=" + strCreate_), lines[3]);
-    EXPECT_EQ(failed("0 > tableCreate()"), lines[4]);
-    Json::Value jRecord = json(R"({"a":"x"})");
-    EXPECT_EQ(-1, api.recSave(jRecord, true));
-}
-
-TEST_F(Handle, ChecksItsArgumentsInOrder)
-{
-    VornJsonDbApi api(nullptr, strEmpty_, jEmpty_, strEmpty_);
-    Lines lines = takeLog();
-    ASSERT_EQ(9U, lines.size());
-    lines.resize(5);
-    EXPECT_EQ((Lines{plain("Failed [!pDb]"), plain("Failed [strName.empty()]"),
-                     plain("Failed [jTableDef.empty()]"), plain("Failed [strSqlCreate.empty()]"),
-                     failed("0 >= strSql.length()")}),
-              lines);
-}
-
-TEST_F(Handle, LogsEachEmptyArgumentForItself)
-{
-    {
-        VornJsonDbApi api(database_.get(), strEmpty_, jDefinition_, strCreate_);
-        EXPECT_EQ(Lines{plain("Failed [strName.empty()]")}, takeLog());
-    }
-    database_.run("drop table " + strName_);
-    {
-        VornJsonDbApi api(database_.get(), strName_, jEmpty_, strCreate_);
-        EXPECT_EQ(Lines{plain("Failed [jTableDef.empty()]")}, takeLog());
-    }
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strEmpty_);
-    const Lines lines = takeLog();
-    ASSERT_EQ(6U, lines.size());
-    EXPECT_EQ(plain("Failed [strSqlCreate.empty()]"), lines[0]);
-    EXPECT_EQ(failed("0 > tableCreate()"), lines[5]);
 }
 
 TEST_F(Handle, WorksThoughItsTableWasThereAlready)
 {
     VornJsonDbApi first(database_.get(), strName_, jDefinition_, strCreate_);
     VornJsonDbApi second(database_.get(), strName_, jDefinition_, strCreate_);
-    const std::string strError = "table " + strName_ + " already exists";
-    EXPECT_EQ(
-        (Lines{plain("i=0,errno=?, run sql failed, error=" + strError + ", sql=" + strCreate_),
-               error("create table failed, sql=" + strCreate_),
-               plain("sql error, err=" + strError + ", sql=" + strCreate_),
-               failed("0 > tableCreate()")}),
-        takeLog());
+    Lines lines = createFailed("table " + strName_ + " already exists", strCreate_);
+    lines.push_back(failed("0 > tableCreate()"));
+    EXPECT_EQ(lines, takeLog());
     EXPECT_EQ("", second.getErrMsg());
-    Json::Value jRecord = json(R"({"a":"x"})");
-    EXPECT_EQ(0, second.recSave(jRecord, true));
-    EXPECT_EQ("x", database_.value("select a from " + strName_));
-    EXPECT_EQ(Lines(), takeLog());
+    expectSaved(second);
 }
 
 TEST_F(Handle, WorksOnceItsTableIsThere)
@@ -119,93 +88,55 @@ TEST_F(Handle, WorksOnceItsTableIsThere)
     EXPECT_EQ(4U, takeLog().size());
     Json::Value jRecord = json(R"({"a":"x"})");
     EXPECT_EQ(-1, api.recSave(jRecord, true));
-    const Lines lines = takeLog();
     EXPECT_EQ(plain("sql error, err=no such table: " + strName_ + ", sql=INSERT INTO " + strName_ +
                     " (a) VALUES ('x') ;select * from " + strName_ +
                     " where rowid == last_insert_rowid();"),
-              lines.back());
+              takeLog().back());
     database_.run(strCreate_);
-    EXPECT_EQ(0, api.recSave(jRecord, true));
-}
-
-TEST_F(Handle, CreatesItsTableAgainWhenAsked)
-{
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    database_.run("drop table " + strName_);
-    EXPECT_EQ(0, api.tableCreate());
-    EXPECT_EQ((Lines{strCreate_, strCreate_}), takeStatements());
-    EXPECT_EQ(Lines(), takeLog());
-    EXPECT_EQ(-1, api.tableCreate());
-    EXPECT_EQ(3U, takeLog().size());
+    expectSaved(api);
 }
 
 TEST_F(Handle, CreatesItsTableWithoutACallback)
 {
-    bool blCalled = false;
-    doubles::state().exec = [&](sqlite3* pDb, const char*, doubles::RowCallback callback, void* arg,
-                                char**) {
-        blCalled = true;
-        EXPECT_EQ(database_.get(), pDb);
-        EXPECT_EQ(nullptr, callback);
-        EXPECT_EQ(nullptr, arg);
-        return SQLITE_OK;
+    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
+    struct Case {
+        End end;
+        int iCount;
+        Lines lines;
     };
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    EXPECT_TRUE(blCalled);
+    for (const Case& row : {Case{{SQLITE_OK}, 7, {}},
+                            {{SQLITE_OK}, -7, createFailed("Unknow Error!!", strCreate_)},
+                            {{SQLITE_ERROR, ""}, 0, createFailed("", strCreate_)}}) {
+        state().changes = [&row] { return row.iCount; };
+        state().exec = [&](sqlite3* pDb, const char*, doubles::RowCallback callback, void* arg,
+                           char** errText) {
+            EXPECT_EQ(database_.get(), pDb);
+            EXPECT_EQ(nullptr, callback);
+            EXPECT_EQ(nullptr, arg);
+            return row.end.leaveIn(errText);
+        };
+        EXPECT_EQ(row.lines.empty() ? 0 : -1, api.tableCreate());
+        EXPECT_EQ(row.lines, takeLog());
+    }
+    EXPECT_EQ(Lines(4, strCreate_), takeStatements());
 }
 
-TEST_F(Handle, CreatesWithAnyCountAsSuccessAndAnyFailureAsMinusOne)
-{
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    doubles::state().exec = execOfStatus(SQLITE_OK, nullptr);
-    doubles::state().changes = [] { return 7; };
-    EXPECT_EQ(0, api.tableCreate());
-    EXPECT_EQ(Lines(), takeLog());
-    doubles::state().changes = [] { return -7; };
-    EXPECT_EQ(-1, api.tableCreate());
-    EXPECT_EQ((Lines{plain("i=0,errno=?, run sql failed, error=Unknow Error!!, sql=" + strCreate_),
-                     error("create table failed, sql=" + strCreate_),
-                     plain("sql error, err=Unknow Error!!, sql=" + strCreate_)}),
-              takeLog());
-}
-
-TEST_F(Handle, LogsNoSqlErrorWhereItsTextIsEmpty)
-{
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    doubles::state().exec = execOfStatus(SQLITE_ERROR, "");
-    EXPECT_EQ(-1, api.tableCreate());
-    EXPECT_EQ((Lines{plain("i=0,errno=?, run sql failed, error=, sql=" + strCreate_),
-                     error("create table failed, sql=" + strCreate_)}),
-              takeLog());
-}
-
-TEST_F(Handle, KeepsCopiesOfItsArguments)
+TEST_F(Handle, CopiesItsArgumentsAndLeavesThemAlone)
 {
     std::string strName = strName_;
     std::string strCreate = strCreate_;
     Json::Value jDefinition = jDefinition_;
     VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
+    expectSaved(api);
+    EXPECT_EQ(strName_, strName);
+    EXPECT_EQ(strCreate_, strCreate);
+    EXPECT_EQ(jDefinition_, jDefinition);
     strName = "other";
     strCreate = "other";
     jDefinition.clear();
     database_.run("drop table " + strName_);
     EXPECT_EQ(0, api.tableCreate());
-    Json::Value jRecord = json(R"({"a":"x"})");
-    EXPECT_EQ(0, api.recSave(jRecord, true));
-    EXPECT_EQ(strName_, database_.value("select name from sqlite_master where type='table'"));
-}
-
-TEST_F(Handle, LeavesItsArgumentsAlone)
-{
-    const std::string strName = strName_;
-    const std::string strCreate = strCreate_;
-    const Json::Value jDefinition = jDefinition_;
-    VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    Json::Value jRecord = json(R"({"a":"x"})");
-    EXPECT_EQ(0, api.recSave(jRecord, true));
-    EXPECT_EQ(strName, strName_);
-    EXPECT_EQ(strCreate, strCreate_);
-    EXPECT_EQ(jDefinition, jDefinition_);
+    expectSaved(api);
 }
 
 // The types of a table are read by the first operation that needs them, so a handle that is only
@@ -221,10 +152,8 @@ TEST_F(Handle, DoesNotReadMemberTypesWhenItIsMade)
 TEST_F(Handle, GivesBackTheMessageOfTheHost)
 {
     VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    EXPECT_EQ("", api.getErrMsg());
     const std::string strMessage("a%s\0b", 5);
     api.setErrMsg(strMessage);
-    EXPECT_EQ(strMessage, api.getErrMsg());
     api.getErrMsg().clear();
     EXPECT_EQ(strMessage, api.getErrMsg());
     EXPECT_EQ(-1, api.tableCreate());
@@ -242,11 +171,7 @@ TEST_F(Handle, LeavesTheConnectionToOthers)
         VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
     }
     takeLog();
-    takeStatements();
-    Json::Value jRecord = json(R"({"a":"x"})");
-    EXPECT_EQ(0, other.recSave(jRecord, true));
-    EXPECT_EQ("1", database_.value("select count(*) from " + strName_));
-    EXPECT_EQ(Lines(), takeLog());
+    expectSaved(other);
 }
 
 }  // namespace

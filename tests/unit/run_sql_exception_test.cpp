@@ -1,0 +1,185 @@
+// SPDX-License-Identifier: MIT
+// What is thrown in the library's row callback passes SQLite and reaches the host.
+
+#include "support/rows.h"
+
+#include <cerrno>
+#include <new>
+#include <thread>
+
+namespace {
+
+using doubles::state;
+
+// The library's row callback, in each call of which the n-th allocation fails.
+struct FailingCallback {
+    doubles::RowCallback callback;
+    void* arg;
+    int iFailNew;
+    unsigned uCalls;
+
+    static int call(void* arg, int nColumns, char** values, char** names)
+    {
+        auto& failing = *static_cast<FailingCallback*>(arg);
+        ++failing.uCalls;
+        state().iFailNew = failing.iFailNew;
+        const int iResult = failing.callback(failing.arg, nColumns, values, names);
+        state().iFailNew = 0;
+        return iResult;
+    }
+};
+
+class CallbackException : public RunSqlTest {
+protected:
+    CallbackException()
+    {
+        database_.run("insert into " + table_.strName +
+                      "(a,s) values(1,'a text that is not short'),(2,'b')");
+    }
+
+    // The n-th allocation in each call of the row callback fails from now on.
+    void failAllocation(int n)
+    {
+        state().exec = [this, n](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
+                                 void* arg, char** errText) {
+            FailingCallback failing = {callback, arg, n, 0};
+            const int iStatus =
+                doubles::realExec(pDb, szSql, FailingCallback::call, &failing, errText);
+            uCallbacks_ = failing.uCalls;
+            return iStatus;
+        };
+    }
+
+    int select() { return table_.api.runSqlEx(strSelect_, callback_, &rows_); }
+
+    // No statement is open, no mutex held, no error line was written, the text ran so many times.
+    void expectCalm(std::size_t nAttempts = 1)
+    {
+        EXPECT_EQ(Lines(), takeLog());
+        EXPECT_EQ(nAttempts, takeStatements().size());
+        EXPECT_EQ(nAttempts - 1, state().sleeps.size());
+        EXPECT_EQ(nullptr, sqlite3_next_stmt(database_.get(), nullptr));
+        std::thread([this] {
+            sqlite3_mutex* pMutex = sqlite3_db_mutex(database_.get());
+            const int iTried = sqlite3_mutex_try(pMutex);
+            EXPECT_EQ(SQLITE_OK, iTried);
+            if (SQLITE_OK == iTried) sqlite3_mutex_leave(pMutex);
+        }).join();
+    }
+
+    // The next statement is not touched by what was thrown before.
+    void expectSound(const std::string& strRows)
+    {
+        state().exec = nullptr;
+        rows_ = Json::nullValue;
+        EXPECT_EQ(0, select());
+        EXPECT_EQ(strRows, text(rows_));
+        EXPECT_EQ("", lastSqlError());
+        takeStatements();
+    }
+
+    static constexpr char kRows[] = R"([{"a":1,"s":"a text that is not short"},{"a":2,"s":"b"}])";
+
+    doubles::RowCallback callback_ = rowCallback(table_);
+    std::string strSelect_ = "select a, s from " + table_.strName;
+    Json::Value rows_;
+    unsigned uCallbacks_ = 0;
+};
+
+// The reader of JSON text is among what runs out of memory.
+TEST_F(CallbackException, OfMemoryReachesTheHostFromEveryAllocation)
+{
+    struct Case {
+        std::string strSelect;
+        const char* szRows;
+        int nAllocations;  // at least
+    };
+    for (const Case& row :
+         {Case{strSelect_, kRows, 3},
+          {"select '{\"key\":[1,2,{}]}' as Unsavable", R"([{"Unsavable":{"key":[1,2,{}]}}])", 5}}) {
+        strSelect_ = row.strSelect;
+        for (int n = 1;; ++n) {
+            SCOPED_TRACE(n);
+            state().exec = nullptr;
+            EXPECT_EQ(-1, table_.api.runSqlEx("no statement"));
+            takeLog();
+            takeStatements();
+            rows_ = Json::nullValue;
+            failAllocation(n);
+            try {
+                EXPECT_EQ(0, select());
+                EXPECT_LT(row.nAllocations, n);
+                break;
+            } catch (const std::bad_alloc&) {
+                // The statement stopped at its row.
+                EXPECT_EQ(rows_.size() + 1, uCallbacks_);
+            }
+            expectCalm();
+            EXPECT_EQ("query aborted", lastSqlError());
+            expectSound(row.szRows);
+        }
+        takeStatements();
+    }
+}
+
+TEST_F(CallbackException, OfMemoryLeavesTheRecordOfASaveAlone)
+{
+    failAllocation(1);
+    Json::Value jRecord = json(R"({"a":3,"s":"c"})");
+    EXPECT_THROW(table_.api.recSave(jRecord, true), std::bad_alloc);
+    EXPECT_EQ(json(R"({"a":3,"s":"c"})"), jRecord);
+    expectCalm();
+    Json::Value jOut = "before";
+    jRecord["a"] = 4;
+    EXPECT_THROW(table_.api.recCreate(jRecord, jOut), std::bad_alloc);
+    EXPECT_EQ(json(R"({"a":4,"s":"c"})"), jRecord);
+    EXPECT_EQ("before", jOut.asString());
+    EXPECT_EQ("", table_.api.getErrMsg());
+    expectCalm();
+    EXPECT_EQ("4", database_.value("select count(*) from " + table_.strName));
+}
+
+// A host may change what recType refers to.
+TEST_F(CallbackException, OfAnAccessorReachesTheHost)
+{
+    Json::Value& jWord = VORN_JSON_DB::recType(table_.jDefinition, table_.strName)["s"]["cpptype"];
+    jWord = Json::Value(Json::objectValue);
+    EXPECT_THROW(select(), Json::LogicError);
+    EXPECT_TRUE(rows_.isNull());
+    expectCalm();
+    EXPECT_EQ("query aborted", lastSqlError());
+    jWord = "string";
+    expectSound(kRows);
+}
+
+TEST_F(CallbackException, IsNeitherRetriedNorLoggedHoweverTheStatementEnds)
+{
+    for (const End& end : {End{SQLITE_ABORT, "query aborted"},
+                           {SQLITE_BUSY, "database is locked"},
+                           {SQLITE_ABORT, nullptr, EAGAIN},
+                           {SQLITE_OK, "a warning"},
+                           {SQLITE_OK}})
+        for (std::size_t nLocked : {0U, 2U}) {
+            state().sleeps.clear();
+            // Retried attempts are logged for debugging.
+            blDebugOutput = 0 == nLocked;
+            const sqlite3_int64 before = sqlite3_memory_used();
+            state().exec = [&](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
+                               char** errText) {
+                if (nLocked > state().sleeps.size())
+                    return End{SQLITE_BUSY, "database is locked"}.leaveIn(errText);
+                Row row = {{"a"}, {"1"}};
+                state().iFailNew = 1;
+                EXPECT_EQ(-1, row.handTo(callback, arg));
+                state().iFailNew = 0;
+                return end.leaveIn(errText);
+            };
+            EXPECT_THROW(select(), std::bad_alloc);
+            expectCalm(nLocked + 1);
+            EXPECT_EQ(before, sqlite3_memory_used());
+            EXPECT_EQ(end.szError ? end.szError : "Unknow Error!!", lastSqlError());
+        }
+    expectSound(kRows);
+}
+
+}  // namespace
