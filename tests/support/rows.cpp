@@ -83,16 +83,16 @@ Lines fieldFailed(const std::string& strFirst)
             failed("0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))")};
 }
 
-Lines statementStopped(Lines lines, const std::string& strSql, std::size_t iColumn,
-                       const std::string& strName, const std::string& strValue)
+Lines statementStopped(Lines lines, const Row& row)
 {
-    const std::string strPlace = "[" + std::to_string(iColumn) + "]=";
-    if (0 < iColumn) {
-        lines.push_back(plain("column_name" + strPlace + strName));
-        lines.push_back(plain("column_value" + strPlace + strValue));
+    if (1 < row.names.size()) {
+        const std::string strPlace = "[" + std::to_string(row.names.size() - 1) + "]=";
+        const auto shown = [](const char* szText) { return szText ? szText : "(null)"; };
+        lines.push_back(plain("column_name" + strPlace + shown(row.names.back())));
+        lines.push_back(plain("column_value" + strPlace + shown(row.values.back())));
     }
     lines.push_back(failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)"));
-    lines.push_back(runFailedLine("query aborted", strSql));
+    lines.push_back(runFailedLine("query aborted", "a text"));
     return lines;
 }
 
@@ -119,4 +119,39 @@ std::string RunSqlTest::lastSqlError()
         return strLine.substr(strHead.size(), nTail - strHead.size());
     }
     return std::string();
+}
+
+const char DecoderTest::kMembers[] = R"({
+    "s": {"cpptype": "string"}, "i": {"cpptype": "int"}, "ui": {"cpptype": "unsigned int"},
+    "u": {"cpptype": "unsigned"}, "l": {"cpptype": "long"}, "ul": {"cpptype": "unsigned long"},
+    "ll": {"cpptype": "long long"}, "ull": {"cpptype": "unsigned long long"},
+    "f": {"cpptype": "float"}, "d": {"cpptype": "double"}, "b": {"cpptype": "bool"},
+    "j": {"cpptype": "Json::Value"}, "jo": {"cpptype": "Json::objectValue"},
+    "ja": {"cpptype": "Json::arrayValue"}, "uid": {"cpptype": "uid_t"},
+    "t": {"cpptype": "time_t"}, "none": {"cpptype": "no such word"}, "case": {"cpptype": "Int"},
+    "empty": {"cpptype": ""}, "other": {"cpptype": "string"}})";
+
+std::string DecoderTest::rowsOf(const std::string& strSql)
+{
+    rows_ = Json::nullValue;
+    EXPECT_EQ(0, run(strSql)) << strSql;
+    EXPECT_EQ(Lines(), takeLog()) << strSql;
+    return text(rows_);
+}
+
+std::string DecoderTest::decoded(std::vector<Row> rows, const char* szBefore)
+{
+    doubles::state().exec = execOfRows(std::move(rows));
+    return decoded(table_, szBefore);
+}
+
+std::string DecoderTest::decoded(Table& table, const char* szBefore)
+{
+    rows_ = json(szBefore);
+    try {
+        iResult_ = table.api.runSqlEx("a text", callback_, &rows_);
+    } catch (const Json::LogicError&) {
+        return "Json::LogicError after " + text(rows_);
+    }
+    return text(rows_);
 }

@@ -46,11 +46,10 @@ doubles::Exec execCalledLocked(int nTimes);
 std::string runFailedLine(const std::string& strError, const std::string& strSql,
                           std::size_t nLocked = 0);
 
-// The lines of a column that cannot be decoded, and those of a statement that a column stops: all
-// but the first of the row are shown.
+// The lines of a column that cannot be decoded, and those of a statement that the last column of a
+// row stops. It is shown, unless it is the first.
 Lines fieldFailed(const std::string& strFirst);
-Lines statementStopped(Lines lines, const std::string& strSql, std::size_t iColumn = 0,
-                       const std::string& strName = "", const std::string& strValue = "");
+Lines statementStopped(Lines lines, const Row& row = {});
 
 // The log, with "..." for the types of all tables of the process.
 Lines takeLogWithoutTypes();
@@ -66,4 +65,28 @@ protected:
                  R"({"Unsavable":{"cpptype":"Json::Value"},"a":{"cpptype":"int"},
                      "s":{"cpptype":"string"}})",
                  "a int, s text"};
+};
+
+// With a table of members of all types, for rows of SQL and rows that are handed to the callback.
+// The log has to be taken.
+class DecoderTest : public TableTest {
+protected:
+    ~DecoderTest() override { EXPECT_EQ(Lines(), takeLog()); }
+
+    int run(const std::string& strSql) { return table_.api.runSqlEx(strSql, callback_, &rows_); }
+
+    // The rows of a statement that succeeds.
+    std::string rowsOf(const std::string& strSql);
+    // What becomes of the rows that are handed to the callback, after the ones before.
+    std::string decoded(std::vector<Row> rows, const char* szBefore = "null");
+    std::string decoded(Table& table, const char* szBefore = "null");
+
+    static const char kMembers[];
+    Table table_{database_, kMembers, "s"};
+    doubles::RowCallback callback_ = rowCallback(table_);
+    // A host may change what recType refers to.
+    Json::Value& jTypes_ = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
+    const Json::Value jTypesBefore_ = jTypes_;
+    Json::Value rows_;
+    int iResult_ = 0;
 };

@@ -13,8 +13,8 @@ using doubles::state;
 
 class ChangedTypes : public TableTest {
 protected:
-    // What the operations make of {"m":5}, and of the row that holds it: each result with the SQL
-    // that was run, or the first line of the log.
+    // What the operations make of {"m":5}, and of the row that holds it: each result with the first
+    // line of the log or the SQL that was run, and the rows.
     Lines operations(VornJsonDbApi& api)
     {
         Json::Value jRecord = json(R"({"m":5})");
@@ -22,9 +22,9 @@ protected:
         Json::Value jRecords;
         Lines lines;
         const auto add = [this, &lines](int iResult) {
-            Lines log = takeLog();
-            for (const std::string& strStatement : takeStatements()) log.push_back(strStatement);
-            lines.push_back(std::to_string(iResult) + " " + (log.empty() ? "" : log[0]));
+            Lines all = takeLog();
+            for (const std::string& strStatement : takeStatements()) all.push_back(strStatement);
+            lines.push_back(std::to_string(iResult) + " " + (all.empty() ? "" : all[0]));
         };
         database_.run("delete from " + table_.strName);
         add(api.checkJsonType(jRecord));
@@ -35,49 +35,38 @@ protected:
         return lines;
     }
 
-    // The same for a type word that every operation knows.
-    Lines ofAKnownWord(const std::string& strCheck, const std::string& strRead) const
-    {
-        const std::string& strName = table_.strName;
-        return {strCheck,
-                "0 INSERT INTO " + strName + " (m) VALUES (5) ;select * from " + strName +
-                    " where rowid == last_insert_rowid();",
-                "0 SELECT m FROM " + strName + "  WHERE  (m=5 );",
-                R"([{"m":)" + strRead + R"(},{"m":)" + strRead + "}]"};
-    }
-
     Table table_{database_, R"({"m":{"cpptype":"int"}})", "m"};
 };
 
 TEST_F(ChangedTypes, HoldFromTheNextStatementOnForEveryHandle)
 {
+    const std::string strInsert = "0 INSERT INTO " + table_.strName +
+                                  " (m) VALUES (5) ;select * from " + table_.strName +
+                                  " where rowid == last_insert_rowid();";
+    const std::string strSelect = "0 SELECT m FROM " + table_.strName + "  WHERE  (m=5 );";
+    const Lines ofAnInteger = {"0 ", strInsert, strSelect, R"([{"m":5},{"m":5}])"};
+    const Lines ofABool = {"-1 " + error(R"(type failed, strKey=m, jRecParam={"m":5})"), strInsert,
+                           strSelect, R"([{"m":false},{"m":false}])"};
+    const Lines ofNoWord = {"-1 " + error("type not found!!, key=m"),
+                            "-1 " + error("cannot support this type="),
+                            "-1 " + error("type error, strType="), "null"};
     Table second(database_, table_.strName, R"({"m":{"cpptype":"int"}})", "m");
     Json::Value& jType = VORN_JSON_DB::recType(table_.jDefinition, table_.strName)["m"];
-    const Lines ofAnInteger = ofAKnownWord("0 ", "5");
-    const Lines ofABool =
-        ofAKnownWord("-1 " + error(R"(type failed, strKey=m, jRecParam={"m":5})"), "false");
-    const Lines ofAnUnknownWord = {"-1 " + error("type not found!!, key=m"),
-                                   "-1 " + error("cannot support this type="),
-                                   "-1 " + error("type error, strType="), "null"};
     for (VornJsonDbApi* pApi : {&table_.api, &second.api}) {
-        EXPECT_EQ(ofAnInteger, operations(*pApi));
-        jType["cpptype"] = "bool";
-        EXPECT_EQ(ofABool, operations(*pApi));
-        jType["cpptype"] = "no such word";
-        EXPECT_EQ(ofAnUnknownWord[0], operations(*pApi)[0]);
-        jType["cpptype"] = "long long";
-        EXPECT_EQ(ofAnInteger, operations(*pApi));
-        // A damaged entry is of no known word and stays.
-        for (const char* szEntry : {"{}", R"({"cppDefaultValue":1})", R"({"type":"int"})", "null",
-                                    "5", "true", R"("int")", "[]", R"([{"cpptype":"int"}])"}) {
-            SCOPED_TRACE(szEntry);
-            jType = json(szEntry);
-            EXPECT_EQ(ofAnUnknownWord, operations(*pApi));
-            EXPECT_EQ(szEntry, text(jType));
-        }
-        jType = json(R"({"cpptype":"int"})");
+        const auto expect = [&](const char* szType, const Lines& lines) {
+            SCOPED_TRACE(szType);
+            jType = json(szType);
+            EXPECT_EQ(lines, operations(*pApi));
+            EXPECT_EQ(szType, text(jType));
+        };
+        expect(R"({"cpptype":"int"})", ofAnInteger);
+        expect(R"({"cpptype":"bool"})", ofABool);
+        expect(R"({"cpptype":"long long"})", ofAnInteger);
+        for (const char* szType :
+             {R"({"cpptype":""})", "{}", R"({"cppDefaultValue":1})", R"({"type":"int"})", "null",
+              "5", "true", R"("int")", "[]", R"([{"cpptype":"int"}])"})
+            expect(szType, ofNoWord);
     }
-    EXPECT_EQ(ofAnInteger, operations(table_.api));
 }
 
 class HostFunctions : public TableTest {
@@ -98,40 +87,35 @@ protected:
     }
 
     std::function<const char*()> function_;
+    int iCalls_ = 0;
     Table table_{database_, R"({"id":{"cpptype":"int"},"name":{"cpptype":"string"}})",
                  "id integer primary key, name text"};
 };
 
 TEST_F(HostFunctions, MayChangeOrDestroyTheRecordOfACreate)
 {
-    table_.create(R"({"id":1,"name":"first"})");
     database_.run("create trigger host_function before insert on " + table_.strName +
                   " begin select host(); end");
     std::unique_ptr<Json::Value> pjRecord;
+    setFunction([&] {
+        (*pjRecord)["name"] = "changed";
+        if (2 == ++iCalls_) pjRecord.reset();
+        return nullptr;
+    });
     Json::Value jStored;
-    for (bool blDestroy : {false, true}) {
-        setFunction([&] {
-            *pjRecord = json(R"({"more":true})");
-            if (blDestroy) pjRecord.reset();
-            return nullptr;
-        });
+    for (int iResult : {0, -1, -1}) {
         pjRecord = std::make_unique<Json::Value>(json(R"({"id":1,"name":"sent"})"));
-        EXPECT_EQ(-1, table_.api.recCreate(*pjRecord, jStored));
-        EXPECT_EQ(blDestroy ? "" : R"({"more":true})", pjRecord ? text(*pjRecord) : "");
-        // The lines of a duplicate create show what was sent.
+        EXPECT_EQ(iResult, table_.api.recCreate(*pjRecord, jStored));
+        EXPECT_EQ(2 == iCalls_ ? "" : R"({"id":1,"name":"changed"})",
+                  pjRecord ? text(*pjRecord) : "");
+        EXPECT_EQ(R"({"id":1,"name":"sent"})", text(jStored));
         const Lines lines = takeLog();
+        if (0 == iResult) continue;
+        // The lines of a duplicate create show what was sent.
         ASSERT_EQ(7U, lines.size());
         EXPECT_EQ(plain(R"(blCreate=1, jRecInOut={"id":1,"name":"sent"})"), lines[2]);
         EXPECT_EQ(plain(R"(call create rec, rec={"id":1,"name":"sent"})"), lines[6]);
     }
-    setFunction([&] {
-        (*pjRecord)["name"] = "changed";
-        return nullptr;
-    });
-    pjRecord = std::make_unique<Json::Value>(json(R"({"id":2,"name":"sent"})"));
-    EXPECT_EQ(0, table_.api.recCreate(*pjRecord, jStored));
-    EXPECT_EQ(R"({"id":2,"name":"changed"})", text(*pjRecord));
-    EXPECT_EQ(R"({"id":2,"name":"sent"})", text(jStored));
 }
 
 // The attempt that follows decodes the rows by the types of its own table again.
@@ -140,9 +124,8 @@ TEST_F(HostFunctions, MayListAnotherTableAndFailAsLocked)
     table_.create(R"({"id":1,"name":"a"})");
     Table other(database_, R"({"zone":{"cpptype":"string"}})", "zone text");
     other.create(R"({"zone":"north"})");
-    int iCalls = 0;
     setFunction([&]() -> const char* {
-        if (0 < iCalls++) return nullptr;
+        if (0 < iCalls_++) return nullptr;
         Json::Value jRequest;
         Json::Value jRecords;
         EXPECT_EQ(0, other.api.recList(jRequest, jRecords));
@@ -153,7 +136,7 @@ TEST_F(HostFunctions, MayListAnotherTableAndFailAsLocked)
     Json::Value jRecords;
     EXPECT_EQ(0, table_.api.recList(jRequest, jRecords));
     EXPECT_EQ(R"([{"id":1,"name":"a"}])", text(jRecords));
-    EXPECT_EQ(2, iCalls);
+    EXPECT_EQ(2, iCalls_);
     EXPECT_EQ(1U, state().sleeps.size());
     EXPECT_EQ(Lines(), takeLog());
 }

@@ -164,14 +164,4 @@ TEST_F(Handle, GivesBackTheMessageOfTheHost)
     EXPECT_EQ("", api.getErrMsg());
 }
 
-TEST_F(Handle, LeavesTheConnectionToOthers)
-{
-    VornJsonDbApi other(database_.get(), strName_, jDefinition_, strCreate_);
-    {
-        VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
-    }
-    takeLog();
-    expectSaved(other);
-}
-
 }  // namespace

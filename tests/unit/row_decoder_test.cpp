@@ -5,32 +5,23 @@
 
 namespace {
 
-const char kMembers[] = R"({
-    "s": {"cpptype": "string"}, "i": {"cpptype": "int"}, "ui": {"cpptype": "unsigned int"},
-    "u": {"cpptype": "unsigned"}, "l": {"cpptype": "long"}, "ul": {"cpptype": "unsigned long"},
-    "ll": {"cpptype": "long long"}, "ull": {"cpptype": "unsigned long long"},
-    "f": {"cpptype": "float"}, "d": {"cpptype": "double"}, "b": {"cpptype": "bool"},
-    "j": {"cpptype": "Json::Value"}, "jo": {"cpptype": "Json::objectValue"},
-    "ja": {"cpptype": "Json::arrayValue"}, "uid": {"cpptype": "uid_t"},
-    "t": {"cpptype": "time_t"}, "none": {"cpptype": "no such word"}, "case": {"cpptype": "Int"},
-    "empty": {"cpptype": ""}})";
+using doubles::state;
 
-class RowDecoder : public TableTest {
+const Row kRow = {{"s"}, {"7"}};
+const std::string kUndeclared = failed("!jType.isMember(strName)");
+const std::string kOfADouble = error("type error, strType=double");
+const std::string kTypesAreNoObject = utilFailed("jType[strJsonName].type() != Json::objectValue");
+
+class RowDecoder : public DecoderTest {
 protected:
-    int run(const std::string& strSql) { return table_.api.runSqlEx(strSql, callback_, &rows_); }
-
-    // The rows of a statement that succeeds.
-    std::string rowsOf(const std::string& strSql)
+    // The log of a row whose table has no types, from the check that asked for them on.
+    static Lines undeclaredLines(const std::string& strCheck, const Table& table)
     {
-        rows_ = Json::nullValue;
-        EXPECT_EQ(0, run(strSql)) << strSql;
-        EXPECT_EQ(Lines(), takeLog()) << strSql;
-        return text(rows_);
+        Lines lines = statementStopped(fieldFailed(kUndeclared));
+        lines.insert(lines.begin(), {strCheck, utilPlain("strJsonName=" + table.strName),
+                                     utilPlain("jTableDef=null"), utilPlain("jType={...}")});
+        return lines;
     }
-
-    Table table_{database_, kMembers, "s"};
-    doubles::RowCallback callback_ = rowCallback(table_);
-    Json::Value rows_;
 };
 
 // SQL values of each column, and the members that they become.
@@ -95,38 +86,10 @@ TEST_F(RowDecoder, RefusesAValueOfAnyOtherType)
 {
     const Json::Value jMembers = json(kMembers);
     for (const char* szName : {"u", "l", "ul", "f", "d", "uid", "t", "none", "case", "empty"}) {
-        const std::string strSql = std::string("select 1 as '") + szName + "'";
-        EXPECT_EQ(-1, run(strSql)) << szName;
+        EXPECT_EQ("null", decoded({{{szName}, {"1"}}}));
+        EXPECT_EQ(-1, iResult_);
         const std::string strWord = jMembers[szName]["cpptype"].asString();
-        EXPECT_EQ(statementStopped(fieldFailed(error("type error, strType=" + strWord)), strSql),
-                  takeLog());
-    }
-    EXPECT_TRUE(rows_.isNull());
-}
-
-const std::string kUndeclared = failed("!jType.isMember(strName)");
-const std::string kOfADouble = error("type error, strType=double");
-
-TEST_F(RowDecoder, ShowsTheFailedColumnUnlessItIsTheFirst)
-{
-    struct Case {
-        const char* szSql;
-        std::string strFirst;
-        std::size_t iColumn;
-        const char* szName;
-        const char* szValue;
-    };
-    for (const Case& row : {Case{"select 2.5 as d, 1 as i", kOfADouble, 0, "", ""},
-                            {"select 1 as x", kUndeclared, 0, "", ""},
-                            {"select 1+1", kUndeclared, 0, "", ""},
-                            {"select null as x", kUndeclared, 0, "", ""},
-                            {"select 'a' as S", kUndeclared, 0, "", ""},
-                            {"select 1 as i, 'v%n' as \"x%s\"", kUndeclared, 1, "x%s", "v%n"},
-                            {"select 1 as i, 2 as s, null as x", kUndeclared, 2, "x", "(null)"},
-                            {"select 1 as i, 2.5 as d", kOfADouble, 1, "d", "2.5"}}) {
-        EXPECT_EQ(-1, run(row.szSql));
-        EXPECT_EQ(statementStopped(fieldFailed(row.strFirst), row.szSql, row.iColumn, row.szName,
-                                   row.szValue),
+        EXPECT_EQ(statementStopped(fieldFailed(error("type error, strType=" + strWord))),
                   takeLog());
     }
 }
@@ -141,20 +104,14 @@ TEST_F(RowDecoder, TakesTheLaterOfTwoColumnsOfOneName)
 
 TEST_F(RowDecoder, AppendsToWhatIsThere)
 {
-    struct Case {
-        const char* szBefore;
-        const char* szSql;
-        const char* szAfter;
-    };
-    const char kThree[] =
-        "select 1 as i union all select 2; select 'a' as s; select 1 as i where 0";
-    for (const Case& row : {Case{R"(["x"])", kThree, R"(["x",{"i":1},{"i":2},{"s":"a"}])"},
-                            {"[]", "select 1 as i", R"([{"i":1}])"},
-                            {"null", "select 1 as i where 0", "null"}}) {
-        rows_ = json(row.szBefore);
-        EXPECT_EQ(0, run(row.szSql));
-        EXPECT_EQ(row.szAfter, text(rows_));
-    }
+    EXPECT_EQ("null", rowsOf("select 1 as i where 0"));
+    rows_ = json("[]");
+    EXPECT_EQ(0, run("select 1 as i"));
+    EXPECT_EQ(0, run("select 2 as i union all select 3; select 'a' as s; select 1 as i where 0"));
+    EXPECT_EQ(R"([{"i":1},{"i":2},{"i":3},{"s":"a"}])", text(rows_));
+    rows_ = json(R"(["x"])");
+    EXPECT_EQ(0, run("select 1 as i"));
+    EXPECT_EQ(R"(["x",{"i":1}])", text(rows_));
 }
 
 TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
@@ -183,7 +140,7 @@ TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
 
 TEST_F(RowDecoder, AppendsTheRowsOfEveryAttempt)
 {
-    doubles::state().exec = execCalledLocked(2);
+    state().exec = execCalledLocked(2);
     EXPECT_EQ(R"([{"i":1},{"i":1},{"i":1}])", rowsOf("select 1 as i"));
 }
 
@@ -208,30 +165,98 @@ TEST_F(RowDecoder, MakesAMemberNullThatIsNestedTooDeep)
     }
 }
 
+TEST_F(RowDecoder, AppendsToArraysAlone)
+{
+    const std::string strStopped = runFailedLine("query aborted", "a text");
+    state().exec = execOfRows({kRow});
+    EXPECT_EQ(-1, table_.api.runSqlEx("a text", callback_, nullptr));
+    EXPECT_EQ((Lines{failed("!pjRecArray"), strStopped}), takeLog());
+    const std::string strNoArray =
+        failed("pjRecArray->type() != Json::arrayValue && pjRecArray->type() != Json::nullValue");
+    for (const char* szTarget : {"{}", R"({"a":1})", "5", R"("x")", "false", "0.5"}) {
+        EXPECT_EQ(szTarget, decoded({kRow}, szTarget));
+        EXPECT_EQ(-1, iResult_);
+        EXPECT_EQ((Lines{strNoArray, strStopped}), takeLog());
+    }
+}
+
+// The failed column is the last one.
+TEST_F(RowDecoder, ShowsTheFailedColumnUnlessItIsTheFirst)
+{
+    struct Case {
+        Row row;
+        Lines first;
+    };
+    const Lines noList = {failed("NULL == column_name || NULL == column_value")};
+    const Lines noName = {failed("NULL == column_name[i]")};
+    const Lines undeclared = fieldFailed(kUndeclared);
+    const Lines ofADouble = fieldFailed(kOfADouble);
+    for (const Case& row : {Case{{{"i"}, {}}, noList},
+                            {{{}, {"1"}}, noList},
+                            {{{nullptr}, {"7"}}, noName},
+                            {{{"i", nullptr}, {"1", nullptr}}, noName},
+                            {{{"i", nullptr}, {"1", "7"}}, noName},
+                            {{{"x"}, {"1"}}, undeclared},
+                            {{{"1+1"}, {"2"}}, undeclared},
+                            {{{"x"}, {nullptr}}, undeclared},
+                            {{{"S"}, {"a"}}, undeclared},
+                            {{{"i", "x%s"}, {"1", "v%n"}}, undeclared},
+                            {{{"i", "s", "x"}, {"1", "2", nullptr}}, undeclared},
+                            {{{"d"}, {"2.5"}}, ofADouble},
+                            {{{"i", "d"}, {"1", "2.5"}}, ofADouble}}) {
+        const Lines lines = statementStopped(row.first, row.row);
+        EXPECT_EQ("null", decoded({row.row}));
+        EXPECT_EQ(-1, iResult_);
+        EXPECT_EQ(lines, takeLog());
+        EXPECT_EQ(R"([{"s":"7"},{"s":"7"},{"s":"7"}])", decoded({kRow, kRow, kRow, row.row, kRow}));
+        EXPECT_EQ(lines, takeLog());
+    }
+}
+
+// Two rows of one statement, as if SQLite went on after the first failed.
+TEST_F(RowDecoder, AsksForMissingTypesAtEveryRow)
+{
+    jTypes_ = Json::nullValue;
+    state().exec = [](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
+                      char** errText) {
+        for (Row row : {kRow, kRow}) EXPECT_EQ(-1, row.handTo(callback, arg));
+        return End{SQLITE_ABORT, "query aborted"}.leaveIn(errText);
+    };
+    EXPECT_EQ("null", decoded(table_));
+    Lines lines = undeclaredLines(kTypesAreNoObject, table_);
+    const Lines ofOneRow(lines.begin(), lines.end() - 1);
+    lines.insert(lines.begin(), ofOneRow.begin(), ofOneRow.end());
+    EXPECT_EQ(lines, takeLogWithoutTypes());
+}
+
+// At places that no row of the process had before.
+TEST_F(RowDecoder, LooksUpANamelessColumnLikeEveryOther)
+{
+    struct Case {
+        std::size_t nOthers;
+        const char* szWord;
+        std::string strFirst;
+    };
+    for (const Case& row :
+         {Case{70, nullptr, kUndeclared}, {80, "", error("type error, strType=")}}) {
+        if (nullptr != row.szWord) jTypes_[""]["cpptype"] = row.szWord;
+        Row strange = {std::vector<const char*>(row.nOthers, "s"),
+                       std::vector<const char*>(row.nOthers + 1, "x")};
+        strange.names.push_back("");
+        EXPECT_EQ("null", decoded({strange}));
+        EXPECT_EQ(statementStopped(fieldFailed(row.strFirst), strange), takeLog());
+    }
+}
+
 // The first to ask for the types of a table is the decoder, which has no definition.
 TEST_F(RowDecoder, SpoilsTheTypesOfATableThatNobodyAskedForBefore)
 {
     Table other(database_, R"({"s":{"cpptype":"string"}})", "s");
-    const std::string strSql = "select 'x' as s";
-    EXPECT_EQ(-1, other.api.runSqlEx(strSql, callback_, &rows_));
-    Lines lines = statementStopped(fieldFailed(kUndeclared), strSql);
-    lines.insert(lines.begin(),
-                 {utilFailed("jTableDef.empty()"), utilPlain("strJsonName=" + other.strName),
-                  utilPlain("jTableDef=null"), utilPlain("jType={...}")});
-    EXPECT_EQ(lines, takeLogWithoutTypes());
-    EXPECT_TRUE(rows_.isNull());
-
+    state().exec = execOfRows({kRow});
+    EXPECT_EQ("null", decoded(other));
+    EXPECT_EQ(undeclaredLines(utilFailed("jTableDef.empty()"), other), takeLogWithoutTypes());
     EXPECT_TRUE(VORN_JSON_DB::recType(other.jDefinition, other.strName).isNull());
     EXPECT_EQ(utilFailed("jType[strJsonName].type() != Json::objectValue"), takeLog()[0]);
-}
-
-TEST_F(RowDecoder, UsesTheTypesOfTheTableThatRanLast)
-{
-    Table other(database_, R"({"s":{"cpptype":"int"}})", "s");
-    VORN_JSON_DB::recType(other.jDefinition, other.strName);
-    EXPECT_EQ(0, other.api.runSqlEx("select 5 as s", callback_, &rows_));
-    EXPECT_EQ(0, run("select 5 as s"));
-    EXPECT_EQ(R"([{"s":5},{"s":"5"}])", text(rows_));
 }
 
 }  // namespace
