@@ -56,11 +56,6 @@ doubles::Exec execOfEnds(std::vector<End> ends)
     };
 }
 
-doubles::Exec execOfStatus(int iStatus, const char* szError)
-{
-    return execOfEnds({{iStatus, szError}});
-}
-
 doubles::Exec execCalledLocked(int nTimes)
 {
     return [nTimes](sqlite3* pDb, const char* szSql, doubles::RowCallback callback, void* arg,

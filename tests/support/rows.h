@@ -37,7 +37,10 @@ struct End {
 
 // A double of sqlite3_exec whose runs end like these in turn, and like the last one from then on.
 doubles::Exec execOfEnds(std::vector<End> ends);
-doubles::Exec execOfStatus(int iStatus, const char* szError);
+inline doubles::Exec execOfStatus(int iStatus, const char* szError)
+{
+    return execOfEnds({{iStatus, szError}});
+}
 
 // A double of sqlite3_exec that runs the text, and calls it locked that many times.
 doubles::Exec execCalledLocked(int nTimes);

@@ -9,11 +9,12 @@ using doubles::state;
 
 class Handle : public TableTest {
 protected:
-    // The lines of a table that was not created.
-    static Lines createFailed(const std::string& strError, const std::string& strSql)
+    // Those lines, and then the ones of a table that was not created.
+    static Lines createFailed(const std::string& strError, const std::string& strSql,
+                              Lines lines = {})
     {
-        Lines lines = {runFailedLine(strError, strSql),
-                       error("create table failed, sql=" + strSql)};
+        lines.push_back(runFailedLine(strError, strSql));
+        lines.push_back(error("create table failed, sql=" + strSql));
         if (!strError.empty())
             lines.push_back(plain("sql error, err=" + strError + ", sql=" + strSql));
         return lines;
@@ -35,39 +36,35 @@ protected:
 
 TEST_F(Handle, ReportsEachArgumentThatIsMissingAndIsMadeAllTheSame)
 {
-    for (unsigned uMissing = 0; uMissing < 16; ++uMissing) {
-        const bool blNoDatabase = 0 != (uMissing & 8U);
-        for (const char* szDefinition : {"null", "{}", "[]"}) {
-            SCOPED_TRACE(uMissing);
-            std::string strName = 0 != (uMissing & 4U) ? "" : strName_;
-            Json::Value jDefinition = 0 != (uMissing & 2U) ? json(szDefinition) : jDefinition_;
-            std::string strCreate = 0 != (uMissing & 1U) ? "" : strCreate_;
-            VornJsonDbApi api(blNoDatabase ? nullptr : database_.get(), strName, jDefinition,
-                              strCreate);
-
-            Lines lines;
-            if (blNoDatabase) lines.push_back(plain("Failed [!pDb]"));
-            if (strName.empty()) lines.push_back(plain("Failed [strName.empty()]"));
-            if (jDefinition.empty()) lines.push_back(plain("Failed [jTableDef.empty()]"));
-            if (strCreate.empty()) {
-                lines.push_back(plain("Failed [strSqlCreate.empty()]"));
-                lines.push_back(failed("0 >= strSql.length()"));
-            }
-            if (blNoDatabase || strCreate.empty()) {
-                for (const std::string& strLine : createFailed("Unknow Error!!", strCreate))
-                    lines.push_back(strLine);
-                lines.push_back(failed("0 > tableCreate()"));
-            }
-            EXPECT_EQ(lines, takeLog());
-            EXPECT_EQ(strCreate.empty() ? Lines() : Lines{strCreate}, takeStatements());
-            EXPECT_EQ("", api.getErrMsg());
-            Json::Value jRecord = json(R"({"a":"x"})");
-            EXPECT_EQ(0 == uMissing ? 0 : -1, api.recSave(jRecord, true));
-            takeLog();
-            takeStatements();
-            database_.run("drop table if exists " + strName_);
-        }
-    }
+    sqlite3* const pNone = nullptr;
+    for (sqlite3* pDb : {database_.get(), pNone})
+        for (std::string strName : {strName_, std::string()})
+            for (Json::Value jDefinition :
+                 {json(R"({"other":{}})"), json("null"), json("{}"), json("[]"), jDefinition_})
+                for (std::string strCreate : {strCreate_, std::string()}) {
+                    VornJsonDbApi api(pDb, strName, jDefinition, strCreate);
+                    Lines lines;
+                    if (nullptr == pDb) lines.push_back(plain("Failed [!pDb]"));
+                    if (strName.empty()) lines.push_back(plain("Failed [strName.empty()]"));
+                    if (jDefinition.empty()) lines.push_back(plain("Failed [jTableDef.empty()]"));
+                    if (strCreate.empty()) {
+                        lines.push_back(plain("Failed [strSqlCreate.empty()]"));
+                        lines.push_back(failed("0 >= strSql.length()"));
+                    }
+                    if (nullptr == pDb || strCreate.empty()) {
+                        lines = createFailed("Unknow Error!!", strCreate, lines);
+                        lines.push_back(failed("0 > tableCreate()"));
+                    }
+                    EXPECT_EQ(lines, takeLog());
+                    EXPECT_EQ(strCreate.empty() ? Lines() : Lines{strCreate}, takeStatements());
+                    EXPECT_EQ("", api.getErrMsg());
+                    database_.run("drop table if exists " + strName_);
+                }
+    // A handle that is only made does not read member types, so a bad definition spoils none.
+    VornJsonDbApi api(nullptr, strName_, jDefinition_, strCreate_);
+    Json::Value jRecord = json(R"({"a":"x"})");
+    EXPECT_EQ(-1, api.recSave(jRecord, true));
+    EXPECT_EQ(R"({"a":{"cpptype":"string"}})", text(VORN_JSON_DB::recType(jDefinition_, strName_)));
 }
 
 TEST_F(Handle, WorksThoughItsTableWasThereAlready)
@@ -137,16 +134,6 @@ TEST_F(Handle, CopiesItsArgumentsAndLeavesThemAlone)
     database_.run("drop table " + strName_);
     EXPECT_EQ(0, api.tableCreate());
     expectSaved(api);
-}
-
-// The types of a table are read by the first operation that needs them, so a handle that is only
-// made cannot spoil them.
-TEST_F(Handle, DoesNotReadMemberTypesWhenItIsMade)
-{
-    Json::Value jBad = json(R"({"other":{}})");
-    VornJsonDbApi unused(database_.get(), strName_, jBad, strCreate_);
-    EXPECT_EQ(R"({"a":{"cpptype":"string"}})", text(VORN_JSON_DB::recType(jDefinition_, strName_)));
-    EXPECT_EQ(Lines(), takeLog());
 }
 
 TEST_F(Handle, GivesBackTheMessageOfTheHost)

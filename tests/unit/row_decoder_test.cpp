@@ -3,6 +3,8 @@
 
 #include "support/rows.h"
 
+#include <utility>
+
 namespace {
 
 using doubles::state;
@@ -34,7 +36,8 @@ const char kDecoded[] = R"({
             "'99999999999999999999'": 2147483647, "'-99999999999999999999'": -2147483648},
     "ui":  {"7": 7, "-7": -7, "2147483648": 2147483647, "4294967295": 2147483647},
     "ll":  {"999999999999999999": 999999999999999999, "1000000000000000000": 1000000000000000000,
-            "9223372036854775807": 9223372036854775807, "'9223372036854775808'": 9223372036854775807,
+            "9223372036854775807": 9223372036854775807,
+            "'9223372036854775808'": 9223372036854775807,
             "'-9223372036854775808'": -9223372036854775808,
             "'-9223372036854775809'": -9223372036854775808,
             "'18446744073709551617'": 9223372036854775807, "'0000000000000000000000042'": 42,
@@ -43,8 +46,9 @@ const char kDecoded[] = R"({
     "b":   {"1": true, "' 1 yes'": true, "'01'": true, "'1a'": true, "0": false, "2": false,
             "-1": false, "19": false, "'true'": false, "''": false, "4294967297": false,
             "'18446744073709551617'": false},
-    "j":   {"'5'": 5, "'\"x\"'": "x", "'null'": null, "'true'": true, "'[1,[2.5,{}]]'": [1,[2.5,{}]],
-            "'[NaN,Infinity,-Infinity]'": [NaN,Infinity,-Infinity], "'/* c */ [1 // d\n]'": [1]},
+    "j":   {"'5'": 5, "'\"x\"'": "x", "'null'": null, "'true'": true,
+            "'[1,[2.5,{}]]'": [1,[2.5,{}]], "'[NaN,Infinity,-Infinity]'": [NaN,Infinity,-Infinity],
+            "'/* c */ [1 // d\n]'": [1]},
     "jo":  {"'{\"k\":{\"l\":[]}}'": {"k":{"l":[]}}, "'[1]'": [1]},
     "ja":  {"'[\"\u00e9\",-1]'": ["\u00e9",-1], "'{}'": {}}})";
 
@@ -116,25 +120,18 @@ TEST_F(RowDecoder, AppendsToWhatIsThere)
 
 TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
 {
-    struct Case {
-        std::string strSql;
-        std::string strFirst;
-        const char* szRows;
-    };
     const std::string strBad = "select 1 as i; select 2 as i; no statement";
-    for (const Case& row :
-         {Case{"select 1 as i; select 2 as i; select 3 as x; select 4 as i", kUndeclared,
-               R"([{"i":1},{"i":2}])"},
-          {strBad, runFailedLine("near \"no\": syntax error", strBad), R"([{"i":1},{"i":2}])"},
-          {"select 1 as i, null as d union all select 2, null union all select 3, 0.5", kOfADouble,
-           R"([{"i":1},{"i":2}])"},
-          {"select null as d union all select null union all select null union all select 1.5 "
-           "union all select 2.5",
-           kOfADouble, "[{},{},{}]"}}) {
+    using Case = std::pair<std::string, std::string>;
+    for (const auto& [strSql, strFirst] :
+         {Case{"select 1 as i; select 2 as i; select 3 as x; select 4 as i", kUndeclared},
+          {strBad, runFailedLine("near \"no\": syntax error", strBad)},
+          {"select 1 as i, null as d union all select 2, null union all select 3, 0.5", kOfADouble},
+          {"select null as d, 1 as i union all select null, 2 union all select 1.5, 3",
+           kOfADouble}}) {
         rows_ = Json::nullValue;
-        EXPECT_EQ(-1, run(row.strSql));
-        EXPECT_EQ(row.szRows, text(rows_)) << row.strSql;
-        EXPECT_EQ(row.strFirst, takeLog()[0]);
+        EXPECT_EQ(-1, run(strSql));
+        EXPECT_EQ(R"([{"i":1},{"i":2}])", text(rows_)) << strSql;
+        EXPECT_EQ(strFirst, takeLog()[0]);
     }
 }
 
@@ -232,19 +229,15 @@ TEST_F(RowDecoder, AsksForMissingTypesAtEveryRow)
 // At places that no row of the process had before.
 TEST_F(RowDecoder, LooksUpANamelessColumnLikeEveryOther)
 {
-    struct Case {
-        std::size_t nOthers;
-        const char* szWord;
-        std::string strFirst;
-    };
-    for (const Case& row :
-         {Case{70, nullptr, kUndeclared}, {80, "", error("type error, strType=")}}) {
-        if (nullptr != row.szWord) jTypes_[""]["cpptype"] = row.szWord;
-        Row strange = {std::vector<const char*>(row.nOthers, "s"),
-                       std::vector<const char*>(row.nOthers + 1, "x")};
-        strange.names.push_back("");
-        EXPECT_EQ("null", decoded({strange}));
-        EXPECT_EQ(statementStopped(fieldFailed(row.strFirst), strange), takeLog());
+    for (std::size_t nOthers : {70U, 80U}) {
+        const bool blDeclared = 80 == nOthers;
+        if (blDeclared) jTypes_[""]["cpptype"] = "";
+        Row row = {std::vector<const char*>(nOthers, "s"),
+                   std::vector<const char*>(nOthers + 1, "x")};
+        row.names.push_back("");
+        EXPECT_EQ("null", decoded({row}));
+        const std::string strFirst = blDeclared ? error("type error, strType=") : kUndeclared;
+        EXPECT_EQ(statementStopped(fieldFailed(strFirst), row), takeLog());
     }
 }
 

@@ -138,21 +138,18 @@ TEST_F(Execution, HandsRowsToTheCallbackWithoutCountingChanges)
 
 TEST_F(Execution, PassesCallbackAndArgumentUnchanged)
 {
-    using Passed = std::pair<doubles::RowCallback, void*>;
-    int iArgument = 0;
-    for (const Passed& passed : {Passed(collect, &iArgument),
-                                 {collect, nullptr},
-                                 {nullptr, &iArgument},
-                                 {nullptr, nullptr}}) {
-        Passed found;
-        state().exec = [&](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
-                           char**) {
-            found = {callback, arg};
-            return SQLITE_OK;
-        };
-        table_.api.runSqlEx("any text", passed.first, passed.second);
-        EXPECT_EQ(passed, found);
-    }
+    std::string strRows;
+    for (doubles::RowCallback passed : {doubles::RowCallback(collect), doubles::RowCallback()})
+        for (void* passedArg : {static_cast<void*>(&strRows), static_cast<void*>(nullptr)}) {
+            state().exec = [&](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
+                               char**) {
+                EXPECT_EQ(passed, callback);
+                EXPECT_EQ(passedArg, arg);
+                return SQLITE_OK;
+            };
+            table_.api.runSqlEx("any text", passed, passedArg);
+            EXPECT_EQ(Lines{"any text"}, takeStatements());
+        }
 }
 
 TEST_F(Execution, ReportsAnEmptyTextWithoutRunningIt)
@@ -175,19 +172,12 @@ TEST_F(Execution, ReportsAnEmptyTextWithoutRunningIt)
 
 TEST_F(Execution, ReportsAFailureOnce)
 {
-    for (const End& end : {End{SQLITE_ERROR, "some error"},
-                           {SQLITE_ERROR},
-                           {SQLITE_BUSY},
-                           {SQLITE_ERROR, ""},
-                           {SQLITE_BUSY, "Database is locked"},
-                           {SQLITE_LOCKED, "database table is locked"},
-                           {-1, "database is  locked"},
-                           {SQLITE_BUSY, "database is locke"},
-                           {SQLITE_ERROR, "%n%s%d"},
-                           {SQLITE_ERROR, nullptr, EINTR},
-                           {SQLITE_ERROR, nullptr, EBUSY},
-                           {SQLITE_ERROR, nullptr, ENOLCK}})
-        expectRun({end}, 0, -1);
+    for (int iStatus : {SQLITE_ERROR, SQLITE_BUSY, SQLITE_LOCKED, -1})
+        for (const char* szError :
+             {static_cast<const char*>(nullptr), "some error", "", "Database is locked",
+              "database table is locked", "database is  locked", "database is locke", "%n%s%d"})
+            expectRun({{iStatus, szError}}, 0, -1);
+    for (int iErrno : {EINTR, EBUSY, ENOLCK}) expectRun({{SQLITE_ERROR, nullptr, iErrno}}, 0, -1);
 }
 
 TEST_F(Execution, FailsForANegativeCountAloneWhateverTheErrorText)
@@ -200,13 +190,14 @@ TEST_F(Execution, FailsForANegativeCountAloneWhateverTheErrorText)
 
 class Retry : public Execution {};
 
-TEST_F(Retry, SucceedsAtTheFirstUnlockedAttempt)
+TEST_F(Retry, EndsWithTheFirstAttemptThatIsNotLocked)
 {
-    for (std::size_t nLocked : {1U, 3U, 499U}) {
-        std::vector<End> ends(nLocked, End{SQLITE_BUSY, "database is locked"});
-        ends.push_back({SQLITE_OK});
-        expectRun(ends, nLocked, 4);
-    }
+    for (std::size_t nLocked : {1U, 2U, 3U, 499U})
+        for (const End& last : {End{SQLITE_OK}, {SQLITE_ERROR, "disk I/O error"}, {SQLITE_ERROR}}) {
+            std::vector<End> ends(nLocked, End{SQLITE_BUSY, "database is locked"});
+            ends.push_back(last);
+            expectRun(ends, nLocked, SQLITE_OK == last.iStatus ? 4 : -1);
+        }
 }
 
 TEST_F(Retry, LooksForTheWordsAnywhereInTheText)
@@ -223,46 +214,28 @@ TEST_F(Retry, TakesTheErrnoOfALockForALock)
     expectRun({{SQLITE_ERROR, "disk I/O error", EAGAIN}}, kMaxAttempts, -1);
 }
 
-TEST_F(Retry, EndsWithAnErrorOfAnotherKind)
-{
-    const End locked = {SQLITE_BUSY, "database is locked"};
-    expectRun({locked, locked, {SQLITE_ERROR, "disk I/O error"}}, 2, -1);
-    expectRun({locked, {SQLITE_ERROR}}, 1, -1);
-}
-
-TEST_F(Retry, ClearsErrnoBeforeEachAttempt)
-{
-    std::vector<int> found;
-    state().exec = [&](sqlite3*, const char*, doubles::RowCallback, void*, char** errText) {
-        found.push_back(errno);
-        return 3 == found.size() ? SQLITE_ERROR
-                                 : End{SQLITE_BUSY, "database is locked", ENOENT}.leaveIn(errText);
-    };
-    state().onSleep = [] { errno = EAGAIN; };
-    errno = EAGAIN;
-    EXPECT_EQ(-1, run("a text"));
-    EXPECT_EQ((std::vector<int>{0, 0, 0}), found);
-    EXPECT_EQ(Lines{runFailedLine(kUnknown, "a text", 2)}, takeLog());
-}
-
-// What the handle holds while a later attempt runs, read by a save on the same handle.
-TEST_F(Retry, HoldsTheTextOfTheLastLockedAttempt)
+// Errno, and what the handle holds while an attempt runs, read by a save on the same handle.
+TEST_F(Retry, ClearsErrnoAndHoldsTheTextOfTheLastLockedAttempt)
 {
     EXPECT_EQ(-1, run("no statement"));
     EXPECT_EQ("near \"no\": syntax error", lastSqlError());
-    std::vector<std::string> held;
-    doubles::Exec exec = execOfEnds({{SQLITE_BUSY, "database is locked 1"},
+    Lines found;
+    doubles::Exec exec = execOfEnds({{SQLITE_BUSY, "database is locked 1", ENOENT},
                                      {SQLITE_BUSY, "database is locked 2"},
                                      {SQLITE_BUSY, nullptr, EAGAIN},
                                      {SQLITE_OK}});
     state().exec = [&](sqlite3* pDb, const char* szSql, doubles::RowCallback callback, void* arg,
                        char** errText) {
-        held.push_back(lastSqlError());
+        found.push_back(std::to_string(errno) + " ");
+        found.back() += lastSqlError();
         return exec(pDb, szSql, callback, arg, errText);
     };
+    state().onSleep = [] { errno = EAGAIN; };
+    errno = EAGAIN;
     EXPECT_EQ(0, table_.api.runSqlEx("a text", collect));
-    EXPECT_EQ((Lines{"", "database is locked 1", "database is locked 2", "database is locked 2"}),
-              held);
+    EXPECT_EQ(
+        (Lines{"0 ", "0 database is locked 1", "0 database is locked 2", "0 database is locked 2"}),
+        found);
     EXPECT_EQ("", lastSqlError());
 }
 
@@ -282,19 +255,16 @@ TEST_F(Retry, WaitsForAnotherConnection)
     Database other(file.path());
     Table table(file, R"({"a":{"cpptype":"int"}})", "a");
     other.run("begin exclusive");
+    state().onSleep = [&other] {
+        if (kMaxAttempts + 100 == state().sleeps.size()) other.run("commit");
+    };
     const std::string strSql = "delete from " + table.strName;
     EXPECT_EQ(-1, table.api.runSqlEx(strSql));
     EXPECT_EQ(sleeps(kMaxAttempts), state().sleeps);
     EXPECT_EQ(Lines{runFailedLine("database is locked", strSql, kMaxAttempts)}, takeLog());
-    takeStatements();
-
-    state().sleeps.clear();
-    state().onSleep = [&other] {
-        if (100 == state().sleeps.size()) other.run("commit");
-    };
     EXPECT_EQ(R"({"a":5})", text(table.create(R"({"a":5})")));
-    EXPECT_EQ(sleeps(100), state().sleeps);
-    EXPECT_EQ(101U, takeStatements().size());
+    EXPECT_EQ(sleeps(kMaxAttempts + 100), state().sleeps);
+    EXPECT_EQ(kMaxAttempts + 101, takeStatements().size());
     EXPECT_EQ(kNoLines, takeLog());
     EXPECT_EQ("5", file.value("select a from " + table.strName));
 }
