@@ -8,14 +8,14 @@
 doubles::RowCallback rowCallback(Table& table)
 {
     doubles::RowCallback taken = nullptr;
-    const auto take = [&](sqlite3*, const char*, doubles::RowCallback callback, void*, char**) {
+    doubles::state().exec = [&](sqlite3*, const char*, doubles::RowCallback callback, void*,
+                                char**) {
         taken = callback;
         return SQLITE_ERROR;
     };
-    const doubles::Exec before = std::exchange(doubles::state().exec, take);
     Json::Value jRecord(Json::objectValue);
     EXPECT_EQ(-1, table.api.recSave(jRecord, true));
-    doubles::state().exec = before;
+    doubles::state().exec = nullptr;
     doubles::state().statements.clear();
     takeLog();
     EXPECT_NE(nullptr, taken);

@@ -22,8 +22,7 @@ struct Row {
     int handTo(doubles::RowCallback callback, void* arg);
 };
 
-// A double of sqlite3_exec that hands rows to the callback until it stops, and ends as SQLite
-// would.
+// A double of sqlite3_exec that hands rows to the callback until it stops, as SQLite does.
 doubles::Exec execOfRows(std::vector<Row> rows);
 
 // How a run of sqlite3_exec ends: with no error text for a null one, errno untouched for 0.
@@ -60,8 +59,7 @@ Lines takeLogWithoutTypes();
 // With a table of which a save can end before it runs any SQL: no value list can hold "Unsavable".
 class RunSqlTest : public TableTest {
 protected:
-    // The SQL error text that the handle holds, as such a save logs it; empty for none. Takes the
-    // log.
+    // The handle's SQL error text, as such a save logs it; empty for none. Takes the log.
     std::string lastSqlError();
 
     Table table_{database_,

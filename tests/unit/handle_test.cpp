@@ -34,10 +34,9 @@ protected:
         json(R"({")" + strName_ + R"(":{"member":{"a":{"cpptype":"string"}}}})");
 };
 
-TEST_F(Handle, ReportsEachArgumentThatIsMissingAndIsMadeAllTheSame)
+TEST_F(Handle, ReportsEachMissingArgument)
 {
-    sqlite3* const pNone = nullptr;
-    for (sqlite3* pDb : {database_.get(), pNone})
+    for (sqlite3* pDb : {database_.get(), static_cast<sqlite3*>(nullptr)})
         for (std::string strName : {strName_, std::string()})
             for (Json::Value jDefinition :
                  {json(R"({"other":{}})"), json("null"), json("{}"), json("[]"), jDefinition_})
@@ -67,7 +66,7 @@ TEST_F(Handle, ReportsEachArgumentThatIsMissingAndIsMadeAllTheSame)
     EXPECT_EQ(R"({"a":{"cpptype":"string"}})", text(VORN_JSON_DB::recType(jDefinition_, strName_)));
 }
 
-TEST_F(Handle, WorksThoughItsTableWasThereAlready)
+TEST_F(Handle, WorksIfItsTableExistsAlready)
 {
     VornJsonDbApi first(database_.get(), strName_, jDefinition_, strCreate_);
     VornJsonDbApi second(database_.get(), strName_, jDefinition_, strCreate_);
@@ -78,7 +77,7 @@ TEST_F(Handle, WorksThoughItsTableWasThereAlready)
     expectSaved(second);
 }
 
-TEST_F(Handle, WorksOnceItsTableIsThere)
+TEST_F(Handle, WorksOnceItsTableExists)
 {
     std::string strNonsense = "no statement";
     VornJsonDbApi api(database_.get(), strName_, jDefinition_, strNonsense);

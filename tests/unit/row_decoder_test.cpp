@@ -98,7 +98,7 @@ TEST_F(RowDecoder, RefusesAValueOfAnyOtherType)
     }
 }
 
-TEST_F(RowDecoder, TakesTheLaterOfTwoColumnsOfOneName)
+TEST_F(RowDecoder, TakesTheLaterOfTwoColumnsOfTheSameName)
 {
     EXPECT_EQ(R"([{"i":2}])", rowsOf("select 1 as i, 2 as i"));
     EXPECT_EQ(R"([{"i":1}])", rowsOf("select 1 as i, null as i"));
@@ -141,7 +141,7 @@ TEST_F(RowDecoder, AppendsTheRowsOfEveryAttempt)
     EXPECT_EQ(R"([{"i":1},{"i":1},{"i":1}])", rowsOf("select 1 as i"));
 }
 
-TEST_F(RowDecoder, KeepsAMemberWhoseTextIsNoJson)
+TEST_F(RowDecoder, KeepsAMemberWhoseTextIsNotJson)
 {
     for (const char* szText : {"", "{", "[1,", "nul", "{\"a\" 1}", "x", "\x01"}) {
         rowsOf("select '" + std::string(szText) + "' as j, 1 as i");
@@ -162,7 +162,7 @@ TEST_F(RowDecoder, MakesAMemberNullThatIsNestedTooDeep)
     }
 }
 
-TEST_F(RowDecoder, AppendsToArraysAlone)
+TEST_F(RowDecoder, AppendsToNothingButAnArray)
 {
     const std::string strStopped = runFailedLine("query aborted", "a text");
     state().exec = execOfRows({kRow});

@@ -11,7 +11,6 @@ namespace {
 
 using doubles::state;
 
-const Lines kNoLines;
 constexpr char kUnknown[] = "Unknow Error!!";
 constexpr std::size_t kMaxAttempts = 500;
 
@@ -105,7 +104,7 @@ TEST_F(Execution, GivesTheNumberOfChangedRows)
         EXPECT_EQ(row.iResult, run(in(row.szSql))) << row.szSql;
         EXPECT_EQ(Lines{in(row.szSql)}, takeStatements());
     }
-    EXPECT_EQ(kNoLines, takeLog());
+    EXPECT_EQ(Lines(), takeLog());
 }
 
 TEST_F(Execution, HandsRowsToTheCallbackWithoutCountingChanges)
@@ -165,7 +164,7 @@ TEST_F(Execution, ReportsAnEmptyTextWithoutRunningIt)
         Lines lines = {failed("0 >= strSql.length()"), runFailedLine(kUnknown, "")};
         if (blDebug) lines.push_back(plain("run sql fail, err=(null)"));
         EXPECT_EQ(lines, takeLog());
-        EXPECT_EQ(kNoLines, takeStatements());
+        EXPECT_EQ(Lines(), takeStatements());
         EXPECT_EQ(kUnknown, lastSqlError());
     }
 }
@@ -180,7 +179,7 @@ TEST_F(Execution, ReportsAFailureOnce)
     for (int iErrno : {EINTR, EBUSY, ENOLCK}) expectRun({{SQLITE_ERROR, nullptr, iErrno}}, 0, -1);
 }
 
-TEST_F(Execution, FailsForANegativeCountAloneWhateverTheErrorText)
+TEST_F(Execution, SucceedsUnlessTheCountIsNegative)
 {
     for (int iCount : {2, -1, -7})
         for (const char* szError :
@@ -265,7 +264,7 @@ TEST_F(Retry, WaitsForAnotherConnection)
     EXPECT_EQ(R"({"a":5})", text(table.create(R"({"a":5})")));
     EXPECT_EQ(sleeps(kMaxAttempts + 100), state().sleeps);
     EXPECT_EQ(kMaxAttempts + 101, takeStatements().size());
-    EXPECT_EQ(kNoLines, takeLog());
+    EXPECT_EQ(Lines(), takeLog());
     EXPECT_EQ("5", file.value("select a from " + table.strName));
 }
 
