@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
-// What the tests of execution and decoding share: rows handed to a row callback, and the handle's
-// last SQL error.
+// What the tests of running statements and decoding rows share.
 #pragma once
 
 #include "support/database.h"
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -12,22 +12,82 @@
 // known afterwards.
 doubles::RowCallback rowCallback(Table& table);
 
-// One result row as SQLite would hand it to a row callback; a null text is SQL NULL.
+// One result row as it is handed to a row callback; a null text is SQL NULL, and an empty list is
+// handed as a null pointer.
 struct Row {
     std::vector<const char*> names;
     std::vector<const char*> values;
+    std::optional<int> nColumns = {};  // unless as many as the longer list has
 
     int handTo(doubles::RowCallback callback, void* arg);
 };
 
-// A double of sqlite3_exec that hands one row to the callback, and ends as SQLite would.
-doubles::Exec execOfRow(Row row);
+// A double of sqlite3_exec that hands rows to the callback until it stops, as SQLite does.
+doubles::Exec execOfRows(std::vector<Row> rows);
 
-// A double of sqlite3_exec that ends with that status and error text (null for none).
-doubles::Exec execOfStatus(int iStatus, const char* szError);
+// How a run of sqlite3_exec ends: with no error text for a null one, errno untouched for 0.
+struct End {
+    int iStatus;
+    const char* szError = nullptr;
+    int iErrno = 0;
 
-// The SQL error text that the handle holds, as a save that ends before it runs any SQL logs it;
-// empty for none. Takes the log. The table's definition has to have kUnsavable as a member, beside
-// others in small letters.
-extern const char kUnsavable[];
-std::string lastSqlError(Table& table);
+    int leaveIn(char** errText) const;
+};
+
+// A double of sqlite3_exec whose runs end like these in turn, and like the last one from then on.
+doubles::Exec execOfEnds(std::vector<End> ends);
+inline doubles::Exec execOfStatus(int iStatus, const char* szError)
+{
+    return execOfEnds({{iStatus, szError}});
+}
+
+// A double of sqlite3_exec that runs the text, and calls it locked that many times.
+doubles::Exec execCalledLocked(int nTimes);
+
+// The line of a statement that failed after so many locked attempts.
+std::string runFailedLine(const std::string& strError, const std::string& strSql,
+                          std::size_t nLocked = 0);
+
+// The lines of a column that cannot be decoded, and those of a statement that the last column of a
+// row stops. It is shown, unless it is the first.
+Lines fieldFailed(const std::string& strFirst);
+Lines statementStopped(Lines lines, const Row& row = {});
+
+// The log, with "..." for the types of all tables of the process.
+Lines takeLogWithoutTypes();
+
+// With a table of which a save can end before it runs any SQL: no value list can hold "Unsavable".
+class RunSqlTest : public TableTest {
+protected:
+    // The handle's SQL error text, as such a save logs it; empty for none. Takes the log.
+    std::string lastSqlError();
+
+    Table table_{database_,
+                 R"({"Unsavable":{"cpptype":"Json::Value"},"a":{"cpptype":"int"},
+                     "s":{"cpptype":"string"}})",
+                 "a int, s text"};
+};
+
+// With a table of members of all types, for rows of SQL and rows that are handed to the callback.
+// The log has to be taken.
+class DecoderTest : public TableTest {
+protected:
+    ~DecoderTest() override { EXPECT_EQ(Lines(), takeLog()); }
+
+    int run(const std::string& strSql) { return table_.api.runSqlEx(strSql, callback_, &rows_); }
+
+    // The rows of a statement that succeeds.
+    std::string rowsOf(const std::string& strSql);
+    // What becomes of the rows that are handed to the callback, after the ones before.
+    std::string decoded(std::vector<Row> rows, const char* szBefore = "null");
+    std::string decoded(Table& table, const char* szBefore = "null");
+
+    static const char kMembers[];
+    Table table_{database_, kMembers, "s"};
+    doubles::RowCallback callback_ = rowCallback(table_);
+    // A host may change what recType refers to.
+    Json::Value& jTypes_ = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
+    const Json::Value jTypesBefore_ = jTypes_;
+    Json::Value rows_;
+    int iResult_ = 0;
+};
