@@ -3,10 +3,10 @@
 // hold afterwards.
 #pragma once
 
-#include "allocators.h"
-#include "cases.h"
+#include "faults/memory/allocators.h"
+#include "faults/memory/cases.h"
 
-enum class Ending { kAsUndisturbed, kRefused, kBadAlloc, kRuntimeError, kLogicError, kEndings };
+enum class Ending { kAsUndisturbed, kRefused, kBadAlloc, kRuntimeError, kLogicError, kOther };
 
 // Plain data: a child process sends it to its parent.
 struct Point {
