@@ -7,7 +7,7 @@
 
 std::string recordsSql(const char* szColumns)
 {
-    return std::string("create table records (") + szColumns +
+    return std::string("create table if not exists records (") + szColumns +
            ");with recursive n(i) as (select 1 union all select i+1 from n where i < " +
            std::to_string(kRecords) +
            ") insert into records select i, 'name' || i, printf('%.300c', 'x'), '{\"k\":1}' from n";
