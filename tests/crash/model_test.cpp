@@ -110,21 +110,19 @@ const char* const kTamperings[][2] = {
 // Half of an operation is the first of them.
 TEST_F(CrashCheck, FindsALostChangedOrAdditionalRecord)
 {
-    const std::filesystem::path sound = strPath_ + ".sound";
-    std::filesystem::copy_file(strPath_, sound);
+    const std::string strSound = strPath_ + ".sound";
+    std::filesystem::rename(strPath_, strSound);
     for (const auto& [szSql, szWrong] : kTamperings) {
+        std::filesystem::copy_file(strSound, strPath_,
+                                   std::filesystem::copy_options::overwrite_existing);
         tamper(szSql);
         expectVerdict(Verdict::kNone, szWrong);
         begin(kThree);
-        expectVerdict(Verdict::kAbsent,
-                      std::string(szWrong) +
-                          "; with the operation [1 3 0 20 20 1 3 21 4 4 22]: record 3 is not "
-                          "revision 21");
+        const std::string strThree = "; with the operation [1 3 0 20 20 1 3 21 4 4 22]: ";
+        expectVerdict(Verdict::kAbsent, szWrong + strThree + "record 3 is not revision 21");
         expected_.pending.reset();
-        std::filesystem::rename(sound, strPath_);
-        std::filesystem::copy_file(strPath_, sound);
     }
-    std::filesystem::remove(sound);
+    std::filesystem::remove(strSound);
 }
 
 TEST(CrashReports, OfOtherFormsAreRefused)

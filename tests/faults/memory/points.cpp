@@ -20,7 +20,7 @@ constexpr char kDefinition[] = R"({
         "any": {"cpptype": "Json::Value"}, "big": {"cpptype": "long long"},
         "data": {"cpptype": "Json::objectValue"}, "flag": {"cpptype": "bool"},
         "id": {"cpptype": "int"},
-        "name": {"cpptype": "string", "cppDefaultValue": "somebody without a name of his own"},
+        "name": {"cpptype": "string", "cppDefaultValue": "somebody unnamed"},
         "rate": {"cpptype": "double"},
         "tags": {"cpptype": "Json::arrayValue", "cppDefaultValue": [1, 2]}}},
     "plain": {"member": {
