@@ -74,17 +74,6 @@ protected:
         return iResult;
     }
 
-    // The statement of the only call since the last time, after a look at its attempts and sleeps.
-    std::string statement(std::size_t nAttempts, std::size_t nSleeps)
-    {
-        const std::vector<std::string> statements = takeStatements();
-        EXPECT_EQ(nAttempts, statements.size());
-        const std::string strSql = statements.at(0);
-        EXPECT_EQ(std::vector<std::string>(statements.size(), strSql), statements);
-        EXPECT_EQ(std::vector<unsigned>(nSleeps, 10000), state().sleeps);
-        return strSql;
-    }
-
     // The holder lets go after 20 sleeps, which are 0.2 s.
     void expectWaitedOut(const Operation& operation, const char* szHold, bool blBlocks)
     {
@@ -93,7 +82,7 @@ protected:
             if (20 == state().sleeps.size()) holder.release();
         };
         EXPECT_EQ(operation.iResult, run(operation));
-        statement(blBlocks ? 21 : 1, blBlocks ? 20 : 0);
+        onlyStatement(blBlocks ? 21 : 1, blBlocks ? 20 : 0);
         EXPECT_EQ(Lines(), takeLog());
         state().onSleep = nullptr;
         if (blBlocks) ++Figures::of("locks, waited out");
@@ -103,7 +92,8 @@ protected:
     void expectEveryAttempt(const Operation& operation)
     {
         EXPECT_EQ(-1, run(operation));
-        const Lines log = operation.failure(table_, "database is locked", statement(500, 500), 500);
+        const Lines log =
+            operation.failure(table_, "database is locked", onlyStatement(500, 500), 500);
         EXPECT_EQ(log, takeLog());
         EXPECT_EQ("", table_.api.getErrMsg());
         EXPECT_EQ(nullptr, sqlite3_next_stmt(database_.get(), nullptr));
@@ -163,7 +153,7 @@ TEST_P(EveryHeldLock, EndsTheCallAfterFiveHundredAttempts)
     if (isBlocked()) return expectGivenUp(tested(), situation().szSql);
     const Holder holder(database_.path(), situation().szSql);
     EXPECT_EQ(tested().iResult, run(tested()));
-    statement(1, 0);
+    onlyStatement(1, 0);
 }
 
 INSTANTIATE_TEST_SUITE_P(Locks, EveryHeldLock,
@@ -173,13 +163,6 @@ INSTANTIATE_TEST_SUITE_P(Locks, EveryHeldLock,
                              return testName({std::get<Situation>(row.param).szName,
                                               std::get<Operation>(row.param).szName});
                          });
-
-// The two runs that sleep in earnest.
-TEST_F(HeldLock, OfAFifthOfASecondIsWaitedOutInEarnest)
-{
-    state().blReallySleep = true;
-    expectWaitedOut(operation("recCreate"), "begin exclusive", true);
-}
 
 TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
 {

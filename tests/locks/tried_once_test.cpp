@@ -8,8 +8,6 @@
 
 namespace {
 
-using doubles::state;
-
 // A connection to a file with the twelve records, opened with a parameter of a URI, and a second
 // one of the same kind.
 class OnceTest : public HostTest {
@@ -20,14 +18,10 @@ protected:
     }
     ~OnceTest() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
 
-    // The statement was tried once, and nobody waited.
-    std::string onlyStatement()
+    static std::string statementTriedOnce()
     {
-        const std::vector<std::string> statements = takeStatements();
-        EXPECT_EQ(1U, statements.size());
-        EXPECT_TRUE(state().sleeps.empty());
         ++Figures::of("locks, errors tried once");
-        return statements.at(0);
+        return onlyStatement(1, 0);
     }
 
     // The operation fails with that error at its first attempt.
@@ -38,7 +32,7 @@ protected:
         table_.api.setErrMsg("");
         Json::Value jOutput;
         EXPECT_EQ(-1, operation.run(database_, table_, jOutput));
-        const std::string strSql = onlyStatement();
+        const std::string strSql = statementTriedOnce();
         EXPECT_EQ(operation.failure(table_, strError, strSql), takeLog());
         const bool blDuplicate = 0 == strError.find("UNIQUE") &&
                                  (operation.is("recCreate") || operation.is("recUpdateByFilter"));
@@ -166,7 +160,7 @@ TEST_F(OnceTest, StatementOfTheHost)
         {"drop table records", "database table is locked"}};
     for (const auto& [szSql, szError] : kStatements) {
         EXPECT_EQ(-1, table_.api.runSqlEx(szSql));
-        EXPECT_EQ(szSql, onlyStatement());
+        EXPECT_EQ(szSql, statementTriedOnce());
         EXPECT_EQ(Lines{runFailed(szError, szSql)}, takeLog());
     }
     sqlite3_finalize(pReader);
@@ -187,7 +181,8 @@ TEST_F(OnceTest, Interrupt)
         Json::Value jOutput;
         EXPECT_EQ(-1, operation(szName).run(database_, table_, jOutput));
         sqlite3_progress_handler(database_.get(), 0, nullptr, nullptr);
-        EXPECT_EQ(operation(szName).failure(table_, "interrupted", onlyStatement()), takeLog());
+        EXPECT_EQ(operation(szName).failure(table_, "interrupted", statementTriedOnce()),
+                  takeLog());
         EXPECT_GT(static_cast<unsigned>(kRecords), jOutput.size());
         EXPECT_EQ(before, database_.rows("select * from records"));
     }
@@ -202,11 +197,8 @@ TEST_F(OnceTest, ExceptATriggerThatSpeaksOfALock)
                   strError + "'); end");
     Json::Value jOutput;
     EXPECT_EQ(-1, operation("recDeleteAll").run(database_, table_, jOutput));
-    const std::vector<std::string> statements = takeStatements();
-    EXPECT_EQ(500U, statements.size());
-    EXPECT_EQ(std::vector<unsigned>(500, 10000), state().sleeps);
-    EXPECT_EQ(operation("recDeleteAll").failure(table_, strError, statements.at(0), 500),
-              takeLog());
+    const std::string strSql = onlyStatement(500, 500);
+    EXPECT_EQ(operation("recDeleteAll").failure(table_, strError, strSql, 500), takeLog());
 }
 
 }  // namespace

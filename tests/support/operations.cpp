@@ -4,6 +4,7 @@
 #include "support/records.h"
 
 #include <stdexcept>
+#include <utility>
 
 std::string recordsSql(const char* szColumns)
 {
@@ -92,6 +93,16 @@ Lines Operation::failure(const Table& table, const std::string& strError, const 
         add({failed("0 > (err = recDeleteByArray(strVector, szKey))"),
              plain("recDeleteByName failed, name=name, strValue=" + strText)});
     return lines;
+}
+
+std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps)
+{
+    const std::vector<std::string> statements = std::exchange(doubles::state().statements, {});
+    const std::string strSql = statements.empty() ? "" : statements[0];
+    EXPECT_EQ(std::vector<std::string>(nAttempts, strSql), statements);
+    EXPECT_EQ(std::vector<unsigned>(nSleeps, 10000), doubles::state().sleeps);
+    doubles::state().sleeps.clear();
+    return strSql;
 }
 
 std::string testName(const std::vector<std::string>& parts)

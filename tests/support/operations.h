@@ -45,6 +45,10 @@ struct Operation {
     }
 };
 
+// The statement of the only call since the last time. It was tried so often, with 10 ms after each
+// attempt that found a lock.
+std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps);
+
 // A name for gtest of such parts: "recSave inserts" and "wal" are recSave_inserts_wal.
 std::string testName(const std::vector<std::string>& parts);
 

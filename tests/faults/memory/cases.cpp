@@ -76,6 +76,12 @@ const std::vector<Case> kCases = {
     {"recCreate is refused by a key, with no default lacking",
      R"({"first": {"id": 4, "name": "Ann", "tags": []}})",
      R"({"result": -1, "message": "DUPLICATE_PRIMARY_KEY"})"},
+    {"recCreate of quotes",
+     R"({"first": {"id": 4, "data": {"it's": "O'Brien's long text"}, "name": "O'Brien's long name",
+         "tags": ["'"]}})",
+     R"({"second": {"data": {"it's": "O'Brien's long text"}, "flag": true, "id": 4,
+         "name": "O'Brien's long name", "tags": ["'"]}, "rows":
+         "1 Ann 1 {k:[x]} [1,true],2 Bob 0,3 O'Brien 1,4 O'Brien's long name 1 {it's:O'Brien's long text} [']"})"},
     {"recCreate of nothing", R"({"first": {}})"},
     {"recCreate of a wrong type", R"({"first": {"id": 4, "name": ["a long enough text"]}})",
      kFailure, true},
