@@ -4,6 +4,7 @@
 
 #include "faults/memory/points.h"
 #include "faults/memory/store.h"
+#include "support/figures.h"
 
 #include <gtest/gtest.h>
 
@@ -43,16 +44,15 @@ const Trial kTrials[] = {
     {"every_from_then_on", {Kind::kEvery, 0, true}, "every allocator, from then on", false},
 };
 
+// By Ending.
+constexpr const char* kEndings[] = {"absorbed",           "result -1",        "std::bad_alloc",
+                                    "Json::RuntimeError", "std::logic_error", "another exception"};
+
 class MemoryFaults : public testing::TestWithParam<Trial> {
 protected:
-    ~MemoryFaults() override
+    static long long& figure(const std::string& strWhat)
     {
-        print("points failed", nPoints_);
-        print("findings", nFindings_);
-        const char* const kEndings[] = {"absorbed", "result -1", "std::bad_alloc",
-                                        "Json::RuntimeError", "std::logic_error"};
-        for (int i = 0; i < static_cast<int>(Ending::kOther); ++i) print(kEndings[i], ended_[i]);
-        fflush(stdout);
+        return Figures::of(std::string("memory faults, ") + GetParam().szFigure + ", " + strWhat);
     }
 
     static Point pointOf(const Case& row, const Fault& fault)
@@ -84,12 +84,10 @@ protected:
                            " blocks of new, " +
                            std::to_string(point.kept.nMalloc - allowed.nMalloc) + " of malloc");
             if (!point.blFailed) return;
-            ++nPoints_;
-            ++ended_[static_cast<int>(point.ending)];
+            ++figure("points failed");
+            ++figure(kEndings[static_cast<int>(point.ending)]);
         }
     }
-
-    int nPoints_ = 0;
 
 private:
     // A process of its own, which sends what it finds.
@@ -120,18 +118,9 @@ private:
     void report(const Case& row, const Fault& fault, const std::string& strProblem)
     {
         if (strProblem.empty()) return;
-        ++nFindings_;
+        ++figure("findings");
         ADD_FAILURE() << row.szName << ", allocation " << fault.iNth << ": " << strProblem;
     }
-
-    static void print(const char* szWhat, int iNumber)
-    {
-        if (IsSkipped()) return;
-        printf("figure: memory faults, %s, %s = %d\n", GetParam().szFigure, szWhat, iNumber);
-    }
-
-    int nFindings_ = 0;
-    int ended_[static_cast<int>(Ending::kOther) + 1] = {};
 };
 
 TEST_P(MemoryFaults, OfEveryAllocation)
@@ -141,10 +130,12 @@ TEST_P(MemoryFaults, OfEveryAllocation)
     // glibc falls silently back to UTC when it has no memory to read the zone.
     tzset();
     const Store theFileIsMadeOnce;
+    figure("findings") = 0;
+    for (const char* szEnding : kEndings) figure(szEnding) = 0;
     for (const Case& row : kCases)
         if (!GetParam().blFirstUse || row.blFirstUse || nullptr != getenv("VORN_SOAK"))
             failEach(row);
-    EXPECT_LT(0, nPoints_);
+    EXPECT_LT(0, figure("points failed"));
 }
 
 INSTANTIATE_TEST_SUITE_P(Host, MemoryFaults, testing::ValuesIn(kTrials),
