@@ -2,9 +2,10 @@
 // Errors that waiting does not cure are tried once.
 
 #include "support/figures.h"
-#include "support/matrix.h"
 #include "support/operations.h"
 #include "support/records.h"
+
+#include <sstream>
 
 namespace {
 
@@ -107,7 +108,8 @@ TEST_P(TriedOnce, ByEveryOperation)
 {
     const Error& error = GetParam();
     std::vector<Operation> chosen;
-    for (const std::string& strName : split(error.szOperations, ','))
+    std::istringstream names(error.szOperations);
+    for (std::string strName; std::getline(names, strName, ',');)
         chosen.push_back(operation(strName));
     if (chosen.empty())
         for (const Operation& candidate : operations()) {
