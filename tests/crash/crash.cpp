@@ -7,8 +7,8 @@
 // VORN_CRASH_SEED repeats what the writers do and the moments at which they are killed, as far as a
 // machine can; the seed of a run is printed.
 
-#include "crash/expected.h"
-#include "crash/victim.h"
+#include "crash/model.h"
+#include "support/child.h"
 
 #include <unistd.h>
 #include <chrono>
@@ -54,13 +54,6 @@ void save(const Figures& figures, const fs::path& file)
     for (const auto& [strName, iValue] : figures) out << strName << '=' << iValue << '\n';
     out.close();
     fs::rename(part, file);
-}
-
-unsigned seed()
-{
-    const char* szSeed = std::getenv("VORN_CRASH_SEED");
-    if (nullptr != szSeed) return static_cast<unsigned>(std::strtoul(szSeed, nullptr, 10));
-    return std::random_device()();
 }
 
 using Clock = std::chrono::steady_clock;
@@ -117,21 +110,22 @@ private:
     // begins.
     bool killWriter(const std::string& strMode, std::mt19937& random)
     {
-        Victim writer({VORN_CRASH_WRITER, database(), strMode, std::to_string(random()),
-                       std::to_string(expected_.iLastRevision)});
+        Child writer({VORN_CRASH_WRITER, database(), strMode, std::to_string(random()),
+                      std::to_string(expected_.iLastRevision)},
+                     kReport);
         const long long iBefore = expected_.iAcknowledged;
         const long long iUntil = iBefore + static_cast<int>(random() % (kMostAcknowledged + 1));
         bool blGood = true;
         const bool blWithin = 0 != random() % 4;
-        std::string strLine;
         const auto begin = Clock::now();
         do {
-            blGood = writer.line(strLine) && expected_.take(strLine);
+            blGood = expected_.take(writer.line());
         } while (blGood && (expected_.iAcknowledged < iUntil || (blWithin && !expected_.pending)));
         if (iBefore < iUntil) operation_ = (Clock::now() - begin) / (iUntil - iBefore);
         passSomeTime(operation_, random);
         blGood = writer.kill() && blGood;
-        while (blGood && writer.line(strLine)) blGood = expected_.take(strLine);
+        for (std::string strLine; blGood && !(strLine = writer.line()).empty();)
+            blGood = expected_.take(strLine);
         figures_["acknowledged operations"] += expected_.iAcknowledged - iBefore;
         ++figures_["kills"];
         return blGood;
@@ -140,9 +134,8 @@ private:
     // While it recovers what the killed one left, or not yet, or no more.
     bool killOpening(const std::string& strMode, std::mt19937& random)
     {
-        Victim opener({VORN_CRASH_WRITER, database(), strMode});
-        std::string strLine;
-        const bool blGood = opener.line(strLine);
+        Child opener({VORN_CRASH_WRITER, database(), strMode}, kReport);
+        const bool blGood = !opener.line().empty();
         passSomeTime(operation_, random);
         ++figures_["kills while the next one opens"];
         return opener.kill() && blGood;
@@ -163,14 +156,12 @@ private:
         for (const std::string& strFault : {verdict.strWrong, verdict.strCorrupt})
             if (!strFault.empty())
                 std::cout << "kill " << figures_["kills"] << ": " << strFault << '\n';
-        switch (verdict.pending) {
-        case Verdict::kNone: ++figures_["killed between operations"]; break;
-        case Verdict::kAbsent: ++figures_["killed in an operation, absent"]; break;
-        case Verdict::kWhole:
-            ++figures_["killed in an operation, whole"];
+        const char* const kEndings[] = {"killed between operations",
+                                        "killed in an operation, absent",
+                                        "killed in an operation, whole"};
+        ++figures_[kEndings[verdict.pending]];
+        if (Verdict::kWhole == verdict.pending)
             expected_.state = after(expected_.state, *expected_.pending);
-            break;
-        }
         expected_.pending.reset();
         return verdict.strWrong.empty() && verdict.strCorrupt.empty();
     }
@@ -180,13 +171,6 @@ private:
     Expected expected_;
     Span operation_{1000};
 };
-
-fs::path temporaryFolder()
-{
-    std::string strFolder = "crash-XXXXXX";
-    if (nullptr == mkdtemp(strFolder.data())) std::abort();
-    return strFolder;
-}
 
 // The numbers of faults come last; a fault of an earlier part of the run counts too.
 bool show(Figures& figures)
@@ -206,10 +190,14 @@ int main(int argc, char** argv)
         return 2;
     }
     const bool blKept = 2 < argc;
-    const fs::path folder = blKept ? fs::path(argv[2]) : temporaryFolder();
+    std::string strFolder = blKept ? argv[2] : "crash-XXXXXX";
+    if (!blKept && nullptr == mkdtemp(strFolder.data())) std::abort();
+    const fs::path folder = strFolder;
     fs::create_directories(folder);
     Figures figures = load(folder / "progress");
-    figures.emplace("seed", seed());
+    const char* szSeed = std::getenv("VORN_CRASH_SEED");
+    figures.emplace("seed",
+                    nullptr == szSeed ? std::random_device()() : std::strtoul(szSeed, nullptr, 10));
     const auto uSeed = static_cast<unsigned>(figures["seed"]);
     std::cout << "VORN_CRASH_SEED=" << uSeed << ", from kill " << figures["kills"] << std::endl;
 

@@ -5,34 +5,18 @@
 //     crash_writer DATABASE JOURNAL_MODE SEED LAST_REVISION    writes
 //     crash_writer DATABASE JOURNAL_MODE                       opens the database and lists it
 
-#include "crash/expected.h"
+#include "crash/model.h"
 
 #include <unistd.h>
 #include <cstdlib>
 
 namespace {
 
-void report(std::string strLine)
+void report(const std::string& strText)
 {
-    strLine += '\n';
+    const std::string strLine = strText + '\n';
     if (static_cast<ssize_t>(strLine.size()) != write(kReport, strLine.data(), strLine.size()))
         std::exit(4);
-}
-
-bool prepare(Store& store, const std::string& strMode)
-{
-    // Little room, so that pages reach the database and its log before a transaction ends.
-    return strMode == store.value("pragma journal_mode=" + strMode) &&
-           store.run("pragma cache_size=8; pragma wal_autocheckpoint=20");
-}
-
-bool load(Store& store, State& state)
-{
-    Json::Value jRecords;
-    if (!store.list(jRecords)) return false;
-    for (const Json::Value& jRecord : jRecords)
-        state[jRecord["id"].asInt()] = jRecord["rev"].asInt();
-    return true;
 }
 
 }  // namespace
@@ -42,8 +26,16 @@ int main(int argc, char** argv)
     if (3 != argc && 5 != argc) return 1;
     report("open");
     Store store(argv[1]);
+    // Little room, so that pages reach the database and its log before a transaction ends.
+    const std::string strMode = argv[2];
+    const std::string strSql =
+        "pragma journal_mode=" + strMode + "; pragma cache_size=8; pragma wal_autocheckpoint=20";
+    if (strMode + "20" != sqlite::value(store.connection(), strSql)) return 2;
     State state;
-    if (!prepare(store, argv[2]) || !load(store, state)) return 2;
+    Json::Value jRecords;
+    if (!store.list(jRecords)) return 2;
+    for (const Json::Value& jRecord : jRecords)
+        state[jRecord["id"].asInt()] = jRecord["rev"].asInt();
     report("ready");
     if (3 == argc)
         for (;;) pause();

@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: MIT
-// A second process holds a lock, for a while and for ever.
+// A second process holds a lock, for a while or longer than a call tries.
 
-#include "locks/calls.h"
-#include "locks/holder.h"
+#include "support/child.h"
 #include "support/figures.h"
+#include "support/operations.h"
 
+#include <unistd.h>
 #include <chrono>
 #include <cstdlib>
 #include <tuple>
@@ -17,7 +18,7 @@ using doubles::state;
 struct Situation {
     const char* szName;
     const char* szJournal;
-    std::string strSql;
+    const char* szSql;
     bool blBlocksReaders;
     bool blBlocksWriters;
 
@@ -27,7 +28,7 @@ struct Situation {
     }
 };
 
-const std::vector<Situation> kSituations = {
+const Situation kSituations[] = {
     {"exclusive", "delete", "begin exclusive", true, true},
     {"writer", "delete", "begin immediate", false, true},
     {"reader", "delete", "begin; select * from sqlite_master", false, true},
@@ -35,70 +36,98 @@ const std::vector<Situation> kSituations = {
     {"wal_reader", "wal", "begin; select * from sqlite_master", false, false},
 };
 
+// The other process, which has run the text and commits when it is told to, or at its end.
+class Holder {
+public:
+    Holder(const std::string& strFile, const std::string& strSql)
+        : child_({VORN_LOCK_HOLDER, strFile, strSql}, STDOUT_FILENO)
+    {
+        EXPECT_EQ("held", child_.line());
+    }
+    ~Holder() { EXPECT_EQ(0, child_.finish()) << "the holder failed"; }
+
+    void release()
+    {
+        EXPECT_TRUE(child_.write("x"));
+        EXPECT_EQ("released", child_.line());
+    }
+
+private:
+    Child child_;
+};
+
 class HeldLock : public HostTest {
 protected:
     explicit HeldLock(const char* szJournal = "delete")
     {
         database_.run(std::string("pragma journal_mode=") + szJournal);
-        addRecords(database_, table_.strName);
+        database_.run(recordsSql(kWithKeys));
     }
 
     ~HeldLock() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
 
-    // The statement of the only call since the last time, after a look at its attempts and sleeps.
-    std::string statement(std::size_t nAttempts, std::size_t nSleeps)
+    int run(const Operation& operation)
     {
-        const std::vector<std::string> statements = takeStatements();
-        EXPECT_EQ(nAttempts, statements.size());
-        const std::string strSql = statements.at(0);
-        EXPECT_EQ(std::vector<std::string>(statements.size(), strSql), statements);
-        EXPECT_EQ(std::vector<unsigned>(nSleeps, 10000), state().sleeps);
-        return strSql;
+        Json::Value jOutput;
+        const int iResult = operation.run(database_, table_, jOutput);
+        EXPECT_TRUE(-1 != iResult || operation.untouched() == jOutput) << text(jOutput);
+        return iResult;
     }
 
     // The holder lets go after 20 sleeps, which are 0.2 s.
-    void expectWaitedOut(const Call& call, const std::string& strHold, bool blBlocks)
+    void expectWaitedOut(const Operation& operation, const char* szHold, bool blBlocks)
     {
-        Holder holder(database_.path(), strHold);
+        Holder holder(database_.path(), szHold);
         state().onSleep = [&holder] {
             if (20 == state().sleeps.size()) holder.release();
         };
-        EXPECT_EQ(call.iResult, call.run(table_));
-        statement(blBlocks ? 21 : 1, blBlocks ? 20 : 0);
+        EXPECT_EQ(operation.iResult, run(operation));
+        onlyStatement(blBlocks ? 21 : 1, blBlocks ? 20 : 0);
         EXPECT_EQ(Lines(), takeLog());
         state().onSleep = nullptr;
         if (blBlocks) ++Figures::of("locks, waited out");
     }
 
-    void expectGivenUp(const Call& call, const std::string& strHold)
+    // While somebody holds a lock.
+    void expectEveryAttempt(const Operation& operation)
     {
-        const std::string strBefore = contents();
+        EXPECT_EQ(-1, run(operation));
+        const Lines log =
+            operation.failure(table_, "database is locked", onlyStatement(500, 500), 500);
+        EXPECT_EQ(log, takeLog());
+        EXPECT_EQ("", table_.api.getErrMsg());
+        EXPECT_EQ(nullptr, sqlite3_next_stmt(database_.get(), nullptr));
+    }
+
+    void expectGivenUp(const Operation& operation, const char* szHold)
+    {
+        const Rows before = database_.rows("select * from records");
         {
-            const Holder holder(database_.path(), strHold);
-            EXPECT_EQ(-1, call.run(table_));
-            const std::string strSql = statement(500, 500);
-            EXPECT_EQ(failure(call, table_, "database is locked", strSql, 500), takeLog());
-            EXPECT_EQ("", table_.api.getErrMsg());
-            EXPECT_EQ(nullptr, sqlite3_next_stmt(database_.get(), nullptr));
+            const Holder holder(database_.path(), szHold);
+            expectEveryAttempt(operation);
         }
-        EXPECT_EQ(strBefore, contents());
-        EXPECT_EQ(call.iResult, call.run(table_));
+        EXPECT_EQ(before, database_.rows("select * from records"));
+        EXPECT_EQ(operation.iResult, run(operation));
         takeStatements();
         EXPECT_EQ(Lines(), takeLog());
         ++Figures::of("locks, given up after 500 attempts");
     }
 
-    std::string contents()
-    {
-        return database_.value("select group_concat(id||name||note) from " + table_.strName);
-    }
-
     Database database_{Database::Place::kFile};
-    Table table_{database_, kMembers, kColumns};
+    Table table_{database_, "records", kMembers, kWithKeys};
 };
 
+// The operations that succeed while no lock is held.
+std::vector<Operation> undisturbed()
+{
+    std::vector<Operation> all;
+    for (const Operation& operation : operations())
+        if (-1 != operation.iResult) all.push_back(operation);
+    return all;
+}
+
 class EveryHeldLock : public HeldLock,
-                      public testing::WithParamInterface<std::tuple<Situation, Call>> {
+                      public testing::WithParamInterface<std::tuple<Situation, Operation>> {
 protected:
     // The long run sleeps in earnest.
     EveryHeldLock() : HeldLock(situation().szJournal)
@@ -107,47 +136,40 @@ protected:
     }
 
     static const Situation& situation() { return std::get<Situation>(GetParam()); }
-    static const Call& call() { return std::get<Call>(GetParam()); }
+    static const Operation& tested() { return std::get<Operation>(GetParam()); }
     static bool isBlocked()
     {
-        return call().blWrites ? situation().blBlocksWriters : situation().blBlocksReaders;
+        return tested().blWrites ? situation().blBlocksWriters : situation().blBlocksReaders;
     }
 };
 
 TEST_P(EveryHeldLock, IsWaitedOut)
 {
-    expectWaitedOut(call(), situation().strSql, isBlocked());
+    expectWaitedOut(tested(), situation().szSql, isBlocked());
 }
 
 TEST_P(EveryHeldLock, EndsTheCallAfterFiveHundredAttempts)
 {
-    if (isBlocked()) return expectGivenUp(call(), situation().strSql);
-    const Holder holder(database_.path(), situation().strSql);
-    EXPECT_EQ(call().iResult, call().run(table_));
-    statement(1, 0);
+    if (isBlocked()) return expectGivenUp(tested(), situation().szSql);
+    const Holder holder(database_.path(), situation().szSql);
+    EXPECT_EQ(tested().iResult, run(tested()));
+    onlyStatement(1, 0);
 }
 
 INSTANTIATE_TEST_SUITE_P(Locks, EveryHeldLock,
                          testing::Combine(testing::ValuesIn(kSituations),
-                                          testing::ValuesIn(calls())),
-                         [](const auto& tested) {
-                             return std::string(std::get<Situation>(tested.param).szName) + "_" +
-                                    std::get<Call>(tested.param).szName;
+                                          testing::ValuesIn(undisturbed())),
+                         [](const auto& row) {
+                             return testName({std::get<Situation>(row.param).szName,
+                                              std::get<Operation>(row.param).szName});
                          });
-
-// The two runs that sleep in earnest.
-TEST_F(HeldLock, OfAFifthOfASecondIsWaitedOutInEarnest)
-{
-    state().blReallySleep = true;
-    expectWaitedOut(call("recCreate"), "begin exclusive", true);
-}
 
 TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
 {
     using namespace std::chrono;
     state().blReallySleep = true;
     const auto start = steady_clock::now();
-    expectGivenUp(call("recCreate"), "begin exclusive");
+    expectGivenUp(operation("recCreate"), "begin exclusive");
     const auto elapsed = duration_cast<milliseconds>(steady_clock::now() - start);
     EXPECT_LE(5000, elapsed.count());
     Figures::of("locks, milliseconds before giving up in earnest") = elapsed.count();
@@ -157,17 +179,13 @@ TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
 TEST_F(HeldLock, OfAnOlderSnapshotIsGivenUp)
 {
     database_.run("pragma journal_mode=wal");
-    database_.run("begin; select * from " + table_.strName);
-    {
-        Holder other(database_.path(),
-                     "begin immediate; insert into " + table_.strName + " values (4,'Dan','d')");
-    }
-    EXPECT_EQ(-1, call("recCreate").run(table_));
-    const std::string strSql = statement(500, 500);
-    EXPECT_EQ(failure(call("recCreate"), table_, "database is locked", strSql, 500), takeLog());
+    database_.run("begin; select * from records");
+    const std::string strInsert = "insert into records values (40,'Dan','d','{}')";
+    Holder(database_.path(), "begin immediate; " + strInsert).release();
+    expectEveryAttempt(operation("recCreate"));
     database_.run("rollback");
-    EXPECT_EQ(0, call("recCreate").run(table_));
-    EXPECT_EQ("5", database_.value("select count(*) from " + table_.strName));
+    EXPECT_EQ(0, run(operation("recCreate")));
+    EXPECT_EQ("14", database_.value("select count(*) from records"));
 }
 
 }  // namespace

@@ -6,6 +6,7 @@
 
 #include <unistd.h>
 #include <cstdio>
+#include <string_view>
 
 namespace {
 
@@ -16,18 +17,18 @@ bool run(sqlite3* pDb, const char* szSql)
     return false;
 }
 
-bool say(char c)
+bool say(std::string_view text)
 {
-    return 1 == write(STDOUT_FILENO, &c, 1);
+    return static_cast<ssize_t>(text.size()) == write(STDOUT_FILENO, text.data(), text.size());
 }
 
 bool hold(sqlite3* pDb, const char* szSql)
 {
-    if (!run(pDb, szSql) || !say('h')) return false;
+    if (!run(pDb, szSql) || !say("held\n")) return false;
     char c;
     while (0 > read(STDIN_FILENO, &c, 1)) {
     }
-    return run(pDb, "commit") && say('r');
+    return run(pDb, "commit") && say("released\n");
 }
 
 }  // namespace

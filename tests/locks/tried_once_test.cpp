@@ -1,253 +1,206 @@
 // SPDX-License-Identifier: MIT
 // Errors that waiting does not cure are tried once.
 
-#include "locks/calls.h"
 #include "support/figures.h"
+#include "support/operations.h"
 #include "support/records.h"
+
+#include <sstream>
 
 namespace {
 
-using doubles::state;
-
+// A connection to a file with the twelve records, opened with a parameter of a URI, and a second
+// one of the same kind.
 class OnceTest : public HostTest {
 protected:
+    explicit OnceTest(const char* szParameter = "")
+        : strUri_("file:" + (owner_.run(recordsSql(kWithKeys)), owner_.path()) + "?" + szParameter)
+    {
+    }
     ~OnceTest() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
 
-    // The statement was tried once, and nobody waited.
-    std::string onlyStatement()
+    static std::string statementTriedOnce()
     {
-        const std::vector<std::string> statements = takeStatements();
-        EXPECT_EQ(1U, statements.size());
-        EXPECT_TRUE(state().sleeps.empty());
         ++Figures::of("locks, errors tried once");
-        return statements.at(0);
+        return onlyStatement(1, 0);
     }
 
-    // The call fails with that error at its first attempt.
-    void expectOnce(const Call& call, Table& table, const std::string& strError)
+    // The operation fails with that error at its first attempt.
+    void expectOnce(const Operation& operation, const std::string& strError)
     {
-        SCOPED_TRACE(call.szName);
+        SCOPED_TRACE(operation.szName);
         takeStatements();
-        EXPECT_EQ(-1, call.run(table));
-        const std::string strSql = onlyStatement();
-        EXPECT_EQ(failure(call, table, strError, strSql, 0), takeLog());
+        table_.api.setErrMsg("");
+        Json::Value jOutput;
+        EXPECT_EQ(-1, operation.run(database_, table_, jOutput));
+        const std::string strSql = statementTriedOnce();
+        EXPECT_EQ(operation.failure(table_, strError, strSql), takeLog());
+        const bool blDuplicate = 0 == strError.find("UNIQUE") &&
+                                 (operation.is("recCreate") || operation.is("recUpdateByFilter"));
+        EXPECT_EQ(blDuplicate ? "DUPLICATE_PRIMARY_KEY" : "", table_.api.getErrMsg());
     }
 
-    void expectOnce(const std::string& strText, Table& table, const std::string& strError)
+    void expectWorking(const Operation& operation)
     {
-        takeStatements();
-        EXPECT_EQ(-1, table.api.runSqlEx(strText));
-        EXPECT_EQ(strText, onlyStatement());
-        EXPECT_EQ(
-            Lines{plain("i=0,errno=?, run sql failed, error=" + strError + ", sql=" + strText)},
-            takeLog());
-    }
-
-    static void expectWorking(const Call& call, Table& table)
-    {
-        EXPECT_EQ(call.iResult, call.run(table)) << call.szName;
+        Json::Value jOutput;
+        EXPECT_EQ(operation.iResult, operation.run(database_, table_, jOutput)) << operation.szName;
         EXPECT_EQ(Lines(), takeLog());
     }
+
+    Database owner_{Database::Place::kFile};
+    const std::string strUri_;
+    Database database_{strUri_};
+    Database other_{strUri_};
+    Table table_{database_, "records", kMembers, kWithKeys};
 };
 
-class TriedOnce : public OnceTest {
+// What brings an error about and cures it.
+struct Error {
+    const char* szName;
+    const char* szParameter;
+    const char* szError;
+    const char* szErrorOfReading;  // "" where reading works
+    // Empty for all operations that would succeed.
+    const char* szOperations;
+    // Of the host itself, before and afterwards.
+    const char* szSql;
+    const char* szCure;
+    // Of the second connection, which is rolled back at the end.
+    const char* szOther = "";
+    bool blMakesTable = false;  // also for those that run the CREATE statement
+};
+
+constexpr char kNoTable[] = "no such table: records";
+constexpr char kSchema[] = "database schema is locked: main";
+
+const Error kErrors[] = {
+    {"NotUnique", "", "UNIQUE constraint failed: records.id", "",
+     "recCreate,recSave inserts,recUpdateByFilter",
+     "insert into records values (50,'Eve','e',''), (90,'Fay','f','')",
+     "delete from records where id in (50, 90)"},
+    {"RefusedByATrigger", "", "no", "",
+     "recDelete,recDeleteByName,recUpdateByWhere,recUpdateByFilter",
+     "create trigger deleted before delete on records begin select raise(abort, 'no'); end;"
+     "create trigger updated before update on records begin select raise(abort, 'no'); end",
+     "drop trigger deleted; drop trigger updated"},
+    {"MissingTable", "", kNoTable, kNoTable, "", "alter table records rename to away",
+     "alter table away rename to records"},
+    {"FullDatabase", "", "database or disk is full", "",
+     "recCreate,recSave inserts,recSave replaces",
+     "create trigger fill after insert on records begin"
+     " update records set note = printf('%.99999c', 'x') where id = 1; end;"
+     "pragma max_page_count = 1",
+     "pragma max_page_count = 1000"},
+    {"ReadOnlyFile", "mode=ro", "attempt to write a readonly database", "", "", "", "", "", true},
+    {"LockedTableOfASharedCache", "cache=shared", "database table is locked",
+     "database table is locked: records", "", "", "",
+     "begin immediate; update records set note = 'x'"},
+    {"LockedSchemaOfASharedCache", "cache=shared", kSchema, kSchema, "", "", "",
+     "begin immediate; create table another (a)", true},
+};
+
+class TriedOnce : public OnceTest, public testing::WithParamInterface<Error> {
 protected:
-    TriedOnce() { addRecords(database_, strTable_); }
-
-    void run(const std::string& strSql) { database_.run(strSql); }
-
-    Database database_{Database::Place::kFile};
-    Table table_{database_, kMembers, kColumns};
-    const std::string strTable_ = table_.strName;
+    TriedOnce() : OnceTest(GetParam().szParameter) {}
 };
 
-TEST_F(TriedOnce, UniqueViolation)
+TEST_P(TriedOnce, ByEveryOperation)
 {
-    run("insert into " + strTable_ + " values (9,'Eve','e')");
-    expectOnce(call("recCreate"), table_, "UNIQUE constraint failed: " + strTable_ + ".id");
-    EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table_.api.getErrMsg());
-    run("update " + strTable_ + " set id = 10, name = 'Zoe' where id = 9");
-    for (const char* szCall : {"recUpdateByWhere", "recUpdateByFilter"})
-        expectOnce(call(szCall), table_, "UNIQUE constraint failed: " + strTable_ + ".name");
-    run("delete from " + strTable_ + " where id = 10");
-    expectWorking(call("recCreate"), table_);
-}
-
-TEST_F(TriedOnce, ViolationOfAnotherConstraint)
-{
-    const std::string strText = "insert into " + strTable_ + " (id) values (5)";
-    expectOnce(strText, table_, "NOT NULL constraint failed: " + strTable_ + ".note");
-    run("create trigger refuse before delete on " + strTable_ +
-        " begin select raise(abort, 'not this one'); end");
-    expectOnce(call("recDeleteByName"), table_, "not this one");
-    run("drop trigger refuse");
-    expectWorking(call("recDeleteAll"), table_);
-}
-
-TEST_F(TriedOnce, SyntaxError)
-{
-    expectOnce("delete from " + strTable_ + " where", table_, "incomplete input");
-    expectOnce("nonsense", table_, "near \"nonsense\": syntax error");
-    Json::Value jRequest;
-    jRequest["vornSqlWhereFilter"] = "id = = 1";
-    EXPECT_EQ(-1, table_.api.recDelete(jRequest));
-    const std::string strSql = onlyStatement();
-    EXPECT_EQ(runFailed("near \"=\": syntax error", strSql), takeLog().at(0));
-    expectWorking(call("recList"), table_);
-}
-
-TEST_F(TriedOnce, MissingTable)
-{
-    run("alter table " + strTable_ + " rename to away");
-    for (const Call& call : calls())
-        if (std::string("tableCreate") != call.szName)
-            expectOnce(call, table_, "no such table: " + strTable_);
-    run("alter table away rename to " + strTable_);
-    expectWorking(call("recDeleteAll"), table_);
-}
-
-TEST_F(TriedOnce, FullDatabase)
-{
-    run("create trigger fill after insert on " + strTable_ + " begin update " + strTable_ +
-        " set note = printf('%.99999c', 'x') where id = 1; end");
-    EXPECT_EQ(database_.value("pragma page_count"), database_.value("pragma max_page_count=1"));
-    for (const char* szCall : {"recCreate", "recSave"})
-        expectOnce(call(szCall), table_, "database or disk is full");
-    database_.value("pragma max_page_count=1000");
-    expectWorking(call("recCreate"), table_);
-}
-
-// SQLite looks for an interrupt in the loops of a statement.
-TEST_F(TriedOnce, Interrupt)
-{
-    run("with recursive n(i) as (select 10 union all select i+1 from n where i < 300) insert "
-        "into " +
-        strTable_ + " select i, i, 'more' from n");
-    const std::string strCount = "select count(*) from " + strTable_ + " where note = 'more'";
-    const auto interrupt = [](void* pDb) {
-        sqlite3_interrupt(static_cast<sqlite3*>(pDb));
-        return 0;
-    };
-    Json::Value jRequest;
-    jRequest["vornSqlWhereFilter"] = "note > 'm'";
-    Json::Value jRecord = json(R"({"note":"none"})");
-    Json::Value jRecords;
-    std::string strWhere = "id > 9";
-    const std::function<int()> longCalls[] = {
-        [&] { return table_.api.recList(jRequest, jRecords); },
-        [&] { return table_.api.recUpdateByWhere(jRecord, strWhere); },
-        [&] { return table_.api.recDelete(jRequest); },
-    };
-    for (const auto& longCall : longCalls) {
-        sqlite3_progress_handler(database_.get(), 1, interrupt, database_.get());
-        EXPECT_EQ(-1, longCall());
-        sqlite3_progress_handler(database_.get(), 0, nullptr, nullptr);
-        EXPECT_EQ(runFailed("interrupted", onlyStatement()), takeLog().at(0));
-        EXPECT_EQ("291", database_.value(strCount));
+    const Error& error = GetParam();
+    std::vector<Operation> chosen;
+    std::istringstream names(error.szOperations);
+    for (std::string strName; std::getline(names, strName, ',');)
+        chosen.push_back(operation(strName));
+    if (chosen.empty())
+        for (const Operation& candidate : operations()) {
+            const bool blMakes = candidate.is("constructor") || candidate.is("tableCreate");
+            if (-1 != candidate.iResult && (error.blMakesTable || !blMakes))
+                chosen.push_back(candidate);
+        }
+    database_.run(error.szSql);
+    other_.run(error.szOther);
+    std::vector<Operation> failing;
+    for (const Operation& tested : chosen) {
+        const char* szError = tested.blWrites ? error.szError : error.szErrorOfReading;
+        if ('\0' == *szError) {
+            expectWorking(tested);
+            continue;
+        }
+        expectOnce(tested, szError);
+        failing.push_back(tested);
     }
-    EXPECT_GT(291U, jRecords.size());
-    EXPECT_EQ(291, table_.api.recDelete(jRequest));
+    if (!sqlite3_get_autocommit(other_.get())) other_.run("rollback");
+    database_.run(error.szCure);
+    if (std::string("ReadOnlyFile") != error.szName) expectWorking(failing.at(0));
 }
 
-TEST_F(TriedOnce, RefusalByTheAuthorizer)
+INSTANTIATE_TEST_SUITE_P(Errors, TriedOnce, testing::ValuesIn(kErrors),
+                         [](const auto& tested) { return std::string(tested.param.szName); });
+
+TEST_F(OnceTest, RefusalByTheAuthorizer)
 {
     const auto refuse = [](void*, int, const char*, const char*, const char*, const char*) {
         return SQLITE_DENY;
     };
     sqlite3_set_authorizer(database_.get(), refuse, nullptr);
-    for (const char* szCall : {"recGetOne", "recDeleteAll", "recUpdateByFilter"})
-        expectOnce(call(szCall), table_, "not authorized");
+    for (const Operation& tested : operations()) expectOnce(tested, "not authorized");
     sqlite3_set_authorizer(database_.get(), nullptr, nullptr);
-    expectWorking(call("recGetOne"), table_);
+    expectWorking(operation("recGetOne"));
 }
 
 // A table cannot be dropped while the same connection reads.
-TEST_F(TriedOnce, TableLockedByItsOwnConnection)
+TEST_F(OnceTest, StatementOfTheHost)
 {
-    const std::string strSelect = "select * from " + strTable_;
     sqlite3_stmt* pReader = nullptr;
     ASSERT_EQ(SQLITE_OK,
-              sqlite3_prepare_v2(database_.get(), strSelect.c_str(), -1, &pReader, nullptr));
+              sqlite3_prepare_v2(database_.get(), "select * from records", -1, &pReader, nullptr));
     ASSERT_EQ(SQLITE_ROW, sqlite3_step(pReader));
-    const std::string strDrop = "drop table " + strTable_;
-    expectOnce(strDrop, table_, "database table is locked");
+    const char* const kStatements[][2] = {
+        {"insert into records (id) values (5)", "NOT NULL constraint failed: records.note"},
+        {"delete from records where", "incomplete input"},
+        {"delete from records where id = = 1", "near \"=\": syntax error"},
+        {"drop table records", "database table is locked"}};
+    for (const auto& [szSql, szError] : kStatements) {
+        EXPECT_EQ(-1, table_.api.runSqlEx(szSql));
+        EXPECT_EQ(szSql, statementTriedOnce());
+        EXPECT_EQ(Lines{runFailed(szError, szSql)}, takeLog());
+    }
     sqlite3_finalize(pReader);
-    EXPECT_LE(0, table_.api.runSqlEx(strDrop));
+    EXPECT_LE(0, table_.api.runSqlEx("drop table records"));
     EXPECT_EQ("0", database_.value("select count(*) from sqlite_master"));
 }
 
+// SQLite looks for an interrupt in the loops of a statement.
+TEST_F(OnceTest, Interrupt)
+{
+    const auto interrupt = [](void* pDb) {
+        sqlite3_interrupt(static_cast<sqlite3*>(pDb));
+        return 0;
+    };
+    for (const char* szName : {"recList", "recUpdateByWhere", "recDelete"}) {
+        const Rows before = database_.rows("select * from records");
+        sqlite3_progress_handler(database_.get(), 1, interrupt, database_.get());
+        Json::Value jOutput;
+        EXPECT_EQ(-1, operation(szName).run(database_, table_, jOutput));
+        sqlite3_progress_handler(database_.get(), 0, nullptr, nullptr);
+        EXPECT_EQ(operation(szName).failure(table_, "interrupted", statementTriedOnce()),
+                  takeLog());
+        EXPECT_GT(static_cast<unsigned>(kRecords), jOutput.size());
+        EXPECT_EQ(before, database_.rows("select * from records"));
+    }
+    expectWorking(operation("recDelete"));
+}
+
 // Kept: the words decide, whoever wrote them.
-TEST_F(TriedOnce, ButNotATriggerThatSpeaksOfALock)
+TEST_F(OnceTest, ExceptATriggerThatSpeaksOfALock)
 {
     const std::string strError = "the database is locked away";
-    run("create trigger refuse before delete on " + strTable_ + " begin select raise(abort, '" +
-        strError + "'); end");
-    EXPECT_EQ(-1, call("recDeleteAll").run(table_));
-    const std::vector<std::string> statements = takeStatements();
-    EXPECT_EQ(500U, statements.size());
-    EXPECT_EQ(std::vector<unsigned>(500, 10000), state().sleeps);
-    EXPECT_EQ(failure(call("recDeleteAll"), table_, strError, statements.at(0), 500), takeLog());
-}
-
-// Connections to one file, opened in a special way.
-class TriedOnceBeside : public OnceTest {
-protected:
-    explicit TriedOnceBeside(const std::string& strParameter)
-        : strUri_("file:" +
-                  (owner_.run("create table " + strTable_ + " (" + kColumns + ")"),
-                   addRecords(owner_, strTable_), owner_.path()) +
-                  "?" + strParameter)
-    {
-    }
-
-    const std::string strTable_ = freshName();
-    Database owner_{Database::Place::kFile};
-    const std::string strUri_;
-    Database database_{strUri_};
-    Table table_{database_, strTable_, kMembers, kColumns};
-};
-
-class TriedOnceReadOnly : public TriedOnceBeside {
-protected:
-    TriedOnceReadOnly() : TriedOnceBeside("mode=ro") {}
-};
-
-TEST_F(TriedOnceReadOnly, File)
-{
-    for (const Call& call : calls()) {
-        if (call.blWrites)
-            expectOnce(call, table_, "attempt to write a readonly database");
-        else
-            expectWorking(call, table_);
-    }
-}
-
-class TriedOnceSharedCache : public TriedOnceBeside {
-protected:
-    TriedOnceSharedCache() : TriedOnceBeside("cache=shared") {}
-
-    Database other_{strUri_};
-};
-
-TEST_F(TriedOnceSharedCache, LockedTable)
-{
-    other_.run("begin immediate; update " + strTable_ + " set note = 'x'");
-    for (const Call& call : calls()) {
-        if (std::string("tableCreate") == call.szName) continue;
-        expectOnce(
-            call, table_,
-            call.blWrites ? "database table is locked" : "database table is locked: " + strTable_);
-    }
-    other_.run("rollback");
-    expectWorking(call("recDeleteAll"), table_);
-}
-
-TEST_F(TriedOnceSharedCache, LockedSchema)
-{
-    other_.run("begin immediate; create table another (a)");
-    for (const Call& call : calls()) expectOnce(call, table_, "database schema is locked: main");
-    other_.run("rollback");
-    expectWorking(call("recDeleteAll"), table_);
+    database_.run("create trigger refuse before delete on records begin select raise(abort, '" +
+                  strError + "'); end");
+    Json::Value jOutput;
+    EXPECT_EQ(-1, operation("recDeleteAll").run(database_, table_, jOutput));
+    const std::string strSql = onlyStatement(500, 500);
+    EXPECT_EQ(operation("recDeleteAll").failure(table_, strError, strSql, 500), takeLog());
 }
 
 }  // namespace

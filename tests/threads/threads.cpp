@@ -3,8 +3,9 @@
 // around every call: every result is right. With --without-lock the mutex is left out, which only
 // ThreadSanitizer should be shown. The status is 0 when all is well.
 
+#include "support/connection.h"
+
 #include <VornJsonDbApi.h>
-#include <sqlite3.h>
 
 #include <unistd.h>
 #include <atomic>
@@ -46,18 +47,10 @@ void expect(bool blRight, const char* szWhat)
     fprintf(stderr, "wrong: %s\n", szWhat);
 }
 
-struct TableOfThread {
-    const char* szName;
-    const char* szWord;
-    Json::Value jValue;
-};
-
-Json::Value definition(const TableOfThread& table)
+template <typename Call>
+void expectResult(int iResult, const char* szWhat, Call call)
 {
-    Json::Value jDefinition;
-    jDefinition[table.szName]["member"]["id"]["cpptype"] = "int";
-    jDefinition[table.szName]["member"]["value"]["cpptype"] = table.szWord;
-    return jDefinition;
+    expect(iResult == locked(call), szWhat);
 }
 
 // What a host does with a record, one call after the other.
@@ -65,39 +58,40 @@ void useRecord(VornJsonDbApi& api, const Json::Value& jRecord)
 {
     Json::Value jIn = jRecord;
     Json::Value jStored;
-    expect(0 == locked([&] { return api.recCreate(jIn, jStored); }) && jStored == jRecord,
-           "recCreate");
-    expect(-1 == locked([&] { return api.recCreate(jIn, jStored); }), "recCreate of a duplicate");
+    expectResult(0, "recCreate", [&] { return api.recCreate(jIn, jStored); });
+    expect(jStored == jRecord, "the record of recCreate");
+    expectResult(-1, "recCreate of a duplicate", [&] { return api.recCreate(jIn, jStored); });
     expect("DUPLICATE_PRIMARY_KEY" == locked([&] { return api.getErrMsg(); }), "getErrMsg");
     locked([&] { api.setErrMsg(""); });
 
     Json::Value jRequest;
     Json::Value jRecords;
-    expect(0 == locked([&] { return api.recList(jRequest, jRecords); }), "recList");
+    expectResult(0, "recList", [&] { return api.recList(jRequest, jRecords); });
     expect(1U == jRecords.size() && jRecords[0] == jRecord, "the record of recList");
     jRequest["id"] = jRecord["id"];
     Json::Value jValues;
     jValues["value"] = jRecord["value"];
-    expect(0 == locked([&] { return api.recUpdateByFilter(jRequest, jValues); }),
-           "recUpdateByFilter");
+    expectResult(0, "recUpdateByFilter", [&] { return api.recUpdateByFilter(jRequest, jValues); });
     Json::Value jFound;
-    expect(1 == locked([&] { return api.recGetOne(jRequest, jFound); }) && jFound == jRecord,
-           "recGetOne");
-    expect(1 == locked([&] { return api.recDelete(jRequest); }), "recDelete");
+    expectResult(1, "recGetOne", [&] { return api.recGetOne(jRequest, jFound); });
+    expect(jFound == jRecord, "the record of recGetOne");
+    expectResult(1, "recDelete", [&] { return api.recDelete(jRequest); });
 }
 
-void useLibrary(sqlite3* pDb, const TableOfThread& table)
+// On a table of that name, whose records have such a value.
+void useLibrary(sqlite3* pDb, std::string strName, const char* szWord, const Json::Value& jValue)
 {
-    std::string strName = table.szName;
     std::string strCreate =
         "create table if not exists " + strName + " (id integer primary key, value text)";
-    Json::Value jDefinition = definition(table);
+    Json::Value jDefinition;
+    jDefinition[strName]["member"]["id"]["cpptype"] = "int";
+    jDefinition[strName]["member"]["value"]["cpptype"] = szWord;
     std::optional<VornJsonDbApi> api;
     locked([&] { api.emplace(pDb, strName, jDefinition, strCreate); });
     for (int i = 0; i < kRounds; ++i) {
         Json::Value jRecord;
         jRecord["id"] = i;
-        jRecord["value"] = table.jValue;
+        jRecord["value"] = jValue;
         useRecord(*api, jRecord);
         std::string strTime;
         locked([&] { return VORN_JSON_DB::convert2ReadableTime(0, strTime, 5); });
@@ -106,28 +100,14 @@ void useLibrary(sqlite3* pDb, const TableOfThread& table)
     locked([&] { api.reset(); });
 }
 
-sqlite3* opened(const std::string& strFile)
-{
-    sqlite3* pDb = nullptr;
-    expect(SQLITE_OK == sqlite3_open(strFile.c_str(), &pDb), "sqlite3_open");
-    return pDb;
-}
-
 void runThreads(sqlite3* pFirst, sqlite3* pSecond)
 {
-    const TableOfThread texts = {"texts", "string", "it's"};
     Json::Value jObject;
     jObject["k"] = 1.5;
-    const TableOfThread objects = {"objects", "Json::objectValue", jObject};
-    std::thread first([&] { useLibrary(pFirst, texts); });
-    std::thread second([&] { useLibrary(pSecond, objects); });
+    std::thread first([&] { useLibrary(pFirst, "texts", "string", "it's"); });
+    std::thread second([&] { useLibrary(pSecond, "objects", "Json::objectValue", jObject); });
     first.join();
     second.join();
-}
-
-void countLine()
-{
-    ++iLines;
 }
 
 }  // namespace
@@ -137,12 +117,12 @@ extern "C" {
 // The log is only counted.
 void syslog(int, const char*, ...)
 {
-    countLine();
+    ++iLines;
 }
 
 void __syslog_chk(int, int, const char*, ...)
 {
-    countLine();
+    ++iLines;
 }
 
 }  // extern "C"
@@ -152,14 +132,11 @@ int main(int argc, char** argv)
     blLocked = !(1 < argc && 0 == strcmp("--without-lock", argv[1]));
     const std::string strFile = std::filesystem::temp_directory_path() /
                                 ("vornjsondb-threads-" + std::to_string(getpid()) + ".db");
-    sqlite3* pOne = opened(strFile);
-    sqlite3* pOther = opened(strFile);
-    sqlite3_exec(pOne, "pragma synchronous=off", nullptr, nullptr, nullptr);
-    sqlite3_exec(pOther, "pragma synchronous=off", nullptr, nullptr, nullptr);
-    runThreads(pOne, pOne);
-    runThreads(pOne, pOther);
-    expect(SQLITE_OK == sqlite3_close(pOne), "sqlite3_close");
-    expect(SQLITE_OK == sqlite3_close(pOther), "sqlite3_close");
+    sqlite3* const connections[] = {sqlite::opened(strFile), sqlite::opened(strFile)};
+    for (sqlite3* pDb : connections) sqlite::run(pDb, "pragma synchronous=off");
+    runThreads(connections[0], connections[0]);
+    runThreads(connections[0], connections[1]);
+    for (sqlite3* pDb : connections) expect(SQLITE_OK == sqlite3_close(pDb), "sqlite3_close");
     std::filesystem::remove(strFile);
 
     expect(0 < iLines, "no failure was logged");

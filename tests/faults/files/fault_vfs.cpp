@@ -27,7 +27,7 @@ bool isDue(Kind kind)
     return true;
 }
 
-// The real file stands behind this one in the memory that SQLite provides.
+// The real file follows this one in the memory that SQLite provides.
 struct File : sqlite3_file {
     sqlite3_file* real() { return reinterpret_cast<sqlite3_file*>(this + 1); }
 };
@@ -37,15 +37,19 @@ sqlite3_file* real(sqlite3_file* pFile)
     return static_cast<File*>(pFile)->real();
 }
 
-int closeFile(sqlite3_file* pFile)
+// A method of the file, which fails with that status where the plan says so.
+template <auto method, Kind kind, int iStatus, typename... Arguments>
+int pass(sqlite3_file* pFile, Arguments... arguments)
 {
-    return real(pFile)->pMethods->xClose(real(pFile));
+    if (isDue(kind)) return iStatus;
+    return (real(pFile)->pMethods->*method)(real(pFile), arguments...);
 }
 
-int readFile(sqlite3_file* pFile, void* pOut, int nBytes, sqlite3_int64 lOffset)
+// One that never fails.
+template <auto method, typename... Arguments>
+int pass(sqlite3_file* pFile, Arguments... arguments)
 {
-    if (isDue(kRead)) return SQLITE_IOERR_READ;
-    return real(pFile)->pMethods->xRead(real(pFile), pOut, nBytes, lOffset);
+    return (real(pFile)->pMethods->*method)(real(pFile), arguments...);
 }
 
 int writeFile(sqlite3_file* pFile, const void* pBytes, int nBytes, sqlite3_int64 lOffset)
@@ -58,59 +62,10 @@ int writeFile(sqlite3_file* pFile, const void* pBytes, int nBytes, sqlite3_int64
     return plan.blDiskFull ? SQLITE_FULL : SQLITE_IOERR_WRITE;
 }
 
-int truncateFile(sqlite3_file* pFile, sqlite3_int64 lSize)
-{
-    if (isDue(kTruncate)) return SQLITE_IOERR_TRUNCATE;
-    return real(pFile)->pMethods->xTruncate(real(pFile), lSize);
-}
-
 // Nothing here loses its power, so the real disk need not be waited for.
 int syncFile(sqlite3_file*, int)
 {
     return isDue(kSync) ? SQLITE_IOERR_FSYNC : SQLITE_OK;
-}
-
-int fileSize(sqlite3_file* pFile, sqlite3_int64* pSize)
-{
-    if (isDue(kFileSize)) return SQLITE_IOERR_FSTAT;
-    return real(pFile)->pMethods->xFileSize(real(pFile), pSize);
-}
-
-int lockFile(sqlite3_file* pFile, int iLevel)
-{
-    if (isDue(kLock)) return SQLITE_BUSY;
-    return real(pFile)->pMethods->xLock(real(pFile), iLevel);
-}
-
-int unlockFile(sqlite3_file* pFile, int iLevel)
-{
-    return real(pFile)->pMethods->xUnlock(real(pFile), iLevel);
-}
-
-int checkReservedLock(sqlite3_file* pFile, int* pHeld)
-{
-    return real(pFile)->pMethods->xCheckReservedLock(real(pFile), pHeld);
-}
-
-int fileControl(sqlite3_file* pFile, int iOperation, void* arg)
-{
-    return real(pFile)->pMethods->xFileControl(real(pFile), iOperation, arg);
-}
-
-int sectorSize(sqlite3_file* pFile)
-{
-    return real(pFile)->pMethods->xSectorSize(real(pFile));
-}
-
-int characteristics(sqlite3_file* pFile)
-{
-    return real(pFile)->pMethods->xDeviceCharacteristics(real(pFile));
-}
-
-int mapShared(sqlite3_file* pFile, int iPage, int nBytes, int iExtend, void volatile** ppOut)
-{
-    if (isDue(kMapShared)) return SQLITE_IOERR_SHMMAP;
-    return real(pFile)->pMethods->xShmMap(real(pFile), iPage, nBytes, iExtend, ppOut);
 }
 
 int lockShared(sqlite3_file* pFile, int iOffset, int n, int iFlags)
@@ -124,16 +79,26 @@ void barrier(sqlite3_file* pFile)
     real(pFile)->pMethods->xShmBarrier(real(pFile));
 }
 
-int unmapShared(sqlite3_file* pFile, int iDelete)
-{
-    return real(pFile)->pMethods->xShmUnmap(real(pFile), iDelete);
-}
-
-const sqlite3_io_methods kMethods = {
-    2,           closeFile,   readFile,        writeFile,  truncateFile,
-    syncFile,    fileSize,    lockFile,        unlockFile, checkReservedLock,
-    fileControl, sectorSize,  characteristics, mapShared,  lockShared,
-    barrier,     unmapShared, nullptr,         nullptr};
+using Methods = sqlite3_io_methods;
+const Methods kMethods = {2,
+                          pass<&Methods::xClose>,
+                          pass<&Methods::xRead, kRead, SQLITE_IOERR_READ>,
+                          writeFile,
+                          pass<&Methods::xTruncate, kTruncate, SQLITE_IOERR_TRUNCATE>,
+                          syncFile,
+                          pass<&Methods::xFileSize, kFileSize, SQLITE_IOERR_FSTAT>,
+                          pass<&Methods::xLock, kLock, SQLITE_BUSY>,
+                          pass<&Methods::xUnlock>,
+                          pass<&Methods::xCheckReservedLock>,
+                          pass<&Methods::xFileControl>,
+                          pass<&Methods::xSectorSize>,
+                          pass<&Methods::xDeviceCharacteristics>,
+                          pass<&Methods::xShmMap, kMapShared, SQLITE_IOERR_SHMMAP>,
+                          lockShared,
+                          barrier,
+                          pass<&Methods::xShmUnmap>,
+                          nullptr,
+                          nullptr};
 
 sqlite3_vfs* realVfs(sqlite3_vfs* pVfs)
 {

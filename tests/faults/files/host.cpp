@@ -2,18 +2,15 @@
 #include "faults/files/host.h"
 
 #include "faults/files/fault_vfs.h"
+#include "support/connection.h"
 
 #include <unistd.h>
+#include <algorithm>
 #include <filesystem>
 
 namespace fs = std::filesystem;
 
 namespace {
-
-const char kMembers[] = R"({"id":   {"cpptype": "int"},
-                            "name": {"cpptype": "string"},
-                            "note": {"cpptype": "string", "cppDefaultValue": "none"},
-                            "tags": {"cpptype": "Json::objectValue", "cppDefaultValue": {}}})";
 
 // Pages are small, so that a dozen records need many of them; the cache holds one page, so that
 // changed pages are written before the end of a statement; the file shrinks with its contents.
@@ -23,17 +20,7 @@ std::string firstState(const DiskFile::Form& form)
     strSql += "pragma auto_vacuum=full; pragma default_cache_size=1;";
     strSql += Journal::kWal == form.journal ? "pragma journal_mode=wal;" : "";
     strSql += "create table bystander (a);";
-    if (!form.blWithRecords) return strSql;
-    return strSql + "create table records (" + form.szColumns + ");" +
-           "with recursive n(i) as (select 1 union all select i+1 from n where i < " +
-           std::to_string(kRecords) +
-           ") insert into records select i, 'name' || i, printf('%.300c', 'x'), '{\"k\":1}' from "
-           "n;";
-}
-
-void removeFiles(const std::string& strPath)
-{
-    for (const char* szTail : {"", "-journal", "-wal", "-shm"}) fs::remove(strPath + szTail);
+    return form.blWithRecords ? strSql + recordsSql(form.szColumns) : strSql;
 }
 
 // The handle's CREATE statement is not run, so that the operation under trial is the first to
@@ -69,8 +56,19 @@ DiskFile::~DiskFile()
 
 void DiskFile::restore() const
 {
-    removeFiles(strPath_);
+    for (const char* szTail : {"", "-journal", "-wal", "-shm"}) fs::remove(strPath_ + szTail);
     fs::copy_file(strFirstState_, strPath_);
+}
+
+std::string DiskFile::contents() const
+{
+    Database other(strPath_, fault_vfs::name());
+    const std::string strSchema =
+        sqlite::value(other.get(), "select name, sql, ';' from sqlite_master order by name");
+    if (std::string::npos == strSchema.find("records")) return strSchema;
+    return strSchema + sqlite::value(other.get(),
+                                     "select id, '|', name, '|', note, '|', tags, ';' from records "
+                                     "order by rowid");
 }
 
 Host::Host(const DiskFile& file)
@@ -80,19 +78,21 @@ Host::Host(const DiskFile& file)
     sqlite3_wal_autocheckpoint(database.get(), 1);
 }
 
-std::string contents(const DiskFile& file)
+void Host::expectNothingLeft(const DiskFile& file, const std::vector<std::string>& contents)
 {
     Database other(file.path(), fault_vfs::name());
-    const auto append = [](std::string& strOut, const Rows& rows) {
-        for (const auto& row : rows) {
-            for (const std::string& strValue : row) strOut.append(strValue).append("|");
-            strOut += "\n";
-        }
-    };
-    std::string strOut;
-    const Rows schema = other.rows("select name, sql from sqlite_master order by name");
-    append(strOut, schema);
-    for (const auto& row : schema)
-        if ("records" == row[0]) append(strOut, other.rows("select * from records order by rowid"));
-    return strOut;
+    EXPECT_EQ("", sqlite::whatIsStuck(database.get(), other.get()));
+    const std::string strFound = file.contents();
+    EXPECT_TRUE(contents.end() != std::find(contents.begin(), contents.end(), strFound))
+        << strFound;
+
+    EXPECT_EQ(0, table.api.tableCreate());
+    const int iBefore = std::stoi(other.value("select count(*) from records"));
+    const char szRecord[] = R"({"id":77,"name":"after","note":"n","tags":{"k":7}})";
+    EXPECT_EQ(szRecord, text(table.create(szRecord)));
+    Json::Value jRequest;
+    Json::Value jRecords;
+    EXPECT_EQ(0, table.api.recList(jRequest, jRecords));
+    EXPECT_EQ(iBefore + 1, static_cast<int>(jRecords.size()));
+    EXPECT_EQ(Lines(), takeLog());
 }

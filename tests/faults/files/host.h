@@ -3,17 +3,12 @@
 // handle.
 #pragma once
 
-#include "support/database.h"
+#include "support/operations.h"
 
 #include <string>
+#include <vector>
 
 enum class Journal { kDelete, kWal };
-
-// The columns of the table "records".
-constexpr char kWithKeys[] = "id integer primary key, name text unique, note text, tags text";
-constexpr char kWithoutKeys[] = "id integer, name text, note text, tags text";
-
-constexpr int kRecords = 12;
 
 // A database file that is brought back to its first state before each trial.
 class DiskFile {
@@ -32,6 +27,8 @@ public:
     DiskFile& operator=(const DiskFile&) = delete;
 
     void restore() const;
+    // What another program sees: everything in the file but the bystander's rows.
+    std::string contents() const;
     const std::string& path() const { return strPath_; }
 
 private:
@@ -46,9 +43,15 @@ class Host {
 public:
     explicit Host(const DiskFile& file);
 
+    int run(const Operation& operation, Json::Value& jOutput)
+    {
+        return operation.run(database, table, jOutput);
+    }
+
+    // After an operation, whatever failed in it: nothing is stuck, the file has one of these
+    // contents, and the handle works on.
+    void expectNothingLeft(const DiskFile& file, const std::vector<std::string>& contents);
+
     Database database;
     Table table;
 };
-
-// What another program sees: everything in the file but the bystander's rows.
-std::string contents(const DiskFile& file);

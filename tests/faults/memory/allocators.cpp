@@ -1,13 +1,22 @@
 // SPDX-License-Identifier: MIT
-#include "allocators.h"
+#include "faults/memory/allocators.h"
 
+#include <VornJsonDbApi.h>
 #include <sqlite3.h>
 
 #include <malloc.h>
+#include <unistd.h>
 #include <atomic>
 #include <cerrno>
+#include <cstdarg>
+#include <cstdio>
 #include <cstdlib>
+#include <ctime>
 #include <new>
+#include <utility>
+
+bool blLogToStdout = false;
+bool blDebugOutput = true;
 
 #if VORN_OWN_MALLOC
 extern "C" {
@@ -36,6 +45,7 @@ thread_local State state;
 
 std::atomic<long> nNewBlocks{0};
 std::atomic<long> nMallocBlocks{0};
+int iWaits = 0;
 
 // Whether the allocation that is asked for now has to fail.
 bool fails(Kind kind)
@@ -48,20 +58,6 @@ bool fails(Kind kind)
     ++state.iFailed;
     errno = ENOMEM;
     return true;
-}
-
-void* allocate(std::size_t nSize)
-{
-    void* pMemory = fails(Kind::kNew) ? nullptr : RAW(malloc)(0 == nSize ? 1 : nSize);
-    if (nullptr == pMemory) throw std::bad_alloc();
-    ++nNewBlocks;
-    return pMemory;
-}
-
-void release(void* pMemory)
-{
-    if (nullptr != pMemory) --nNewBlocks;
-    RAW(free)(pMemory);
 }
 
 void* sqliteMalloc(int iSize)
@@ -79,34 +75,28 @@ void* sqliteRealloc(void* pMemory, int iSize)
     return fails(Kind::kSqlite) ? nullptr : RAW(realloc)(pMemory, static_cast<std::size_t>(iSize));
 }
 
-int sqliteSize(void* pMemory)
+// Reads the whole line, as the real log would, with memory of its own.
+__attribute__((format(printf, 1, 0))) void readLine(const char* szFormat, va_list arguments)
 {
-    return static_cast<int>(malloc_usable_size(pMemory));
+    const bool blArmed = std::exchange(state.blArmed, false);
+    static char szLine[1 << 16];
+    vsnprintf(szLine, sizeof(szLine), szFormat, arguments);
+    state.blArmed = blArmed;
 }
-
-int sqliteRoundup(int iSize)
-{
-    return (iSize + 7) & ~7;
-}
-
-int sqliteInit(void*)
-{
-    return SQLITE_OK;
-}
-
-void sqliteShutdown(void*) {}
 
 }  // namespace
 
-bool allocators::ownMalloc()
-{
-    return VORN_OWN_MALLOC;
-}
-
 void allocators::install()
 {
-    sqlite3_mem_methods methods = {sqliteMalloc,  sqliteFree, sqliteRealloc,  sqliteSize,
-                                   sqliteRoundup, sqliteInit, sqliteShutdown, nullptr};
+    sqlite3_mem_methods methods = {
+        sqliteMalloc,
+        sqliteFree,
+        sqliteRealloc,
+        [](void* pMemory) { return static_cast<int>(malloc_usable_size(pMemory)); },
+        [](int iSize) { return (iSize + 7) & ~7; },
+        [](void*) { return SQLITE_OK; },
+        [](void*) {},
+        nullptr};
     if (SQLITE_OK != sqlite3_config(SQLITE_CONFIG_MALLOC, &methods)) abort();
     if (SQLITE_OK != sqlite3_config(SQLITE_CONFIG_LOOKASIDE, 0, 0)) abort();
     if (SQLITE_OK != sqlite3_initialize()) abort();
@@ -123,54 +113,38 @@ int allocators::disarm()
     return state.iFailed;
 }
 
-allocators::Pause::Pause() : blArmed_(state.blArmed)
-{
-    state.blArmed = false;
-}
-
-allocators::Pause::~Pause()
-{
-    state.blArmed = blArmed_;
-}
-
 allocators::Blocks allocators::blocks()
 {
     return {nNewBlocks, nMallocBlocks};
 }
 
-void* operator new(std::size_t nSize)
+int allocators::waits()
 {
-    return allocate(nSize);
+    return iWaits;
 }
 
-void* operator new[](std::size_t nSize)
+void* operator new(std::size_t nSize)
 {
-    return allocate(nSize);
+    void* pMemory = fails(Kind::kNew) ? nullptr : RAW(malloc)(0 == nSize ? 1 : nSize);
+    if (nullptr == pMemory) throw std::bad_alloc();
+    ++nNewBlocks;
+    return pMemory;
 }
 
 void operator delete(void* pMemory) noexcept
 {
-    release(pMemory);
-}
-
-void operator delete[](void* pMemory) noexcept
-{
-    release(pMemory);
+    if (nullptr != pMemory) --nNewBlocks;
+    RAW(free)(pMemory);
 }
 
 void operator delete(void* pMemory, std::size_t /*nSize*/) noexcept
 {
-    release(pMemory);
+    operator delete(pMemory);
 }
 
-void operator delete[](void* pMemory, std::size_t /*nSize*/) noexcept
-{
-    release(pMemory);
-}
-
-#if VORN_OWN_MALLOC
 extern "C" {
 
+#if VORN_OWN_MALLOC
 void* malloc(size_t nSize)
 {
     void* pMemory = fails(Kind::kMalloc) ? nullptr : __libc_malloc(nSize);
@@ -198,6 +172,37 @@ void free(void* pMemory)
     if (nullptr != pMemory) --nMallocBlocks;
     __libc_free(pMemory);
 }
+#endif
+
+void __syslog_chk(int, int, const char*, ...) __attribute__((format(printf, 3, 4)));
+void syslog(int, const char*, ...) __attribute__((format(printf, 2, 3)));
+
+void syslog(int /*iPriority*/, const char* szFormat, ...)
+{
+    va_list arguments;
+    va_start(arguments, szFormat);
+    readLine(szFormat, arguments);
+    va_end(arguments);
+}
+
+void __syslog_chk(int /*iPriority*/, int /*iFlag*/, const char* szFormat, ...)
+{
+    va_list arguments;
+    va_start(arguments, szFormat);
+    readLine(szFormat, arguments);
+    va_end(arguments);
+}
+
+int usleep(useconds_t /*uMicroseconds*/)
+{
+    return ++iWaits, 0;
+}
+
+time_t time(time_t* pTime) noexcept
+{
+    constexpr time_t kNow = 1700000000;
+    if (nullptr != pTime) *pTime = kNow;
+    return kNow;
+}
 
 }  // extern "C"
-#endif

@@ -1,7 +1,8 @@
 // SPDX-License-Identifier: MIT
-// The three allocators of a host process, each with a fault that can be armed: SQLite's through
-// SQLITE_CONFIG_MALLOC, C++'s operator new, and malloc, calloc and realloc themselves. Each counts
-// its own allocations only: what SQLite and operator new take is no malloc of the program.
+// What the host process gives the library: the log, the clock, the wait, and three allocators, each
+// with a fault that can be armed: SQLite's through SQLITE_CONFIG_MALLOC, C++'s operator new, and
+// malloc, calloc and realloc themselves. Each counts its own allocations only: what SQLite and
+// operator new take is not counted as the program's malloc.
 #pragma once
 
 namespace allocators {
@@ -16,7 +17,7 @@ struct Fault {
 };
 
 // Whether the program has a malloc of its own. A sanitizer does not allow it.
-bool ownMalloc();
+constexpr bool kOwnMalloc = VORN_OWN_MALLOC;
 
 // Before SQLite is used at all. Lookaside memory is off, as in SQLite's own tests of this kind, so
 // that each allocation reaches the allocator.
@@ -26,23 +27,14 @@ void install();
 void arm(const Fault& fault);
 int disarm();
 
-// While one lives, this thread's allocations neither fail nor count.
-class Pause {
-public:
-    Pause();
-    ~Pause();
-    Pause(const Pause&) = delete;
-    Pause& operator=(const Pause&) = delete;
-
-private:
-    bool blArmed_;
-};
-
 // What is allocated at present, in all threads: blocks of operator new, blocks of malloc.
 struct Blocks {
     long nNew = 0;
     long nMalloc = 0;
 };
 Blocks blocks();
+
+// How often the library has waited for a lock. It does not wait in earnest.
+int waits();
 
 }  // namespace allocators

@@ -1,10 +1,9 @@
 // SPDX-License-Identifier: MIT
 // What docs/limits.md says of a host that runs out of memory.
 
-#include "allocators.h"
-#include "host.h"
-#include "json_of.h"
-#include "store.h"
+#include "faults/memory/allocators.h"
+#include "faults/memory/store.h"
+#include "support/json_text.h"
 
 #include <VornJsonDbApi.h>
 #include <gtest/gtest.h>
@@ -30,7 +29,7 @@ TEST(MemoryLimits, LastRecordOfAFailedListMayLackMembers)
     Store store;
     std::string strName = "plain";
     std::string strCreate = "create table if not exists plain (id integer primary key)";
-    Json::Value jDefinition = jsonOf(kDefinition);
+    Json::Value jDefinition = leftByReader(kDefinition);
     VornJsonDbApi api(store.get(), strName, jDefinition, strCreate);
     Json::Value jRequest;
     Json::Value jAll;
@@ -44,7 +43,7 @@ TEST(MemoryLimits, LastRecordOfAFailedListMayLackMembers)
         if (0 == allocators::disarm()) break;
         EXPECT_EQ(-1, iResult);
         for (Json::ArrayIndex i = 0; i + 1 < jRecords.size(); ++i) EXPECT_EQ(jAll[i], jRecords[i]);
-        if (!jRecords.empty()) lasts.insert(textOf(jRecords[jRecords.size() - 1]));
+        if (!jRecords.empty()) lasts.insert(text(jRecords[jRecords.size() - 1]));
     }
     EXPECT_EQ(1U, lasts.count(R"({"data":{"n":1},"name":"the first of the rows alike"})"));
 }
@@ -69,18 +68,10 @@ std::string localTime(bool blHostAskedForTheZone)
 
 TEST(MemoryLimits, FirstLocalTimeMayBeUtc)
 {
-    if (!allocators::ownMalloc())
+    if (!allocators::kOwnMalloc)
         GTEST_SKIP() << "malloc cannot be replaced beside the one of a sanitizer";
     EXPECT_EXIT(endWith("1970-01-01 00:00:00" == localTime(false)), testing::ExitedWithCode(0), "");
     EXPECT_EXIT(endWith("1970-01-01 02:00:00" == localTime(true)), testing::ExitedWithCode(0), "");
 }
 
 }  // namespace
-
-int main(int argc, char** argv)
-{
-    setenv("TZ", "EET-2", 1);
-    allocators::install();
-    testing::InitGoogleTest(&argc, argv);
-    return RUN_ALL_TESTS();
-}

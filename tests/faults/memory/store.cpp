@@ -1,13 +1,15 @@
 // SPDX-License-Identifier: MIT
-#include "store.h"
+#include "faults/memory/store.h"
+
+#include "support/connection.h"
 
 #include <unistd.h>
-#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
-#include <thread>
+
+namespace fs = std::filesystem;
 
 namespace {
 
@@ -28,51 +30,29 @@ constexpr char kRows[] =
     " || coalesce(' ' || replace(data, '\"', ''), '') || coalesce(' ' || replace(tags, '\"', ''),"
     " '') || coalesce(' ' || big, '') || coalesce(' ' || rate, '') strRow from task order by id)";
 
-sqlite3* opened(const std::string& strPath)
-{
-    sqlite3* pDb = nullptr;
-    if (SQLITE_OK != sqlite3_open(strPath.c_str(), &pDb)) abort();
-    Store::run(pDb, "pragma synchronous = off");
-    return pDb;
-}
-
 std::string path(const char* szEnd)
 {
-    return std::filesystem::temp_directory_path() /
-           ("vornjsondb-memory-" + std::to_string(getpid()) + szEnd);
+    return fs::temp_directory_path() / ("vornjsondb-memory-" + std::to_string(getpid()) + szEnd);
+}
+
+sqlite3* openedQuick(const std::string& strPath)
+{
+    sqlite3* pDb = sqlite::opened(strPath);
+    sqlite::run(pDb, "pragma synchronous = off");
+    return pDb;
 }
 
 // The bytes of the file that every point begins with.
 std::string freshFile()
 {
     const std::string strPath = path(".fresh");
-    sqlite3* pDb = opened(strPath);
-    Store::run(pDb, "pragma page_size = 1024; create table other (n); insert into other values(0)");
-    Store::run(pDb, kSchema);
+    sqlite3* pDb = openedQuick(strPath);
+    sqlite::run(pDb, std::string("pragma page_size = 1024; create table bystander (a);") + kSchema);
     if (SQLITE_OK != sqlite3_close(pDb)) abort();
     std::ifstream file(strPath, std::ios::binary);
-    const std::string strBytes((std::istreambuf_iterator<char>(file)),
-                               std::istreambuf_iterator<char>());
-    std::filesystem::remove(strPath);
+    const std::string strBytes{std::istreambuf_iterator<char>(file), {}};
+    fs::remove(strPath);
     return strBytes;
-}
-
-int appendRow(void* arg, int nColumns, char** values, char** /*names*/)
-{
-    for (int i = 0; i < nColumns; ++i)
-        static_cast<std::string*>(arg)->append(values[i] ? values[i] : "NULL");
-    return 0;
-}
-
-bool isMutexFree(sqlite3* pDb)
-{
-    int iStatus = SQLITE_BUSY;
-    std::thread other([&] {
-        iStatus = sqlite3_mutex_try(sqlite3_db_mutex(pDb));
-        if (SQLITE_OK == iStatus) sqlite3_mutex_leave(sqlite3_db_mutex(pDb));
-    });
-    other.join();
-    return SQLITE_OK == iStatus;
 }
 
 }  // namespace
@@ -81,59 +61,31 @@ Store::Store() : strPath_(path(".db"))
 {
     static const std::string& strFresh = *new std::string(freshFile());
     // Of a process that had this number and was killed: SQLite would play it back.
-    std::filesystem::remove(strPath_ + "-journal");
+    fs::remove(strPath_ + "-journal");
     std::ofstream(strPath_, std::ios::binary) << strFresh;
-    pDb_ = opened(strPath_);
-    pOther_ = opened(strPath_);
+    pDb_ = openedQuick(strPath_);
+    pOther_ = openedQuick(strPath_);
 }
 
 Store::~Store()
 {
     close();
-    std::filesystem::remove(strPath_);
-}
-
-void Store::run(sqlite3* pDb, const std::string& strSql)
-{
-    char* szError = nullptr;
-    if (SQLITE_OK == sqlite3_exec(pDb, strSql.c_str(), nullptr, nullptr, &szError)) return;
-    fprintf(stderr, "%s: %s\n", strSql.c_str(), szError);
-    abort();
-}
-
-// All columns of all rows in one text, as the second connection sees them.
-std::string Store::value(const char* szSql)
-{
-    std::string strValue;
-    if (SQLITE_OK == sqlite3_exec(pOther_, szSql, appendRow, &strValue, nullptr)) return strValue;
-    return sqlite3_errmsg(pOther_);
+    fs::remove(strPath_);
 }
 
 std::string Store::rows()
 {
-    return value(kRows);
+    return sqlite::value(pOther_, kRows);
 }
 
 bool Store::hasMade()
 {
-    return "1" == value("select count(*) from sqlite_master where name = 'made'");
-}
-
-std::string Store::whatIsStuck()
-{
-    if (nullptr != sqlite3_next_stmt(pDb_, nullptr)) return "a statement is open";
-    if (0 == sqlite3_get_autocommit(pDb_)) return "a transaction is open";
-    if (!isMutexFree(pDb_)) return "the connection's mutex is held";
-    if (SQLITE_OK != sqlite3_exec(pOther_, "update other set n = n + 1", nullptr, nullptr, nullptr))
-        return std::string("another connection cannot write: ") + sqlite3_errmsg(pOther_);
-    const std::string strIntegrity = value("pragma integrity_check");
-    if ("ok" != strIntegrity) return "integrity_check: " + strIntegrity;
-    return std::string();
+    return "1" == sqlite::value(pOther_, "select count(*) from sqlite_master where name = 'made'");
 }
 
 void Store::restore()
 {
-    run(pDb_, std::string("begin immediate;") + kSchema + "commit");
+    sqlite::run(pDb_, std::string("begin immediate;") + kSchema + "commit");
     sqlite3_set_last_insert_rowid(pDb_, 0);
 }
 

@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: MIT
+// Every function of the library by its name, with arguments out of JSON, for tests that bring each
+// of them into the same trouble.
+#pragma once
+
+#include <VornJsonDbApi.h>
+#include <sqlite3.h>
+
+#include <optional>
+#include <string>
+#include <vector>
+
+// What a host holds for one call. The call itself allocates nothing of its own.
+struct Call {
+    using Function = int (*)(Call& call);
+
+    // The function that the first word of a case's name is.
+    static Function function(const std::string& strCase);
+
+    // Takes the members "first", "second", "text", "key", "vector", "flag", "number" and "now";
+    // those that are left out become empty.
+    void setArguments(const Json::Value& jArguments);
+
+    // Of the constructor, and the handle that it makes.
+    sqlite3* pDb = nullptr;
+    std::string strTable;
+    Json::Value jDefinition;
+    std::string strCreate;
+    std::optional<VornJsonDbApi> made;
+
+    VornJsonDbApi* pApi = nullptr;
+    // JSON objects, texts and the rest as the functions take them, in this order.
+    Json::Value jFirst;
+    Json::Value jSecond;
+    std::string strText;
+    std::string strKey;
+    std::vector<std::string> strVector;
+    bool blFlag = false;  // of runSqlEx: with a callback; of SqlExpandMemberName: of a record
+    int iNumber = 0;      // a kind of time or list; getTimeAfterNow writes text unless it is 0
+    long now = 0;         // also the number of rows that a callback was called with
+    const Json::Value* pjResult = nullptr;  // what recType referred to
+};

@@ -1,0 +1,156 @@
+// SPDX-License-Identifier: MIT
+#include "support/operations.h"
+
+#include "support/records.h"
+
+#include <stdexcept>
+#include <utility>
+
+std::string recordsSql(const char* szColumns)
+{
+    return std::string("create table if not exists records (") + szColumns +
+           ");with recursive n(i) as (select 1 union all select i+1 from n where i < " +
+           std::to_string(kRecords) +
+           ") insert into records select i, 'name' || i, printf('%.300c', 'x'), '{\"k\":1}' from n";
+}
+
+bool Operation::is(const std::string& strFunction) const
+{
+    return 0 == (std::string(szName) + " ").find(strFunction + " ");
+}
+
+int Operation::run(Database& database, Table& table, Json::Value& jOutput) const
+{
+    Call call;
+    call.pDb = database.get();
+    call.strTable = table.strName;
+    call.jDefinition = table.jDefinition;
+    call.strCreate = table.strCreate;
+    call.pApi = &table.api;
+    call.setArguments(json(szArguments));
+    const int iReturned = Call::function(szName)(call);
+    jOutput = is("recSave") ? call.jFirst : call.jSecond;
+    return is("constructor") && !doubles::state().log.empty() ? -1 : iReturned;
+}
+
+Json::Value Operation::untouched() const
+{
+    return json(szArguments)[is("recSave") ? "first" : "second"];
+}
+
+Lines Operation::failure(const Table& table, const std::string& strError, const std::string& strSql,
+                         int nRetries) const
+{
+    const Json::Value jArguments = json(szArguments);
+    const std::string strFirst = text(jArguments["first"]);
+    const std::string strSqlError = sqlError(strError, strSql);
+    Lines lines{runFailed(strError, strSql, nRetries)};
+    const auto add = [&lines](const Lines& more) {
+        lines.insert(lines.end(), more.begin(), more.end());
+    };
+
+    if (is("constructor") || is("tableCreate"))
+        add({error("create table failed, sql=" + strSql), strSqlError});
+    if (is("constructor")) add({failed("0 > tableCreate()")});
+
+    if (is("recSave") || is("recCreate")) {
+        Json::Value jRecord = jArguments["first"];
+        Json::Value jDefinition = table.jDefinition;
+        std::string strName = table.strName;
+        const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
+        for (const std::string& strKey : jTypes.getMemberNames())
+            if (!jRecord.isMember(strKey)) jRecord[strKey] = jTypes[strKey]["cppDefaultValue"];
+        const bool blCreate = is("recCreate") || jArguments["flag"].asBool();
+        add({failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
+             plain("blCreate=" + std::to_string(blCreate) + ", jRecInOut=" + text(jRecord)),
+             plain("jType=" + text(jTypes)), strSqlError});
+        if (is("recCreate"))
+            add({failed("0 > recSave(jParam, true)"),
+                 plain("call create rec, rec=" + text(jRecord))});
+    }
+
+    if (is("recList") || is("recGetOne"))
+        add({failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
+             plain("jRecParam=" + strFirst), strSqlError});
+    if (is("recGetOne")) add({failed("0 > recList(jRecParam, jRecArray)")});
+
+    const std::string strValues = is("recUpdateByFilter") ? text(jArguments["second"]) : strFirst;
+    if (is("recUpdateByFilter") || is("recUpdateByWhere"))
+        add({failed("0 > runSqlEx(strSql, NULL, NULL)"), plain("jRecIn=" + strValues),
+             strSqlError});
+    if (is("recUpdateByFilter"))
+        add({failed("0 > recUpdateByWhere(jParamIn, strSql)"),
+             plain("recUpdateByFilter failed, jParamIn=" + strValues)});
+
+    if (0 == std::string(szName).find("recDelete"))
+        add({failed("0 > (err = runSqlEx(strSqlRun))"), strSqlError});
+    const std::string strText =
+        is("recDeleteByName") ? jArguments["text"].asString() : jArguments["vector"][0].asString();
+    if (is("recDeleteByArray") || is("recDeleteByName"))
+        add({failed("0 > (err = recDelete(jParam))"),
+             plain("recDeleteByArray failed, name=name, strVector=" + strText)});
+    if (is("recDeleteByName"))
+        add({failed("0 > (err = recDeleteByArray(strVector, szKey))"),
+             plain("recDeleteByName failed, name=name, strValue=" + strText)});
+    return lines;
+}
+
+std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps)
+{
+    const std::vector<std::string> statements = std::exchange(doubles::state().statements, {});
+    const std::string strSql = statements.empty() ? "" : statements[0];
+    EXPECT_EQ(std::vector<std::string>(nAttempts, strSql), statements);
+    EXPECT_EQ(std::vector<unsigned>(nSleeps, 10000), doubles::state().sleeps);
+    doubles::state().sleeps.clear();
+    return strSql;
+}
+
+std::string testName(const std::vector<std::string>& parts)
+{
+    std::string strName;
+    for (const std::string& strPart : parts)
+        for (const char c : (strName.empty() ? "" : "_") + strPart)
+            if (',' != c) strName += ' ' == c ? '_' : c;
+    return strName;
+}
+
+const std::vector<Operation>& operations()
+{
+    static const std::vector<Operation> all = {
+        {"constructor", "{}", 0, false, false},
+        {"constructor on its table", "{}", 0, false},
+        {"tableCreate", "{}", 0, false, false},
+        {"recCreate", R"({"first":{"id":50,"name":"new"},"second":{"untouched":true}})", 0},
+        {"recCreate of a duplicate",
+         R"({"first":{"id":50,"name":"name3"},"second":{"untouched":true}})", -1},
+        {"recSave inserts",
+         R"({"flag":true,"first":{"id":50,"name":"new","note":"n","tags":{"k":[1,2]}}})", 0},
+        {"recSave replaces", R"({"first":{"id":3,"name":"other","note":"n","tags":{}}})", 0},
+        {"recList", R"({"second":[]})", 0, false},
+        {"recList of some",
+         R"({"first":{"vornSqlWhereFilter":"id > 6","sort_by":"id","limit":3},"second":[]})", 0,
+         false},
+        // The filter is SQL as it is, so it can end the statement and begin another.
+        {"recList of all, twice",
+         R"({"first":{"vornSqlWhereFilter":"1); SELECT id,name,note,tags FROM records WHERE (1"},
+             "second":[]})",
+         0, false},
+        {"recGetOne", R"({"first":{"name":"name7"},"second":{"untouched":true}})", 1, false},
+        {"recUpdateByWhere", R"({"first":{"note":"short"},"text":"id > 2"})", 0},
+        {"recUpdateByFilter", R"({"first":{"name":"name9"},
+                                  "second":{"id":90,"name":"nine","note":"n","tags":{"k":9}}})",
+         0},
+        {"recDelete", R"({"first":{"vornSqlWhereFilter":"id between 3 and 9"}})", 7},
+        {"recDeleteAll", "{}", kRecords},
+        {"recDeleteByArray", R"({"vector":["name4"],"key":"name"})", 1},
+        {"recDeleteByName", R"({"text":"name5","key":"name"})", 1},
+    };
+    return all;
+}
+
+const Operation& operation(const std::string& strName)
+{
+    for (const Operation& candidate : operations())
+        if (strName == candidate.szName) return candidate;
+    throw std::invalid_argument(strName);
+}

@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: MIT
+// Every operation of the library that touches the file, on a table of twelve records, with the log
+// of its failure.
+#pragma once
+
+#include "support/calls.h"
+#include "support/database.h"
+
+#include <ostream>
+#include <string>
+#include <vector>
+
+constexpr char kMembers[] = R"({"id":   {"cpptype": "int"},
+                                "name": {"cpptype": "string"},
+                                "note": {"cpptype": "string", "cppDefaultValue": "none"},
+                                "tags": {"cpptype": "Json::objectValue", "cppDefaultValue": {}}})";
+constexpr char kWithKeys[] =
+    "id integer primary key, name text unique, note text not null, tags text";
+constexpr char kWithoutKeys[] = "id integer, name text, note text, tags text";
+constexpr int kRecords = 12;
+
+// Makes the table "records" with its records, called name1 to name12.
+std::string recordsSql(const char* szColumns);
+
+struct Operation {
+    const char* szName;       // the first word is the function
+    const char* szArguments;  // as Call takes them
+    // Of an undisturbed run; the constructor's is -1 when it logged anything.
+    int iResult;
+    bool blWrites = true;
+    bool blNeedsTable = true;
+
+    // Sets jOutput to the record or list that the operation writes, if there is one.
+    int run(Database& database, Table& table, Json::Value& jOutput) const;
+    // That output before the operation.
+    Json::Value untouched() const;
+    // The whole log where the statement failed with that error after so many retries.
+    Lines failure(const Table& table, const std::string& strError, const std::string& strSql,
+                  int nRetries = 0) const;
+
+    bool is(const std::string& strFunction) const;
+    friend std::ostream& operator<<(std::ostream& out, const Operation& operation)
+    {
+        return out << operation.szName;
+    }
+};
+
+// The statement of the only call since the last time. It was tried so often, with 10 ms after each
+// attempt that found a lock.
+std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps);
+
+// A name for gtest of such parts: "recSave inserts" and "wal" are recSave_inserts_wal.
+std::string testName(const std::vector<std::string>& parts);
+
+const std::vector<Operation>& operations();
+const Operation& operation(const std::string& strName);
