@@ -140,15 +140,6 @@ Ended called(VornJsonDbApi& api, const std::string& strCall)
     return ended;
 }
 
-std::vector<std::string> split(const std::string& strText, char cSeparator)
-{
-    std::vector<std::string> parts;
-    std::istringstream stream(strText);
-    for (std::string strPart; std::getline(stream, strPart, cSeparator);)
-        if (!strPart.empty()) parts.push_back(strPart);
-    return parts;
-}
-
 std::string replaced(const std::string& strText, char cOld, const std::string& strNew)
 {
     std::string strOut;

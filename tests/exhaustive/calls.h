@@ -35,9 +35,6 @@ inline bool isFailure(const std::string& strEnd)
 // failed or found no record, unless the function leaves there what it appended before the failure.
 Ended called(VornJsonDbApi& api, const std::string& strCall);
 
-// The parts between the separators that are not empty.
-std::vector<std::string> split(const std::string& strText, char cSeparator);
-
 std::string replaced(const std::string& strText, char cOld, const std::string& strNew);
 
 template <typename Item>

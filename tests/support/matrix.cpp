@@ -3,6 +3,16 @@
 
 #include <cstdlib>
 #include <filesystem>
+#include <sstream>
+
+std::vector<std::string> split(const std::string& strText, char cSeparator)
+{
+    std::vector<std::string> parts;
+    std::istringstream stream(strText);
+    for (std::string strPart; std::getline(stream, strPart, cSeparator);)
+        if (!strPart.empty()) parts.push_back(strPart);
+    return parts;
+}
 
 void expectSound(Database& database, VornJsonDbApi& api, const std::string& strRecord)
 {
