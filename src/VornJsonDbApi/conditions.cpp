@@ -136,8 +136,8 @@ int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jHostLis
     if (FAILED(jList.type() != Json::arrayValue)) return -1;
     if (jList.empty()) return 0;
 
-    // Kept(Terms.OfSeveralItemsGlueThem): several items of a list are written side by side without
-    // a comma
+    // Kept(Terms.PutNothingBetweenTheItemsOfAList): several items of a list are written side by
+    // side without a comma
     std::string strTerm = std::string(szField) + " in (";
     for (Json::ArrayIndex i = 0; i < jList.size(); ++i) {
         SqliteText szSql;

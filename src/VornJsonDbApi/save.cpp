@@ -47,9 +47,8 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
 {
     // What runs inside the statement may change or destroy the host's record: it is read no more.
     Json::Value jParam = jRecIn;
-    // Kept(Create.TellsAnEarlierDuplicateAgain,
-    // UpdateDuplicate.AnEarlierDuplicateCountsForEveryFailureWithoutSql): an earlier duplicate
-    // counts for a later failure without SQL
+    // Kept(Operations.TellAnEarlierDuplicateAgain): an earlier duplicate counts for a later failure
+    // without SQL
     const auto fail = [&] {
         LOG_PLAIN("call create rec, rec=%s", toString(jParam).c_str());
         if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;

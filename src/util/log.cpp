@@ -32,7 +32,7 @@ void LogLine::write(const char* szFormat, ...)
     va_end(arguments);
     if (0 > iLength) return;
 
-    // Kept(Log.OnStandardOutputHasTheseForms): lines of the error family repeat their location
+    // Kept(Log.WritesEachFamilyInItsForms): lines of the error family repeat their location
     const unsigned uPid = static_cast<unsigned>(getpid());
     errno = iErrno_;
     switch (family_) {

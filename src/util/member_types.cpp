@@ -13,7 +13,7 @@ using namespace vorn;
 namespace {
 
 // The member types of every table that was asked for.
-// Kept(MemberTypes.OfTheFirstDefinitionHoldForEveryHandle): the first definition under a table name
+// Kept(MemberTypes.KeepTheFirstDefinitionForEveryHandle): the first definition under a table name
 // wins
 struct Cache {
     Json::Value jType;
@@ -31,7 +31,7 @@ bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
     if (FAILED(!jTableDef[strJsonName].isObject())) return false;
     if (FAILED(!jTableDef[strJsonName].isMember("member"))) return false;
     if (FAILED(!jTableDef[strJsonName]["member"].isObject())) return false;
-    // Kept(FirstMemberTypes.OfAnEmptyNameFailAfterTheLookUps): an empty table name is refused only
+    // Kept(MemberTypes.RefuseAnEmptyNameAfterTheLookUps): an empty table name is refused only
     // after the look-ups
     return !FAILED(strJsonName.empty());
 }
@@ -58,7 +58,7 @@ bool readMembers(Json::Value& jTableDef, std::string& strJsonName, Json::Value& 
 }
 
 // Fills the table's entry.
-// Kept(MemberTypes.OfABadDefinitionAreReportedAndStayAsTheyAre): a bad definition leaves a null or
+// Kept(MemberTypes.KeepTheEntryOfABadDefinition): a bad definition leaves a null or
 // partial entry for the life of the process
 bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jType)
 {

@@ -18,7 +18,7 @@ static_assert(sizeof(long) <= sizeof(time_t));
 
 int VORN_JSON_DB::getTimeAfterNow(int offsetSecond, long& now)
 {
-    // Kept(TimeAfterNow.DoesNotLookWhetherTheClockFails): a clock that fails counts as the second
+    // Kept(TimeAfterNow.IgnoresAFailingClock): a clock that fails counts as the second
     // before the epoch
     //
     // Beyond a long, as after 2038 where it has 32 bits, the sum wraps.
@@ -41,7 +41,8 @@ int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, i
             return -1;
     }
     if (iType & kGmtLayout) {
-        // Kept(TimeText.EveryBitSet): local time too may be followed by the letters GMT
+        // Kept(TimeText.ReadsOnlyTheThreeLowestBits): local time too may be followed by the letters
+        // GMT
         if (FAILED(0 == strftime(szTime, sizeof(szTime), "%a, %d %b %Y %T GMT", &sTime))) return -1;
     } else if (iType & kNumericLayout) {
         if (FAILED(0 == strftime(szTime, sizeof(szTime), "%Y-%m-%d %H:%M:%S", &sTime))) return -1;

@@ -64,7 +64,10 @@ TEST(Documentation, NamesScriptsThatExist)
 {
     std::string strPages;
     for (const std::string& strPage : pages()) strPages += fileText(strPage);
-    const auto commands = matches(strPages, R"(scripts/[\w-]+|\.ci/run)", {0});
+    const auto commands = matches(
+        strPages,
+        R"((?:scripts/|contrib/scale-out/)(?:(?:dev|release)/)?[a-z][a-z-]*(?![\w./-])|\.ci/run)",
+        {0});
     EXPECT_FALSE(commands.empty());
     for (const std::string& strCommand : commands)
         EXPECT_EQ(0, access((VORN_DOCS "/../" + strCommand).c_str(), X_OK)) << strCommand;

@@ -121,7 +121,7 @@ protected:
 // The last row of the first table is of any other word.
 TEST_F(TypesPage, ListsEveryTypeWord)
 {
-    Cells words = matches(folderText("src"), R"re(\{"([^"]+)",\s*Decode::)re");
+    Cells words = matches(folderText("src"), R"re(\{"([^"]+)",\s*RowForm::)re");
     ASSERT_EQ(words.size() + 1, tables_[0].rows.size());
     for (std::size_t i = 0; i < words.size(); ++i) EXPECT_EQ(words[i], tables_[0].rows[i][0]);
 }

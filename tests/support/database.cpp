@@ -127,12 +127,14 @@ Json::Value Table::create(const std::string& strRecord)
 HostTest::HostTest()
 {
     doubles::reset();
+    blLogToStdout = blDebugOutput = false;
     errno = 0;
 }
 
 HostTest::~HostTest()
 {
     doubles::reset();
+    blLogToStdout = blDebugOutput = false;
 }
 
 std::vector<std::string> HostTest::takeStatements()

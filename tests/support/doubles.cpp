@@ -28,7 +28,6 @@ State& state()
 void reset()
 {
     state() = State();
-    blLogToStdout = blDebugOutput = false;
 }
 
 char* errorText(const char* szText)

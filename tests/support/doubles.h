@@ -53,7 +53,7 @@ struct State {
 
 State& state();
 
-// Back to passing every call on, with nothing recorded and the flags of the log unset.
+// Back to passing every call on, with nothing recorded.
 void reset();
 
 // Is shown every line of the whole program, whatever is reset.
