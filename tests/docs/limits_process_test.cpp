@@ -225,6 +225,7 @@ TEST_F(Limits, GlobalLocaleWithADecimalComma)
     const std::locale before = std::locale::global(std::locale(std::locale(), new DecimalComma));
     EXPECT_EQ(blByLocale ? R"({"o":{"rate":null}})" : text(jFraction), create(jFraction));
     EXPECT_EQ(text(jText), create(jText));
+    EXPECT_EQ(R"({"o":{"n":12345}})", create(json(R"({"o":{"n":12345}})")));
     EXPECT_EQ(Lines(), takeLog());
     std::locale::global(before);
     EXPECT_EQ(text(jFraction), create(jFraction));

@@ -78,6 +78,7 @@ TEST_F(Limits, PercentBeforeOtherMembers)
 
     EXPECT_EQ(0, updated(api_, R"({"id":1})", R"({"lang":"50%s"})"));
     EXPECT_EQ(R"({"id":1,"lang":"50%s","text":"x"})", stored(1));
+    EXPECT_EQ(0, updated(api_, R"({"lang":"50%s"})", R"({"id":1})"));
 }
 
 TEST_F(Limits, RecordNeedsItsLastMember)
@@ -131,18 +132,34 @@ TEST_F(Limits, ArrayMemberIsNotUpdatedByFilter)
 
 TEST_F(Limits, MinusOneDoesNotMeanNotWritten)
 {
-    for (const char* szColumns : {"id integer primary key) without rowid --",
-                                  "id integer primary key, undeclared default 'x'"}) {
-        SCOPED_TRACE(szColumns);
-        Table table(database_, R"({"id":{"cpptype":"int"}})", szColumns);
+    const struct {
+        const char* szWord;
+        const char* szColumns;
+        const char* szTrigger;
+    } cases[] = {
+        {"int", "id integer primary key) without rowid --", ""},
+        {"int", "id integer primary key, undeclared default 'x'", ""},
+        {"int", "id integer primary key", "update $ set id = new.id + 10;"},
+        {"int", "id integer primary key", "delete from $;"},
+        {"double", "id real", ""},
+    };
+    for (const auto& row : cases) {
+        SCOPED_TRACE(std::string(row.szWord) + " " + row.szColumns + " " + row.szTrigger);
+        Table table(database_, std::string(R"({"id":{"cpptype":")") + row.szWord + R"("}})",
+                    row.szColumns);
+        if ('\0' != row.szTrigger[0])
+            database_.run(replaced(
+                std::string("create trigger g$ after insert on $ begin ") + row.szTrigger + " end",
+                R"(\$)", table.strName));
+        const bool blDeletes = 'd' == row.szTrigger[0];
         const std::string strCount = "select count(*) from " + table.strName;
         EXPECT_EQ("-1", saved(table.api, R"({"id":1})"));
-        EXPECT_EQ("1", database_.value(strCount));
+        EXPECT_EQ(blDeletes ? "0" : "1", database_.value(strCount));
 
         EXPECT_LE(0, table.api.runSqlEx(example(0, "sql")));
         EXPECT_EQ("-1", saved(table.api, R"({"id":2})"));
         EXPECT_LE(0, table.api.runSqlEx("rollback"));
-        EXPECT_EQ("1", database_.value(strCount));
+        EXPECT_EQ(blDeletes ? "0" : "1", database_.value(strCount));
         takeLog();
     }
 }
