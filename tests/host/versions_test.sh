@@ -59,7 +59,7 @@ rm -rf "$work"
 jsoncpp_version=$(lowest JSONCPP)
 sqlite_version=$(lowest SQLITE)
 cmake_version=$(sed -nE 's/^cmake_minimum_required\(VERSION ([0-9.]+)\)$/\1/p' "$source/CMakeLists.txt")
-grep -qF "jsoncpp ($jsoncpp_version or later), SQLite ($sqlite_version or later), CMake ($cmake_version or later)" \
+grep -qF "jsoncpp $jsoncpp_version, SQLite $sqlite_version, CMake $cmake_version and" \
     "$source/README.md" || fail "the README has other versions"
 
 configures "$jsoncpp_version" "$sqlite_version" || { cat "$work/log"; fail "the lowest versions do not do"; }

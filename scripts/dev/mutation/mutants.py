@@ -25,18 +25,22 @@ class Mutant:
         self.path = path
         self.line = source.text.count("\n", 0, begin) + 1
         self.column = begin - line_begin + 1
-        self.code = code_of(source.text.splitlines(), self.line - 1)
+        lines = source.text.splitlines()
+        self.code = lines[self.line - 1].split("  //")[0].strip()
+        self.place = f"{path}, {scope_of(lines, self.line - 1)}"
         self.change = f"{shown(source.text[begin:end])} -> {shown(new)}"
         self.text = mutated(source, begin, end, new)
         self.key = hashlib.sha256((path + "\n" + self.text).encode()).hexdigest()
         self.is_guard = "GUARDED" in self.code
 
 
-def code_of(lines, index):
-    """The line without its indentation, and which one it is when the same stands there again."""
-    code = lines[index].strip()
-    same = [i for i, line in enumerate(lines) if line.strip() == code]
-    return f"{code} ({same.index(index) + 1} of {len(same)})" if 1 < len(same) else code
+def scope_of(lines, index):
+    """The name of the function, type or constant that has the line."""
+    for line in reversed(lines[:index + 1]):
+        name = re.match(r"(?=[A-Za-z\[]).*?(?:(?:class|struct) (\w+)|(~?\w+)[({\[]|(\w+) =)", line)
+        if name:
+            return next(filter(None, name.groups()))
+    return "-"
 
 
 def shown(text):

@@ -97,7 +97,7 @@ def judge_all(pending, state, build, workers, paths):
 
 
 def listed_survivors():
-    """(file, line of code, change) of each survivor that is known, with the reason."""
+    """(file and function, line of code, change) of each survivor that is known, with the reason."""
     reasons = {}
     places, changes = [], []
     with open(LISTED) as file:
@@ -116,7 +116,7 @@ def listed_survivors():
 
 
 def place(mutant):
-    return mutant.path, mutant.code, mutant.change
+    return mutant.place, mutant.code, mutant.change
 
 
 def report(chosen, found, guards, state):
@@ -143,7 +143,7 @@ def report(chosen, found, guards, state):
     alive = {place(mutant) for mutant in survivors}
     # A sample does not tell about the others.
     unknown = {place(mutant) for of_file in found.values() for mutant in of_file if results.get(mutant.key) is None}
-    stale = [listed for listed in reasons if listed[0] in found and listed not in alive | unknown]
+    stale = [listed for listed in reasons if listed[0].split(",")[0] in found and listed not in alive | unknown]
     for listed in stale:
         print("listed, but no survivor: " + ": ".join(listed))
     score = 100 * (len(valid) - len(survivors)) / len(valid) if valid else 0
