@@ -3,8 +3,7 @@
 // texts from malloc and throws Json::RuntimeError when there is none. After each the handle works
 // and no statement is open. Prints how each attempt ended; the status tells which check failed.
 
-#include <VornJsonDbApi.h>
-#include <sqlite3.h>
+#include "task.h"
 
 #include <json/json.h>
 #include <cstdio>
@@ -39,34 +38,33 @@ Ending attempt(int iFail, Operation operation)
 {
     iMallocs = 0;
     iFailMalloc = iFail;
+    int iResult = 0;
+    Ending ending = kGood;
     try {
-        const int iResult = operation();
-        iFailMalloc = 0;
-        return 0 > iResult ? kMinusOne : kGood;
+        iResult = operation();
     } catch (const std::bad_alloc&) {
-        iFailMalloc = 0;
-        return kBadAlloc;
+        ending = kBadAlloc;
     } catch (const Json::RuntimeError&) {
-        iFailMalloc = 0;
-        return kRuntimeError;
+        ending = kRuntimeError;
     } catch (const std::logic_error&) {
-        iFailMalloc = 0;
-        return kLogicError;
+        ending = kLogicError;
     }
+    iFailMalloc = 0;
+    return 0 > iResult ? kMinusOne : ending;
 }
 
 // Each malloc in turn until none fails. The handle and the connection have to be sound in between.
 template <typename Operation>
-void failEach(const char* szName, sqlite3* pDb, VornJsonDbApi& api, Operation operation)
+void failEach(const char* szName, Task& task, Operation operation)
 {
     int endings[kEndings] = {};
     for (int iFail = 1;; ++iFail) {
         ++endings[attempt(iFail, operation)];
         if (iMallocs < iFail) break;
-        if (nullptr != sqlite3_next_stmt(pDb, nullptr)) exit(2);
+        if (nullptr != sqlite3_next_stmt(task.pDb, nullptr)) exit(2);
         Json::Value jAll;
         Json::Value jList;
-        if (0 != api.recList(jAll, jList) || 1 > jList.size()) exit(3);
+        if (0 != task.api().recList(jAll, jList) || 1 > jList.size()) exit(3);
     }
     printf("%s: %d good, %d refused, %d bad_alloc, %d RuntimeError, %d logic_error\n", szName,
            endings[kGood], endings[kMinusOne], endings[kBadAlloc], endings[kRuntimeError],
@@ -78,33 +76,19 @@ void failEach(const char* szName, sqlite3* pDb, VornJsonDbApi& api, Operation op
 
 int main()
 {
-    sqlite3* pDb = nullptr;
-    if (SQLITE_OK != sqlite3_open(":memory:", &pDb)) return 1;
-    std::string strName = "task";
-    std::string strCreate = "create table task (data text, id integer primary key, name text)";
-    Json::Value jDefinition;
-    jDefinition["task"]["member"]["data"]["cpptype"] = "Json::objectValue";
-    jDefinition["task"]["member"]["id"]["cpptype"] = "int";
-    jDefinition["task"]["member"]["name"]["cpptype"] = "string";
-    {
-        VornJsonDbApi api(pDb, strName, jDefinition, strCreate);
-        Json::Value jRecord;
-        jRecord["data"]["a key that is long"] = "a text that is longer than a short string";
-        jRecord["id"] = 1;
-        jRecord["name"] = "a name that is longer than a short string";
-        if (0 != api.recSave(jRecord, true)) return 1;
-        failEach("save", pDb, api, [&] {
-            Json::Value jCopy = jRecord;
-            return api.recSave(jCopy, false);
-        });
-        failEach("list", pDb, api, [&] {
-            Json::Value jAll;
-            Json::Value jList;
-            const int iResult = api.recList(jAll, jList);
-            // A list that succeeds lacks nothing.
-            if (0 == iResult && jRecord != jList[0]) exit(6);
-            return iResult;
-        });
-    }
-    return SQLITE_OK == sqlite3_close(pDb) ? 0 : 5;
+    Task task;
+    Json::Value jRecord = Task::record(1);
+    if (0 != task.api().recSave(jRecord, true)) return 1;
+    failEach("save", task, [&] {
+        Json::Value jCopy = jRecord;
+        return task.api().recSave(jCopy, false);
+    });
+    failEach("list", task, [&] {
+        Json::Value jAll;
+        Json::Value jList;
+        const int iResult = task.api().recList(jAll, jList);
+        // A list that succeeds lacks nothing.
+        if (0 == iResult && jRecord != jList[0]) exit(6);
+        return iResult;
+    });
 }

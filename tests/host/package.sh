@@ -40,10 +40,11 @@ installed() {
     libdir=$(dirname "$(cd "$2" && find . -name 'libvornjsondb.so' -o -name 'libvornjsondb.a')")
 }
 
-# lists FOLDER FILE: below the folder is what the file of tests/host names, with LIBDIR for that of the library.
+# lists FOLDER [EDIT]: below the folder is what installed.txt, edited by sed, names, with LIBDIR for that of the library.
 lists() {
     (cd "$1" && find . ! -type d | sed "s|^$libdir/|LIBDIR/|; s|^\./||" | LC_ALL=C sort) >"$work/installed"
-    same "the list of installed files" "$source/tests/host/$2" "$work/installed"
+    sed "${2:-}" "$part/installed.txt" >"$work/to_install"
+    same "the list of installed files" "$work/to_install" "$work/installed"
     if grep -rlF -e "$source" -e "$work" "$1"; then fail "a path of the build was installed"; fi
 }
 

@@ -11,7 +11,7 @@ sqlite=$(find /usr/lib /usr/local/lib -name libsqlite3.a -print -quit)
 
 built "$work/build" -DBUILD_SHARED_LIBS=OFF
 installed "$work/build" "$work/moved"
-lists "$work/moved" installed_static.txt
+lists "$work/moved" '/\.so\./d; s/\.so$/.a/'
 library=$work/moved/$libdir/libvornjsondb.a
 
 # A host's global may be older than whatever the library would initialise.

@@ -32,10 +32,15 @@ text_of() { cat "$1"; printf .; }
 # lines TEXT: the text as a program prints it, and the dot
 lines() { printf '%s' "$1${1:+$'\n'}."; }
 
-# expect STATUS STDOUT STDERR ARGUMENT...: runs the program
+# run ARGUMENT...: the program; sets $status and leaves what it prints in the files out and err
+run() {
+    status=0
+    "$program" "$@" >out 2>err || status=$?
+}
+
+# expect STATUS STDOUT STDERR ARGUMENT...
 expect() {
-    local status=0
-    "$program" "${@:4}" >out 2>err || status=$?
+    run "${@:4}"
     same "exit status: ${*:4}" "$1" "$status"
     same "standard output: ${*:4}" "$(lines "$2")" "$(text_of out)"
     same "standard error: ${*:4}" "$(lines "$3")" "$(text_of err)"
@@ -50,8 +55,17 @@ refused() {
     same "integrity: ${*:3}" ok "$(sqlite3 "$1" 'pragma integrity_check')"
 }
 
-# rows DATABASE TABLE EXPECTED: the table's rows in the shell's list form
-rows() { same "rows of $2" "$3" "$(sqlite3 "$1" "select * from $2 order by rowid")"; }
+# on DATABASE TABLE.json: what the commands that follow work with
+on() { database=$1 table=$2; }
+
+# prints STDOUT COMMAND ARGUMENT...
+prints() { expect 0 "$1" '' "$database" "$table" "${@:2}"; }
+
+# fails MESSAGE COMMAND ARGUMENT...
+fails() { refused "$database" "records: $2: $1" "$database" "$table" "${@:2}"; }
+
+# rows EXPECTED: those of the table that its file is named after, in the shell's list form
+rows() { same "rows of $table" "$1" "$(sqlite3 "$database" "select * from ${table%.json} order by rowid")"; }
 
 # what a message says when only the log knows the reason
 log='failed (-v shows the log)'
