@@ -28,10 +28,10 @@ struct FormatArgument {
 //
 //     text = sqlite3_mprintf(text + conversion, value)
 //
-// with the whole text so far, stored values included, as the format; so a "%" in an earlier value
-// is read as a conversion of its own by every later one. This class gives the same bytes wherever C
-// defines them, in linear time while the text holds no "%", and without reading arguments that were
-// never passed where it does. formatted_text.cpp has the rules.
+// with the whole text so far, stored values included, as the format; so every later value reads a
+// "%" in an earlier one as a conversion of its own. This class gives the same bytes wherever C
+// defines them and no width exceeds a limit, in linear time while the text has no "%", and
+// otherwise without reading arguments that were never passed. formatted_text.cpp has the rules.
 class FormattedText {
 public:
     explicit FormattedText(const std::string& strText);

@@ -39,6 +39,7 @@ int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
             return -1;
         }
         const Json::Value* pjDefault = findMember(*it, "cppDefaultValue");
+        // The walk goes on: what is inserted sorts before all that it has yet to visit.
         if (nullptr != pjDefault && (jParam.isNull() || jParam.isObject()))
             jParam[std::string(strKey)] = Json::Value(*pjDefault);
     }

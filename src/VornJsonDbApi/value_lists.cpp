@@ -81,6 +81,7 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
 int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
 {
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    // A copy: sql changes only when every member is written.
     FormattedText text(sql);
     const Json::Value& jMembers = declaredMembers(jTableDef, strName);
     MemberWalk types(jType);
