@@ -2,6 +2,7 @@
 // The look-ups of member types behind every operation, on types that are missing, of a wrong kind
 // or partial: the result, the whole log and what is left in the table.
 
+#include "support/lookups.h"
 #include "lookup_cases.h"
 
 #include <map>
@@ -9,30 +10,9 @@
 
 namespace {
 
-const std::string kPoisoned = "jType[strJsonName].type() != Json::objectValue";
 const std::string kNoWord = R"(!jTableDef[strJsonName]["member"][strKey].isMember("cpptype"))";
 const std::string kWordIsNoText =
     R"(!jTableDef[strJsonName]["member"][strKey]["cpptype"].isString())";
-
-const struct {
-    const char* szDefinition;
-    const char* szLater;  // after the column list looked for its members
-    const char* szCondition;
-} kBadDefinitions[] = {
-    {"null", R"({"$":{"member":null}})", "jTableDef.empty()"},
-    {"{}", R"({"$":{"member":null}})", "jTableDef.empty()"},
-    {"[]", "[]", "jTableDef.empty()"},
-    {R"(["$"])", R"(["$"])", "!jTableDef.isMember(strJsonName)"},
-    {R"({"-":{}})", R"({"-":{},"$":{"member":null}})", "!jTableDef.isMember(strJsonName)"},
-    {R"({"$":null})", R"({"$":{"member":null}})", "!jTableDef[strJsonName].isObject()"},
-    {R"({"$":"member"})", R"({"$":"member"})", "!jTableDef[strJsonName].isObject()"},
-    {R"({"$":{"x":1}})", R"({"$":{"member":null,"x":1}})",
-     R"(!jTableDef[strJsonName].isMember("member"))"},
-    {R"({"$":{"member":["a"]}})", R"({"$":{"member":["a"]}})",
-     R"(!jTableDef[strJsonName]["member"].isObject())"},
-    {R"({"$":{"member":{}}})", R"({"$":{"member":{}}})",
-     "jType == Json::nullValue || !jType.isMember(strJsonName)"},
-};
 
 std::string typesOf(const std::string& strA)
 {
@@ -46,14 +26,6 @@ std::string defined(const std::string& strMembers)
 
 const std::string kWhole = defined(typesOf(R"({"cpptype":"string"})"));
 
-// Four lines of a look-up that fails; the entry of the table, or "-" where there is none.
-Lines lookUp(const std::string& strCondition, const std::string& strDefinition,
-             const std::string& strEntry)
-{
-    return {utilFailed(strCondition), utilPlain("strJsonName=$"),
-            utilPlain("jTableDef=" + strDefinition), utilPlain("jType=" + strEntry)};
-}
-
 // The types that calls meet.
 struct Types {
     std::string strDefinition;
@@ -64,7 +36,7 @@ struct Types {
     bool blByHost = false;          // has put the entry there before the call
 };
 
-class LookUps : public TableTest {
+class LookUps : public LookUpsTest {
 protected:
     // Each call on a table of its own, and once more where later look-ups log other lines.
     void expect(const Cases& cases, const Types& types)
@@ -91,15 +63,7 @@ protected:
         return pApi;
     }
 
-    void expectLog(const Lines& expected)
-    {
-        Lines named;
-        for (const std::string& strLine : expected)
-            named.push_back(replaced(strLine, '$', strName_));
-        EXPECT_EQ(named, takeOwnLog());
-    }
-
-    std::string strName_ = freshName();
+    void expectLog(const Lines& expected) { EXPECT_EQ(named(expected), takeOwnLog()); }
 
 private:
     void expectCall(const Case& c, const std::string& strCall, VornJsonDbApi& api,
@@ -127,23 +91,6 @@ private:
         }
         expectLog(expected);
         EXPECT_EQ(c.szRows, database_.value("select group_concat(a||b||c) from " + strName_));
-    }
-
-    // The log. A dump of all tables' types is reduced to the entry of this table.
-    Lines takeOwnLog()
-    {
-        const std::string strDump = utilPlain("jType=");
-        const std::string strKey = '"' + strName_ + "\":";
-        Lines lines = takeLog();
-        for (std::string& strLine : lines) {
-            if (0 != strLine.compare(0, strDump.size(), strDump)) continue;
-            const std::size_t nKey = strLine.find(strKey);
-            // The reader leaves what follows the entry.
-            strLine = strDump + (std::string::npos == nKey
-                                     ? "-"
-                                     : text(leftByReader(strLine.substr(nKey + strKey.size()))));
-        }
-        return lines;
     }
 };
 

@@ -5,7 +5,6 @@
 #include "support/database.h"
 
 #include <iostream>
-#include <utility>
 
 // The result of a call, or "T" where it throws Json::LogicError. Anything else that is thrown fails
 // the test.
@@ -29,19 +28,6 @@ void expectSound(Database& database, VornJsonDbApi& api, const std::string& strR
 // Ends the process of a death test, with 0 unless a check has failed. Its fixture is never
 // destroyed, so the file of the database goes here.
 [[noreturn]] void endProcess(const Database& database);
-
-// While it lives, the lines of the log are not shown to EveryMessage, which searches each for every
-// text that no line has had yet: thousands of lines would take their time.
-class UnwatchedLog {
-public:
-    UnwatchedLog() : before_(std::exchange(doubles::onEveryLine, nullptr)) {}
-    ~UnwatchedLog() { doubles::onEveryLine = before_; }
-    UnwatchedLog(const UnwatchedLog&) = delete;
-    UnwatchedLog& operator=(const UnwatchedLog&) = delete;
-
-private:
-    void (*before_)(const std::string& strText);
-};
 
 // A line for the table of figures.
 inline void printFigure(const std::string& strName, std::size_t nNumber)

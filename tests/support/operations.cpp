@@ -39,7 +39,7 @@ Json::Value Operation::untouched() const
 }
 
 Lines Operation::failure(const Table& table, const std::string& strError, const std::string& strSql,
-                         int nRetries) const
+                         std::size_t nRetries) const
 {
     const Json::Value jArguments = json(szArguments);
     const std::string strFirst = text(jArguments["first"]);

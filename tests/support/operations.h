@@ -36,7 +36,7 @@ struct Operation {
     Json::Value untouched() const;
     // The whole log where the statement failed with that error after so many retries.
     Lines failure(const Table& table, const std::string& strError, const std::string& strSql,
-                  int nRetries = 0) const;
+                  std::size_t nRetries = 0) const;
 
     bool is(const std::string& strFunction) const;
     friend std::ostream& operator<<(std::ostream& out, const Operation& operation)

@@ -92,7 +92,7 @@ Lines RecordsTest::expectedLog(const Call& call, const Outcome& outcome, const s
     }
     lines = lines + outcome.causes;
     if (!outcome.strError.empty()) {
-        lines.push_back(runFailed(strHeld, outcome.strSql, static_cast<int>(nRetries_)));
+        lines.push_back(runFailed(strHeld, outcome.strSql, nRetries_));
         if (blDebugOutput)
             lines.push_back(
                 plain("run sql fail, err=" + ("Unknow Error!!" == strHeld ? "(null)" : strHeld)));

@@ -8,9 +8,9 @@
 
 // The lines of a statement that SQLite refused, and of the operation that knows its text.
 inline std::string runFailed(const std::string& strError, const std::string& strSql,
-                             int iAttempts = 0)
+                             std::size_t nAttempts = 0)
 {
-    return plain("i=" + std::to_string(iAttempts) + ",errno=?, run sql failed, error=" + strError +
+    return plain("i=" + std::to_string(nAttempts) + ",errno=?, run sql failed, error=" + strError +
                  ", sql=" + strSql);
 }
 

@@ -65,13 +65,6 @@ doubles::Exec execCalledLocked(int nTimes)
     };
 }
 
-std::string runFailedLine(const std::string& strError, const std::string& strSql,
-                          std::size_t nLocked)
-{
-    return plain("i=" + std::to_string(nLocked) + ",errno=?, run sql failed, error=" + strError +
-                 ", sql=" + strSql);
-}
-
 Lines fieldFailed(const std::string& strFirst)
 {
     return {strFirst,
@@ -87,7 +80,7 @@ Lines statementStopped(Lines lines, const Row& row)
         lines.push_back(plain("column_value" + strPlace + shown(row.values.back())));
     }
     lines.push_back(failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)"));
-    lines.push_back(runFailedLine("query aborted", "a text"));
+    lines.push_back(runFailed("query aborted", "a text"));
     return lines;
 }
 

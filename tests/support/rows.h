@@ -2,7 +2,7 @@
 // What the tests of running statements and decoding rows share.
 #pragma once
 
-#include "support/database.h"
+#include "support/records.h"
 
 #include <optional>
 #include <string>
@@ -43,10 +43,6 @@ inline doubles::Exec execOfStatus(int iStatus, const char* szError)
 
 // A double of sqlite3_exec that runs the text, and calls it locked that many times.
 doubles::Exec execCalledLocked(int nTimes);
-
-// The line of a statement that failed after so many locked attempts.
-std::string runFailedLine(const std::string& strError, const std::string& strSql,
-                          std::size_t nLocked = 0);
 
 // The lines of a column that cannot be decoded, and those of a statement that the last column of a
 // row stops. It is shown, unless it is the first.

@@ -13,7 +13,7 @@ protected:
     static Lines createFailed(const std::string& strError, const std::string& strSql,
                               Lines lines = {})
     {
-        lines.push_back(runFailedLine(strError, strSql));
+        lines.push_back(runFailed(strError, strSql));
         lines.push_back(error("create table failed, sql=" + strSql));
         if (!strError.empty())
             lines.push_back(plain("sql error, err=" + strError + ", sql=" + strSql));

@@ -124,7 +124,7 @@ TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
     using Case = std::pair<std::string, std::string>;
     for (const auto& [strSql, strFirst] :
          {Case{"select 1 as i; select 2 as i; select 3 as x; select 4 as i", kUndeclared},
-          {strBad, runFailedLine("near \"no\": syntax error", strBad)},
+          {strBad, runFailed("near \"no\": syntax error", strBad)},
           {"select 1 as i, null as d union all select 2, null union all select 3, 0.5", kOfADouble},
           {"select null as d, 1 as i union all select null, 2 union all select 1.5, 3",
            kOfADouble}}) {
@@ -164,7 +164,7 @@ TEST_F(RowDecoder, MakesAMemberNullThatIsNestedTooDeep)
 
 TEST_F(RowDecoder, AppendsToNothingButAnArray)
 {
-    const std::string strStopped = runFailedLine("query aborted", "a text");
+    const std::string strStopped = runFailed("query aborted", "a text");
     state().exec = execOfRows({kRow});
     EXPECT_EQ(-1, table_.api.runSqlEx("a text", callback_, nullptr));
     EXPECT_EQ((Lines{failed("!pjRecArray"), strStopped}), takeLog());

@@ -61,7 +61,7 @@ protected:
                 lines.push_back(plain("retry, i=" + std::to_string(i) +
                                       ", errno=?, run sql failed, error=" + traced(i) +
                                       ", sql=a text"));
-            if (0 > iResult) lines.push_back(runFailedLine(strError, "a text", nLocked));
+            if (0 > iResult) lines.push_back(runFailed(strError, "a text", nLocked));
             if (0 > iResult && blDebug)
                 lines.push_back(plain(std::string("run sql fail, err=") + traced(nLocked)));
 
@@ -122,8 +122,8 @@ TEST_F(Execution, HandsRowsToTheCallbackWithoutCountingChanges)
                             {"select a from $ where a=7", "", {}},
                             {"update $ set a=a+1", "", {}},
                             {";", "", {}},
-                            {strStopped, "x=stop;", {runFailedLine("query aborted", strStopped)}},
-                            {strBad, "", {runFailedLine("near \"no\": syntax error", strBad)}}}) {
+                            {strStopped, "x=stop;", {runFailed("query aborted", strStopped)}},
+                            {strBad, "", {runFailed("near \"no\": syntax error", strBad)}}}) {
         std::string strRows;
         const std::string strSql = in(row.strSql);
         EXPECT_EQ(row.lines.empty() ? 0 : -1, table_.api.runSqlEx(strSql, collect, &strRows));
@@ -161,7 +161,7 @@ TEST_F(Execution, ReportsAnEmptyTextWithoutRunningIt)
         errno = EACCES;
         EXPECT_EQ(-1, table_.api.runSqlEx("", blDebug ? collect : nullptr));
         EXPECT_EQ(EACCES, state().log.at(1).iErrno);
-        Lines lines = {failed("0 >= strSql.length()"), runFailedLine(kUnknown, "")};
+        Lines lines = {failed("0 >= strSql.length()"), runFailed(kUnknown, "")};
         if (blDebug) lines.push_back(plain("run sql fail, err=(null)"));
         EXPECT_EQ(lines, takeLog());
         EXPECT_EQ(Lines(), takeStatements());
@@ -260,7 +260,7 @@ TEST_F(Retry, WaitsForAnotherConnection)
     const std::string strSql = "delete from " + table.strName;
     EXPECT_EQ(-1, table.api.runSqlEx(strSql));
     EXPECT_EQ(sleeps(kMaxAttempts), state().sleeps);
-    EXPECT_EQ(Lines{runFailedLine("database is locked", strSql, kMaxAttempts)}, takeLog());
+    EXPECT_EQ(Lines{runFailed("database is locked", strSql, kMaxAttempts)}, takeLog());
     EXPECT_EQ(R"({"a":5})", text(table.create(R"({"a":5})")));
     EXPECT_EQ(sleeps(kMaxAttempts + 100), state().sleeps);
     EXPECT_EQ(kMaxAttempts + 101, takeStatements().size());

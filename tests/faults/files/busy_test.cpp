@@ -137,7 +137,7 @@ TEST_P(BusyAt, LockIsTriedAgainFromTheStart)
                                    : tested.untouched(),
               jOutput_);
     EXPECT_EQ(tested.is("recCreate") ? held.nTimes : 0, nAdded(kStoredRow));
-    const int nRetries = 500 == held.nAttempts ? 500 : static_cast<int>(held.nAttempts) - 1;
+    const std::size_t nRetries = 500 == held.nAttempts ? 500 : held.nAttempts - 1;
     EXPECT_EQ(
         0 == held.iResult ? Lines() : tested.failure(host_.table, held.szError, strSql_, nRetries),
         takeLog());
