@@ -2,10 +2,8 @@
 // Calls on types that are missing, of a wrong kind or partial, and every line that each logs.
 #pragma once
 
-#include "calls.h"
+#include "support/matrix.h"
 #include "support/records.h"
-
-#include <map>
 
 // In the expected lines: a look-up of the operation, one before the operation has listed columns,
 // and one of the row decoder, which has no definition. Each stands for the lines that it logs.
@@ -19,78 +17,13 @@ inline constexpr char kRows[] = "xyz,uvw";
 struct Case {
     std::string strCalls;        // between bars
     const char* szEnd;           // the result and the output, if it changes
-    Lines lines;                 // up to the failed check; kAfter tells what follows
+    Lines lines;                 // up to the failed check
     const char* szRows = kRows;  // of the table afterwards
     // The statement that SQLite refuses, and why.
     std::string strSql = "";
     std::string strError = kNearWhere;
 };
 using Cases = std::vector<Case>;
-
-// Parts of the lines below, of which those with a "!" stand for a refused statement alone.
-inline const std::string kRefused = "!statement";
-inline const std::string kError = "!error";
-inline const Lines kListed = {kRefused,
-                              failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
-                              plain("jRecParam=<1>"), kError};
-inline const std::string kUpdated = failed("0 > runSqlEx(strSql, NULL, NULL)");
-inline const std::string kSaved = failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)");
-inline const std::string kCreated = plain("call create rec, rec=<1>");
-
-// What each operation logs after the failed check or statement. <1> is an argument; recCreate gets
-// its record with the defaults as its second one.
-inline const std::map<std::string, Lines> kAfter = {
-    {"recList", kListed},
-    {"recGetOne", kListed + Lines{failed("0 > recList(jRecParam, jRecArray)")}},
-    {"recDelete", {kRefused, "!" + failed("0 > (err = runSqlEx(strSqlRun))"), kError}},
-    {"recDeleteByArray", {plain("recDeleteByArray failed, name=<2>, strVector=x")}},
-    {"recDeleteByName", {plain("recDeleteByName failed, name=<2>, strValue=x")}},
-    {"recUpdateByWhere", {kRefused, kUpdated, plain("jRecIn=<1>"), kError}},
-    {"recUpdateByFilter",
-     {kRefused, "!" + kUpdated, "!" + plain("jRecIn=<2>"), kError,
-      "!" + failed("0 > recUpdateByWhere(jParamIn, strSql)"),
-      plain("recUpdateByFilter failed, jParamIn=<2>")}},
-    {"recSave",
-     {kRefused, "!" + kSaved, plain("blCreate=<2>, jRecInOut=<1>"), plain("jType=<types>"),
-      kError}},
-    {"recCreate",
-     {kRefused, "!" + kSaved, plain("blCreate=1, jRecInOut=<2>"), plain("jType=<types>"), kError,
-      failed("0 > recSave(jParam, true)"), plain("call create rec, rec=<2>")}},
-    {"recCreate {}", {kCreated}},
-    {"recCreate [1]", {kCreated}},
-};
-
-// Every line of the call, which finds those types.
-inline Lines linesOf(const Case& c, const std::string& strCall, const std::string& strTypes)
-{
-    std::map<std::string, std::string> texts = {{"<types>", strTypes}};
-    const std::vector<std::string> words = split(strCall, ' ');
-    for (std::size_t i = 1; i < words.size(); ++i) texts["<" + std::to_string(i) + ">"] = words[i];
-    if ("recSave" == words[0]) texts["<2>"] = "insert" == words[2] ? "1" : "0";
-    const auto own = kAfter.find(strCall);
-    const auto after = kAfter.end() == own ? kAfter.find(words[0]) : own;
-    Lines lines = c.lines;
-    if (kAfter.end() == after || '-' != c.szEnd[0]) return lines;
-    for (std::string strLine : after->second) {
-        if ('!' == strLine[0] && c.strSql.empty()) continue;
-        if (kRefused == strLine) strLine = runFailed(c.strError, c.strSql);
-        if (kError == strLine) strLine = sqlError(c.strError, c.strSql);
-        if ('!' == strLine[0]) strLine.erase(0, 1);
-        for (const auto& [strName, strText] : texts)
-            if (const std::size_t n = strLine.find(strName); std::string::npos != n)
-                strLine.replace(n, strName.size(), strText);
-        lines.push_back(strLine);
-    }
-    return lines;
-}
-
-// A row whose column the decoder refuses with that line; the first column is not traced.
-inline Lines rowRefused(const std::string& strLine, const Lines& traced = {})
-{
-    const char szField[] = "0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))";
-    return Lines{strLine, failed(szField)} + traced +
-           Lines{failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)")};
-}
 
 inline constexpr char kNoX[] = "no such column: x";
 inline constexpr char kAborted[] = "query aborted";
@@ -104,6 +37,7 @@ inline const Lines kNoField = {kLookUp, failed("!jType.isMember(strField)")};
 inline const Lines kNoListField = {kLookUp, failed("!jType.isMember(szField)")};
 inline const Lines kNoCondition = {kLookUp, failed("strSql.empty()")};
 inline const Lines kSave = {kLookUp, kLookUp};
+inline const Lines kRefusedA = rowRefused(fieldFailed(kNoColumn));
 inline const Lines kCreate = {kLookUp, kEarlyLookUp, kEarlyLookUp, kLookUp};
 
 // clang-format off
@@ -133,7 +67,7 @@ inline const std::string kInto =
 inline const Cases kWithoutColumns = {
     {R"(recSave {"a":1} insert)", "-1", kSave, kRows, "INSERT" + kInto, kNearParenthesis},
     {R"(recSave {"a":1} replace)", "-1", kSave, kRows, "REPLACE" + kInto, kNearParenthesis},
-    {R"(recCreate {"a":1} {"a":1})", "-1", kCreate, kRows, "INSERT" + kInto, kNearParenthesis},
+    {R"(recCreate {"a":1})", "-1", kCreate, kRows, "INSERT" + kInto, kNearParenthesis},
     {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1", kFound, kRows, "SELECT  FROM $ ;",
      "near \"FROM\": syntax error"},
     {"SqlExpandMemberName", "0", {}},
@@ -143,18 +77,18 @@ inline const Cases kWithoutColumns = {
 // Of types that are no object and a definition with columns: none of them is found.
 inline const Cases kWithColumns = {
     {R"(recSave {"a":"x"} insert)", "-1", kSave + Lines{kNoKey, kNoValue}},
-    {R"(recCreate {"a":"x"} {"a":"x"})", "-1", kCreate + Lines{kNoKey, kNoValue}},
+    {R"(recCreate {"a":"x"})", "-1", kCreate + Lines{kNoKey, kNoValue}},
     {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1",
-     Lines{kLookUp, kDecoder} + rowRefused(kNoColumn), kRows, kSelect, kAborted},
+     Lines{kLookUp, kDecoder} + kRefusedA, kRows, kSelect, kAborted},
     {"SqlExpandMemberName", "0 a,b,c", {}},
     {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {kLookUp, kNoKey}},
 };
 
 // Of types that end before b; only the first look-up says so. What is asked of b is not asked.
 inline const Lines kRefusedB =
-    kFound + rowRefused(kNoColumn, {plain("column_name[1]=b"), plain("column_value[1]=y")});
+    kFound + rowRefused(fieldFailed(kNoColumn), {plain("column_name[1]=b"), plain("column_value[1]=y")});
 inline const Cases kWithPartialTypes = {
-    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2} {"a":"d","b":1,"c":2})", "-1",
+    {R"(recSave {"a":"n"} insert|recCreate {"b":1,"c":2})", "-1",
      {kLookUp, kNoKey, kNoValue}},
     {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {kLookUp, kNoKey}},
     {R"(recList {"a":"x"}|recGetOne {"a":"x"})", "-1", kRefusedB, kRows,
@@ -187,7 +121,7 @@ inline const Cases kWithPartialTypes = {
 inline const std::string kNoText = failed(R"(jType[szKey]["cpptype"].asString() != "string")");
 inline const std::string kNoCheck = error("type not found!!, key=a");
 inline const Cases kWithoutAWord = {
-    {R"(recList {"b":"y"}|recGetOne {"b":"y"})", "-1", rowRefused(error("type error, strType=")),
+    {R"(recList {"b":"y"}|recGetOne {"b":"y"})", "-1", rowRefused(fieldFailed(error("type error, strType="))),
      kRows, "SELECT a,b,c FROM $  WHERE  (b='y' );", kAborted},
     {R"(recList {"a":"x"})", "-1", {}, kRows, "SELECT a,b,c FROM $  WHERE  (a=x );", kNoX},
     {R"(recUpdateByFilter {"b":"y"} {"a":"n"})", "-1",

@@ -66,13 +66,25 @@ protected:
     void expectLog(const Lines& expected) { EXPECT_EQ(named(expected), takeOwnLog()); }
 
 private:
+    // Every line of the call.
+    static Lines linesOf(const Case& c, const Words& call, const Types& types)
+    {
+        const std::vector<Lines> levels =
+            levelsOf(call[0], argumentsOf(call), json(types.strEntry));
+        if (levels.empty() || '-' != c.szEnd[0]) return c.lines;
+        if (!c.strSql.empty())
+            return c.lines + Lines{runFailed(c.strError, c.strSql), levels[0][0]} +
+                   restOf(levels, 0, c.strError, c.strSql);
+        // An operation checks by itself, but recCreate leaves the values to recSave.
+        return c.lines + restOf(levels, kNoValue == c.lines.back() ? 0 : levels.size() - 1, "", "");
+    }
+
     void expectCall(const Case& c, const std::string& strCall, VornJsonDbApi& api,
                     const Types& types, bool blFirst)
     {
         database_.run("delete from " + strName_ + ";insert into " + strName_ +
                       " values ('x','y','z'),('u','v','w')");
-        const Ended ended = called(api, strCall);
-        EXPECT_EQ(c.szEnd, ended.whole());
+        EXPECT_EQ(c.szEnd, called(api, split(strCall, ' ')).whole());
         const auto again = [&](const std::string& strDefinition) {
             return '{' == types.strEntry[0] ? Lines()
                                             : lookUp(kPoisoned, strDefinition, types.strEntry);
@@ -84,7 +96,7 @@ private:
         lookUps[kLookUp] =
             blFirst ? lookUp(types.strCondition, types.strDefinition, types.strFirst) : later;
         Lines expected;
-        for (const std::string& strLine : linesOf(c, strCall, types.strEntry)) {
+        for (const std::string& strLine : linesOf(c, split(strCall, ' '), types)) {
             const auto look = lookUps.find(strLine);
             expected = expected + (lookUps.end() == look ? Lines{strLine} : look->second);
             if (kLookUp == strLine) look->second = later;
@@ -136,8 +148,9 @@ TEST_F(LookUps, FailOnTypesThatLackAColumn)
     };
     const char szCalls[] = "recList null|recGetOne null";
     for (const auto& [szEntry, traced] : cases)
-        expect({{szCalls, "-1", rowRefused(kNoColumn, traced), kRows, kSelect, kAborted}},
-               {kWhole, "", "", szEntry, "", true});
+        expect(
+            {{szCalls, "-1", rowRefused(fieldFailed(kNoColumn), traced), kRows, kSelect, kAborted}},
+            {kWhole, "", "", szEntry, "", true});
 }
 
 TEST_F(LookUps, TakeAMemberOfAWrongKindForOneOfAnUnknownWord)
@@ -157,7 +170,7 @@ TEST_F(LookUps, SucceedOnceTheHostHasRepairedTheEntry)
     expectLog(lookUp("jTableDef.empty()", "null", "-"));
     jEntry = json(typesOf(R"({"cpptype":"int"})"));
     const char szSave[] = R"(recSave {"a":1,"b":"y","c":"z"} insert)";
-    EXPECT_EQ("0", called(*pApi, szSave).strEnd);
+    EXPECT_EQ("0", called(*pApi, split(szSave, ' ')).strEnd);
     EXPECT_EQ(Lines(), takeLog());
 }
 

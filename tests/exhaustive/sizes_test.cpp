@@ -2,7 +2,7 @@
 // How wide, long and deep records may be. Each failed look-up of member types logs those of all
 // tables, so the tests of look-ups run before the wide tables here.
 
-#include "calls.h"
+#include "support/matrix.h"
 
 #include <pthread.h>
 #include <functional>
@@ -42,7 +42,9 @@ TEST_F(LargeRecords, MayHaveAsManyColumnsAsSqliteTakes)
     const Wide wide(kMaxColumns);
     const std::string& strRecord = wide.strRecord;
     Table table(database_, wide.strMembers, wide.strColumns);
-    const auto end = [&](const std::string& strCall) { return called(table.api, strCall).whole(); };
+    const auto end = [&](const std::string& strCall) {
+        return called(table.api, split(strCall, ' ')).whole();
+    };
     EXPECT_EQ("0 " + strRecord, end("recCreate " + strRecord + " {}"));
     EXPECT_EQ("1 " + strRecord, end("recGetOne null {}"));
     EXPECT_EQ("0", end("recSave " + strRecord + " insert"));
@@ -65,8 +67,8 @@ TEST_F(LargeRecords, MayNotHaveOneColumnMore)
     VornJsonDbApi api(database_.get(), strName, jDefinition, strCreate);
     EXPECT_EQ(plain("sql error, err=too many columns on " + strName + ", sql=" + strCreate),
               takeLog().at(2));
-    EXPECT_EQ("-1", called(api, "recCreate " + wide.strRecord).whole());
-    EXPECT_EQ("-1", called(api, "recList null").whole());
+    EXPECT_EQ("-1", called(api, {"recCreate", wide.strRecord}).whole());
+    EXPECT_EQ("-1", called(api, {"recList", "null"}).whole());
     EXPECT_LE(3U, takeLog().size());
     Table sound(database_, R"({"z":{"cpptype":"string"}})", "z");
     expectSound(database_, sound.api, R"({"z":"sound"})");

@@ -55,49 +55,66 @@ int jsonCopyMember(Call& call)
     return VORN_JSON_DB::jsonCopyMember(call.jFirst, call.jSecond, call.blFlag);
 }
 
-using Named = std::pair<const std::string, Call::Function>;
-#define METHOD(NAME, ...) Named(#NAME, [](Call& call) { return call.pApi->NAME(__VA_ARGS__); })
+struct Entry {
+    Call::Function function;
+    const char* szParameters = "";
+};
 
-const std::map<std::string, Call::Function>& functions()
+using Named = std::pair<const std::string, Entry>;
+#define METHOD(NAME, PARAMETERS, ...) \
+    Named(#NAME, {[](Call& call) { return call.pApi->NAME(__VA_ARGS__); }, PARAMETERS})
+
+const std::map<std::string, Entry>& functions()
 {
-    static const std::map<std::string, Call::Function> all = {
-        {"constructor", construct},
-        {"setErrMsg", [](Call& call) { return call.pApi->setErrMsg(call.strText), 0; }},
-        {"getErrMsg", getErrMsg},
-        {"runSqlEx", runSqlEx},
-        {"recType", recType},
-        {"getTimeAfterNow", getTimeAfterNow},
-        {"convert2ReadableTime", convert2ReadableTime},
-        {"jsonCopyMember", jsonCopyMember},
-        METHOD(tableCreate),
-        METHOD(fillDefaultValue, call.jFirst, call.blFlag),
-        METHOD(checkJsonType, call.jFirst),
-        METHOD(recSave, call.jFirst, call.blFlag),
-        METHOD(recCreate, call.jFirst, call.jSecond),
-        METHOD(recList, call.jFirst, call.jSecond),
-        METHOD(recGetOne, call.jFirst, call.jSecond),
-        METHOD(recUpdateByWhere, call.jFirst, call.strText),
-        METHOD(recUpdateByFilter, call.jFirst, call.jSecond),
-        METHOD(recDelete, call.jFirst, call.blFlag),
-        METHOD(recDeleteAll),
-        METHOD(recDeleteByArray, call.strVector, call.strKey.c_str()),
-        METHOD(recDeleteByName, call.strText, call.strKey.c_str()),
-        METHOD(SqlExpandMemberName, call.strText, call.blFlag ? &call.jFirst : nullptr),
-        METHOD(SqlExpandMemberSymbol, call.strText, call.jFirst),
-        METHOD(SqlExpandMemberList, call.jFirst, call.strText, call.iNumber),
-        METHOD(SqlMakeByMatchField, call.strKey, call.jFirst, call.strText),
-        METHOD(SqlMakeByListField, call.strKey.c_str(), call.jFirst, call.strText),
-        METHOD(VectorParamToJson, call.strVector, call.strKey.c_str(), call.jFirst),
-        METHOD(SqlFilterConditionFromJson, call.jFirst, call.strText),
+    static const std::map<std::string, Entry> all = {
+        {"constructor", {construct}},
+        {"setErrMsg", {[](Call& call) { return call.pApi->setErrMsg(call.strText), 0; }}},
+        {"getErrMsg", {getErrMsg}},
+        {"runSqlEx", {runSqlEx, "text flag"}},
+        {"recType", {recType}},
+        {"getTimeAfterNow", {getTimeAfterNow}},
+        {"convert2ReadableTime", {convert2ReadableTime}},
+        {"jsonCopyMember", {jsonCopyMember, ">first second flag"}},
+        METHOD(tableCreate, ""),
+        METHOD(fillDefaultValue, ">first flag", call.jFirst, call.blFlag),
+        METHOD(checkJsonType, "first", call.jFirst),
+        METHOD(recSave, ">first flag", call.jFirst, call.blFlag),
+        METHOD(recCreate, "first >second", call.jFirst, call.jSecond),
+        METHOD(recList, "first >second", call.jFirst, call.jSecond),
+        METHOD(recGetOne, "first >second", call.jFirst, call.jSecond),
+        METHOD(recUpdateByWhere, "first text", call.jFirst, call.strText),
+        METHOD(recUpdateByFilter, "first second", call.jFirst, call.jSecond),
+        METHOD(recDelete, "first flag", call.jFirst, call.blFlag),
+        METHOD(recDeleteAll, ""),
+        METHOD(recDeleteByArray, "vector key", call.strVector, call.key()),
+        METHOD(recDeleteByName, "text key", call.strText, call.key()),
+        METHOD(SqlExpandMemberName, ">text record", call.strText,
+               call.blFlag ? &call.jFirst : nullptr),
+        METHOD(SqlExpandMemberSymbol, ">text first", call.strText, call.jFirst),
+        METHOD(SqlExpandMemberList, "first >text number", call.jFirst, call.strText, call.iNumber),
+        METHOD(SqlMakeByMatchField, "key first >text", call.strKey, call.jFirst, call.strText),
+        METHOD(SqlMakeByListField, "key first >text", call.key(), call.jFirst, call.strText),
+        METHOD(VectorParamToJson, "vector key >first", call.strVector, call.key(), call.jFirst),
+        METHOD(SqlFilterConditionFromJson, "first >text", call.jFirst, call.strText),
     };
     return all;
+}
+
+const Entry& entry(const std::string& strCase)
+{
+    return functions().at(strCase.substr(0, strCase.find(' ')));
 }
 
 }  // namespace
 
 Call::Function Call::function(const std::string& strCase)
 {
-    return functions().at(strCase.substr(0, strCase.find(' ')));
+    return entry(strCase).function;
+}
+
+const char* Call::parameters(const std::string& strCase)
+{
+    return entry(strCase).szParameters;
 }
 
 void Call::setArguments(const Json::Value& jArguments)
@@ -105,6 +122,7 @@ void Call::setArguments(const Json::Value& jArguments)
     jFirst = jArguments["first"];
     jSecond = jArguments["second"];
     strText = jArguments["text"].asString();
+    blKey = jArguments.isMember("key");
     strKey = jArguments["key"].asString();
     strVector.clear();
     for (const Json::Value& jText : jArguments["vector"]) strVector.push_back(jText.asString());
@@ -112,4 +130,19 @@ void Call::setArguments(const Json::Value& jArguments)
     iNumber = jArguments["number"].asInt();
     now = static_cast<long>(std::min<Json::Int64>(jArguments["now"].asInt64(), LONG_MAX));
     pjResult = nullptr;
+}
+
+Json::Value Call::arguments() const
+{
+    Json::Value jArguments;
+    jArguments["first"] = jFirst;
+    jArguments["second"] = jSecond;
+    jArguments["text"] = strText;
+    jArguments["key"] = strKey;
+    jArguments["vector"] = Json::arrayValue;
+    for (const std::string& strItem : strVector) jArguments["vector"].append(strItem);
+    jArguments["flag"] = blFlag;
+    jArguments["number"] = iNumber;
+    jArguments["now"] = Json::Int64(now);
+    return jArguments;
 }

@@ -16,10 +16,15 @@ struct Call {
 
     // The function that the first word of a case's name is.
     static Function function(const std::string& strCase);
+    // Its arguments in their order, such as "first >second": members of the arguments below, with
+    // ">" before an output. A "record" is "first", with "flag" where it is given.
+    static const char* parameters(const std::string& strCase);
 
     // Takes the members "first", "second", "text", "key", "vector", "flag", "number" and "now";
-    // those that are left out become empty.
+    // those that are left out become empty, and the key a null pointer.
     void setArguments(const Json::Value& jArguments);
+    // What has become of them.
+    Json::Value arguments() const;
 
     // Of the constructor, and the handle that it makes.
     sqlite3* pDb = nullptr;
@@ -34,6 +39,8 @@ struct Call {
     Json::Value jSecond;
     std::string strText;
     std::string strKey;
+    const char* key() const { return blKey ? strKey.c_str() : nullptr; }
+    bool blKey = false;
     std::vector<std::string> strVector;
     bool blFlag = false;  // of runSqlEx: with a callback; of SqlExpandMemberName: of a record
     int iNumber = 0;      // a kind of time or list; getTimeAfterNow writes text unless it is 0

@@ -8,6 +8,13 @@
 
 using Lines = std::vector<std::string>;
 
+template <typename Item>
+std::vector<Item> operator+(std::vector<Item> items, const std::vector<Item>& more)
+{
+    items.insert(items.end(), more.begin(), more.end());
+    return items;
+}
+
 // The lines since the last call (or reset), each brought to the form
 //
 //     E VornJsonDbApi: Failed [!pDb]        error family (the text without its ", err=...")

@@ -2,7 +2,7 @@
 // Look-ups of member types as their tests expect them in the log, and definitions that have none.
 #pragma once
 
-#include "support/database.h"
+#include "support/matrix.h"
 
 #include <string>
 
@@ -33,21 +33,10 @@ inline constexpr BadDefinition kBadDefinitions[] = {
      "jType == Json::nullValue || !jType.isMember(strJsonName)"},
 };
 
-inline Lines operator+(Lines lines, const Lines& more)
-{
-    lines.insert(lines.end(), more.begin(), more.end());
-    return lines;
-}
-
 class LookUpsTest : public TableTest {
 protected:
     // The text with every "$" replaced by the table's name.
-    std::string named(std::string strText) const
-    {
-        for (std::size_t i = 0; std::string::npos != (i = strText.find('$', i));)
-            strText.replace(i, 1, strName_);
-        return strText;
-    }
+    std::string named(const std::string& strText) const { return replaced(strText, '$', strName_); }
 
     Lines named(Lines lines) const
     {

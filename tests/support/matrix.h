@@ -4,7 +4,8 @@
 
 #include "support/database.h"
 
-#include <iostream>
+#include <string>
+#include <vector>
 
 // The result of a call, or "T" where it throws Json::LogicError. Anything else that is thrown fails
 // the test.
@@ -21,6 +22,30 @@ std::string endOf(Call call)
 // The parts between the separators that are not empty.
 std::vector<std::string> split(const std::string& strText, char cSeparator);
 
+// The text with other words for every such character.
+std::string replaced(const std::string& strText, char cOld, const std::string& strNew);
+
+// A call such as {"recList", R"({"a":1})", "[]"}: the function and its arguments as in the
+// interface. A flag is a word such as "insert" or "all". An output that is left out is filled
+// before the call, and a key that is left out is a null pointer.
+using Words = std::vector<std::string>;
+
+// The arguments as Call takes them; the member "output" names the one that is an output.
+Json::Value argumentsOf(const Words& call);
+
+struct Ended {
+    std::string strEnd;  // as endOf tells it
+    Json::Value jBefore;
+    Json::Value jOut;       // the output, before the call and after it
+    std::string strChange;  // of the output: its JSON, or what was appended to its text
+
+    std::string whole() const { return strChange.empty() ? strEnd : strEnd + " " + strChange; }
+};
+
+// The test fails where the call changes an argument that is no output, or what an output text
+// begins with.
+Ended called(VornJsonDbApi& api, const Words& call);
+
 // No statement is open, no transaction either, and a record can be written and read back by the
 // handle; strRecord is one that its table takes, as JSON.
 void expectSound(Database& database, VornJsonDbApi& api, const std::string& strRecord);
@@ -28,9 +53,3 @@ void expectSound(Database& database, VornJsonDbApi& api, const std::string& strR
 // Ends the process of a death test, with 0 unless a check has failed. Its fixture is never
 // destroyed, so the file of the database goes here.
 [[noreturn]] void endProcess(const Database& database);
-
-// A line for the table of figures.
-inline void printFigure(const std::string& strName, std::size_t nNumber)
-{
-    std::cout << "figure: " << strName << " = " << nNumber << std::endl;
-}

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "support/operations.h"
 
+#include "support/matrix.h"
 #include "support/records.h"
 
 #include <stdexcept>
@@ -41,58 +42,15 @@ Json::Value Operation::untouched() const
 Lines Operation::failure(const Table& table, const std::string& strError, const std::string& strSql,
                          std::size_t nRetries) const
 {
-    const Json::Value jArguments = json(szArguments);
-    const std::string strFirst = text(jArguments["first"]);
-    const std::string strSqlError = sqlError(strError, strSql);
-    Lines lines{runFailed(strError, strSql, nRetries)};
-    const auto add = [&lines](const Lines& more) {
-        lines.insert(lines.end(), more.begin(), more.end());
-    };
-
-    if (is("constructor") || is("tableCreate"))
-        add({error("create table failed, sql=" + strSql), strSqlError});
-    if (is("constructor")) add({failed("0 > tableCreate()")});
-
-    if (is("recSave") || is("recCreate")) {
-        Json::Value jRecord = jArguments["first"];
-        Json::Value jDefinition = table.jDefinition;
-        std::string strName = table.strName;
-        const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
-        for (const std::string& strKey : jTypes.getMemberNames())
-            if (!jRecord.isMember(strKey)) jRecord[strKey] = jTypes[strKey]["cppDefaultValue"];
-        const bool blCreate = is("recCreate") || jArguments["flag"].asBool();
-        add({failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
-             plain("blCreate=" + std::to_string(blCreate) + ", jRecInOut=" + text(jRecord)),
-             plain("jType=" + text(jTypes)), strSqlError});
-        if (is("recCreate"))
-            add({failed("0 > recSave(jParam, true)"),
-                 plain("call create rec, rec=" + text(jRecord))});
-    }
-
-    if (is("recList") || is("recGetOne"))
-        add({failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
-             plain("jRecParam=" + strFirst), strSqlError});
-    if (is("recGetOne")) add({failed("0 > recList(jRecParam, jRecArray)")});
-
-    const std::string strValues = is("recUpdateByFilter") ? text(jArguments["second"]) : strFirst;
-    if (is("recUpdateByFilter") || is("recUpdateByWhere"))
-        add({failed("0 > runSqlEx(strSql, NULL, NULL)"), plain("jRecIn=" + strValues),
-             strSqlError});
-    if (is("recUpdateByFilter"))
-        add({failed("0 > recUpdateByWhere(jParamIn, strSql)"),
-             plain("recUpdateByFilter failed, jParamIn=" + strValues)});
-
-    if (0 == std::string(szName).find("recDelete"))
-        add({failed("0 > (err = runSqlEx(strSqlRun))"), strSqlError});
-    const std::string strText =
-        is("recDeleteByName") ? jArguments["text"].asString() : jArguments["vector"][0].asString();
-    if (is("recDeleteByArray") || is("recDeleteByName"))
-        add({failed("0 > (err = recDelete(jParam))"),
-             plain("recDeleteByArray failed, name=name, strVector=" + strText)});
-    if (is("recDeleteByName"))
-        add({failed("0 > (err = recDeleteByArray(strVector, szKey))"),
-             plain("recDeleteByName failed, name=name, strValue=" + strText)});
-    return lines;
+    Json::Value jArguments = json(szArguments);
+    jArguments["create"] = strSql;
+    Json::Value jDefinition = table.jDefinition;
+    std::string strName = table.strName;
+    const std::string strFunction = split(szName, ' ')[0];
+    const std::vector<Lines> levels =
+        levelsOf(strFunction, jArguments, VORN_JSON_DB::recType(jDefinition, strName));
+    return Lines{runFailed(strError, strSql, nRetries), levels[0][0]} +
+           restOf(levels, 0, strError, strSql);
 }
 
 std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps)

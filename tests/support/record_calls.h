@@ -2,7 +2,7 @@
 // A table of three records, the calls of the record operations, and all that has to come of a call.
 #pragma once
 
-#include "support/database.h"
+#include "support/matrix.h"
 #include "support/records.h"
 
 #include <functional>
@@ -16,20 +16,6 @@ protected:
     // The level of an operation itself, above those of the operations that it calls.
     static constexpr std::size_t kOutermost = static_cast<std::size_t>(-1);
     static constexpr int kThrows = -99;
-
-    // A call of one operation.
-    struct Call {
-        std::string strName;
-        // The second argument is the output, where there is one, and strOut its text before.
-        std::function<int(VornJsonDbApi&, Json::Value&)> run;
-        // How its log ends when it fails: for each level, the innermost first, the check of what
-        // the level below gives (the first: of what SQLite gives) and the lines that follow any
-        // check.
-        std::vector<Lines> levels;
-        std::string strOut = "null";
-        bool blTellsDuplicate = false;
-        bool blTracesCount = false;
-    };
 
     // The statement of a save: strValues ends in ") " where the list closes.
     static std::string saved(bool blCreate, const std::string& strColumns,
@@ -45,19 +31,40 @@ protected:
         return "SELECT data,flag,id,name,tags FROM $ " + strTail;
     }
 
-    static Call save(const std::string& strRecord, bool blCreate);
-    // strFilled is the record with its defaults.
-    static Call create(const std::string& strRecord, const std::string& strFilled = "");
-    static Call list(const std::string& strRequest, const std::string& strArray = "[7]");
-    static Call get(const std::string& strRequest, const std::string& strOut = "null");
-    static Call updateByWhere(const std::string& strRecord, const std::string& strWhere);
-    static Call updateByFilter(const std::string& strFilter, const std::string& strValues);
-    static Call remove(const std::string& strRequest, bool blDeleteAll = false);
-    static Call removeAll();
-    static Call removeByArray(const std::vector<std::string>& texts, const char* szKey);
-    static Call removeByName(const std::string& strValue, const char* szKey);
+    static Words save(const std::string& strRecord, bool blCreate)
+    {
+        return {"recSave", strRecord, blCreate ? "insert" : "replace"};
+    }
+    static Words create(const std::string& strRecord)
+    {
+        return {"recCreate", strRecord, R"({"left":"over"})"};
+    }
+    static Words list(const std::string& strRequest, const std::string& strArray = "[7]")
+    {
+        return {"recList", strRequest, strArray};
+    }
+    static Words get(const std::string& strRequest, const std::string& strOut = "null")
+    {
+        return {"recGetOne", strRequest, strOut};
+    }
+    static Words updateByWhere(const std::string& strRecord, const std::string& strWhere)
+    {
+        return {"recUpdateByWhere", strRecord, strWhere};
+    }
+    static Words updateByFilter(const std::string& strFilter, const std::string& strValues)
+    {
+        return {"recUpdateByFilter", strFilter, strValues};
+    }
+    static Words remove(const std::string& strRequest, bool blDeleteAll = false)
+    {
+        return {"recDelete", strRequest, blDeleteAll ? "all" : "some"};
+    }
+    static Words removeAll() { return {"recDeleteAll"}; }
+    static Words removeByArray(const std::vector<std::string>& texts, const char* szKey);
+    static Words removeByName(const std::string& strValue, const char* szKey);
+    static bool isRemoval(const Words& call) { return 0 == call[0].find("recDelete"); }
 
-    // What comes of a call; "$" is the name of the table, "$types" are its member types.
+    // What comes of a call; "$" is the name of the table.
     struct Outcome {
         int iResult = -1;
         std::string strSql = "";           // the statement that is run; empty for none
@@ -74,32 +81,32 @@ protected:
     // result, the output, the arguments, the statements, the whole log, the message, the error text
     // that the handle holds afterwards, and that a failure leaves the table alone (but for
     // blWritten_).
-    void expect(const Call& call, const Outcome& outcome);
+    void expect(const Words& call, const Outcome& outcome);
 
     // expect() for a call that gives an output, one that changes the table, one that fails without
     // SQL, one that fails after its statement (strError is empty where SQLite took it), and one
     // that passes on the exception of an accessor.
-    void expectOutput(const Call& call, int iResult, const std::string& strSql,
+    void expectOutput(const Words& call, int iResult, const std::string& strSql,
                       const std::string& strOut)
     {
         expect(call, {iResult, strSql, strOut.c_str()});
     }
-    void expectContents(const Call& call, int iResult, const std::string& strSql,
+    void expectContents(const Words& call, int iResult, const std::string& strSql,
                         const std::string& strContents)
     {
         expect(call, {iResult, strSql, nullptr, strContents.c_str()});
     }
-    void expectFailure(const Call& call, const Lines& causes, std::size_t nLevel = kOutermost,
+    void expectFailure(const Words& call, const Lines& causes, std::size_t nLevel = kOutermost,
                        const std::string& strComposed = "")
     {
         expect(call, {-1, "", nullptr, nullptr, "", causes, nLevel, strComposed});
     }
-    void expectSqlFailure(const Call& call, const std::string& strSql, const std::string& strError,
+    void expectSqlFailure(const Words& call, const std::string& strSql, const std::string& strError,
                           const Lines& causes = {})
     {
         expect(call, {-1, strSql, nullptr, nullptr, strError, causes, 0});
     }
-    void expectThrow(const Call& call) { expect(call, {kThrows}); }
+    void expectThrow(const Words& call) { expect(call, {kThrows}); }
 
     // "1Ann1,2Bob0,3O'Brien1", or all columns of another table.
     std::string contents();
@@ -129,12 +136,11 @@ protected:
     RecordsTest();
 
 private:
-    std::string in(std::string strText);
-    Lines in(Lines lines);
-    Rows rows();
+    std::string in(const std::string& strText) { return replaced(strText, '$', pTable_->strName); }
+    Rows rows() { return database_.rows("select * from " + pTable_->strName); }
     void hold(const std::string& strError);
-    Lines expectedLog(const Call& call, const Outcome& outcome, const std::string& strHeld);
-    void expectOnce(const Call& call, const Outcome& outcome, const std::string& strEarlier);
+    Lines expectedLog(const Words& call, const Outcome& outcome, const std::string& strHeld);
+    void expectOnce(const Words& call, const Outcome& outcome, const std::string& strEarlier);
 };
 
 // Checks that several operations have in common.
@@ -150,9 +156,3 @@ inline const Lines kNoMemoryForText = {
 inline const Lines kNoMemoryForItem = {
     failed(R"(NULL == (szSql = sqlite3_mprintf("%q", jList[i].asString().c_str())))"),
     failed("0 > SqlMakeByListField(jmFieldName[i].c_str(), jTmp, strSqlWhereOut)")};
-
-inline Lines operator+(Lines lines, const Lines& more)
-{
-    lines.insert(lines.end(), more.begin(), more.end());
-    return lines;
-}

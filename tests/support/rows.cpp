@@ -65,23 +65,16 @@ doubles::Exec execCalledLocked(int nTimes)
     };
 }
 
-Lines fieldFailed(const std::string& strFirst)
+Lines statementStopped(const Lines& field, const Row& row)
 {
-    return {strFirst,
-            failed("0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))")};
-}
-
-Lines statementStopped(Lines lines, const Row& row)
-{
+    Lines traced;
     if (1 < row.names.size()) {
         const std::string strPlace = "[" + std::to_string(row.names.size() - 1) + "]=";
         const auto shown = [](const char* szText) { return szText ? szText : "(null)"; };
-        lines.push_back(plain("column_name" + strPlace + shown(row.names.back())));
-        lines.push_back(plain("column_value" + strPlace + shown(row.values.back())));
+        traced = {plain("column_name" + strPlace + shown(row.names.back())),
+                  plain("column_value" + strPlace + shown(row.values.back()))};
     }
-    lines.push_back(failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)"));
-    lines.push_back(runFailed("query aborted", "a text"));
-    return lines;
+    return rowRefused(field, traced) + Lines{runFailed("query aborted", "a text")};
 }
 
 Lines takeLogWithoutTypes()

@@ -44,10 +44,8 @@ inline doubles::Exec execOfStatus(int iStatus, const char* szError)
 // A double of sqlite3_exec that runs the text, and calls it locked that many times.
 doubles::Exec execCalledLocked(int nTimes);
 
-// The lines of a column that cannot be decoded, and those of a statement that the last column of a
-// row stops. It is shown, unless it is the first.
-Lines fieldFailed(const std::string& strFirst);
-Lines statementStopped(Lines lines, const Row& row = {});
+// The lines of a statement that the last column of a row stops.
+Lines statementStopped(const Lines& field, const Row& row = {});
 
 // The log, with "..." for the types of all tables of the process.
 Lines takeLogWithoutTypes();

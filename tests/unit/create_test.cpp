@@ -66,7 +66,7 @@ TEST_F(Create, RefusesABadTypeAndLogsTheFilledRecord)
     for (const char* szMember : {R"("5")", "null", "1.5"}) {
         const std::string strRecord = std::string(R"({"id":)") + szMember;
         const std::string strFilled = strRecord + R"(,"name":"unnamed"})";
-        expectFailure(create(strRecord + "}", strFilled),
+        expectFailure(create(strRecord + "}"),
                       {error("type failed, strKey=id, jRecParam=" + strFilled),
                        failed("0 > checkJsonType(jParam)")});
     }
@@ -90,7 +90,7 @@ TEST_F(Create, ChecksTheDefaultsToo)
                     "a, v");
         pTable_ = &table;
         const std::string strFilled = R"({"a":1,"v":)" + row.strDefault + "}";
-        expectFailure(create(R"({"a":1})", strFilled),
+        expectFailure(create(R"({"a":1})"),
                       {error(row.blKnown ? "type failed, strKey=v, jRecParam=" + strFilled
                                          : "type not found!!, key=v"),
                        failed("0 > checkJsonType(jParam)")});

@@ -75,7 +75,7 @@ TEST_F(Delete, FailsWhereMemoryRunsOut)
     for (const bool blDeleteAll : {false, true})
         expectFailure(remove(R"({"name":"Ann"})", blDeleteAll),
                       kNoMemoryForText + Lines{kNoRequestConditions});
-    for (const Call& call : {removeByArray({"Bob"}, "name"), removeByName("Bob", "name")})
+    for (const Words& call : {removeByArray({"Bob"}, "name"), removeByName("Bob", "name")})
         expectFailure(call, kNoMemoryForItem + Lines{kNoRequestConditions}, 0);
 }
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 // Construction, table creation and the host's message.
 
+#include "support/matrix.h"
 #include "support/rows.h"
 
 namespace {
@@ -64,6 +65,24 @@ TEST_F(Handle, ReportsEachMissingArgument)
     Json::Value jRecord = json(R"({"a":"x"})");
     EXPECT_EQ(-1, api.recSave(jRecord, true));
     EXPECT_EQ(R"({"a":{"cpptype":"string"}})", text(VORN_JSON_DB::recType(jDefinition_, strName_)));
+}
+
+// What composes SQL does so on the same handle.
+TEST_F(Handle, FailsToRunSqlWithoutAConnection)
+{
+    VornJsonDbApi api(nullptr, strName_, jDefinition_, strCreate_);
+    takeLog();
+    for (const std::string& strCall :
+         split(R"(tableCreate|runSqlEx pragma|runSqlEx pragma callback|recSave {"a":"x"} insert|)"
+               R"(recCreate {"a":"x"}|recList null|recGetOne null|recUpdateByWhere {"a":"x"} 1|)"
+               R"(recUpdateByFilter {"a":"x"} {"a":"y"}|recDelete {"a":"x"}|recDeleteAll|)"
+               R"(recDeleteByArray ["x"] a|recDeleteByName x a)",
+               '|')) {
+        EXPECT_EQ("-1", called(api, split(strCall, ' ')).whole()) << strCall;
+        EXPECT_NE(Lines(), takeLog()) << strCall;
+        EXPECT_EQ("", api.getErrMsg()) << strCall;
+    }
+    EXPECT_EQ("0  (a='x' )", called(api, {"SqlExpandMemberList", R"({"a":"x"})", "", "1"}).whole());
 }
 
 TEST_F(Handle, WorksIfItsTableExistsAlready)

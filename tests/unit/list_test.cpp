@@ -147,11 +147,8 @@ TEST_F(List, KeepsTheRowsBeforeTheBadOne)
     pTable_ = &table;
     database_.run("insert into " + table.strName + " values (NULL,NULL),(1,NULL),(2,2.5)");
     const std::string strError = sqlite3_errstr(SQLITE_ABORT);
-    const Lines causes = {
-        error("type error, strType=double"),
-        failed("0 > (iTmp = DbCallBackFillField(*pjRec, column_name, column_value, i))"),
-        plain("column_name[1]=real"), plain("column_value[1]=2.5"),
-        failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)")};
+    const Lines causes = rowRefused(fieldFailed(error("type error, strType=double")),
+                                    {plain("column_name[1]=real"), plain("column_value[1]=2.5")});
     const std::string strSelect = "SELECT id,real FROM $ ";
     expect(list("null", "[7]"),
            {-1, strSelect + ";", R"([7,{},{"id":1}])", nullptr, strError, causes, 0});
