@@ -260,7 +260,7 @@ TEST_F(EveryCall, TakesAnyKindOfJsonValue)
     Figures::of("matrix cells, JSON arguments") = iCells_;
 }
 
-TEST_F(EveryCall, TakesAnyKindOfMemberOfAnyTypeWord)
+TEST_F(EveryCall, TakesAnyKindOfValueUnderAnyTypeWord)
 {
     for (const Row& row : kMembers) check(row, {std::begin(kKinds), std::end(kKinds)});
     for (const auto& [strCall, words] : words_)
