@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What the tests share that try very many arguments.
+// Calls that are written as words, and what else the tests share that try very many arguments.
 #pragma once
 
 #include "support/database.h"

@@ -2,18 +2,46 @@
 // The time helpers. No test looks at the clock or the time zone of the machine.
 
 #include "support/database.h"
-#include "support/time_zone.h"
 
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
 #include <ctime>
+#include <optional>
 
 namespace {
 
 using doubles::state;
 using VORN_JSON_DB::convert2ReadableTime;
 using VORN_JSON_DB::getTimeAfterNow;
+
+// Whether the system's long holds the time.
+bool isLong(long long iTime)
+{
+    return LONG_MIN <= iTime && LONG_MAX >= iTime;
+}
+
+// A time zone for as long as the object lives.
+class TimeZone {
+public:
+    explicit TimeZone(const char* szZone)
+    {
+        if (const char* szBefore = getenv("TZ")) before_ = szBefore;
+        set(szZone);
+    }
+    ~TimeZone() { set(before_ ? before_->c_str() : nullptr); }
+    TimeZone(const TimeZone&) = delete;
+    TimeZone& operator=(const TimeZone&) = delete;
+
+private:
+    static void set(const char* szZone)
+    {
+        nullptr == szZone ? unsetenv("TZ") : setenv("TZ", szZone, 1);
+        tzset();
+    }
+
+    std::optional<std::string> before_;
+};
 
 constexpr int kLocalGmt = 2;
 constexpr int kGmt = 3;
