@@ -12,7 +12,7 @@ using formatter_oracle::Value;
 
 constexpr unsigned kMaxField = 4096;
 
-// What a format reads, found by a scanner of the test's own.
+// What a format reads, as found by the test's own scanner.
 struct Reads {
     bool blDefined = true;  // nothing but conversions that may be called with one value
     int iCount = 0;
