@@ -61,7 +61,7 @@ struct Operation {
     std::vector<Step> steps;
 };
 
-// One line without its end, and back. False when it is not such a line.
+// An operation as one line without its end, and back. False if it is not such a line.
 std::string toLine(const Operation& operation);
 bool fromLine(const std::string& strLine, Operation& operation);
 

@@ -70,7 +70,7 @@ struct Sample {
         return strSql;
     }
 
-    // The term; "error" where SQLite refuses it, "nothing" where its list is empty.
+    // The term; "error" if SQLite refuses it, "nothing" if its list is empty.
     std::string termOfNull(const std::string& strValue)
     {
         insert("(m) values (null)");

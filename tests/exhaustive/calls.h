@@ -15,7 +15,7 @@ inline constexpr const char* kKinds[] = {"null", "true", "-1",        "184467440
                                          "[1]",  "{}",   R"({"k":1})"};
 
 struct Ended {
-    std::string strEnd;  // the result, or T where the call threw Json::LogicError
+    std::string strEnd;  // the result, or T if the call threw Json::LogicError
     std::string strOut;  // an output that was changed: its JSON, or what was appended to its text
 
     std::string whole() const { return strOut.empty() ? strEnd : strEnd + " " + strOut; }

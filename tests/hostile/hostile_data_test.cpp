@@ -138,7 +138,7 @@ const auto asJson = [](const char* szText) { return leftByReader(szText); };
 
 struct Word {
     const char* szWord;
-    Json::Value (*value)(const char* szText);  // null where no column can be decoded
+    Json::Value (*value)(const char* szText);  // null if no column can be decoded
 };
 
 const Word kWords[] = {

@@ -19,7 +19,7 @@ struct Reads {
     std::string strFirst;  // the first conversion that reads: its length and type, "lld"
 };
 
-// Moves past the digits there, if any. False where they are a number above kMaxField.
+// Moves past the digits there, if any. False if they are a number above kMaxField.
 bool smallNumber(const std::string& strText, std::size_t& i)
 {
     const std::size_t nEnd = std::min(strText.find_first_not_of("0123456789", i), strText.size());

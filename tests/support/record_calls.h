@@ -20,7 +20,7 @@ protected:
     // A call of one operation.
     struct Call {
         std::string strName;
-        // The second argument is the output, where there is one, and strOut its text before.
+        // The second argument is the output, if there is one, and strOut its text before.
         std::function<int(VornJsonDbApi&, Json::Value&)> run;
         // How its log ends when it fails: for each level, the innermost first, the check of what
         // the level below gives (the first: of what SQLite gives) and the lines that follow any
@@ -31,7 +31,7 @@ protected:
         bool blTracesCount = false;
     };
 
-    // The statement of a save: strValues ends in ") " where the list closes.
+    // The statement of a save: strValues ends in ") " if the list closes.
     static std::string saved(bool blCreate, const std::string& strColumns,
                              const std::string& strValues)
     {
@@ -61,7 +61,7 @@ protected:
     struct Outcome {
         int iResult = -1;
         std::string strSql = "";           // the statement that is run; empty for none
-        const char* szOut = nullptr;       // the output; null where it is left alone
+        const char* szOut = nullptr;       // the output; null if it is left alone
         const char* szContents = nullptr;  // see contents(); null if they are not checked
         std::string strError = "";         // of the statement
         Lines causes = {};                 // the lines before those of the failed level
@@ -77,7 +77,7 @@ protected:
     void expect(const Call& call, const Outcome& outcome);
 
     // expect() for a call that gives an output, one that changes the table, one that fails without
-    // SQL, one that fails after its statement (strError is empty where SQLite took it), and one
+    // SQL, one that fails after its statement (strError is empty if SQLite accepted it), and one
     // that passes on the exception of an accessor.
     void expectOutput(const Call& call, int iResult, const std::string& strSql,
                       const std::string& strOut)

@@ -241,7 +241,7 @@ TEST_F(RowDecoder, LooksUpANamelessColumnLikeAnyOther)
     }
 }
 
-// The first to ask for the types of a table is the decoder, which has no definition.
+// The first to ask for a table's types is the decoder, which has no definition.
 TEST_F(RowDecoder, SpoilsTheTypesOfATableThatNobodyAskedForBefore)
 {
     Table other(database_, R"({"s":{"cpptype":"string"}})", "s");

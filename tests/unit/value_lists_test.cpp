@@ -166,7 +166,7 @@ TEST_F(ValueLists, LeaveTheTextAloneWhenAnAccessorThrows)
     for (const char* szValue : {"{}", "[1]"}) expectOfWords("string", szValue, {"", "T"});
 }
 
-// Kept: words that other consumers know. A word matters only where the record holds the member.
+// Kept: words that other consumers know. A word matters only if the record holds the member.
 TEST_F(ValueLists, RefuseAnyOtherWord)
 {
     for (const std::string& strWord : split(kRefused, '|'))

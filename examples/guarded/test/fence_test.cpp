@@ -25,7 +25,7 @@ protected:
         pFence_ = std::make_unique<Fence>(database_.get(), "note");
     }
 
-    // 0, or -1 where SQLite refuses the statement and says why.
+    // 0, or -1 if SQLite refuses the statement and says why.
     int execute(const std::string& strSql)
     {
         const auto ignore = [](void*, int, char**, char**) { return 0; };

@@ -87,7 +87,7 @@ struct Held {
     int nHeld;
     int iResult;
     std::size_t nAttempts;
-    // How many rows are new afterwards, or how often a list holds all records.
+    // How many rows are new afterwards, or how many times a list holds all records.
     int nTimes;
     const char* szColumns = kWithoutKeys;
     const char* szError = kLocked;
