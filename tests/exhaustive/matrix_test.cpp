@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-// Every argument of every function as every kind of JSON value, a member of every type word among
-// them: how the call ends, that it leaves alone what it should, and that handle and connection go
-// on working.
+// Every argument of every function as every kind of JSON value, including a member of every type
+// word: how the call ends, that it changes nothing that it should not, and that handle and
+// connection go on working.
 
 #include "support/matrix.h"
 #include "support/figures.h"
@@ -12,7 +12,7 @@
 
 namespace {
 
-// One value of each kind that jsoncpp knows, and the edges.
+// One value of each kind that jsoncpp knows, and edge cases.
 constexpr const char* kKinds[] = {"null", "true", "-1",        "18446744073709551615",
                                   "1.5",  "\"\"", "\"x\"",     "[]",
                                   "[1]",  "{}",   R"({"k":1})"};
@@ -23,7 +23,7 @@ const std::string kRecordOf = R"({"a":"a","m":$,"z":"z"})";
 const std::string kRecord = R"({"a":"a","m":5,"z":"z"})";
 const std::string kByDefault = "recCreate by default";
 
-// An end is the result, T for a Json::LogicError or W for a failure that has written all the same.
+// An end is the result, T for a Json::LogicError or W for a failure that nevertheless wrote.
 struct Row {
     std::string strCalls;  // between bars, as the words
     std::string strWords;  // of the member m
@@ -45,7 +45,7 @@ const std::string kExpandLists =
     "SqlExpandMemberList $ before 0|SqlExpandMemberList $ before 1|SqlExpandMemberList $ before 2";
 const std::string kPage = "SqlFilterConditionFromJson $";
 
-// Of a table whose m is an int. SQLite refuses an empty raw filter and one of an unknown column,
+// On a table whose m is an int. SQLite refuses an empty raw filter and one of an unknown column,
 // and wants whole numbers of 64 bits for paging.
 // clang-format off
 const Row kArguments[] = {
@@ -155,13 +155,13 @@ const Row kMembers[] = {
     {"SqlMakeByMatchField m $|" + kListField + "|" + kMemberList, kJson,
                                                           "  0    0    0    0    0    0    0    0    0    0    0"},
 
-    // SQLite refuses an empty list, a bare value that is missing and a bare text that is no column.
+    // SQLite refuses an empty list, a missing bare value and a bare text that is not a column.
     {kFinds, "string",                                    "  0    0    0    0    0    0    0   -1    0    T    T"},
     {kFinds, kNumbers,                                    " -1    0    0    0    0   -1   -1   -1    0    T    T"},
     {kFinds, "bool",                                      "  0    0    0    T    0    T    T   -1    0    T    T"},
     {kFinds, kJson,                                       "  0    0    0    0    0    0    0   -1    0    0    0"},
 
-    // A list is no value to set.
+    // A list is not a value to set.
     {kUpdateWhere, "string",                              "  0    0    0    0    0    0    0   -1   -1    T    T"},
     {kUpdateWhere, kNumbers,                              " -1    0    0    0    0   -1   -1   -1   -1    T    T"},
     {kUpdateWhere, "bool",                                "  0    0    0    T    0    T    T   -1   -1    T    T"},
@@ -206,7 +206,7 @@ private:
         return *pTable;
     }
 
-    // It logs exactly when it gives -1.
+    // The call logs exactly when it returns -1.
     void checkCall(Table& table, const std::string& strCall, const std::string& strValue,
                    const std::string& strExpected)
     {

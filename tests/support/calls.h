@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every function of the library by its name, with arguments out of JSON, for tests that bring each
-// of them into the same trouble.
+// Every function of the library by name, with arguments from JSON, for tests that put each of them
+// through the same trouble.
 #pragma once
 
 #include <VornJsonDbApi.h>
@@ -14,7 +14,7 @@
 struct Call {
     using Function = int (*)(Call& call);
 
-    // The function that the first word of a case's name is.
+    // The function that the first word of a case's name stands for.
     static Function function(const std::string& strCase);
     // Its arguments in their order, such as "first >second": members of the arguments below, with
     // ">" before an output. A "record" is "first", with "flag" where it is given.
@@ -26,7 +26,7 @@ struct Call {
     // What has become of them.
     Json::Value arguments() const;
 
-    // Of the constructor, and the handle that it makes.
+    // The constructor's arguments, and the handle that it makes.
     sqlite3* pDb = nullptr;
     std::string strTable;
     Json::Value jDefinition;
@@ -42,7 +42,7 @@ struct Call {
     const char* key() const { return blKey ? strKey.c_str() : nullptr; }
     bool blKey = false;
     std::vector<std::string> strVector;
-    bool blFlag = false;  // of runSqlEx: with a callback; of SqlExpandMemberName: of a record
+    bool blFlag = false;  // runSqlEx: with a callback; SqlExpandMemberName: for a record
     int iNumber = 0;      // a kind of time or list; getTimeAfterNow writes text unless it is 0
     long now = 0;         // also the number of rows that a callback was called with
     const Json::Value* pjResult = nullptr;  // what recType referred to

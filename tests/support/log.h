@@ -20,10 +20,10 @@ std::vector<Item> operator+(std::vector<Item> items, const std::vector<Item>& mo
 //     E VornJsonDbApi: Failed [!pDb]        error family (the text without its ", err=...")
 //     P util: strJsonName=task              plain family
 //
-// after everything else of it was checked: the exact form of its variant, process id, component,
-// priority, errno, and that the line number leads to the very check in the component's sources. A
-// line that breaks a rule comes as "BROKEN ...". A number in "errno=2," has to be the errno of the
-// line and comes as "errno=?,".
+// after everything else about it has been checked: the exact form of its variant, process id,
+// component, priority, errno, and that the line number leads to the very check in the component's
+// sources. A line that breaks a rule comes as "BROKEN ...". A number in "errno=2," has to be the
+// errno of the line and comes as "errno=?,".
 Lines takeLog();
 
 // A failed check of the class, or of the free functions.
@@ -35,5 +35,5 @@ std::string error(const std::string& strMessage);
 std::string plain(const std::string& strMessage);
 std::string utilPlain(const std::string& strMessage);
 
-// The places of a text in the sources of a component, such as "util:12", one a line of its code.
+// The places of a text in the sources of a component, such as "util:12", one per line of code.
 std::multiset<std::string> placesOf(const std::string& strComponent, const std::string& strText);

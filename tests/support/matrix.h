@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Calls that are written as words, and what else the tests share that try very many arguments.
+// Shared by the tests that try very many arguments, or calls that are written as words.
 #pragma once
 
 #include "support/database.h"
@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-// The result of a call, or "T" where it throws Json::LogicError. Anything else that is thrown fails
+// The result of a call, or "T" if it throws Json::LogicError. Anything else that is thrown fails
 // the test.
 template <typename Call>
 std::string endOf(Call call)
@@ -19,7 +19,7 @@ std::string endOf(Call call)
     }
 }
 
-// The parts between the separators that are not empty.
+// The non-empty parts between the separators.
 std::vector<std::string> split(const std::string& strText, char cSeparator);
 
 // The text with other words for every such character.
@@ -42,14 +42,14 @@ struct Ended {
     std::string whole() const { return strChange.empty() ? strEnd : strEnd + " " + strChange; }
 };
 
-// The test fails where the call changes an argument that is no output, or what an output text
-// begins with.
+// The test fails if the call changes an argument that is not an output, or the beginning of an
+// output text.
 Ended called(VornJsonDbApi& api, const Words& call);
 
-// No statement is open, no transaction either, and a record can be written and read back by the
-// handle; strRecord is one that its table takes, as JSON.
+// No statement or transaction is open, and the handle can write a record and read it back;
+// strRecord is a record for its table, as JSON.
 void expectSound(Database& database, VornJsonDbApi& api, const std::string& strRecord);
 
 // Ends the process of a death test, with 0 unless a check has failed. Its fixture is never
-// destroyed, so the file of the database goes here.
+// destroyed, so the database file is removed here.
 [[noreturn]] void endProcess(const Database& database);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// A table of three records, the calls of the record operations, and all that has to come of a call.
+// A table of three records, the calls of the record operations, and all that a call results in.
 #pragma once
 
 #include "support/matrix.h"
@@ -17,7 +17,7 @@ protected:
     static constexpr std::size_t kOutermost = static_cast<std::size_t>(-1);
     static constexpr int kThrows = -99;
 
-    // The statement of a save: strValues ends in ") " where the list closes.
+    // The statement of a save: strValues ends in ") " if the list closes.
     static std::string saved(bool blCreate, const std::string& strColumns,
                              const std::string& strValues)
     {
@@ -64,12 +64,12 @@ protected:
     static Words removeByName(const std::string& strValue, const char* szKey);
     static bool isRemoval(const Words& call) { return 0 == call[0].find("recDelete"); }
 
-    // What comes of a call; "$" is the name of the table.
+    // The outcome of a call; "$" is the name of the table.
     struct Outcome {
         int iResult = -1;
         std::string strSql = "";           // the statement that is run; empty for none
-        const char* szOut = nullptr;       // the output; null where it is left alone
-        const char* szContents = nullptr;  // see contents(); null where they are not looked at
+        const char* szOut = nullptr;       // the output; null if it is left alone
+        const char* szContents = nullptr;  // see contents(); null if they are not checked
         std::string strError = "";         // of the statement
         Lines causes = {};                 // the lines before those of the failed level
         std::size_t nLevel = kOutermost;
@@ -84,7 +84,7 @@ protected:
     void expect(const Words& call, const Outcome& outcome);
 
     // expect() for a call that gives an output, one that changes the table, one that fails without
-    // SQL, one that fails after its statement (strError is empty where SQLite took it), and one
+    // SQL, one that fails after its statement (strError is empty if SQLite accepted it), and one
     // that passes on the exception of an accessor.
     void expectOutput(const Words& call, int iResult, const std::string& strSql,
                       const std::string& strOut)
@@ -130,7 +130,7 @@ protected:
     std::function<void()> prepare_ = [] {};
     // The retries of the statement.
     std::size_t nRetries_ = 0;
-    // Whether calls that fail change the table all the same.
+    // Whether failing calls change the table anyway.
     bool blWritten_ = false;
 
     RecordsTest();
@@ -149,7 +149,7 @@ inline const std::string kNoObjectOrNull =
 inline const std::string kFilterIsNoText = failed("!jRecParam[jmFieldName[i]].isString()");
 inline const std::string kNoRequestConditions =
     failed("0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND)");
-// The lines of a text, and of an item of a list, that find no memory.
+// The lines when memory runs out for a text, or for an item of a list.
 inline const Lines kNoMemoryForText = {
     failed(R"(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))"),
     failed("0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut)")};
