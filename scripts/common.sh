@@ -8,9 +8,6 @@ build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev 
 # zlib is what the static SQLite of Debian stands on.
 test_packages=("${build_packages[@]}" clang devscripts zlib1g-dev)
 
-# The labels of tests that no build but the developer's runs: they build and install, or take long.
-only_once='install|long'
-
 say() {
     printf '== %s\n' "$*"
 }
@@ -96,14 +93,14 @@ build_package() {
     fi
 }
 
-# run_whole_suite FOLDER: in a build folder; what the tests say is shown when one fails.
-run_whole_suite() {
-    say "running the whole suite in $1"
-    if ! ctest --test-dir "$1" --output-on-failure -j "$(nproc)" -LE "$only_once" >"$1/tests.log" 2>&1; then
-        cat "$1/tests.log"
+# run_preset PRESET: the tests of the preset; what they say is shown when one fails.
+run_preset() {
+    say "running the tests of the preset $1"
+    if ! ctest --preset "$1" -j "$(nproc)" >"build/$1/tests.log" 2>&1; then
+        cat "build/$1/tests.log"
         return 1
     fi
-    grep 'tests passed' "$1/tests.log"
+    grep 'tests passed' "build/$1/tests.log"
 }
 
 # figures FILE...: what test programs printed as lines "figure: NAME = NUMBER", as one table. A test that
