@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every block of code of the documentation is run, and every section of docs/limits.md by a test of
-// its own.
+// Every block of code in the documentation is run, and every section of docs/limits.md has a test
+// of its own.
 
 #include "docs/limits_page.h"
 
@@ -38,7 +38,7 @@ bool isRunByInstallWays(const std::string& strHeading, const std::string& strLan
     return !matches(strScript, strName + strWord + strEnd, {0}).empty();
 }
 
-TEST(Documentation, HasNoBlockThatIsNotRun)
+TEST(Documentation, HasNoBlockThatNoTestRuns)
 {
     // The tests of these pages fail when there is a block that they do not know.
     const std::set<std::string> known = {"docs/limits.md", "docs/log.md", "docs/requests.md",

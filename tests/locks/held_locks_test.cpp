@@ -129,7 +129,7 @@ std::vector<Operation> undisturbed()
 class EveryHeldLock : public HeldLock,
                       public testing::WithParamInterface<std::tuple<Situation, Operation>> {
 protected:
-    // The long run sleeps in earnest.
+    // The long run really sleeps.
     EveryHeldLock() : HeldLock(situation().szJournal)
     {
         state().blReallySleep = nullptr != getenv("VORN_SOAK");
@@ -164,7 +164,7 @@ INSTANTIATE_TEST_SUITE_P(Locks, EveryHeldLock,
                                               std::get<Operation>(row.param).szName});
                          });
 
-TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
+TEST_F(HeldLock, IsGivenUpAfterFiveRealSeconds)
 {
     using namespace std::chrono;
     state().blReallySleep = true;
@@ -175,8 +175,8 @@ TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
     Figures::of("locks, milliseconds before giving up in earnest") = elapsed.count();
 }
 
-// A transaction of the host that has read an older state can never write: all attempts are made.
-TEST_F(HeldLock, OfAnOlderSnapshotIsGivenUp)
+// A host's transaction that has read an older state can never write: all attempts are made.
+TEST_F(HeldLock, IsGivenUpInATransactionWithAnOlderSnapshot)
 {
     database_.run("pragma journal_mode=wal");
     database_.run("begin; select * from records");

@@ -30,7 +30,7 @@ TEST_F(Delete, ComposesOneStatementAndCounts)
         {R"({"data":{"k":1}})", R"(data='{"k":1}')", 1, "2Bob0,3O'Brien1"},
         {R"({"vornSqlWhereFilter":"id > 1"})", " id > 1 ", 2, "1Ann1"},
         {R"({"vornSqlWhereFilter":"1"})", " 1 ", 3, ""},
-        // Kept: sorting and paging do not count here.
+        // Kept: sorting and paging are ignored here.
         {R"({"flag":true,"limit":1,"offset":1,"sort_by":5})", "flag=1", 2, "2Bob0"},
         {R"({"id":2,"undeclared":1})", "id=2", 1, "1Ann1,3O'Brien1"},
     };
@@ -42,7 +42,7 @@ TEST_F(Delete, ComposesOneStatementAndCounts)
                            row.szContents);
 }
 
-TEST_F(Delete, DeletesEverythingOnlyWhereThatIsAllowed)
+TEST_F(Delete, DeletesEverythingOnlyWhenAllowed)
 {
     for (const char* szRequest : {"{}", R"({"undeclared":1})", R"({"limit":1,"sort_by":"id"})"}) {
         expectFailure(remove(szRequest), {failed("strSql.empty()")});
@@ -53,7 +53,7 @@ TEST_F(Delete, DeletesEverythingOnlyWhereThatIsAllowed)
     expectContents(removeAll(), 0, "DELETE FROM $ ;", "");
 }
 
-TEST_F(Delete, FailsWhereTheRequestDoes)
+TEST_F(Delete, FailsWhenTheRequestIsBad)
 {
     for (const bool blDeleteAll : {false, true}) {
         for (const char* szRequest : {"null", R"("x")", R"("")", "[]", "[1]", R"([{"id":1}])", "5",
@@ -69,7 +69,7 @@ TEST_F(Delete, FailsWhereTheRequestDoes)
     }
 }
 
-TEST_F(Delete, FailsWhereMemoryRunsOut)
+TEST_F(Delete, FailsWhenMemoryRunsOut)
 {
     prepare_ = [] { doubles::state().iFailMprintf = 1; };
     for (const bool blDeleteAll : {false, true})
@@ -79,7 +79,7 @@ TEST_F(Delete, FailsWhereMemoryRunsOut)
         expectFailure(call, kNoMemoryForItem + Lines{kNoRequestConditions}, 0);
 }
 
-TEST_F(Delete, FailsWhereSqliteRefuses)
+TEST_F(Delete, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szRequest;
@@ -95,7 +95,7 @@ TEST_F(Delete, FailsWhereSqliteRefuses)
     for (const auto& row : cases)
         expectSqlFailure(remove(row.szRequest, true),
                          std::string("DELETE FROM $  WHERE  (") + row.szTerms + " );", row.szError);
-    // These are the words of a duplicate, but a delete tells the host nothing.
+    // This is the text of a duplicate, but a delete sets no message for the host.
     database_.run("create trigger keep before delete on " + table_.strName +
                   " when old.id = 3 begin select raise(abort, 'UNIQUE constraint failed'); end");
     expectSqlFailure(removeAll(), "DELETE FROM $ ;", "UNIQUE constraint failed");
@@ -144,8 +144,8 @@ TEST_F(DeleteBy, RefusesAnEmptyListBeforeTheKey)
     }
 }
 
-// recDeleteByName does not reach the list.
-TEST_F(DeleteBy, RefusesAKeyThatIsNoMember)
+// recDeleteByName fails before it reaches the list.
+TEST_F(DeleteBy, RefusesAKeyThatIsNotAMember)
 {
     for (const char* szKey : {static_cast<const char*>(nullptr), "", "undeclared", "Name", " name",
                               "vornSqlWhereFilter"}) {
@@ -163,7 +163,7 @@ TEST_F(DeleteBy, RefusesAKeyThatIsNoMember)
     }
 }
 
-TEST_F(DeleteBy, RefusesAKeyOfEveryOtherWord)
+TEST_F(DeleteBy, RefusesAKeyOfAnyOtherWord)
 {
     Json::Value jMembers;
     for (const char* szWord :
@@ -179,7 +179,7 @@ TEST_F(DeleteBy, RefusesAKeyOfEveryOtherWord)
     }
 }
 
-// What the look-up of missing types logs comes before every check.
+// The log lines of looking up missing types come before those of any check.
 TEST_F(DeleteBy, LooksUpTheMembersFirst)
 {
     VORN_JSON_DB::recType(table_.jDefinition, table_.strName) = json("[1]");

@@ -23,7 +23,7 @@ protected:
         return strSql;
     }
 
-    // The same of a record that holds one value, without the ") " that closes the list.
+    // The same for a record that holds one value, without the ") " that closes the list.
     static std::string with(Table& table, const Json::Value& jValue, const std::string& strPrefix)
     {
         Json::Value jRecord;
@@ -85,7 +85,7 @@ TEST_F(FormattedLists, ReadAPercentSignAsAConversion)
     for (const auto& c : cases) EXPECT_EQ(c.szText, values(c.table, json(c.szRecord)));
 }
 
-TEST_F(FormattedLists, ReadAPercentSignOfTheStatementToo)
+TEST_F(FormattedLists, ReadAPercentSignInTheStatementToo)
 {
     const Json::Value jRecord = json(R"({"a":"x","b":5})");
     EXPECT_EQ("%('x',5) ", values(integer_, jRecord, "%%%%("));
@@ -95,7 +95,7 @@ TEST_F(FormattedLists, ReadAPercentSignOfTheStatementToo)
     EXPECT_EQ("100NULL,0) ", values(integer_, jRecord, "100%"));
 }
 
-TEST_F(FormattedLists, MakeASaveFailWhereTheTextIsCut)
+TEST_F(FormattedLists, MakeASaveFailIfTheTextIsCut)
 {
     Json::Value jRecord = json(R"({"a":"100%","b":5})");
     EXPECT_EQ(-1, integer_.api.recSave(jRecord, true));
@@ -119,7 +119,7 @@ std::string sqliteText(const std::string& strFormat, Arguments... arguments)
 
 enum class Kind { kInteger, kFloat, kText };
 
-// One conversion on its own, given the value where it is of the value's kind.
+// One conversion on its own, given the value if it is of the value's kind.
 std::string piece(const std::string& strHead, const std::string& strLength, char cType, Kind kind)
 {
     const std::string strFormat = strHead + strLength + ('z' == cType ? 's' : cType);

@@ -27,7 +27,7 @@ auto* const pRealVasprintf =
 
 }  // namespace
 
-// What the library calls instead of the real one.
+// The library calls this instead of the real one.
 extern "C" __attribute__((format(printf, 2, 0))) int vasprintf(char** pszText, const char* szFormat,
                                                                va_list arguments) noexcept
 {
@@ -37,7 +37,7 @@ extern "C" __attribute__((format(printf, 2, 0))) int vasprintf(char** pszText, c
     return iLength;
 }
 
-// With _FORTIFY_SOURCE it is this one.
+// With _FORTIFY_SOURCE it calls this one.
 extern "C" __attribute__((format(printf, 3, 0))) int __vasprintf_chk(char** pszText, int /*iFlag*/,
                                                                      const char* szFormat,
                                                                      va_list arguments) noexcept
@@ -125,7 +125,7 @@ TEST_F(Log, WritesEachFamilyInItsForms)
     }
 }
 
-TEST_F(Log, GivesTheSqlErrorOfEachOperationALineNumberOfItsOwn)
+TEST_F(Log, GivesEachOperationsSqlErrorItsOwnLineNumber)
 {
     database_.run("drop table " + table_.strName);
     blLogToStdout = true;
@@ -149,7 +149,7 @@ TEST_F(Log, GivesTheSqlErrorOfEachOperationALineNumberOfItsOwn)
 }
 
 // Rendering a record allocates, and so does formatting: both may leave anything in errno.
-TEST_F(Log, ShowsTheErrnoOfTheCheckThoughComposingTheLineChangesIt)
+TEST_F(Log, ShowsTheErrnoOfTheCheckEvenIfComposingTheLineChangesIt)
 {
     // The first look-up of a process makes the cache, before any check.
     VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
@@ -237,7 +237,7 @@ TEST_F(Log, IsSilentAboutSuccess)
     EXPECT_EQ(Lines(), takeLog());
 }
 
-TEST_F(Log, DropsOnlyTheLineThatFindsNoMemory)
+TEST_F(Log, DropsOnlyTheLineThatLacksMemory)
 {
     blFailNextLine = true;
     errno = ENOENT;

@@ -22,7 +22,7 @@ protected:
         });
     }
 
-    // Neither a connection nor a definition is looked at.
+    // Neither a connection nor a definition is needed.
     std::string strName_ = freshName();
     Json::Value jDefinition_;
     std::string strCreate_;
@@ -65,7 +65,7 @@ TEST_F(Paging, WritesTheSortKeyAsATextLiteral)
                      {std::string(" order by '") + szLiteral + "'"});
 }
 
-TEST_F(Paging, SortsDownOnlyForDesc)
+TEST_F(Paging, SortsDescendingOnlyForDesc)
 {
     const std::string strRequest = R"({"sort_by":"name","sort_direction":)";
     expectClause(strRequest + R"("desc"})", {" order by 'name' DESC"});
@@ -74,7 +74,7 @@ TEST_F(Paging, SortsDownOnlyForDesc)
         expectClause(strRequest + szDirection + "}", {" order by 'name' ASC"});
 }
 
-// Of every kind, and unchecked.
+// Of any kind, and unchecked.
 TEST_F(Paging, WritesLimitAndOffsetAsJson)
 {
     const auto expectValue = [this](const std::string& strValue, const std::string& strText) {
@@ -106,7 +106,7 @@ TEST_F(Paging, WritesLimitAndOffsetAsJson)
     expectValue(R"({"b": 1, "a": [null, 2]})", R"({"a":[null,2],"b":1})");
 }
 
-TEST_F(Paging, LeavesOutTheCommentsOfAReader)
+TEST_F(Paging, LeavesOutCommentsOnTheNumbers)
 {
     Json::Value jRequest = json(R"({"limit":10})");
     jRequest["limit"].setComment(std::string("// ten"), Json::commentAfterOnSameLine);

@@ -36,7 +36,7 @@ TEST_F(UpdateByWhere, ComposesOneStatement)
         {R"({"name":null})", "id=2", "name=''", "1Ann1,20,3O'Brien1"},
         {R"({"flag":null})", "id=1", "flag=0", "1Ann0,2Bob0,3O'Brien1"},
         {R"({"flag":true,"undeclared":5})", "id=2", "flag=1", "1Ann1,2Bob1,3O'Brien1"},
-        // A raw filter beside the values is no column, of whatever kind it is.
+        // A raw filter among the values is not a column, whatever its kind.
         {R"({"flag":true,"vornSqlWhereFilter":"id=3"})", "id=2", "flag=1", "1Ann1,2Bob1,3O'Brien1"},
         {R"({"flag":true,"vornSqlWhereFilter":5})", "id=2", "flag=1", "1Ann1,2Bob1,3O'Brien1"},
         // Kept: the condition is taken unchanged.
@@ -59,7 +59,7 @@ TEST_F(UpdateByWhere, RefusesAnEmptyConditionBeforeTheRecord)
         expectFailure(updateByWhere(szRecord, ""), {failed("strSqlWhere.empty()")});
 }
 
-TEST_F(UpdateByWhere, RefusesARecordThatIsEmptyOrOfAnotherKind)
+TEST_F(UpdateByWhere, RefusesARecordThatIsEmptyOrOfTheWrongKind)
 {
     for (const char* szRecord : {"null", "{}", "[]"})
         expectFailure(updateByWhere(szRecord, "id=1"), {failed("jRecIn.empty()")});
@@ -68,14 +68,14 @@ TEST_F(UpdateByWhere, RefusesARecordThatIsEmptyOrOfAnotherKind)
                       "UPDATE $ SET ");
 }
 
-TEST_F(UpdateByWhere, FailsWhereMemoryRunsOutInATerm)
+TEST_F(UpdateByWhere, FailsWhenMemoryRunsOutInATerm)
 {
     prepare_ = [] { doubles::state().iFailMprintf = 2; };
     expectFailure(updateByWhere(R"({"id":1,"name":"Eve"})", "id=1"),
                   kNoMemoryForText + Lines{kNoSetList}, 0, "UPDATE $ SET ");
 }
 
-TEST_F(UpdateByWhere, FailsWhereSqliteRefuses)
+TEST_F(UpdateByWhere, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szRecord;
@@ -136,7 +136,7 @@ TEST_F(UpdateByFilter, ComposesOneStatement)
         {R"({"name":["Ann"]})", R"({"id":7})", "id=7", "name in ('Ann' )", "2Bob0,3O'Brien1,7Ann1"},
         {R"({"vornSqlWhereFilter":"id > 1"})", R"({"flag":false})", "flag=0", " id > 1 ",
          "1Ann1,2Bob0,3O'Brien0"},
-        // Kept: sorting and paging do not count here.
+        // Kept: sorting and paging are ignored here.
         {R"({"flag":true,"limit":1,"sort_by":"id"})", R"({"flag":false})", "flag=0", "flag=1",
          "1Ann0,2Bob0,3O'Brien0"},
         {R"({"id":9})", R"({"flag":false})", "flag=0", "id=9", kBefore},
@@ -151,7 +151,7 @@ TEST_F(UpdateByFilter, ComposesOneStatement)
                        update(row.szSet, row.szTerms), row.szContents);
 }
 
-TEST_F(UpdateByFilter, RefusesAFilterByItsKindBeforeTheValues)
+TEST_F(UpdateByFilter, RefusesAFilterOfTheWrongKindBeforeTheValues)
 {
     for (const char* szValues : {R"({"flag":true})", "[1]", "null"}) {
         for (const char* szFilter : {"null", "{}", "[]"})
@@ -162,7 +162,7 @@ TEST_F(UpdateByFilter, RefusesAFilterByItsKindBeforeTheValues)
     }
 }
 
-TEST_F(UpdateByFilter, RefusesValuesOfAnotherKindBeforeTheConditionsAreLookedAt)
+TEST_F(UpdateByFilter, RefusesValuesOfTheWrongKindBeforeReadingTheConditions)
 {
     for (const char* szFilter :
          {R"({"id":1})", R"({"vornSqlWhereFilter":5})", R"({"undeclared":1})"})
@@ -172,7 +172,7 @@ TEST_F(UpdateByFilter, RefusesValuesOfAnotherKindBeforeTheConditionsAreLookedAt)
                           {failed("jParamIn.type() != Json::objectValue")});
 }
 
-TEST_F(UpdateByFilter, ReportsAFaultOfTheFilterBeforeOneOfTheValues)
+TEST_F(UpdateByFilter, ReportsABadFilterBeforeBadValues)
 {
     const std::string strBadValues = R"({"id":"x"})";
     expectFailure(updateByFilter(R"({"vornSqlWhereFilter":5})", strBadValues),
@@ -214,12 +214,12 @@ TEST_F(UpdateByFilter, RefusesValuesOfTheWrongType)
     expectRefused("type not found!!, key=id", R"({"id":1})");
 }
 
-TEST_F(UpdateByFilter, RefusesEmptyValuesOneLevelBelow)
+TEST_F(UpdateByFilter, RefusesEmptyValuesInTheInnerUpdate)
 {
     expectFailure(updateByFilter(R"({"id":1})", "{}"), {failed("jRecIn.empty()")}, 0);
 }
 
-TEST_F(UpdateByFilter, FailsWhereSqliteRefuses)
+TEST_F(UpdateByFilter, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szFilter;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What SQLite refuses inside the fence, whatever the statement comes from.
+// What SQLite refuses inside the fence, wherever the statement comes from.
 
 #include "world.h"
 
@@ -17,7 +17,7 @@ protected:
             "insert into note values (1,'a'),(2,'b'); insert into vault values ('s')");
     }
 
-    // Runs the statements without the fence, and makes it anew.
+    // Runs the statements without the fence, and then recreates it.
     void rebuild(const std::string& strSql)
     {
         pFence_.reset();
@@ -25,7 +25,7 @@ protected:
         pFence_ = std::make_unique<Fence>(database_.get(), "note");
     }
 
-    // 0, or -1 where SQLite refuses the statement and says why.
+    // 0, or -1 if SQLite refuses the statement and says why.
     int execute(const std::string& strSql)
     {
         const auto ignore = [](void*, int, char**, char**) { return 0; };
@@ -77,7 +77,7 @@ TEST_F(FenceTest, GivesEachAccessWhatItNeeds)
     EXPECT_EQ("1z,3d", notes());
 }
 
-TEST_F(FenceTest, GivesNoneMoreAndNothingBetweenTwoCalls)
+TEST_F(FenceTest, GivesNoFurtherAccessAndNoneBetweenCalls)
 {
     const char* kSelect = "select * from note";
     const char* kInsert = "insert into note (id) values (3)";
@@ -85,7 +85,7 @@ TEST_F(FenceTest, GivesNoneMoreAndNothingBetweenTwoCalls)
     const char* kDelete = "delete from note where id=1";
     const char* kRowid = "select last_insert_rowid() from note";
     const std::vector<std::string> never = {
-        // Other tables, and the names and numbers of SQLite.
+        // Other tables, including SQLite's own.
         "select * from vault", "select count(*) from vault", "insert into vault values ('x')",
         "update vault set secret=''", "delete from vault", "drop table vault",
         "select * from sqlite_sequence", "insert into sqlite_sequence values ('note',9)",
@@ -137,7 +137,7 @@ TEST_F(FenceTest, GivesNothingToTriggersAndOtherDatabases)
     EXPECT_EQ("1a,2b", notes());
 }
 
-TEST_F(FenceTest, TakesBackMoreThanOneChangeAndWhatFails)
+TEST_F(FenceTest, RollsBackFailuresAndMoreThanOneChange)
 {
     const std::pair<Access, const char*> calls[] = {
         {Access::kDelete, "delete from note"},
@@ -189,7 +189,7 @@ TEST_F(FenceTest, LimitsStatements)
     EXPECT_NE(std::string::npos, strError_.find("none")) << strError_;
 }
 
-TEST_F(FenceTest, StopsNobodyWhenItIsGone)
+TEST_F(FenceTest, StopsNothingOnceDestroyed)
 {
     pFence_.reset();
     EXPECT_EQ("524288", database_.value("select count(*) from note" + repeated(18, " join note")));
@@ -218,8 +218,8 @@ TEST_F(FenceTest, IsDefensiveAndDoesNotTrustTheSchema)
 }
 
 // The guard lets these through: they are good requests, but for the size of the table. Each call
-// has all its steps.
-TEST_F(HostTest, FencedScansEndWhereTheTableIsLarge)
+// may take all its steps.
+TEST_F(HostTest, StopsScansOfALargeTable)
 {
     World large(World::Layers::kBoth, 200000);
     World medium(World::Layers::kBoth, 10000);
@@ -236,7 +236,7 @@ TEST_F(HostTest, FencedScansEndWhereTheTableIsLarge)
 }
 
 // The library alone would try 500 times to get a lock.
-TEST_F(HostTest, FencedAnswersBesideAnotherConnection)
+TEST_F(HostTest, AnswersWhileAnotherConnectionHoldsALock)
 {
     Database database(Database::Place::kFile);
     Host host(database.get());

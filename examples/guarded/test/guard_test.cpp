@@ -24,7 +24,7 @@ std::string refusal(const std::string& strLine, const Json::Value& jTypes = note
     return std::string();
 }
 
-// Of a text inside of quotes.
+// The same for a text in quotes.
 std::string refusalOfText(const std::string& strText)
 {
     return refusal(list(R"({"author":")" + strText + "\"}"));
@@ -105,8 +105,8 @@ TEST_F(Guard, RefusesControlCharacters)
     EXPECT_EQ(kText, refusalOfText("\xc2\x9b")) << "unescaped";
 }
 
-// In the second list are the neighbours of what is refused.
-TEST_F(Guard, RefusesWhatIsNotUtf8)
+// The second list has the neighbours of what is refused.
+TEST_F(Guard, RefusesInvalidUtf8)
 {
     for (const char* szText :
          {// Begins in the middle, ends too early, or goes on with something else.
@@ -123,8 +123,8 @@ TEST_F(Guard, RefusesWhatIsNotUtf8)
         EXPECT_EQ("", refusalOfText(szText)) << testing::PrintToString(szText);
 }
 
-// A table of somebody else's has other words.
-TEST_F(Guard, KnowsTheOtherWords)
+// Another table may have other words.
+TEST_F(Guard, KnowsTheOtherTypeWords)
 {
     const Json::Value jTypes = json(
         R"({"n":{"cpptype":"int"},"o":{"cpptype":"Json::objectValue"},"x":{"cpptype":"double"}})");
@@ -170,7 +170,7 @@ TEST_F(Guard, CountsValues)
 }
 
 // A default of the wrong kind, which is the host's own mistake.
-TEST_F(Guard, IsNotAskedAboutDefaults)
+TEST_F(Guard, DoesNotCheckDefaults)
 {
     World world(World::Layers::kBoth);
     Json::Value jNone;
