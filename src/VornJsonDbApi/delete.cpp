@@ -45,7 +45,7 @@ int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun += ";";
     if (FAILED(0 > (err = runSqlEx(strSqlRun)))) return fail();
-    // Cannot fail: a run that succeeds empties the error text.
+    // Cannot fail: a successful run clears the error text.
     if (GUARDED_SQL("sql error, sql=%s", strSqlRun.c_str())) return fail();
     if (blDebugOutput) LOG_PLAIN("delete rec number=%d", err);
     return err;
@@ -75,7 +75,7 @@ int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const c
     if (FAILED_AS(TypeWord(*pjMember).text() != "string",
                   "jType[szKey][\"cpptype\"].asString() != \"string\""))
         return fail();
-    // Cannot fail: object and key were checked before.
+    // Cannot fail: the object and the key were checked before.
     if (GUARDED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();
     if (FAILED(0 > (err = recDelete(jParam)))) return fail();
     return err;

@@ -21,7 +21,7 @@ struct FormatArgument {
     static FormatArgument text(const char* szValue) { return {Kind::kText, 0, 0, szValue}; }
 };
 
-// Kept(FormattedLists.ReadAPercentSignAsAConversion): a `%` in a text is a conversion for every
+// Kept(FormattedLists.ReadAPercentSignAsAConversion): a `%` in a string is a conversion for every
 // later value
 //
 // Every value is appended as

@@ -73,8 +73,8 @@ const Json::Value& memberTypes()
     State& current = state();
     // What is not an object is asked for again, which logs.
     if (nullptr == current.pjMemberTypes || !current.pjMemberTypes->isObject()) {
-        // Kept(RowDecoder.SpoilsTheTypesOfATableThatNobodyAskedForBefore): a row that is decoded
-        // before anybody asked for the table's types poisons them
+        // Kept(RowDecoder.SpoilsTheTypesOfATableThatNobodyAskedForBefore): decoding a row before
+        // anything has asked for the table's types poisons them
         Json::Value jTableDef;
         current.pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, current.strCurJsonName);
     }
@@ -157,7 +157,7 @@ int saturatedToInt(long long iValue)
 
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
 {
-    // Cannot fail: the record is an object of our own.
+    // Cannot fail: the record is the library's own object.
     if (GUARDED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue)) return -1;
     // Cannot fail: the loop begins at 0.
     if (GUARDED(0 > idx)) return -1;
@@ -270,8 +270,8 @@ Json::Value recordFromPrototype(char** column_value)
     }
 }
 
-// Kept(RowDecoder.AppendsTheRowsOfEveryAttempt, RowDecoder.KeepsTheRowsBeforeAFailure): arrays are
-// appended to, also by every retried attempt, and keep the rows before a failure
+// Kept(RowDecoder.AppendsTheRowsOfEveryAttempt, RowDecoder.KeepsTheRowsBeforeAFailure): rows are
+// appended to arrays, again at every retry, and the rows before a failure are kept
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
 {
     if (FAILED(!pjRecArray)) return -1;

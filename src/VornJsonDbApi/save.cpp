@@ -30,13 +30,13 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
     strSql += ") VALUES (";
     if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
     strSql.append(";select * from ").append(strName).append(" where rowid == last_insert_rowid();");
-    // Cannot fail: the text begins with its verb.
+    // Cannot fail: the statement begins with its verb.
     if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp))) return fail();
-    // Cannot fail: a run that succeeds empties the error text.
+    // Cannot fail: a successful run clears the error text.
     if (GUARDED_SQL("sql error, sql=%s", strSql.c_str())) return fail();
-    // Kept(Save.FailsWhereTheRowCannotBeReadThoughItIsWritten): a write whose row cannot be read
-    // back fails and stays written
+    // Kept(Save.FailsWhereTheRowCannotBeReadThoughItIsWritten): a write fails if its row cannot be
+    // read back, but the row stays written
     if (FAILED(0 == jArrayTmp.size())) return fail();
 
     jRecInOut = std::move(*jArrayTmp.begin());
@@ -47,8 +47,8 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
 {
     // What runs inside the statement may change or destroy the host's record: it is read no more.
     Json::Value jParam = jRecIn;
-    // Kept(Operations.TellAnEarlierDuplicateAgain): an earlier duplicate counts for a later failure
-    // without SQL
+    // Kept(Operations.TellAnEarlierDuplicateAgain): after a duplicate, a later failure that ran no
+    // SQL is reported as a duplicate too
     const auto fail = [&] {
         LOG_PLAIN("call create rec, rec=%s", toString(jParam).c_str());
         if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;

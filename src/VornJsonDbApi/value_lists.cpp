@@ -71,8 +71,8 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
         const std::string_view strKey = memberName(it);
         if (nullptr != rec && nullptr == values.find(strKey)) continue;
         sql += strKey;
-        // The place in the definition decides. Kept(Save.RefusesListsThatDoNotClose): a record
-        // without the last declared member gives a list that does not close
+        // The place in the definition decides. Kept(Save.RefusesListsThatDoNotClose): if a record
+        // lacks the last declared member, its list is not closed
         if (0 < nLeft) sql += ',';
     }
     return 0;

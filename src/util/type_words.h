@@ -28,8 +28,8 @@ struct TypeForms {
 };
 
 // Kept(ValueLists.RefuseEveryOtherWord, RowDecoder.RefusesAValueOfAnyOtherType,
-// TypeCheck.KnowsNoOtherWord): each consumer knows type words of its own: a "double" is written and
-// not read back, a "Json::Value" read and not written
+// TypeCheck.KnowsNoOtherWord): each consumer supports its own type words: a "double" is written but
+// not read back, a "Json::Value" is read but not written
 // clang-format off
 inline constexpr TypeForms kTypeWords[] = {
     //  word               a row            a value list            a condition      the type check
