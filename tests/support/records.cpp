@@ -26,59 +26,68 @@ Lines rowRefused(const Lines& field, const Lines& shown)
            Lines{failed("0 > DbCallBackFillRec(&jTmp, n_column, column_value, column_name)")};
 }
 
-std::vector<Lines> levelsOf(const std::string& strFunction, const Json::Value& jArguments,
+std::vector<Lines> levelsOf(const std::string& strFunction, Json::Value jArguments,
                             const Json::Value& jTypes)
 {
-    const auto is = [&](const char* szFirst, const char* szSecond) {
-        return szFirst == strFunction || szSecond == strFunction;
+    // The levels of the operation that this one calls, and its own.
+    const auto above = [&](const char* szCalled, const Lines& level) {
+        return levelsOf(szCalled, jArguments, jTypes) + std::vector<Lines>{level};
     };
-    const std::string strFirst = text(jArguments["first"]);
-    std::vector<Lines> levels;
+    const auto shown = [](const char* szName, const Json::Value& jValue) {
+        return plain(szName + ("=" + text(jValue)));
+    };
+    Json::Value& jFirst = jArguments["first"];
 
-    if (is("tableCreate", "constructor"))
-        levels = {{error("create table failed, sql=" + jArguments["create"].asString())}};
-    if (is("constructor", "")) levels.push_back({failed("0 > tableCreate()")});
+    if ("tableCreate" == strFunction)
+        return {{error("create table failed, sql=" + jArguments["create"].asString())}};
+    if ("constructor" == strFunction) return above("tableCreate", {failed("0 > tableCreate()")});
 
-    const bool blCreate = is("recCreate", "");
-    const std::string strRecord =
-        blCreate ? text(withDefaults(jArguments["first"], jTypes)) : strFirst;
-    const std::string strFlag = blCreate || jArguments["flag"].asBool() ? "1" : "0";
-    if (is("recSave", "recCreate"))
-        levels = {{failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
-                   plain("blCreate=" + strFlag + ", jRecInOut=" + strRecord),
-                   plain("jType=" + text(jTypes))}};
-    if (blCreate)
-        levels.push_back(
-            {failed("0 > recSave(jParam, true)"), plain("call create rec, rec=" + strRecord)});
+    if ("recSave" == strFunction)
+        return {
+            {failed("0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp)"),
+             shown(jArguments["flag"].asBool() ? "blCreate=1, jRecInOut" : "blCreate=0, jRecInOut",
+                   jFirst),
+             shown("jType", jTypes)}};
+    if ("recCreate" == strFunction) {
+        jFirst = withDefaults(jFirst, jTypes);
+        jArguments["flag"] = true;
+        return above("recSave",
+                     {failed("0 > recSave(jParam, true)"), shown("call create rec, rec", jFirst)});
+    }
 
-    if (is("recList", "recGetOne"))
-        levels = {{failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
-                   plain("jRecParam=" + strFirst)}};
-    if (is("recGetOne", "")) levels.push_back({failed("0 > recList(jRecParam, jRecArray)")});
+    if ("recList" == strFunction)
+        return {{failed("0 > runSqlEx(strSqlRun, DbCallBackFillList, &jRecArrayOut)"),
+                 shown("jRecParam", jFirst)}};
+    if ("recGetOne" == strFunction)
+        return above("recList", {failed("0 > recList(jRecParam, jRecArray)")});
 
-    const std::string strValues =
-        is("recUpdateByFilter", "") ? text(jArguments["second"]) : strFirst;
-    if (is("recUpdateByWhere", "recUpdateByFilter"))
-        levels = {{failed("0 > runSqlEx(strSql, NULL, NULL)"), plain("jRecIn=" + strValues)}};
-    if (is("recUpdateByFilter", ""))
-        levels.push_back({failed("0 > recUpdateByWhere(jParamIn, strSql)"),
-                          plain("recUpdateByFilter failed, jParamIn=" + strValues)});
+    if ("recUpdateByWhere" == strFunction)
+        return {{failed("0 > runSqlEx(strSql, NULL, NULL)"), shown("jRecIn", jFirst)}};
+    if ("recUpdateByFilter" == strFunction) {
+        jFirst = jArguments["second"];
+        return above("recUpdateByWhere", {failed("0 > recUpdateByWhere(jParamIn, strSql)"),
+                                          shown("recUpdateByFilter failed, jParamIn", jFirst)});
+    }
 
-    if (0 == strFunction.find("recDelete")) levels = {{failed("0 > (err = runSqlEx(strSqlRun))")}};
-    const bool blByName = is("recDeleteByName", "");
-    const std::string strName =
-        "name=" + (jArguments.isMember("key") ? jArguments["key"].asString() : "(null)");
-    std::string strTexts = blByName ? "," + jArguments["text"].asString() : "";
-    for (const Json::Value& jText : jArguments["vector"]) strTexts += "," + jText.asString();
-    strTexts.erase(0, 1);
-    if (is("recDeleteByArray", "recDeleteByName"))
-        levels.push_back(
-            {failed("0 > (err = recDelete(jParam))"),
-             plain("recDeleteByArray failed, " + strName + ", strVector=" + strTexts)});
-    if (blByName)
-        levels.push_back({failed("0 > (err = recDeleteByArray(strVector, szKey))"),
-                          plain("recDeleteByName failed, " + strName + ", strValue=" + strTexts)});
-    return levels;
+    if ("recDelete" == strFunction || "recDeleteAll" == strFunction)
+        return {{failed("0 > (err = runSqlEx(strSqlRun))")}};
+    const std::string strKey = jArguments.isMember("key") ? jArguments["key"].asString() : "(null)";
+    if ("recDeleteByArray" == strFunction) {
+        std::string strTexts;
+        for (const Json::Value& jText : jArguments["vector"]) strTexts += "," + jText.asString();
+        strTexts.erase(0, 1);
+        return above("recDelete", {failed("0 > (err = recDelete(jParam))"),
+                                   plain("recDeleteByArray failed, name=" + strKey +
+                                         ", strVector=" + strTexts)});
+    }
+    if ("recDeleteByName" == strFunction) {
+        const std::string strValue = jArguments["text"].asString();
+        jArguments["vector"].append(strValue);
+        return above("recDeleteByArray",
+                     {failed("0 > (err = recDeleteByArray(strVector, szKey))"),
+                      plain("recDeleteByName failed, name=" + strKey + ", strValue=" + strValue)});
+    }
+    return {};
 }
 
 Lines restOf(const std::vector<Lines>& levels, std::size_t nLevel, const std::string& strError,

@@ -32,7 +32,7 @@ Lines rowRefused(const Lines& field, const Lines& shown = {});
 // How the log of a failed operation ends: for each level, the innermost first, the check of what
 // the level below gives (the first: of what SQLite gives) and the lines that follow any check. The
 // arguments are as Call takes them, with the text of the CREATE statement as "create".
-std::vector<Lines> levelsOf(const std::string& strFunction, const Json::Value& jArguments,
+std::vector<Lines> levelsOf(const std::string& strFunction, Json::Value jArguments,
                             const Json::Value& jTypes);
 
 // What follows a failed check of that level; the error text is the one that the handle holds.
