@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every block of code of the documentation is run, and every section of docs/limits.md by a test of
-// its own.
+// Every block of code of the documentation is run, every section of docs/limits.md by a test of its
+// own, and the tests, scripts and guards that pages name are there.
 
 #include "docs/limits_page.h"
 
@@ -36,6 +36,12 @@ bool isRunByInstallWays(const std::string& strHeading, const std::string& strLan
     const std::string strEnd =
         blLoop ? "(?:" + strNumber + "\\b|\"\\$number\")" : strNumber + "\\b";
     return !matches(strScript, strName + strWord + strEnd, {0}).empty();
+}
+
+bool hasTest(const std::string& strSuite, const std::string& strTest)
+{
+    static const std::string strTests = folderText("tests");
+    return std::string::npos != strTests.find("(" + strSuite + ", " + strTest + ")\n{");
 }
 
 TEST(Documentation, HasNoBlockThatIsNotRun)
@@ -89,7 +95,7 @@ TEST(LimitsPage, NamesOneTestInEachSection)
         }
         ASSERT_EQ(2U, tests.size());
         EXPECT_TRUE(named.insert(tests[1]).second);
-        EXPECT_NE(std::string::npos, strTests.find("(" + tests[0] + ", " + tests[1] + ")\n{"));
+        EXPECT_PRED2(hasTest, tests[0], tests[1]);
         for (const MarkdownBlock& block : section.blocks) {
             const std::string strInclude = "#include \"limits/" + tests[1] + ".inc\"";
             const bool blIncluded = std::string::npos != strTests.find(strInclude);
@@ -97,6 +103,27 @@ TEST(LimitsPage, NamesOneTestInEachSection)
         }
     }
     EXPECT_FALSE(named.empty());
+}
+
+TEST(DesignPage, NamesTestsThatExist)
+{
+    const auto names =
+        matches(fileText("docs/design.md"), "`([A-Z][A-Za-z]+)\\.([A-Z][A-Za-z]+)`", {1, 2});
+    EXPECT_LT(50U, names.size());
+    for (std::size_t i = 0; i < names.size(); i += 2) EXPECT_PRED2(hasTest, names[i], names[i + 1]);
+}
+
+TEST(DesignPage, ListsEveryGuard)
+{
+    const std::string strPage = fileText("docs/design.md");
+    const std::string strMessages = fileText("tests/data/messages.txt");
+    const std::size_t nGuards = strMessages.find("\n# guards");
+    ASSERT_NE(std::string::npos, nGuards);
+    const auto guards = matches(
+        strMessages.substr(nGuards, strMessages.find("\n# ", nGuards + 1) - nGuards), "\n([^#].*)");
+    EXPECT_LT(5U, guards.size());
+    for (const std::string& strGuard : guards)
+        EXPECT_NE(std::string::npos, strPage.find("`" + strGuard + "`")) << strGuard;
 }
 
 }  // namespace
