@@ -3,7 +3,6 @@
 # package_test.sh SOURCE WORK HOST EXPECTED: installs the library as the README says, moves what was
 # installed, and builds the README's host against it in every way that the README names, and the
 # examples; then removes it. What was installed stays in WORK/moved.
-set -euo pipefail
 . "$(dirname "$0")/package.sh"
 [ "$(wc -l <"$host")" -le 30 ] || fail "the host has more than 30 lines"
 
@@ -72,9 +71,8 @@ c++ -std=c++17 "$host" $flags -Wl,-rpath,"$work/moved/$libdir" -o "$work/host"
 runs "$work/host"
 
 # In folders that are not below the prefix, pkg-config names them as they stand.
-quietly "absolute folders do not configure" cmake -S "$source" -B "$work/absolute" -DVORNJSONDB_TESTS=OFF \
-    -DVORNJSONDB_EXAMPLES=OFF -DCMAKE_INSTALL_PREFIX=/usr -DCMAKE_INSTALL_LIBDIR=/opt/lib \
-    -DCMAKE_INSTALL_INCLUDEDIR=/srv/include
+quietly "absolute folders do not configure" cmake -S "$source" -B "$work/absolute" "${alone[@]}" \
+    -DCMAKE_INSTALL_PREFIX=/usr -DCMAKE_INSTALL_LIBDIR=/opt/lib -DCMAKE_INSTALL_INCLUDEDIR=/srv/include
 for variable in libdir=/opt/lib includedir=/srv/include; do
     [ "$(pkg-config --variable="${variable%%=*}" "$work/absolute/vornjsondb.pc")" = "${variable#*=}" ] ||
         fail "pkg-config has not $variable"
