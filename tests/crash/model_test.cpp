@@ -57,7 +57,7 @@ protected:
     Expected expected_;
 };
 
-TEST_F(CrashCheck, PassesAPendingOperationAbsentOrWhole)
+TEST_F(CrashCheck, AcceptsAPendingOperationAbsentOrComplete)
 {
     expectVerdict(Verdict::kNone, "");
     begin(kThree);
@@ -66,7 +66,7 @@ TEST_F(CrashCheck, PassesAPendingOperationAbsentOrWhole)
     expectVerdict(Verdict::kWhole, "");
 }
 
-TEST_F(CrashCheck, FindsWhatWasRolledBack)
+TEST_F(CrashCheck, FindsARolledBackChange)
 {
     Operation rolledBack = kThree;
     rolledBack.frame = Operation::kRollback;
@@ -94,7 +94,7 @@ TEST_F(CrashCheck, FindsADamagedIndex)
     EXPECT_NE("", check(strPath_, expected_).strCorrupt);
 }
 
-TEST_F(CrashCheck, FindsWhatIsNoDatabase)
+TEST_F(CrashCheck, FindsAFileThatIsNotADatabase)
 {
     std::ofstream(strPath_) << std::string(4096, 'x');
     expectVerdict(Verdict::kNone, "the records cannot be listed", "file is not a database");
@@ -108,7 +108,7 @@ const char* const kTamperings[][2] = {
 };
 
 // Half of an operation is the first of them.
-TEST_F(CrashCheck, FindsALostChangedOrAdditionalRecord)
+TEST_F(CrashCheck, FindsALostChangedOrExtraRecord)
 {
     const std::string strSound = strPath_ + ".sound";
     std::filesystem::rename(strPath_, strSound);
@@ -125,7 +125,7 @@ TEST_F(CrashCheck, FindsALostChangedOrAdditionalRecord)
     std::filesystem::remove(strSound);
 }
 
-TEST(CrashReports, OfOtherFormsAreRefused)
+TEST(CrashReports, MalformedLinesAreRefused)
 {
     Expected expected;
     for (const char* szLine : {"", "done", "begin ", "begin 0 1", "begin 0 1 0 1", "begin 3 0",

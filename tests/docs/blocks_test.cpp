@@ -44,7 +44,7 @@ bool hasTest(const std::string& strSuite, const std::string& strTest)
     return std::string::npos != strTests.find("(" + strSuite + ", " + strTest + ")\n{");
 }
 
-TEST(Documentation, HasNoBlockThatIsNotRun)
+TEST(Documentation, HasNoBlockThatNoTestRuns)
 {
     // The tests of these pages fail when there is a block that they do not know.
     const std::set<std::string> known = {"docs/limits.md", "docs/log.md", "docs/requests.md",

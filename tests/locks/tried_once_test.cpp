@@ -137,7 +137,7 @@ TEST_P(TriedOnce, ByEveryOperation)
 INSTANTIATE_TEST_SUITE_P(Errors, TriedOnce, testing::ValuesIn(kErrors),
                          [](const auto& tested) { return std::string(tested.param.szName); });
 
-TEST_F(OnceTest, RefusalByTheAuthorizer)
+TEST_F(OnceTest, AuthorizerRefusalIsTriedOnce)
 {
     const auto refuse = [](void*, int, const char*, const char*, const char*, const char*) {
         return SQLITE_DENY;
@@ -149,7 +149,7 @@ TEST_F(OnceTest, RefusalByTheAuthorizer)
 }
 
 // A table cannot be dropped while the same connection reads.
-TEST_F(OnceTest, StatementOfTheHost)
+TEST_F(OnceTest, DropDuringAHostsQueryIsTriedOnce)
 {
     sqlite3_stmt* pReader = nullptr;
     ASSERT_EQ(SQLITE_OK,
@@ -171,7 +171,7 @@ TEST_F(OnceTest, StatementOfTheHost)
 }
 
 // SQLite looks for an interrupt in the loops of a statement.
-TEST_F(OnceTest, Interrupt)
+TEST_F(OnceTest, InterruptIsTriedOnce)
 {
     const auto interrupt = [](void* pDb) {
         sqlite3_interrupt(static_cast<sqlite3*>(pDb));
@@ -192,7 +192,7 @@ TEST_F(OnceTest, Interrupt)
 }
 
 // Kept: the words decide, whoever wrote them.
-TEST_F(OnceTest, ExceptATriggerThatSpeaksOfALock)
+TEST_F(OnceTest, TriggerThatMentionsALockIsRetried)
 {
     const std::string strError = "the database is locked away";
     database_.run("create trigger refuse before delete on records begin select raise(abort, '" +

@@ -125,7 +125,7 @@ protected:
     BusyAt() : Busy(GetParam().szColumns) {}
 };
 
-TEST_P(BusyAt, LockIsTriedAgainFromTheStart)
+TEST_P(BusyAt, RetriesFromTheStart)
 {
     const Held& held = GetParam();
     const Operation& tested = operation(held.szOperation);
@@ -185,7 +185,7 @@ TEST_P(BusyInTransaction, EveryOperationRunsOnce)
 
 // Kept: EAGAIN counts as a lock, whatever failed. Such a failure can come between two rows, and a
 // transaction is no help.
-TEST_F(Busy, ListRepeatsItsFirstRowsWhereAReadWouldHaveToWait)
+TEST_F(Busy, ListRepeatsItsFirstRowsIfAReadHasToWait)
 {
     const DiskFile file({Journal::kDelete});
     std::size_t nRepeated = 0;
@@ -209,7 +209,7 @@ TEST_F(Busy, ListRepeatsItsFirstRowsWhereAReadWouldHaveToWait)
 
 // Also the locks that a connection takes before its first statement. Only an INSERT into a table
 // with keys fails, at the lock of its re-selection.
-TEST_F(Busy, EveryOperationIsTriedAgainAtEachLock)
+TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
 {
     for (const Operation& operation : operations())
         for (Journal journal : {Journal::kDelete, Journal::kWal}) {
