@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
-# package_test.sh SOURCE WORK HOST EXPECTED: installs the library as the README says, moves what was
-# installed, and builds the README's host against it in every way that the README names, and the
-# examples; then removes it. What was installed stays in WORK/moved.
+# package_test.sh SOURCE WORK HOST EXPECTED HARDENING-CHECK: installs the library as the README says,
+# moves what was installed, and builds the README's host against it in every way that the README
+# names, and the examples; then removes it. The program hardening-check may be missing.
 . "$(dirname "$0")/package.sh"
 [ "$(wc -l <"$host")" -le 30 ] || fail "the host has more than 30 lines"
 
@@ -25,6 +25,17 @@ done
 # library needs has all others.
 ldd -r "$library" 2>&1 | sed -n 's/^undefined symbol: \([^[:space:]]*\).*/\1/p' | LC_ALL=C sort >"$work/undefined"
 printf 'blDebugOutput\nblLogToStdout\n' | diff -u - "$work/undefined" || fail "other symbols than the host's two flags are undefined"
+
+# Hardened as Debian's packages are. Debian's own start files lack the mark of control flow protection that
+# hardening-check reads, so a function is looked at. The compilers for other processors do not know the option.
+if [ -x "$5" ]; then
+    "$5" "$library" >"$work/log" 2>&1 || true
+    says "Stack protected: yes" "Fortify Source functions: yes" "Read-only relocations: yes" "Immediate binding: yes"
+    if [[ $(readelf -h "$library") == *X86-64* ]]; then
+        objdump -dC "$library" | grep -A 1 '<VornJsonDbApi::tableCreate()>:$' | grep endbr64 ||
+            fail "no control flow protection"
+    fi
+fi
 
 # Found by CMake, twice, after the host's own jsoncpp; the examples with it.
 host_project found -DCMAKE_PREFIX_PATH="$work/moved" <<PROJECT
