@@ -13,18 +13,17 @@ namespace {
 
 using Layers = World::Layers;
 
-class Attacked : public HostTest, public testing::WithParamInterface<std::size_t> {
-protected:
-    static void expectGoesOn(World& world)
-    {
-        world.send(create(R"({"text":"fine"})"));
-        const Json::Value jAnswer = world.answers.back();
-        EXPECT_EQ(0, jAnswer["result"].asInt()) << text(jAnswer);
-        EXPECT_EQ("fine", jAnswer["record"]["text"].asString());
-        world.send(erase(R"({"id":)" + text(jAnswer["record"]["id"]) + "}"));
-        EXPECT_EQ(1, world.answers.back()["result"].asInt());
-    }
-};
+class Attacked : public HostTest, public testing::WithParamInterface<std::size_t> {};
+
+void expectGoesOn(World& world)
+{
+    world.send(create(R"({"text":"fine"})"));
+    const Json::Value jAnswer = world.answers.back();
+    EXPECT_EQ(0, jAnswer["result"].asInt()) << text(jAnswer);
+    EXPECT_EQ("fine", jAnswer["record"]["text"].asString());
+    world.send(erase(R"({"id":)" + text(jAnswer["record"]["id"]) + "}"));
+    EXPECT_EQ(1, world.answers.back()["result"].asInt());
+}
 
 TEST_P(Attacked, IsHitOnlyWhereNothingStopsTheAttack)
 {
