@@ -16,7 +16,7 @@ TITLES = {
     "group": "list a group of ten", "list": "list a row of all", "update": "update a member by key",
     "delete": "delete a record by its key",
 }
-# What stands on the left, the figure's name, the limit, if there is one, and the aim beyond it.
+# The label on the left, the figure's name, the limit, if there is one, and the target beyond it.
 LIMITS = [
     ("create, instructions over the floor's", ("count", "create", "floor"), 1.50, 1.35),
     ("fetch, instructions over the floor's", ("count", "fetch", "floor"), 1.45, 1.35),

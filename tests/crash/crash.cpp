@@ -3,7 +3,7 @@
 //
 //     crash KILLS [FOLDER]
 //
-// In FOLDER the count is kept, and a run that was interrupted goes on with it, on a new database.
+// FOLDER keeps the count, and an interrupted run is continued from there, on a new database.
 // VORN_CRASH_SEED repeats what the writers do and the moments at which they are killed, as far as a
 // machine can; the seed of a run is printed.
 
@@ -60,7 +60,7 @@ using Clock = std::chrono::steady_clock;
 using Span = std::chrono::duration<double, std::micro>;
 
 // Either somewhere within the time that an operation takes, or from one microsecond to ten
-// milliseconds, short ones as likely as long ones. Busy, as a sleep is not that exact.
+// milliseconds, short waits as likely as long ones. A busy wait, because a sleep is less exact.
 void passSomeTime(Span operation, std::mt19937& random)
 {
     const bool blWithin = 0 == random() % 2;
@@ -78,7 +78,7 @@ public:
         for (const char* szEnd : kFiles) fs::remove(database() + szEnd);
     }
 
-    // One kill, or two. False when something is not as it has to be.
+    // One kill, or two. False if something is wrong.
     bool round(unsigned uSeed)
     {
         const long long iRound = figures_["kills"];
@@ -94,7 +94,7 @@ public:
         return judge();
     }
 
-    // Out of the way of a later run.
+    // Moves it out of the way of a later run.
     std::string keepDatabase()
     {
         std::string strKept = folder_ / ("fault-" + std::to_string(figures_["kills"]) + ".db");
@@ -106,8 +106,8 @@ public:
 private:
     std::string database() const { return folder_ / "crash.db"; }
 
-    // Some time after a number of acknowledgements, mostly counted from where the next operation
-    // begins.
+    // Some time after a number of acknowledgements, mostly timed from the start of the next
+    // operation.
     bool killWriter(const std::string& strMode, std::mt19937& random)
     {
         Child writer({VORN_CRASH_WRITER, database(), strMode, std::to_string(random()),
@@ -131,7 +131,7 @@ private:
         return blGood;
     }
 
-    // While it recovers what the killed one left, or not yet, or no more.
+    // Before, while or after it recovers what the killed writer left.
     bool killOpening(const std::string& strMode, std::mt19937& random)
     {
         Child opener({VORN_CRASH_WRITER, database(), strMode}, kReport);

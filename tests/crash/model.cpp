@@ -5,7 +5,7 @@
 #include <iterator>
 #include <sstream>
 
-// To the output of the test: nothing is logged unless an operation fails.
+// On the output of the test: nothing is logged unless an operation fails.
 bool blLogToStdout = true;
 bool blDebugOutput = false;
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 // The database that the killed writer and the checker share, what the writer does with it, and what
-// has to be in it by the writer's reports.
+// has to be in it according to the writer's reports.
 #pragma once
 
 #include "support/connection.h"
@@ -23,7 +23,7 @@ using State = std::map<int, int>;
 class Store {
 public:
     explicit Store(const std::string& strPath);
-    // False when a statement was left open.
+    // False if a statement was left open.
     bool close();
     ~Store() { close(); }
     Store(const Store&) = delete;
@@ -48,7 +48,7 @@ struct Step {
     enum Kind { kCreate, kReplace, kUpdate, kUpdateKind, kDelete, kDeleteKind, kEnd };
 
     Kind kind;
-    int iId;  // the two of a kind mean all records of its kind
+    int iId;  // for kUpdateKind and kDeleteKind, any id of the kind
     int iRevision;
 };
 
@@ -61,7 +61,7 @@ struct Operation {
     std::vector<Step> steps;
 };
 
-// One line without its end, and back. False when it is not such a line.
+// An operation as one line without its end, and back. False if it is not such a line.
 std::string toLine(const Operation& operation);
 bool fromLine(const std::string& strLine, Operation& operation);
 
@@ -88,7 +88,7 @@ struct Verdict {
     enum Pending { kNone, kAbsent, kWhole };
 
     Pending pending = kNone;
-    std::string strWrong;    // what is lost, half there or not as acknowledged
+    std::string strWrong;    // what is lost, incomplete or not as acknowledged
     std::string strCorrupt;  // what SQLite finds
 };
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The check after a kill lets pass what it has to, and nothing else.
+// The check after a kill accepts what it has to, and nothing else.
 
 #include "crash/model.h"
 
@@ -107,7 +107,7 @@ const char* const kTamperings[][2] = {
     {"update item set text=text||' ' where id=5", "record 5 is not revision 5"},
 };
 
-// Half of an operation is the first of them.
+// The first of these is also half of an operation.
 TEST_F(CrashCheck, FindsALostChangedOrExtraRecord)
 {
     const std::string strSound = strPath_ + ".sound";

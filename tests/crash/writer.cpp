@@ -26,7 +26,7 @@ int main(int argc, char** argv)
     if (3 != argc && 5 != argc) return 1;
     report("open");
     Store store(argv[1]);
-    // Little room, so that pages reach the database and its log before a transaction ends.
+    // A small cache, so that pages reach the database and its log before a transaction ends.
     const std::string strMode = argv[2];
     const std::string strSql =
         "pragma journal_mode=" + strMode + "; pragma cache_size=8; pragma wal_autocheckpoint=20";

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every block of code of the documentation is run, every section of docs/limits.md by a test of its
-// own, and the tests, scripts and guards that pages name are there.
+// Every block of code in the documentation is run, every section of docs/limits.md has a test of its
+// own, and the tests, scripts and guards that pages name exist.
 
 #include "docs/limits_page.h"
 

@@ -54,7 +54,7 @@ protected:
     Table table_{database_, "records", kMembers, kWithKeys};
 };
 
-// What brings an error about and cures it.
+// What causes an error, and what cures it.
 struct Error {
     const char* szName;
     const char* szParameter;
@@ -62,7 +62,7 @@ struct Error {
     const char* szErrorOfReading;  // "" where reading works
     // Empty for all operations that would succeed.
     const char* szOperations;
-    // Of the host itself, before and afterwards.
+    // The host's own SQL, before and afterwards.
     const char* szSql;
     const char* szCure;
     // Of the second connection, which is rolled back at the end.

@@ -130,7 +130,7 @@ const std::vector<Operation>& operations()
         {"recList of some",
          R"({"first":{"vornSqlWhereFilter":"id > 6","sort_by":"id","limit":3},"second":[]})", 0,
          false},
-        // The filter is SQL as it is, so it can end the statement and begin another.
+        // The filter is SQL verbatim, so it can end the statement and begin another.
         {"recList of all, twice",
          R"({"first":{"vornSqlWhereFilter":"1); SELECT id,name,note,tags FROM records WHERE (1"},
              "second":[]})",

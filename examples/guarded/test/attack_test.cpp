@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every attack reaches its aim at a host without checks, and at the example it does not. The trust
-// table of SECURITY.md names the attacks and the functions that are there.
+// Every attack succeeds against a host without checks, and fails against the example. The trust table
+// of SECURITY.md names every attack, and functions that exist.
 
 #include "attacks.h"
 #include "support/markdown.h"
@@ -47,7 +47,7 @@ TEST_P(Attacked, IsHitOnlyWhereNothingStopsTheAttack)
         EXPECT_EQ(blHit, attack.worked(world));
         if (Layers::kNone == layers) continue;
         EXPECT_EQ("s3cr3t", world.database.value("select secret from vault"));
-        // An update by itself is not wrong, but what the host makes of it later.
+        // The update itself does no harm, but what the host makes of it later does.
         if (!blHit && (blGuard || std::string::npos == attack.strLines.find(kHostSavesAgain))) {
             EXPECT_EQ(world.strBefore, world.contents());
         }

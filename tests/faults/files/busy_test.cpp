@@ -18,10 +18,10 @@ constexpr char kLocked[] = "database is locked";
 // The locks of an INSERT are SHARED, RESERVED and EXCLUSIVE, in this order; the fourth is that of
 // its re-selection.
 constexpr int kReselection = 4;
-// More often than a call tries.
+// More times than a call tries.
 constexpr int kAlways = 1000;
 
-// The n-th lock of each of so many attempts.
+// The n-th lock of each of that many attempts.
 std::function<bool(int n)> lockOf(int nLock, int nAttempts)
 {
     return [=](int n) { return 0 == n % nLock && n / nLock <= nAttempts; };
@@ -42,7 +42,7 @@ protected:
 
     ~Busy() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
 
-    // The result of an operation that is tried so often.
+    // The result of an operation that is tried that many times.
     int run(const char* szOperation, int nLock, int nHeld, std::size_t nAttempts)
     {
         follow({kLock, lockOf(nLock, nHeld)});
@@ -53,7 +53,7 @@ protected:
         return iResult;
     }
 
-    // All records, so many times.
+    // All records, that many times.
     Json::Value all(int nTimes) const
     {
         Json::Value jRecords(Json::arrayValue);
@@ -62,7 +62,7 @@ protected:
         return jRecords;
     }
 
-    // How many rows there are, beyond those of the beginning, that meet the condition.
+    // How many rows beyond the initial ones meet the condition.
     int nAdded(const char* szCondition = "1")
     {
         return std::stoi(host_.database.value(
@@ -80,14 +80,14 @@ protected:
 const char kStored[] = R"({"id":50,"name":"new","note":"none","tags":{}})";
 const char kStoredRow[] = "id = 50 and name = 'new' and note = 'none' and tags = '{}'";
 
-// The n-th lock of so many attempts is held.
+// The n-th lock of that many attempts is held.
 struct Held {
     const char* szOperation;
     int nLock;
     int nHeld;
     int iResult;
     std::size_t nAttempts;
-    // How many rows are new afterwards, or how often a list holds all records.
+    // How many rows are new afterwards, or how many times a list holds all records.
     int nTimes;
     const char* szColumns = kWithoutKeys;
     const char* szError = kLocked;
@@ -169,7 +169,7 @@ protected:
 
 INSTANTIATE_TEST_SUITE_P(Tables, BusyInTransaction, testing::Values(kWithKeys, kWithoutKeys));
 
-// Inside the host's transaction all locks are held that could fail half-way.
+// Inside the host's transaction every lock that could fail half-way is already held.
 TEST_P(BusyInTransaction, EveryOperationRunsOnce)
 {
     for (const char* szOperation : {"recList", "recList of all, twice", "recDelete", "recCreate"}) {
@@ -184,7 +184,7 @@ TEST_P(BusyInTransaction, EveryOperationRunsOnce)
 }
 
 // Kept: EAGAIN counts as a lock, whatever failed. Such a failure can come between two rows, and a
-// transaction is no help.
+// transaction does not help.
 TEST_F(Busy, ListRepeatsItsFirstRowsIfAReadHasToWait)
 {
     const DiskFile file({Journal::kDelete});
@@ -207,7 +207,7 @@ TEST_F(Busy, ListRepeatsItsFirstRowsIfAReadHasToWait)
     EXPECT_EQ(Lines(), takeLog());
 }
 
-// Also the locks that a connection takes before its first statement. Only an INSERT into a table
+// Even at the locks that a connection takes before its first statement. Only an INSERT into a table
 // with keys fails, at the lock of its re-selection.
 TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
 {
@@ -217,7 +217,7 @@ TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
             const DiskFile file({journal, operation.blNeedsTable});
             std::string strUndisturbed;
             int nFailures = 0;
-            // No lock has the number after the last that is ever taken.
+            // The loop ends after the last lock that is ever taken.
             for (int nHeld = kAlways, iFailed = 1; 0 < iFailed; nHeld = nHeld % kAlways + 1) {
                 file.restore();
                 {

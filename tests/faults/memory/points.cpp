@@ -33,7 +33,7 @@ constexpr char kDefinition[] = R"({
         "d": {"cpptype": "unsigned long long"}, "e": {"cpptype": "float"},
         "f": {"cpptype": "double"}, "g": {"cpptype": "Json::arrayValue"}}}})";
 
-// Whether an output that was being written ends somewhere on its way.
+// Whether an interrupted output is somewhere between before and after.
 bool isBetween(const Json::Value& jBefore, const Json::Value& jAfter, const Json::Value& jNow)
 {
     if (jNow == jBefore || jNow == jAfter) return true;
@@ -133,7 +133,7 @@ public:
         return 0 < iFailed;
     }
 
-    // What there is now.
+    // The current state.
     Json::Value outcome()
     {
         Json::Value jOutcome;
@@ -157,7 +157,7 @@ public:
         return jOutcome == jAfter_ ? Ending::kAsUndisturbed : ending_;
     }
 
-    // Empty, or what must not be after a call during which memory was lacking.
+    // Empty, or what is wrong after a call that ran out of memory.
     std::string whatIsWrong(const Json::Value& jOutcome) const
     {
         if (jOutcome == jAfter_) return std::string();
@@ -223,8 +223,8 @@ std::string check(Attempt& attempt, Store& store, Point& point)
     return sqlite::whatIsStuck(store.get(), store.other());
 }
 
-// Lines of the log that are written whole: no part of an earlier one is kept, and what the writer
-// of JSON keeps for lists is there.
+// Logs whole lines, so that no part of an earlier one is kept and the memory that the JSON writer
+// keeps for lists is there.
 void settle()
 {
     Json::Value jNoTable;
