@@ -68,8 +68,28 @@ nothing_left() {
     echo "figure: seconds $way = $((SECONDS - began))"
 }
 
-finds="Install it, A host that finds it"
-part="Install it, As a part of the host's own build"
+# found_by_hosts NAME: the README's host is built and run, by CMake and by pkg-config.
+found_by_hosts() {
+    local folder
+    folder=$(host "$1")
+    block "Install it, A host that finds it" cmake 1 >"$folder/CMakeLists.txt"
+    in_folder "$folder" "Install it, A host that finds it" 1
+    printed
+    in_folder "$(host "$1_pkg_config")" "Install it, A host that finds it" 2
+    printed
+}
+
+# way_as_part NUMBER: with the CMakeLists.txt on standard input.
+way_as_part() {
+    local folder
+    way "as a part of the host's own build, $1"
+    folder=$(host "part_$1")
+    git clone --quiet "$clone" "$folder/vornjsondb"
+    cat >"$folder/CMakeLists.txt"
+    in_folder "$folder" "Install it, A host that finds it" 1
+    printed
+    nothing_left
+}
 
 say "what it needs"
 in_folder "$clone" "Install it" 1
@@ -77,12 +97,7 @@ installed >"$work/before"
 
 way "by CMake"
 in_folder "$clone" "Install it, By CMake" 1 unshare --net
-folder=$(host found)
-block "$finds" cmake 1 >"$folder/CMakeLists.txt"
-in_folder "$folder" "$finds" 1
-printed
-in_folder "$(host pkg_config)" "$finds" 2
-printed
+found_by_hosts installed
 in_folder "$clone" "Install it, By CMake" 2
 nothing_left
 
@@ -90,23 +105,10 @@ way "by Debian packages"
 in_folder "$clone" "Install it, By Debian packages" 1
 installed >"$work/before"
 in_folder "$clone" "Install it, By Debian packages" 2
-folder=$(host packaged)
-block "$finds" cmake 1 >"$folder/CMakeLists.txt"
-in_folder "$folder" "$finds" 1
-printed
-in_folder "$(host packaged_pkg_config)" "$finds" 2
-printed
+found_by_hosts packaged
 in_folder "$clone" "Install it, By Debian packages" 3
 nothing_left
 
-for number in 1 2; do
-    way "as a part of the host's own build, $number"
-    folder=$(host "part_$number")
-    git clone --quiet "$clone" "$folder/vornjsondb"
-    block "$part" cmake "$number" >"$folder/CMakeLists.txt"
-    in_folder "$folder" "$finds" 1
-    printed
-    nothing_left
-done
-
+block "Install it, As a part of the host's own build" cmake 1 | way_as_part 1
+block "Install it, As a part of the host's own build" cmake 2 | way_as_part 2
 rm -r "$work"

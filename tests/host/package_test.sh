@@ -26,9 +26,8 @@ done
 ldd -r "$library" 2>&1 | sed -n 's/^undefined symbol: \([^[:space:]]*\).*/\1/p' | LC_ALL=C sort >"$work/undefined"
 printf 'blDebugOutput\nblLogToStdout\n' | diff -u - "$work/undefined" || fail "other symbols than the host's two flags are undefined"
 
-# Hardened as Debian's packages are. Debian's own start files lack the mark of control flow protection that
-# hardening-check reads, so one function is checked instead. The compilers
-# for other processors do not know the option.
+# Hardened as Debian's packages are. Debian's own start files lack the mark that hardening-check reads, so one
+# function is checked instead. The compilers for other processors do not know the option.
 if [ -x "$5" ]; then
     "$5" "$library" >"$work/log" 2>&1 || true
     says "Stack protected: yes" "Fortify Source functions: yes" "Read-only relocations: yes" "Immediate binding: yes"

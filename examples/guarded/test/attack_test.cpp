@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every attack succeeds against a host without checks, and fails against the example. The trust table
-// of SECURITY.md names every attack, and functions that exist.
+// Every attack succeeds against a host without checks, and fails against the example. The trust
+// table of SECURITY.md names every attack, and functions that exist.
 
 #include "attacks.h"
 #include "support/markdown.h"
