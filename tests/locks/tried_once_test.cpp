@@ -110,7 +110,7 @@ TEST_P(TriedOnce, ByEveryOperation)
     std::vector<Operation> chosen;
     std::istringstream names(error.szOperations);
     for (std::string strName; std::getline(names, strName, ',');)
-        chosen.push_back(operation(strName));
+        chosen.push_back(operation(strName.c_str()));
     if (chosen.empty())
         for (const Operation& candidate : operations()) {
             const bool blMakes = candidate.is("constructor") || candidate.is("tableCreate");

@@ -3,6 +3,7 @@
 
 #include "support/records.h"
 
+#include <cstring>
 #include <stdexcept>
 #include <utility>
 
@@ -148,9 +149,9 @@ const std::vector<Operation>& operations()
     return all;
 }
 
-const Operation& operation(const std::string& strName)
+const Operation& operation(const char* szName)
 {
     for (const Operation& candidate : operations())
-        if (strName == candidate.szName) return candidate;
-    throw std::invalid_argument(strName);
+        if (0 == strcmp(szName, candidate.szName)) return candidate;
+    throw std::invalid_argument(szName);
 }

@@ -53,4 +53,4 @@ std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps);
 std::string testName(const std::vector<std::string>& parts);
 
 const std::vector<Operation>& operations();
-const Operation& operation(const std::string& strName);
+const Operation& operation(const char* szName);
