@@ -119,9 +119,8 @@ TEST_F(HostileData, IsStoredInSeveralMembersOfARecord)
             if (blKept) {
                 EXPECT_EQ(0, iResult);
             }
-            if (blKept || 0 != iResult) {
-                EXPECT_EQ(jExpected, jOut);
-            }
+            // No message with both: gtest's comparison of very long ones takes all memory.
+            EXPECT_TRUE((!blKept && 0 == iResult) || jExpected == jOut) << szMember;
         }
     });
 }
