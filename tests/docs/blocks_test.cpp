@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every block of code in the documentation is run, and every section of docs/limits.md has a test
-// of its own.
+// Every block of code in the documentation is run, every section of docs/limits.md has a test of
+// its own, and the tests, scripts and guards that pages name exist.
 
 #include "docs/limits_page.h"
 
@@ -23,19 +23,18 @@ std::vector<std::string> pages()
 // Whether install_ways.sh runs the n-th block of its language below a heading of the README.
 bool isRunByInstallWays(const std::string& strHeading, const std::string& strLanguage, int n)
 {
-    const std::string strScript = fileText("tests/host/install_ways.sh");
-    const std::string strNumber = std::to_string(n);
-    std::string strName = "\"(?:[^\"]*, )?" + strHeading + "\"";
-    const auto variables = matches(strScript, "\n(\\w+)=" + strName + "\n");
-    if (!variables.empty()) strName = "\"\\$" + variables[0] + "\"";
-    const bool blLoop =
-        !matches(strScript, "for number in [0-9 ]*\\b" + strNumber + "\\b", {0}).empty();
-    const std::string strWord = "sh" == strLanguage   ? " "
-                                : strLanguage.empty() ? " \"\" "
-                                                      : " " + strLanguage + " ";
-    const std::string strEnd =
-        blLoop ? "(?:" + strNumber + "\\b|\"\\$number\")" : strNumber + "\\b";
-    return !matches(strScript, strName + strWord + strEnd, {0}).empty();
+    static const std::string strScript = fileText("tests/host/install_ways.sh");
+    const std::string strWord = "sh" == strLanguage   ? ""
+                                : strLanguage.empty() ? "\"\" "
+                                                      : strLanguage + " ";
+    const std::string strBlock = strHeading + "\" " + strWord + std::to_string(n);
+    return std::string::npos != strScript.find(strBlock);
+}
+
+bool hasTest(const std::string& strSuite, const std::string& strTest)
+{
+    static const std::string strTests = folderText("tests");
+    return std::string::npos != strTests.find("(" + strSuite + ", " + strTest + ")\n{");
 }
 
 TEST(Documentation, HasNoBlockThatNoTestRuns)
@@ -89,7 +88,7 @@ TEST(LimitsPage, NamesOneTestInEachSection)
         }
         ASSERT_EQ(2U, tests.size());
         EXPECT_TRUE(named.insert(tests[1]).second);
-        EXPECT_NE(std::string::npos, strTests.find("(" + tests[0] + ", " + tests[1] + ")\n{"));
+        EXPECT_PRED2(hasTest, tests[0], tests[1]);
         for (const MarkdownBlock& block : section.blocks) {
             const std::string strInclude = "#include \"limits/" + tests[1] + ".inc\"";
             const bool blIncluded = std::string::npos != strTests.find(strInclude);
@@ -97,6 +96,27 @@ TEST(LimitsPage, NamesOneTestInEachSection)
         }
     }
     EXPECT_FALSE(named.empty());
+}
+
+TEST(DesignPage, NamesTestsThatExist)
+{
+    const auto names =
+        matches(fileText("docs/design.md"), "`([A-Z][A-Za-z]+)\\.([A-Z][A-Za-z]+)`", {1, 2});
+    EXPECT_LT(50U, names.size());
+    for (std::size_t i = 0; i < names.size(); i += 2) EXPECT_PRED2(hasTest, names[i], names[i + 1]);
+}
+
+TEST(DesignPage, ListsEveryGuard)
+{
+    const std::string strPage = fileText("docs/design.md");
+    const std::string strMessages = fileText("tests/data/messages.txt");
+    const std::size_t nGuards = strMessages.find("\n# guards");
+    ASSERT_NE(std::string::npos, nGuards);
+    const auto guards = matches(
+        strMessages.substr(nGuards, strMessages.find("\n# ", nGuards + 1) - nGuards), "\n([^#].*)");
+    EXPECT_LT(5U, guards.size());
+    for (const std::string& strGuard : guards)
+        EXPECT_NE(std::string::npos, strPage.find("`" + strGuard + "`")) << strGuard;
 }
 
 }  // namespace

@@ -24,30 +24,30 @@ std::size_t waits()
     return sleeps.size();
 }
 
+// Between the INSERT of the first attempt and the SELECT that reads the row back, the other
+// connection locks the database until the second attempt.
 struct LockBetween {
+    explicit LockBetween(Database& other)
+    {
+        state().exec = [&](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
+                           void* arg, char** errText) {
+            const std::string strSql = szSql;
+            std::size_t nSelect = strSql.find(";select") + 1;
+            if (0 != nSelect && 0 == iAttempts++) {
+                EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strSql.substr(0, nSelect).c_str(),
+                                                       nullptr, nullptr, nullptr));
+                iLocked = run(other, "begin exclusive");
+            } else {
+                run(other, "rollback");
+                nSelect = 0;
+            }
+            return doubles::realExec(pDb, szSql + nSelect, callback, arg, errText);
+        };
+    }
+
     int iAttempts = 0;
     int iLocked = SQLITE_OK;  // the result of the other connection's lock
 };
-
-// Between the INSERT of the first attempt and the SELECT that reads the row back, the other
-// connection locks the database until the second attempt.
-void lockBetween(Database& other, LockBetween& lock)
-{
-    state().exec = [&other, &lock](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
-                                   void* arg, char** errText) {
-        const std::string strSql = szSql;
-        std::size_t nSelect = strSql.find(";select") + 1;
-        if (0 != nSelect && 0 == lock.iAttempts++) {
-            EXPECT_EQ(SQLITE_OK, doubles::realExec(pDb, strSql.substr(0, nSelect).c_str(), nullptr,
-                                                   nullptr, nullptr));
-            lock.iLocked = run(other, "begin exclusive");
-        } else {
-            run(other, "rollback");
-            nSelect = 0;
-        }
-        return doubles::realExec(pDb, szSql + nSelect, callback, arg, errText);
-    };
-}
 
 }  // namespace
 
@@ -72,14 +72,12 @@ TEST_F(Limits, LockedCallBlocks)
 TEST_F(Limits, RetryRunsTheWholeTextAgain)
 {
     Database other(database_.path());
-    LockBetween first;
-    lockBetween(other, first);
+    LockBetween first(other);
     EXPECT_NE("-1", saved(api_, example()));
     EXPECT_EQ(2, first.iAttempts);
     EXPECT_EQ("12", ids());
 
-    LockBetween second;
-    lockBetween(other, second);
+    LockBetween second(other);
     EXPECT_LE(0, api_.runSqlEx(example(0, "sql")));
     EXPECT_NE("-1", saved(api_, example()));
     EXPECT_LE(0, api_.runSqlEx("commit"));
@@ -90,8 +88,7 @@ TEST_F(Limits, RetryRunsTheWholeTextAgain)
 TEST_F(Limits, DuplicateMayBeYourOwnRecord)
 {
     Database other(database_.path());
-    LockBetween first;
-    lockBetween(other, first);
+    LockBetween first(other);
     EXPECT_EQ("-1", created(api_, example()));
     EXPECT_EQ(2, first.iAttempts);
     EXPECT_EQ("DUPLICATE_PRIMARY_KEY", api_.getErrMsg());
@@ -99,8 +96,7 @@ TEST_F(Limits, DuplicateMayBeYourOwnRecord)
     const std::string strRecord = stored(1);
 
     database_.run("delete from " + table_.strName);
-    LockBetween second;
-    lockBetween(other, second);
+    LockBetween second(other);
     EXPECT_LE(0, api_.runSqlEx(example(0, "sql")));
     EXPECT_EQ(strRecord, created(api_, example()));
     EXPECT_LE(0, api_.runSqlEx("commit"));

@@ -8,68 +8,48 @@
 
 namespace {
 
-class UpgradingPage : public TableTest {
-protected:
-    UpgradingPage()
-    {
-        // The layouts, of which the first is the library's, and two requests.
-        for (const MarkdownBlock& block : readPage("upgrading.md").blocks)
-            layouts_.push_back(block.strText);
-        EXPECT_LT(4U, layouts_.size());
-        strByText_ = layouts_.at(layouts_.size() - 2);
-        strByValue_ = layouts_.back();
-        layouts_.resize(layouts_.size() - 2);
-        for (const std::string& strLayout : layouts_) insert(strLayout);
-    }
+using UpgradingPage = TableTest;
 
-    // As another program would write the row.
-    void insert(const std::string& strText)
-    {
-        database_.run("insert into " + table_.strName + " (data) values ('" + strText + "')");
-    }
-
+TEST_F(UpgradingPage, ShowsLayoutsThatAreReadFoundAndSaved)
+{
+    // The layouts, of which the first is the library's, and two requests.
+    const auto blocks = readPage("upgrading.md").blocks;
+    ASSERT_EQ(6U, blocks.size());
+    const std::string& strByText = blocks[4].strText;
+    const std::string& strByValue = blocks[5].strText;
+    Table table(database_, R"({"data":{"cpptype":"Json::objectValue"},"id":{"cpptype":"int"}})",
+                "id integer primary key, data text");
+    const std::string strSelect = "select data from " + table.strName + " order by id";
     // The ids of the rows that a request selects; each is the same record.
-    std::string selected(const std::string& strRequest = "null")
-    {
+    const auto selected = [&](const std::string& strRequest = "null") {
         std::string strIds;
-        for (const Json::Value& jRecord : json(listed(table_.api, strRequest))) {
-            EXPECT_EQ(text(json(layouts_[0])), text(jRecord["data"]));
+        for (const Json::Value& jRecord : json(listed(table.api, strRequest))) {
+            EXPECT_EQ(text(json(blocks[0].strText)), text(jRecord["data"]));
             strIds += jRecord["id"].asString();
         }
         EXPECT_EQ(Lines(), takeLog());
         return strIds;
-    }
+    };
 
-    Rows rows() { return database_.rows("select data from " + table_.strName + " order by id"); }
-
-    std::vector<std::string> layouts_;
-    std::string strByText_;
-    std::string strByValue_;
-    Table table_{database_, R"({"data":{"cpptype":"Json::objectValue"},"id":{"cpptype":"int"}})",
-                 "id integer primary key, data text"};
-};
-
-TEST_F(UpgradingPage, ShowsOnlyLayoutsThatCanBeRead)
-{
-    EXPECT_EQ("1234", selected());
-    Rows expected;
-    for (const std::string& strLayout : layouts_) expected.push_back({strLayout});
-    EXPECT_EQ(expected, rows());
-    EXPECT_EQ(4U, std::set<std::string>(layouts_.begin(), layouts_.end()).size());
-
-    for (const std::string& strLayout : layouts_) insert(replaced(strLayout, "\n", "\r\n"));
+    // As another program would write the rows.
+    Rows layouts;
+    for (const char* szLineEnd : {"\n", "\r\n"})
+        for (std::size_t i = 0; i < 4; ++i) {
+            layouts.push_back({replaced(blocks[i].strText, "\n", szLineEnd)});
+            database_.run("insert into " + table.strName + " (data) values ('" + layouts.back()[0] +
+                          "')");
+        }
+    EXPECT_EQ(8U, (std::set<Rows::value_type>(layouts.begin(), layouts.end()).size()));
     EXPECT_EQ("12345678", selected());
-}
+    EXPECT_EQ(layouts, database_.rows(strSelect));
+    EXPECT_EQ("", selected(strByText));
+    EXPECT_EQ("123567", selected(strByValue));  // not those with comments
+    EXPECT_NE(std::string::npos, blocks[3].strText.find("//"));
 
-TEST_F(UpgradingPage, ShowsHowRowsAreFoundAndSaved)
-{
-    EXPECT_EQ("", selected(strByText_));
-    EXPECT_EQ("123", selected(strByValue_));  // not the one with comments
-    EXPECT_NE(std::string::npos, layouts_[3].find("//"));
-    for (const Json::Value& jRecord : json(listed(table_.api)))
-        EXPECT_EQ(text(jRecord), saved(table_.api, text(jRecord), false));
-    EXPECT_EQ(Rows(4, rows().at(0)), rows());
-    EXPECT_EQ("1234", selected(strByText_));
+    for (const Json::Value& jRecord : json(listed(table.api)))
+        EXPECT_EQ(text(jRecord), saved(table.api, text(jRecord), false));
+    EXPECT_EQ(Rows(8, database_.rows(strSelect).at(0)), database_.rows(strSelect));
+    EXPECT_EQ("12345678", selected(strByText));
 }
 
 }  // namespace

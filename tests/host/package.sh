@@ -1,18 +1,29 @@
 # SPDX-License-Identifier: MIT
-# Shared by the tests of what is installed; sourced, not run. They have the same arguments: SOURCE WORK HOST
-# EXPECTED, where HOST is the README's host, and EXPECTED what it prints.
-source=$1 work=$2 host=$3 expected=$4
-test_name=$(basename "$0" .sh)
+# Shared by the tests that configure and install the library; sourced, not run. Their arguments begin with SOURCE
+# WORK. Those that build hosts go on with HOST EXPECTED: the README's host, and what it prints.
+set -euo pipefail
+source=$1 work=$2 host=${3:-} expected=${4:-}
 part=$source/tests/host
+alone=(-DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXAMPLES=OFF)
 
+# fail MESSAGE: shows what was run last without showing it.
 fail() {
-    printf '%s: %s\n' "$test_name" "$*" >&2
+    cat "$work/log" >&2
+    printf '%s: %s\n' "$(basename "$0" .sh)" "$1" >&2
     exit 1
 }
 
 # quietly WHAT COMMAND...: what it says is shown when it fails.
 quietly() {
-    "${@:2}" >"$work/log" 2>&1 || { cat "$work/log"; fail "$1"; }
+    "${@:2}" >"$work/log" 2>&1 || fail "$1"
+}
+
+# says TEXT...: what was run last, however its lines are broken.
+says() {
+    local text
+    for text in "$@"; do
+        tr -s ' \n' ' ' <"$work/log" | grep -qF -e "$text" || fail "it does not say: $text"
+    done
 }
 
 # same NAME EXPECTED-FILE FILE
@@ -28,8 +39,8 @@ runs() {
 
 # built FOLDER [OPTION...]: the library, as it is shipped.
 built() {
-    quietly "the library does not configure" cmake -S "$source" -B "$1" -DCMAKE_BUILD_TYPE=Release \
-        -DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXAMPLES=OFF -DCMAKE_INSTALL_PREFIX=/usr "${@:2}"
+    quietly "the library does not configure" cmake -S "$source" -B "$1" "${alone[@]}" \
+        -DCMAKE_BUILD_TYPE=Release -DCMAKE_INSTALL_PREFIX=/usr "${@:2}"
     quietly "the library does not build" cmake --build "$1" -j "$(nproc)"
 }
 
@@ -54,12 +65,12 @@ configured() {
     cp "$host" "$work/$1/host.cpp"
     { printf 'cmake_minimum_required(VERSION 3.22)\nproject(host LANGUAGES CXX)\nset(CMAKE_CXX_STANDARD 17)\n'; cat; } \
         >"$work/$1/CMakeLists.txt"
-    cmake -S "$work/$1" -B "$work/$1/build" "${@:2}" >"$work/$1/log" 2>&1
+    cmake -S "$work/$1" -B "$work/$1/build" "${@:2}" >"$work/log" 2>&1
 }
 
 # host_project FOLDER [OPTION...]: the same, built and run.
 host_project() {
-    configured "$@" || { cat "$work/$1/log"; fail "$1 does not configure"; }
+    configured "$@" || fail "$1 does not configure"
     quietly "$1 does not build" cmake --build "$work/$1/build" -j "$(nproc)"
     runs "$work/$1/build/host"
 }
@@ -87,3 +98,4 @@ target_link_libraries(host PRIVATE VornJsonDb::vornjsondb)'
 
 rm -rf "$work"
 mkdir -p "$work"
+: >"$work/log"

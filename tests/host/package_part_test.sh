@@ -2,7 +2,6 @@
 # SPDX-License-Identifier: MIT
 # package_part_test.sh SOURCE WORK HOST EXPECTED: the library as a part of a host's own build, in every way that
 # the README names.
-set -euo pipefail
 . "$(dirname "$0")/package.sh"
 
 # part_alone FOLDER: the host there, which contains the library, has not built its tests and examples.

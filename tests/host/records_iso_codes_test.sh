@@ -44,13 +44,11 @@ compare_list() {
     same "list of $1" same "$(cmp "wanted_$1" out && echo same)"
 }
 
-for comparison in compare compare_list; do
-    for name in subdivisions languages; do
-        on iso.db "$name.json"
-        prints "{\"imported\":${count[$name]}}" import "${file[$name]}" "${key[$name]}"
-        $comparison "$name"
-        [[ $comparison == compare_list ]] || prints "{\"deleted\":${count[$name]}}" delete-all
-    done
+for name in subdivisions languages; do
+    on iso.db "$name.json"
+    prints "{\"imported\":${count[$name]}}" import "${file[$name]}" "${key[$name]}"
+    compare "$name"
+    compare_list "$name"
 done
 same 'integrity' ok "$(sqlite3 iso.db 'pragma integrity_check')"
 

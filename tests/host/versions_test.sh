@@ -3,15 +3,9 @@
 # versions_test.sh SOURCE WORK JSONCPP_DIR SQLITE_HEADERS CMAKE_OPTION...: the lowest versions of
 # CMakeLists.txt are those of the README; with them the project configures, and with a lower one it
 # fails and names both. The options name the tools, and SQLite's library.
-set -euo pipefail
-source=$1 work=$2 jsoncpp=$3 sqlite=$4
-shift 4
-options=("$@")
-
-fail() {
-    printf 'versions_test: %s\n' "$*" >&2
-    exit 1
-}
+. "$(dirname "$0")/package.sh"
+jsoncpp=$3 sqlite=$4
+options=("${@:5}")
 
 # lowest NAME: as CMakeLists.txt has it.
 lowest() {
@@ -37,14 +31,7 @@ configures() {
     sed -E "s/(#define SQLITE_VERSION +\").*\"/\\1$2\"/" "$sqlite/sqlite3.h" >"$work/include/sqlite3.h"
     cmake -S "${3:-$source}" -B "$work/build" -Djsoncpp_DIR="$work/jsoncpp" -DSQLite3_INCLUDE_DIR="$work/include" \
         -DCMAKE_FIND_USE_CMAKE_SYSTEM_PATH=OFF -DCMAKE_FIND_USE_SYSTEM_ENVIRONMENT_PATH=OFF \
-        -DVORNJSONDB_TESTS=OFF -DVORNJSONDB_EXAMPLES=OFF -DVornJsonDb_DIR="$work/package" "${options[@]}" >"$work/log" 2>&1
-}
-
-# refused NAME LOWER LOWEST
-refused() {
-    for text in "$1" "$2" "$3"; do
-        grep -qF "$text" "$work/log" || { cat "$work/log"; fail "it does not say $text"; }
-    done
+        "${alone[@]}" -DVornJsonDb_DIR="$work/package" "${options[@]}" >"$work/log" 2>&1
 }
 
 # host NAME: a host in a folder of this name, which finds jsoncpp before the line on standard input.
@@ -55,26 +42,25 @@ host() {
 }
 
 [ "$(below 1.10.0)" = 1.9.999 ] || fail "another version is below 1.10.0"
-rm -rf "$work"
 jsoncpp_version=$(lowest JSONCPP)
 sqlite_version=$(lowest SQLITE)
 cmake_version=$(sed -nE 's/^cmake_minimum_required\(VERSION ([0-9.]+)\)$/\1/p' "$source/CMakeLists.txt")
 grep -qF "jsoncpp $jsoncpp_version, SQLite $sqlite_version, CMake $cmake_version and" \
     "$source/README.md" || fail "the README has other versions"
 
-configures "$jsoncpp_version" "$sqlite_version" || { cat "$work/log"; fail "the lowest versions do not do"; }
+configures "$jsoncpp_version" "$sqlite_version" || fail "the lowest versions do not do"
 mkdir "$work/package"
 cp "$work"/build/VornJsonDbConfig*.cmake "$work/package"
 lower=$(below "$jsoncpp_version")
 if configures "$lower" "$sqlite_version"; then fail "jsoncpp $lower was taken"; fi
-refused jsoncpp "$lower" "$jsoncpp_version"
+says jsoncpp "$lower" "$jsoncpp_version"
 host part <<<"add_subdirectory($source vornjsondb)"
 host found <<<"find_package(VornJsonDb CONFIG REQUIRED)"
 for name in part found; do
     if configures "$lower" "$sqlite_version" "$work/$name"; then fail "the host's jsoncpp $lower was taken"; fi
-    refused jsoncpp "$lower" "$jsoncpp_version"
+    says jsoncpp "$lower" "$jsoncpp_version"
 done
-configures "$jsoncpp_version" "$sqlite_version" "$work/part" || { cat "$work/log"; fail "the host's lowest version does not do"; }
+configures "$jsoncpp_version" "$sqlite_version" "$work/part" || fail "the host's lowest version does not do"
 lower=$(below "$sqlite_version")
 if configures "$jsoncpp_version" "$lower"; then fail "SQLite $lower was taken"; fi
-refused SQLite3 "$lower" "$sqlite_version"
+says SQLite3 "$lower" "$sqlite_version"

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <climits>
 #include <cstdlib>
+#include <set>
 
 namespace {
 
@@ -49,6 +50,14 @@ protected:
     }
 };
 
+TEST_F(HostileData, IsEnough)
+{
+    const auto& strings = hostileStrings();
+    const std::size_t nStrings = std::set<std::string>(strings.begin(), strings.end()).size();
+    EXPECT_LE(400U, nStrings);
+    Figures::of("hostile strings") = static_cast<long long>(nStrings);
+}
+
 TEST_F(HostileData, IsStored)
 {
     Json::Value& jTypes = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
@@ -76,6 +85,43 @@ TEST_F(HostileData, IsStored)
         EXPECT_EQ(0, table_.api.recUpdateByWhere(jValues, strWhere));
         EXPECT_EQ(upToNul(strHostile),
                   database_.value("select s from " + table_.strName + " where n=2"));
+    });
+}
+
+// Before members of every type that can be read back, in the last member at first.
+TEST_F(HostileData, IsStoredInSeveralMembersOfARecord)
+{
+    Table table(database_,
+                R"({"a":{"cpptype":"string"},"b":{"cpptype":"bool"},"i":{"cpptype":"int"},
+                    "j":{"cpptype":"long long"},"l":{"cpptype":"Json::arrayValue"},
+                    "o":{"cpptype":"Json::objectValue"},"u":{"cpptype":"unsigned int"},
+                    "v":{"cpptype":"unsigned long long"},"z":{"cpptype":"string"}})",
+                "a text, b, i, j, l, o, u, v, z text");
+    forEachString(0, [&](const std::string& strHostile) {
+        const std::pair<const char*, Json::Value> members[] = {
+            {"z", strHostile},
+            {"o", member(strHostile, strHostile)},
+            {"l", listOf(strHostile)},
+            {"a", strHostile}};
+        Json::Value jRecord =
+            json(R"({"a":"m","b":true,"i":42,"j":42,"l":[1],"o":{"k":1},"u":42,"v":42,"z":"m"})");
+        for (const auto& [szMember, jValue] : members) {
+            jRecord[szMember] = jValue;
+            Json::Value jOut = jRecord;
+            const int iResult = table.api.recSave(jOut, true);
+            expectEnds(iResult);
+            Json::Value jExpected = jRecord;
+            if (0 == iResult)
+                for (const char* szText : {"a", "z"})
+                    jExpected[szText] = upToNul(jRecord[szText].asString());
+            // No value follows the last member.
+            const bool blKept = 'z' == szMember[0] || std::string::npos == strHostile.find('%');
+            if (blKept) {
+                EXPECT_EQ(0, iResult);
+            }
+            // No message with both: gtest's comparison of very long ones takes all memory.
+            EXPECT_TRUE((!blKept && 0 == iResult) || jExpected == jOut) << szMember;
+        }
     });
 }
 
@@ -122,49 +168,35 @@ TEST_F(HostileData, IsAConstantAsSortKeyAndDirection)
     });
 }
 
-long long number(const char* szText)
-{
-    return strtoll(szText, nullptr, 10);
-}
-
 // What a stored text comes back as.
-const auto asText = [](const char* szText) { return Json::Value(szText); };
-const auto asInt = [](const char* szText) {
-    return Json::Value(static_cast<int>(std::clamp<long long>(number(szText), INT_MIN, INT_MAX)));
-};
-const auto asInt64 = [](const char* szText) { return Json::Value(Json::Int64(number(szText))); };
-const auto asBool = [](const char* szText) { return Json::Value(1 == number(szText)); };
-const auto asJson = [](const char* szText) { return leftByReader(szText); };
-
-struct Word {
-    const char* szWord;
-    Json::Value (*value)(const char* szText);  // null if no column can be decoded
-};
-
-const Word kWords[] = {
-    {"string", asText},      {"int", asInt},
-    {"unsigned int", asInt}, {"long long", asInt64},
-    {"bool", asBool},        {"unsigned long long", asInt64},
-    {"double", nullptr},     {"Json::objectValue", asJson},
-    {"unknown", nullptr},    {"Json::arrayValue", asJson},
-};
+Json::Value readAs(const std::string& strWord, const char* szText)
+{
+    const long long iNumber = strtoll(szText, nullptr, 10);
+    if ("string" == strWord) return szText;
+    if ("bool" == strWord) return 1 == iNumber;
+    if (0 == strWord.find("Json::")) return leftByReader(szText);
+    if (std::string::npos != strWord.find("long long")) return Json::Int64(iNumber);
+    return static_cast<int>(std::clamp<long long>(iNumber, INT_MIN, INT_MAX));
+}
 
 TEST_F(HostileData, IsReadFromAColumnOfEachType)
 {
-    for (const Word& word : kWords) {
-        SCOPED_TRACE(word.szWord);
-        Table stored(database_, std::string(R"({"v":{"cpptype":")") + word.szWord + R"("}})", "v");
+    for (const std::string strWord :
+         {"string", "int", "unsigned int", "long long", "unsigned long long", "bool",
+          "Json::objectValue", "Json::arrayValue", "double", "unknown"}) {
+        SCOPED_TRACE(strWord);
+        const bool blDecoded = "double" != strWord && "unknown" != strWord;
+        Table stored(database_, R"({"v":{"cpptype":")" + strWord + R"("}})", "v");
         forEachString(1, [&](const std::string& strHostile) {
             database_.run("delete from " + stored.strName + "; insert into " + stored.strName +
                           " values ('" + doubled(strHostile) + "')");
-            const bool blDecoded = nullptr != word.value;
             Json::Value jRequest;
             Json::Value jRecords(Json::arrayValue);
             EXPECT_EQ(blDecoded ? 0 : -1, stored.api.recList(jRequest, jRecords));
             EXPECT_EQ(blDecoded, doubles::state().log.empty());
             ASSERT_EQ(blDecoded ? 1U : 0U, jRecords.size());
             if (blDecoded) {
-                EXPECT_EQ(text(word.value(strHostile.c_str())), text(jRecords[0]["v"]));
+                EXPECT_EQ(text(readAs(strWord, strHostile.c_str())), text(jRecords[0]["v"]));
             }
         });
     }

@@ -2,9 +2,12 @@
 // Shared by the tests that put every hostile string into a role.
 #pragma once
 
-#include "hostile/hostile_strings.h"
 #include "support/figures.h"
 #include "support/matrix.h"
+
+// Texts that something may trip over: quotes, SQL, control characters, bidirectional marks, invalid
+// UTF-8, percent signs in all forms, NUL bytes and long texts.
+const std::vector<std::string>& hostileStrings();
 
 class HostileRoleTest : public TableTest {
 protected:
@@ -17,7 +20,7 @@ protected:
     HostileRoleTest() { database_.run("pragma journal_mode=memory"); }
 
     // The check for each string, on a table of two records, n=1 and n=2; then handle and connection
-    // have to be sound. The check puts the string into nRoles.
+    // have to be sound. The figure counts nRoles a string.
     template <typename Check>
     void forEachString(std::size_t nRoles, Check check)
     {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "hostile/hostile_strings.h"
+#include "hostile/hostile_roles.h"
 
 #include <iterator>
 #include <utility>

@@ -48,11 +48,11 @@ TEST_F(Guard, RefusesWithAReason)
         {"the command is no JSON object",
          {"", "[]", list("{}") + " {}", R"({"op":"list","request":{},"request":{}})"}},
         {"there is no such operation",
-         {R"({"op":7,"request":{}})", R"({"op":{},"request":{}})", command("drop", "{}")}},
+         {R"({"op":7,"request":{}})", R"({"op":{},"request":{}})", Command{"drop"}("{}")}},
         {"the command holds a request",
          {get(R"({"id":1},"values":{})"), R"({"op":"list"})", list(R"({},"record":{})")}},
         {"the command holds a record", {R"({"op":"create","request":{}})"}},
-        {"the command holds a request and values", {command("update", R"({"id":1})")}},
+        {"the command holds a request and values", {update(R"({"id":1})")}},
         {"a request is an object", {list("null")}},
         {"a record is an object with members", {create("{}"), create("[1]")}},
         {"there is no such member",
@@ -133,16 +133,6 @@ TEST_F(Guard, KnowsTheOtherTypeWords)
     for (const char* szRecord : {R"({"n":2147483648})", R"({"n":-2147483649})", R"({"n":1.0})",
                                  R"({"o":[]})", R"({"x":1})"})
         EXPECT_NE("", refusal(create(szRecord), jTypes)) << szRecord;
-}
-
-TEST_F(Guard, LimitsTheRowsOfAList)
-{
-    for (const auto& [szRequest, szLimited] :
-         {std::pair("{}", R"({"limit":100})"), std::pair(R"({"limit":7})", R"({"limit":7})")}) {
-        Json::Value jCommand = json(list(szRequest));
-        guard::checkCommand(noteTypes(), jCommand);
-        EXPECT_EQ(list(szLimited), text(jCommand));
-    }
 }
 
 // The command and its record are two levels.

@@ -11,6 +11,7 @@
 #include <unistd.h>
 #include <cstdio>
 #include <string>
+#include <thread>
 #include <utility>
 
 namespace {
@@ -19,12 +20,6 @@ constexpr std::size_t kStack = 8 * 1024 * 1024;
 constexpr int kMostDepth = 1 << 17;
 
 using Operation = void (*)(std::size_t nDepth, bool blObject);
-
-struct Trial {
-    Operation run;
-    std::size_t nDepth;
-    bool blObject;
-};
 
 // Built from the inside, which does not recurse. Never destroyed: that does.
 Json::Value& nested(std::size_t nDepth, bool blObject)
@@ -68,27 +63,17 @@ void destroy(std::size_t nDepth, bool blObject)
     delete &nested(nDepth, blObject);
 }
 
-void* runOnThread(void* arg)
-{
-    const Trial& trial = *static_cast<Trial*>(arg);
-    trial.run(trial.nDepth, trial.blObject);
-    _exit(0);
-}
-
-bool survives(Trial trial)
+bool survives(Operation run, std::size_t nDepth, bool blObject)
 {
     const pid_t iChild = fork();
     if (0 == iChild) {
         const rlimit noCore = {0, 0};
         setrlimit(RLIMIT_CORE, &noCore);
         if (nullptr == freopen("/dev/null", "w", stderr)) _exit(1);
-        pthread_attr_t attributes;
-        pthread_attr_init(&attributes);
-        pthread_attr_setstacksize(&attributes, kStack);
-        pthread_t thread;
-        if (0 != pthread_create(&thread, &attributes, runOnThread, &trial)) _exit(1);
-        pthread_join(thread, nullptr);
-        _exit(1);
+        std::thread([=] {
+            run(nDepth, blObject);
+            _exit(0);
+        }).join();
     }
     int iStatus = 0;
     return iChild == waitpid(iChild, &iStatus, 0) && WIFEXITED(iStatus) &&
@@ -100,7 +85,7 @@ std::size_t deepest(Operation run, bool blObject)
 {
     std::size_t nGood = 0;
     for (std::size_t nStep = kMostDepth; 0 < nStep; nStep /= 2)
-        if (survives({run, nGood + nStep, blObject})) nGood += nStep;
+        if (survives(run, nGood + nStep, blObject)) nGood += nStep;
     return nGood;
 }
 
@@ -108,6 +93,10 @@ std::size_t deepest(Operation run, bool blObject)
 
 int main(int argc, char** argv)
 {
+    pthread_attr_t attributes;
+    pthread_attr_init(&attributes);
+    pthread_attr_setstacksize(&attributes, kStack);
+    if (0 != pthread_setattr_default_np(&attributes)) return 2;
     const std::size_t nLeast = 1 < argc ? std::stoul(argv[1]) : 0;
     bool blDeepEnough = true;
     const std::pair<const char*, Operation> operations[] = {

@@ -33,8 +33,7 @@ int countSteps(void* pWorld)
 
 }  // namespace
 
-std::string command(const char* szOperation, const std::string& strArgument,
-                    const std::string& strValues)
+std::string Command::operator()(const std::string& strArgument, const std::string& strValues) const
 {
     const std::string strOperation = szOperation;
     const bool blRecord = "create" == strOperation || "save" == strOperation;

@@ -13,20 +13,13 @@
 #include <vector>
 
 // The lines of a stranger: the operation with its record or request, and the values of an update.
-std::string command(const char* szOperation, const std::string& strArgument,
-                    const std::string& strValues = "");
-inline const auto create = [](const std::string& strRecord) {
-    return command("create", strRecord);
+struct Command {
+    std::string operator()(const std::string& strArgument, const std::string& strValues = "") const;
+
+    const char* szOperation;
 };
-inline const auto save = [](const std::string& strRecord) { return command("save", strRecord); };
-inline const auto list = [](const std::string& strRequest) { return command("list", strRequest); };
-inline const auto get = [](const std::string& strRequest) { return command("get", strRequest); };
-inline const auto erase = [](const std::string& strRequest) {
-    return command("delete", strRequest);
-};
-inline const auto update = [](const std::string& strRequest, const std::string& strValues) {
-    return command("update", strRequest, strValues);
-};
+inline constexpr Command create{"create"}, save{"save"}, list{"list"}, get{"get"}, erase{"delete"},
+    update{"update"};
 
 std::string repeated(unsigned uTimes, const std::string& strText);
 
