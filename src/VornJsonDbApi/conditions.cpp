@@ -14,7 +14,7 @@ using namespace vorn;
 
 namespace {
 
-// How terms are put together: " (" a " and " b " )", or a " , " b.
+// How terms are joined: " (" a " and " b " )", or a " , " b.
 struct Joiner {
     const char* szBefore;
     const char* szBetween;
@@ -87,13 +87,13 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
         const std::string_view strField = memberName(it);
         const bool blRawFilter = kRawFilterKey == strField;
         const Json::Value* pjMember = types.find(strField);
-        // Kept(Conditions.PassOverUndeclaredKeys): undeclared keys of a request are ignored
+        // Kept(Conditions.SkipUndeclaredKeys): undeclared keys of a request are ignored
         if (nullptr == pjMember && !blRawFilter) continue;
         // Kept(Conditions.WriteTheJoinerAroundAnEmptyArray): an empty list writes its joiner and no
         // term
         strSqlWhereOut += blWritten ? pJoiner->szBetween : pJoiner->szBefore;
         Json::Value& jTmp = *it;
-        // Kept(Conditions.TakeTheRawFilterForAMemberOfItsName): the raw filter wins over a member
+        // Kept(Conditions.PreferTheRawFilterToAMemberOfItsName): the raw filter wins over a member
         // of its name
         if (blRawFilter) {
             if (FAILED_AS(!jTmp.isString(), "!jRecParam[jmFieldName[i]].isString()")) return -1;
@@ -126,7 +126,7 @@ int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jPara
 // name in ('x' ), id in (5 )
 int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jHostList, std::string& out)
 {
-    // Only read: the other access by index would fill the holes of the host's array.
+    // Const, because non-const access by index would fill the holes of the host's array.
     const Json::Value& jList = jHostList;
     const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
     if (FAILED(!szField || !szField[0])) return -1;

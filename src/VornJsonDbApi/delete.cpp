@@ -41,11 +41,11 @@ int VornJsonDbApi::recDelete(Json::Value& jRecParam, bool blDeleteAll)
     if (!blDeleteAll && FAILED(strSql.empty())) return fail();
     strSqlRun.reserve(kUsualStatement);
     strSqlRun.append("DELETE FROM ").append(strName).append(" ");
-    // Two blanks, as in a listing.
+    // Two blanks before WHERE, as in a listing.
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun += ";";
     if (FAILED(0 > (err = runSqlEx(strSqlRun)))) return fail();
-    // Cannot fail: a run that succeeds empties the error text.
+    // Cannot fail: a successful run clears the error text.
     if (GUARDED_SQL("sql error, sql=%s", strSqlRun.c_str())) return fail();
     if (blDebugOutput) LOG_PLAIN("delete rec number=%d", err);
     return err;

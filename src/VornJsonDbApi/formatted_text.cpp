@@ -14,7 +14,7 @@
 //
 // Any other type ends the output at its "%". A lone "%" at the very end is written.
 //
-// One value is passed, and a text may ask for more. So each conversion is formatted on its own:
+// Only one value is passed but a text may ask for more, so each conversion is formatted alone:
 // every "*", every "%n" and every other conversion but "%%" takes one slot, in order. The first
 // slot is the value, given only to a conversion of its own kind; all others are 0, 0.0 or NULL of
 // the conversion's kind. "%n" stores nothing, "%z" releases nothing, "*" means no width. A width or
@@ -35,10 +35,10 @@ namespace {
 
 constexpr unsigned kMaxField = 4096;
 
-// SQLite is asked about longer texts: half of the limit that it is built with by default.
+// Longer texts are checked with SQLite: half of the limit that it has by default.
 constexpr std::size_t kLongText = 500'000'000;
 
-// Bytes that most value lists find enough.
+// Bytes that suffice for most value lists.
 constexpr std::size_t kUsualList = 256;
 
 enum class ConversionKind {
@@ -130,8 +130,8 @@ Conversion readConversion(const char*& szText)
     return conversion;
 }
 
-// A formatted text. Null, for a lack of memory or a text that is too long, ends in
-// std::logic_error, as constructing a string from it does.
+// A formatted text. Throws std::logic_error where it is null (out of memory, or too long a text),
+// as constructing a string from null does.
 template <typename Argument>
 SqliteText formatted(const char* szFormat, Argument argument)
 {
@@ -174,8 +174,8 @@ void appendConversion(std::string& strOut, const Conversion& conversion,
     }
 }
 
-// Throws where SQLite's formatter finds the text too long. The precision makes it count beyond the
-// 30 bits that it keeps of a length otherwise.
+// Throws if SQLite's formatter finds the text too long. The precision makes it count beyond the 30
+// bits to which it otherwise cuts a length.
 void refuseTooLong(const std::string& strText)
 {
     formatted(strText.size() < (1U << 30) ? "%s" : "%.2147483647s", strText.c_str());

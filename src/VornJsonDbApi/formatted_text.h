@@ -21,24 +21,24 @@ struct FormatArgument {
     static FormatArgument text(const char* szValue) { return {Kind::kText, 0, 0, szValue}; }
 };
 
-// Kept(FormattedLists.ReadAPercentSignAsAConversion): a `%` in a text is a conversion for every
-// later value
+// Kept(FormattedLists.ReadAPercentSignAsAConversion): a `%` in a text acts as a conversion for
+// every later value
 //
 // Every value is appended as
 //
 //     text = sqlite3_mprintf(text + conversion, value)
 //
-// with the whole text so far, stored values included, as the format; so every later value reads a
-// "%" in an earlier one as a conversion of its own. This class gives the same bytes wherever C
-// defines them and no width exceeds a limit, in linear time while the text has no "%", and
-// otherwise without reading arguments that were never passed. formatted_text.cpp has the rules.
+// with the whole text so far, stored values included, as the format; so a "%" in one value acts as
+// a conversion for every later one. This class gives the same bytes wherever C defines them and no
+// width exceeds a limit, in linear time while the text has no "%", and otherwise without reading
+// arguments that were never passed. formatted_text.cpp has the rules.
 class FormattedText {
 public:
     explicit FormattedText(const std::string& strText);
 
     // Appends one conversion of sqlite3_mprintf ("%Q", "%lld", "%llu", "%f", "%lf") and formats the
-    // text with the argument. Throws std::logic_error when SQLite finds no memory, or the text too
-    // long.
+    // text with the argument. Throws std::logic_error if SQLite runs out of memory or finds the
+    // text too long.
     void appendValue(const char* szConversion, const FormatArgument& argument);
 
     // Appends text that holds neither "%" nor a NUL byte.

@@ -6,7 +6,7 @@
 
 #include <utility>
 
-// The constructor's argument checks are of the plain family, and construction goes on.
+// The constructor's argument checks log in the plain family, and construction goes on.
 #define REPORT(COND) ((COND) ? LOG_PLAIN("Failed [%s]", #COND) : void())
 
 VornJsonDbApi::VornJsonDbApi(sqlite3* pDatabase, std::string& strTable, Json::Value& jDefinition,

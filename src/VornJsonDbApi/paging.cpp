@@ -13,7 +13,7 @@ int VornJsonDbApi::SqlFilterConditionFromJson(Json::Value& jFilter, std::string&
 {
     if (FAILED(jFilter.type() != Json::objectValue && jFilter.type() != Json::nullValue)) return -1;
     if (const Json::Value* pjSortBy = findMember(jFilter, "sort_by")) {
-        // Kept(Paging.WritesTheSortKeyAsATextLiteral): "sort_by" is a text literal
+        // Kept(Paging.WritesTheSortKeyAsATextLiteral): "sort_by" is written as a text literal
         const SqliteText szSql(sqlite3_mprintf(" order by '%q'", pjSortBy->asCString()));
         if (FAILED(!szSql)) return -1;
         out += szSql;

@@ -39,12 +39,12 @@ struct Source {
     RowForm form;
 };
 
-// A record with every column of the rows as a member, to be copied and filled in the order of its
-// members, without a search for any.
+// A record with every column of the rows as a member. Copies are filled in the order of the
+// members, so that none has to be searched for.
 struct Prototype {
     Json::Value jRecord;
     std::vector<Source> sources;  // one for each column; empty until the columns are known
-    bool blUsable = false;        // unless a column cannot be decoded, or occurs twice
+    bool blUsable = false;        // false if a column cannot be decoded or occurs twice
     bool blChecked = false;       // whether the columns have these types in the running statement
 };
 
@@ -53,12 +53,12 @@ struct State {
     std::string strCurJsonName;
     // What was thrown in the row callback; nothing may unwind through SQLite's own frames.
     std::exception_ptr pThrownInCallback;
-    // The member types of that table, once a row has asked for them: the entry stays where it is.
+    // The member types of that table, once a row has asked for them: the entry never moves.
     const Json::Value* pjMemberTypes = nullptr;
     std::vector<Column> columns;
     Prototype prototype;
-    // Whether a row that is filled by name has met a column for the first time, or with another
-    // type.
+    // Whether a row that is filled by name has come across a new column, or one whose type has
+    // changed.
     bool blNewColumn = false;
 };
 
@@ -71,10 +71,10 @@ State& state()
 const Json::Value& memberTypes()
 {
     State& current = state();
-    // What is not an object is asked for again, which logs.
+    // If it is not an object it is looked up again, which logs.
     if (nullptr == current.pjMemberTypes || !current.pjMemberTypes->isObject()) {
         // Kept(RowDecoder.SpoilsTheTypesOfATableThatNobodyAskedForBefore): a row that is decoded
-        // before anybody asked for the table's types poisons them
+        // before anybody has asked for the table's types spoils them
         Json::Value jTableDef;
         current.pjMemberTypes = &VORN_JSON_DB::recType(jTableDef, current.strCurJsonName);
     }
@@ -90,7 +90,7 @@ std::string_view sharedName(const char* szName)
     return *(names.end() == it ? names.emplace(szName).first : it);
 }
 
-// The column at idx, or null, after the failed check's line, when the table has no such member.
+// The column at idx, or null, after logging the failed check, if the table has no such member.
 const Column* resolvedColumn(const char* szName, std::size_t idx)
 {
     State& current = state();
@@ -116,10 +116,10 @@ const Column* resolvedColumn(const char* szName, std::size_t idx)
     return &column;
 }
 
-// Any number of so many digits fits.
+// Any number with this many digits fits.
 constexpr int kFittingDigits = 18;
 
-// What strtoll reads, faster where the text is digits alone that fit.
+// What strtoll reads, but faster if the text is nothing but digits and fits.
 long long integerOf(const char* szText)
 {
     const char* szDigit = szText;
@@ -135,15 +135,15 @@ int saturatedToInt(long long iValue)
     return static_cast<int>(std::clamp<long long>(iValue, INT_MIN, INT_MAX));
 }
 
-// Sets the member from the text of its column; a bool is false already. Inlined, since its call
-// costs as much as most of its ways.
+// Sets the member from its column's text; a bool is already false. Inlined, because a call would
+// cost as much as most of its branches.
 [[gnu::always_inline]] inline void decode(RowForm form, const char* szValue, Json::Value& jMember)
 {
     // Cheaper than an assignment, which moves comments and offsets too.
     const auto set = [&jMember](Json::Value jValue) { jMember.swapPayload(jValue); };
     switch (form) {
     case RowForm::kText: set(szValue); break;
-    // Kept(RowDecoder.HoldsIntegersAsSignedOnes): unsigned words are read through signed
+    // Kept(RowDecoder.StoresIntegersAsSigned): unsigned words are read through signed
     // conversions and saturate
     case RowForm::kInt32: set(saturatedToInt(integerOf(szValue))); break;
     case RowForm::kInt64: set(Json::Int64(integerOf(szValue))); break;
@@ -225,7 +225,7 @@ void makePrototype(std::size_t nColumns)
 }
 
 // Whether the columns still have the types that they had in an earlier statement. Neither logs nor
-// throws: in doubt the row is filled by name, which does.
+// throws: if in doubt, the row is filled by name, which does both.
 bool haveSameTypes()
 {
     State& current = state();
@@ -257,7 +257,7 @@ bool fitsPrototype(std::size_t nColumns, char** column_value, char** column_name
     return prototype.blChecked;
 }
 
-// The prototype has one column at least.
+// The prototype has at least one column.
 Json::Value recordFromPrototype(char** column_value)
 {
     const Prototype& prototype = state().prototype;
@@ -270,8 +270,8 @@ Json::Value recordFromPrototype(char** column_value)
     }
 }
 
-// Kept(RowDecoder.AppendsTheRowsOfEveryAttempt, RowDecoder.KeepsTheRowsBeforeAFailure): arrays are
-// appended to, also by every retried attempt, and keep the rows before a failure
+// Kept(RowDecoder.AppendsTheRowsOfEveryAttempt, RowDecoder.KeepsTheRowsBeforeAFailure): rows are
+// appended to the array, also by every retried attempt, and those before a failure stay
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
 {
     if (FAILED(!pjRecArray)) return -1;

@@ -12,7 +12,7 @@ namespace vorn {
 // Returns 0, or -1 to stop the statement. What is thrown inside is kept for takeThrown().
 int DbCallBackFillList(void* arg, int n_column, char** column_value, char** column_name);
 
-// Says whose table's statement runs from now on.
+// Sets the table whose statement runs from now on.
 void beginStatement(const std::string& strTable);
 
 // What was thrown in the row callback since the last call, or null.

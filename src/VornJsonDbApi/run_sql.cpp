@@ -16,7 +16,7 @@ namespace {
 
 constexpr int kMaxAttempts = 500;
 constexpr useconds_t kRetryDelayMicroseconds = 10000;
-// Kept(Execution.ReportsAnEmptyTextWithoutRunningIt): the message "Unknow Error!!" is spelt so
+// Kept(Execution.ReportsAnEmptyTextWithoutRunningIt): the message is spelt "Unknow Error!!"
 constexpr char kUnknownError[] = "Unknow Error!!";
 
 const char* textOrUnknown(const char* szText)
@@ -24,9 +24,9 @@ const char* textOrUnknown(const char* szText)
     return nullptr == szText ? kUnknownError : szText;
 }
 
-// Kept(Retry.LooksForTheWordsAnywhereInTheText, Retry.TakesTheErrnoOfALockForALock): an error that
-// speaks of a locked database counts as a lock, whoever wrote its text, and so does EAGAIN in
-// errno, whatever failed
+// Kept(Retry.LooksForTheWordsAnywhereInTheText, Retry.TreatsTheErrnoOfALockAsALock): an error text
+// that mentions a locked database counts as a lock, whoever wrote it, and so does EAGAIN in errno,
+// whatever failed
 bool isLocked(const char* errText)
 {
     return (nullptr != errText && nullptr != strstr(errText, "database is locked")) ||
@@ -51,7 +51,7 @@ int VornJsonDbApi::runSqlEx(std::string strSql, int (*callback)(void*, int, char
 
     if (FAILED(0 >= strSql.length())) return fail(-1);
     strSqlError.clear();
-    // Kept(Retry.TriesTheWholeTextAgain): a retry runs the whole text again
+    // Kept(Retry.RunsTheWholeTextAgain): a retry runs the whole text again
     for (;;) {
         if (nullptr != errText) strSqlError = errText;
         errno = 0;

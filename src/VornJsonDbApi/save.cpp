@@ -33,10 +33,10 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
     // Cannot fail: the text begins with its verb.
     if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp))) return fail();
-    // Cannot fail: a run that succeeds empties the error text.
+    // Cannot fail: a successful run clears the error text.
     if (GUARDED_SQL("sql error, sql=%s", strSql.c_str())) return fail();
-    // Kept(Save.FailsWhereTheRowCannotBeReadThoughItIsWritten): a write whose row cannot be read
-    // back fails and stays written
+    // Kept(Save.FailsIfTheWrittenRowCannotBeReadBack): a write whose row cannot be read back fails,
+    // but the row stays
     if (FAILED(0 == jArrayTmp.size())) return fail();
 
     jRecInOut = std::move(*jArrayTmp.begin());
@@ -45,10 +45,10 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
 
 int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
 {
-    // What runs inside the statement may change or destroy the host's record: it is read no more.
+    // What runs inside the statement may change or destroy the host's record: do not read it again.
     Json::Value jParam = jRecIn;
-    // Kept(Operations.TellAnEarlierDuplicateAgain): an earlier duplicate counts for a later failure
-    // without SQL
+    // Kept(Operations.ReportAnEarlierDuplicateAgain): a later failure without SQL is reported as a
+    // duplicate if an earlier one was
     const auto fail = [&] {
         LOG_PLAIN("call create rec, rec=%s", toString(jParam).c_str());
         if (isDuplicateKey(strSqlError)) strErrMsg = kDuplicateKeyMessage;

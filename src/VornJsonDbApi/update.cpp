@@ -36,7 +36,7 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
     // Cannot fail: the text begins with its verb.
     if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, NULL, NULL))) return fail();
-    // Cannot fail: a run that succeeds empties the error text.
+    // Cannot fail: a successful run clears the error text.
     if (GUARDED_SQL("sql error msg=%s, sql=%s", strSqlError.c_str(), strSql.c_str())) return fail();
     return 0;
 }

@@ -39,7 +39,7 @@ int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
             return -1;
         }
         const Json::Value* pjDefault = findMember(*it, "cppDefaultValue");
-        // The walk goes on: what is inserted sorts before all that it has yet to visit.
+        // Inserting here is safe: the new name sorts before everything still to be visited.
         if (nullptr != pjDefault && (jParam.isNull() || jParam.isObject()))
             jParam[std::string(strKey)] = Json::Value(*pjDefault);
     }

@@ -43,7 +43,7 @@ bool appendLiteral(FormattedText& text, const Json::Value& jMember, const Json::
                          FormatArgument::integer(static_cast<long long>(jValue.asUInt64())));
         return true;
     case LiteralForm::kFloat: {
-        // Stored, since a function of i386 returns more digits than a float has.
+        // Stored, because on i386 a function returns more digits than a float has.
         const volatile float fValue = jValue.asFloat();
         text.appendValue("%f", FormatArgument::floating(static_cast<double>(fValue)));
         return true;
@@ -71,7 +71,7 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
         const std::string_view strKey = memberName(it);
         if (nullptr != rec && nullptr == values.find(strKey)) continue;
         sql += strKey;
-        // The place in the definition decides. Kept(Save.RefusesListsThatDoNotClose): a record
+        // The position in the definition decides. Kept(Save.RefusesListsThatDoNotClose): a record
         // without the last declared member gives a list that does not close
         if (0 < nLeft) sql += ',';
     }

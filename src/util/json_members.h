@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Members of a JSON value that may be of any kind: what is not an object has none, where jsoncpp's
-// own calls would throw.
+// Members of a JSON value of any kind: a value that is not an object has none, where jsoncpp's own
+// calls would throw.
 #pragma once
 
 #include <json/value.h>
@@ -34,8 +34,8 @@ inline std::string_view memberName(const Json::Value::const_iterator& it)
     return {szName, static_cast<std::size_t>(szEnd - szName)};
 }
 
-// Finds members of a value that are asked for once each, in ascending order of their names (the
-// order in which jsoncpp holds them), in one walk.
+// Finds members of a value in one walk; each may be asked for once, in ascending order of the names
+// (the order in which jsoncpp holds them).
 class MemberWalk {
 public:
     explicit MemberWalk(const Json::Value& jValue)
@@ -65,7 +65,7 @@ private:
     Json::ArrayIndex nLeft_ = 0;
 };
 
-// The text of a JSON string, empty where the value is none.
+// The text of a JSON string; empty if the value is not a string.
 inline std::string_view textOf(const Json::Value& jString)
 {
     const char* szBegin = nullptr;

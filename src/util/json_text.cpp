@@ -16,10 +16,10 @@ namespace vorn {
 
 namespace {
 
-// Bytes that most texts find enough.
+// Bytes that suffice for most texts.
 constexpr std::size_t kUsualText = 128;
 
-// Collects what a stream writes in a string.
+// Collects in a string what a stream writes.
 class StringBuffer : public std::streambuf {
 public:
     void start()
@@ -52,7 +52,7 @@ class Writer {
 public:
     Writer()
     {
-        // So that a lack of memory reaches the caller instead of leaving half a text.
+        // So that running out of memory reaches the caller instead of leaving half a text.
         stream_.exceptions(std::ios_base::badbit);
         Json::StreamWriterBuilder builder;
         builder["commentStyle"] = "None";
@@ -77,7 +77,7 @@ private:
     std::unique_ptr<Json::StreamWriter> pWriter_;
 };
 
-// Inlined, its frame would burden every text that is parsed.
+// Not inlined, because its frame would slow down every parse.
 [[gnu::noinline]] Json::CharReader* newReader()
 {
     Json::CharReaderBuilder builder;

@@ -33,7 +33,7 @@ public:
     LogLine(const LogLine&) = delete;
     LogLine& operator=(const LogLine&) = delete;
 
-    // Writes the line with one call of printf or syslog. A line that finds no memory is dropped.
+    // Writes the line with one call of printf or syslog. A line is dropped if memory runs out.
     void write(const char* szFormat, ...) __attribute__((format(printf, 2, 3)));
 
 private:

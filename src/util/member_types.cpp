@@ -17,12 +17,12 @@ namespace {
 // wins
 struct Cache {
     Json::Value jType;
-    // The entry that was asked for last: an operation asks for the same one several times.
+    // The last entry that was asked for: an operation asks for the same one several times.
     std::string strLastName;
     Json::Value* pjLast = nullptr;
 };
 
-// False, after the failed check's line, when jTableDef does not define the members of a table.
+// False, after logging the failed check, if jTableDef does not define the members of a table.
 bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
 {
     if (FAILED(jTableDef.empty())) return false;
@@ -36,8 +36,8 @@ bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
     return !FAILED(strJsonName.empty());
 }
 
-// Copies what the library reads of each declared member into jEntry; false, after the failed
-// check's line, at the first member without a type word.
+// Copies what the library reads of each declared member into jEntry; false, after logging the
+// failed check, at the first member without a type word.
 bool readMembers(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jEntry)
 {
     const Json::Value& jMembers = jTableDef[strJsonName]["member"];
@@ -70,8 +70,7 @@ bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jT
     return !FAILED(jType == Json::nullValue || !jType.isMember(strJsonName));
 }
 
-// The table's entry, filled where it is new; null, after the failed check's line, when there is no
-// usable one.
+// The table's entry, filled if it is new; null, after logging the failed check, if none is usable.
 Json::Value* findEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jType)
 {
     Json::Value* pjEntry = findMember(jType, strJsonName);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The vocabulary of "cpptype": one row a word, one column a consumer.
+// The vocabulary of "cpptype": one row per word, one column per consumer.
 #pragma once
 
 #include "util/json_members.h"
@@ -27,9 +27,9 @@ struct TypeForms {
     CheckedKind checked;
 };
 
-// Kept(ValueLists.RefuseEveryOtherWord, RowDecoder.RefusesAValueOfAnyOtherType,
-// TypeCheck.KnowsNoOtherWord): each consumer knows type words of its own: a "double" is written and
-// not read back, a "Json::Value" read and not written
+// Kept(ValueLists.RefuseAnyOtherWord, RowDecoder.RefusesAValueOfAnyOtherType,
+// TypeCheck.KnowsNoOtherWord): each consumer knows its own type words: a "double" is written but
+// not read back, a "Json::Value" read but not written
 // clang-format off
 inline constexpr TypeForms kTypeWords[] = {
     //  word               a row            a value list            a condition      the type check
@@ -84,7 +84,7 @@ public:
 
 private:
     // "cpptype" is the last member by name, as far as the library fills the cache, so that one is
-    // looked at before a search.
+    // tried before a search.
     static const Json::Value* find(const Json::Value& jMember)
     {
         const Json::ArrayIndex nMembers = jMember.size();

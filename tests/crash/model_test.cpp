@@ -52,7 +52,7 @@ protected:
     Expected expected_;
 };
 
-TEST_F(CrashCheck, PassesAPendingOperationAbsentOrWhole)
+TEST_F(CrashCheck, AcceptsAPendingOperationAbsentOrComplete)
 {
     expectVerdict(Verdict::kNone, "");
     expected_.pending = kThree;
@@ -61,7 +61,7 @@ TEST_F(CrashCheck, PassesAPendingOperationAbsentOrWhole)
     expectVerdict(Verdict::kWhole, "");
 }
 
-TEST_F(CrashCheck, FindsWhatWasRolledBack)
+TEST_F(CrashCheck, FindsARolledBackChange)
 {
     expected_.pending = kThree;
     expected_.pending->frame = Operation::kRollback;
@@ -86,7 +86,7 @@ TEST_F(CrashCheck, FindsADamagedIndex)
     EXPECT_NE("", check(strPath_, expected_).strCorrupt);
 }
 
-TEST_F(CrashCheck, FindsWhatIsNoDatabase)
+TEST_F(CrashCheck, FindsAFileThatIsNotADatabase)
 {
     std::ofstream(strPath_) << std::string(4096, 'x');
     expectVerdict(Verdict::kNone, "the records cannot be listed", "file is not a database");

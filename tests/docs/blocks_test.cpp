@@ -38,7 +38,7 @@ bool isRunByInstallWays(const std::string& strHeading, const std::string& strLan
     return !matches(strScript, strName + strWord + strEnd, {0}).empty();
 }
 
-TEST(Documentation, HasNoBlockThatIsNotRun)
+TEST(Documentation, HasNoBlockThatNoTestRuns)
 {
     // The tests of these pages fail when there is a block that they do not know.
     const std::set<std::string> known = {"docs/limits.md", "docs/log.md", "docs/requests.md",

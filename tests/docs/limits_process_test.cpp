@@ -170,7 +170,7 @@ std::string linesOfTwoPlugins(const std::string& strCommand)
 
 }  // namespace
 
-TEST_F(Limits, FirstPluginsFlagsRule)
+TEST_F(Limits, FirstPluginsFlagsWin)
 {
     const std::string strStdoutFirst = " " VORN_STDOUT_PLUGIN " " VORN_SYSLOG_PLUGIN;
     const std::string strSyslogFirst = " " VORN_SYSLOG_PLUGIN " " VORN_STDOUT_PLUGIN;

@@ -112,7 +112,7 @@ TEST_F(LogPage, ShowsARowThatCannotBeRead)
     EXPECT_EQ(withoutPlaces(blocks_[5].strText), takeText());
 }
 
-TEST_F(LogPage, SaysWhatSqliteSays)
+TEST_F(LogPage, QuotesSqliteCorrectly)
 {
     for (const auto& row : page_.tables.at(1).rows) {
         SCOPED_TRACE(row[1]);

@@ -63,7 +63,7 @@ TEST(ManClassPage, ShowsTheHostOfTheReadme)
     }));
 }
 
-TEST(ManGeneralPage, ShowsADefinitionThatIsRead)
+TEST(ManGeneralPage, ShowsADefinitionThatTheLibraryReads)
 {
     Json::Value jDefinition =
         json(matches(fileText("man/vornjsondb.7"), "\n(\\{\"[^.]*)\\.Ed").at(0));
@@ -73,7 +73,7 @@ TEST(ManGeneralPage, ShowsADefinitionThatIsRead)
     EXPECT_EQ(jDefinition[strName]["member"], jTypes);
 }
 
-TEST(ManGeneralPage, SaysOfEveryTypeWordWhatTheGuideSays)
+TEST(ManGeneralPage, AgreesWithTheGuideOnEveryTypeWord)
 {
     std::vector<std::string> inTheGuide;
     const auto words = readPage("types.md").tables.at(0).rows;
@@ -88,7 +88,7 @@ TEST(ManGeneralPage, SaysOfEveryTypeWordWhatTheGuideSays)
                       {1, 2, 3, 4}));
 }
 
-TEST(ManGeneralPage, HasRequestsOfTheGuide)
+TEST(ManGeneralPage, TakesItsRequestsFromTheGuide)
 {
     std::set<std::string> inTheGuide;
     for (const MarkdownTable& table : readPage("requests.md").tables)
@@ -104,7 +104,7 @@ TEST(ManGeneralPage, HasRequestsOfTheGuide)
     }
 }
 
-TEST(ManGeneralPage, HasTheFormsOfTheLog)
+TEST(ManGeneralPage, HasTheFormsOfTheLogLines)
 {
     std::vector<std::string> inTheGuide;
     const auto forms = readPage("log.md").tables.at(0).rows;

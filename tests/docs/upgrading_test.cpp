@@ -49,7 +49,7 @@ protected:
                  "id integer primary key, data text"};
 };
 
-TEST_F(UpgradingPage, ShowsLayoutsThatAreAllRead)
+TEST_F(UpgradingPage, ShowsOnlyLayoutsThatCanBeRead)
 {
     EXPECT_EQ("1234", selected());
     Rows expected;

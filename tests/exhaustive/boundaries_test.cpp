@@ -104,7 +104,7 @@ TEST_F(IntegerBounds, HoldInEveryCall)
 }
 
 // Integers that another program stored, as text.
-TEST_F(IntegerBounds, HoldInRowsOfAnotherProgram)
+TEST_F(IntegerBounds, HoldInRowsWrittenByAnotherProgram)
 {
     for (const char* szWord : {"int", "unsigned int", "long long", "unsigned long long"}) {
         Table table(database_, std::string(R"({"m":{"cpptype":")") + szWord + "\"}}", "m");

@@ -91,7 +91,7 @@ void checkHandleWithout(int iMissing, Database& database, Table& table)
         }
 }
 
-TEST_F(EmptyArguments, AreSafeForAHandle)
+TEST_F(EmptyArguments, AreSafeForTheConstructor)
 {
     constexpr int kChoices = 16;
     // In a process of its own, because the member types of the empty name would stay.

@@ -103,13 +103,13 @@ TEST_F(LookUps, FailOnABadDefinition)
     }
 }
 
-TEST_F(LookUps, FailOnTypesOfAWrongKind)
+TEST_F(LookUps, FailOnTypesOfTheWrongKind)
 {
     for (const char* szEntry : {"null", "[{\"a\":1}]", "\"a\"", "5", "true"})
         expect(kWithoutTypes + kWithColumns, {kWhole, "", "", szEntry, "", true});
 }
 
-TEST_F(LookUps, EndAtAMemberWithoutAWord)
+TEST_F(LookUps, StopAtAMemberWithoutATypeWord)
 {
     for (const char* szMember : {"{}", "\"int\"", "null", R"({"cpptype":5})"}) {
         const std::string strMember = szMember;
@@ -140,7 +140,7 @@ TEST_F(LookUps, FailOnTypesThatLackAColumn)
                {kWhole, "", "", szEntry, "", true});
 }
 
-TEST_F(LookUps, TakeAMemberOfAWrongKindForOneOfAnUnknownWord)
+TEST_F(LookUps, TreatAMemberOfTheWrongKindAsOneOfAnUnknownWord)
 {
     for (const char* szA : {"{}", "null", R"({"cpptype":null})", "5", "\"string\"", "[\"string\"]"})
         expect(kWithoutAWord, {kWhole, "", "", typesOf(szA), "", true});

@@ -270,7 +270,7 @@ TEST_F(EveryCall, TakesAnyKindOfJsonValue)
     printFigure("matrix cells, JSON arguments", nCells_);
 }
 
-TEST_F(EveryCall, TakesAnyKindOfMemberOfAnyTypeWord)
+TEST_F(EveryCall, TakesAnyKindOfValueUnderAnyTypeWord)
 {
     for (const Row& row : kMembers) check(row, {std::begin(kKinds), std::end(kKinds)});
     for (const auto& [strCall, words] : words_)

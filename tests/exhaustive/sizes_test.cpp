@@ -37,7 +37,7 @@ struct Wide {
 // SQLite's default limit.
 constexpr int kMaxColumns = 2000;
 
-TEST_F(LargeRecords, MayHaveAsManyColumnsAsSqliteTakes)
+TEST_F(LargeRecords, MayHaveAsManyColumnsAsSqliteAllows)
 {
     const Wide wide(kMaxColumns);
     const std::string& strRecord = wide.strRecord;

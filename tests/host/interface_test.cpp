@@ -38,7 +38,7 @@ TEST_F(Interface, HasDefaultsForCallbackArgumentRecordAndFlag)
     EXPECT_EQ(-1, table.api.recDelete(jNoCondition));
 }
 
-TEST_F(Interface, LeavesTheFlagsAndTheDoubledCallsToTheProgram)
+TEST_F(Interface, LeavesTheFlagsAndTheReplaceableCallsToTheProgram)
 {
     FILE* pPipe = popen(VORN_NM " -DCP --undefined-only " VORN_LIBRARY, "r");
     ASSERT_NE(nullptr, pPipe);

@@ -88,7 +88,7 @@ private:
 
 using FormatterOracle = TableTest;
 
-TEST_F(FormatterOracle, AgreesWithSqliteWhereverThatIsDefined)
+TEST_F(FormatterOracle, AgreesWithSqliteWhereverTheResultIsDefined)
 {
     std::map<std::string, Table> tables;
     for (const auto& [szConversion, szWord] :
@@ -124,7 +124,7 @@ TEST_F(FormatterOracle, AgreesWithSqliteWhereverThatIsDefined)
     EXPECT_LT(1000, iEarlierRead);
 }
 
-TEST_F(FormatterOracle, TellsWhatIsDefined)
+TEST_F(FormatterOracle, KnowsWhichCallsAreDefined)
 {
     const struct {
         Value value;

@@ -170,7 +170,7 @@ TEST_F(HostileData, IsReadFromAColumnOfEachType)
     }
 }
 
-TEST_F(HostileData, IsKeptByWhatRunsNoStatement)
+TEST_F(HostileData, IsUnchangedByCallsThatRunNoSql)
 {
     forEachString(3, [&](const std::string& strHostile) {
         table_.api.setErrMsg(strHostile);

@@ -139,7 +139,7 @@ INSTANTIATE_TEST_SUITE_P(Locks, EveryHeldLock,
                                               std::get<Operation>(row.param).szName});
                          });
 
-TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
+TEST_F(HeldLock, IsGivenUpAfterFiveRealSeconds)
 {
     using namespace std::chrono;
     state().blReallySleep = true;
@@ -151,7 +151,7 @@ TEST_F(HeldLock, OfFiveSecondsIsGivenUpInEarnest)
 }
 
 // A transaction of the host that has read an older state can never write: all attempts are made.
-TEST_F(HeldLock, OfAnOlderSnapshotIsGivenUp)
+TEST_F(HeldLock, IsGivenUpInATransactionWithAnOlderSnapshot)
 {
     database_.run("pragma journal_mode=wal");
     database_.run("begin; select * from records");

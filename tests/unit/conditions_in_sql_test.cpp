@@ -102,7 +102,7 @@ TEST_F(ConditionsInSql, SelectRows)
             << c.szRequest;
 }
 
-TEST_F(ConditionsInSql, UpdateRowsByASetList)
+TEST_F(ConditionsInSql, UpdateRowsWithASetList)
 {
     const char szValues[] = R"({"name":"it's","n":8,"doc":{"k":"'"},"flag":false})";
     database_.run(composed(strUpdate_, szValues, kComma) + " where id=1");
@@ -112,7 +112,7 @@ TEST_F(ConditionsInSql, UpdateRowsByASetList)
               outcome(composed(strUpdate_, R"({"name":["x"]})", kComma)));
 }
 
-TEST_F(ConditionsInSql, PageThroughRowsInTheOrderOfTheTable)
+TEST_F(ConditionsInSql, PageThroughRowsInTableOrder)
 {
     const std::pair<const char*, const char*> cases[] = {
         {R"({"limit":2,"offset":1})", "23"},

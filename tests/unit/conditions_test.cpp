@@ -80,7 +80,7 @@ TEST_F(Conditions, AddNothingWithoutAUsableKey)
         for (int iJoiner : {kOr, kAnd, kComma}) expectTerms({{iJoiner, szRequest, {"", "1"}}});
 }
 
-TEST_F(Conditions, PassOverUndeclaredKeys)
+TEST_F(Conditions, SkipUndeclaredKeys)
 {
     expectTerms({
         {kAnd, R"({"a":"x","aa":1,"b":"y"})", {" (a='x' and b='y' )"}},
@@ -110,7 +110,7 @@ TEST_F(Conditions, WriteTheRawFilterVerbatimAtItsPlaceInByteOrder)
     });
 }
 
-TEST_F(Conditions, MakeAMembershipTermOfEveryArray)
+TEST_F(Conditions, TurnEveryArrayIntoAMembershipTerm)
 {
     expectTerms({
         {kAnd, R"({"a":["x"]})", {" (a in ('x' ) )"}},
@@ -134,7 +134,7 @@ TEST_F(Conditions, WriteTheJoinerAroundAnEmptyArray)
     });
 }
 
-TEST_F(Conditions, MakeAnEqualityTermOfEveryOtherValue)
+TEST_F(Conditions, TurnAnyOtherValueIntoAnEqualityTerm)
 {
     expectTerms({
         {kAnd, R"({"a":"O'Brien"})", {" (a='O''Brien' )"}},
@@ -159,7 +159,7 @@ TEST_F(Conditions, ReadPagingKeysThatTheTableDeclares)
 }
 
 // Kept: the name always means the raw filter, and its value is never written as a value.
-TEST_F(Conditions, TakeTheRawFilterForAMemberOfItsName)
+TEST_F(Conditions, PreferTheRawFilterToAMemberOfItsName)
 {
     Table table(database_, R"({"vornSqlWhereFilter":{"cpptype":"int"}})", "vornSqlWhereFilter");
     expectTerms(table.api, {{kAnd, R"({"vornSqlWhereFilter":"x"})", {" ( x  )"}},
@@ -237,7 +237,7 @@ TEST_F(Conditions, KeepWhatWasAppendedBeforeAnAccessorThrows)
 
 using ConditionLookUps = LookUpsTest;
 
-TEST_F(ConditionLookUps, ComeOnceACallBeforeEveryCheck)
+TEST_F(ConditionLookUps, HappenOncePerCallBeforeAnyCheck)
 {
     const char szDefinition[] = R"({"-":{}})";
     Json::Value jDefinition = json(szDefinition);

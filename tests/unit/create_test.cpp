@@ -52,7 +52,7 @@ TEST_F(Create, TakesARecordAndAResultThatShareAnObject)
     }
 }
 
-TEST_F(Create, RefusesWhatIsNoRecord)
+TEST_F(Create, RefusesWhatIsNotARecord)
 {
     for (const char* szRecord : {"null", "{}", "[]"})
         expectFailure(create(szRecord), {failed("jRecIn.empty()")});
@@ -97,7 +97,7 @@ TEST_F(Create, ChecksTheDefaultsToo)
     }
 }
 
-TEST_F(Create, FailsOnWordsThatTheCheckTakesAndTheListDoesNot)
+TEST_F(Create, FailsOnWordsThatTheCheckAcceptsAndTheListDoesNot)
 {
     for (const std::string strWord : {"uid_t", "time_t"}) {
         Table table(database_, R"({"v":{"cpptype":")" + strWord + R"("}})", "v");
@@ -109,7 +109,7 @@ TEST_F(Create, FailsOnWordsThatTheCheckTakesAndTheListDoesNot)
     }
 }
 
-TEST_F(Create, TellsADuplicateOfAnyUniqueColumnAndNoOtherError)
+TEST_F(Create, ReportsADuplicateInAnyUniqueColumnAndNoOtherError)
 {
     Table table(database_, R"({"a":{"cpptype":"int"},"b":{"cpptype":"string"}})",
                 "a integer primary key not null, b text unique check (b <> 'bad')");

@@ -42,7 +42,7 @@ TEST_F(Delete, ComposesOneStatementAndCounts)
                            row.szContents);
 }
 
-TEST_F(Delete, DeletesEverythingOnlyWhereThatIsAllowed)
+TEST_F(Delete, DeletesEverythingOnlyWhenAllowed)
 {
     for (const char* szRequest : {"{}", R"({"undeclared":1})", R"({"limit":1,"sort_by":"id"})"}) {
         expectFailure(remove(szRequest), {failed("strSql.empty()")});
@@ -53,7 +53,7 @@ TEST_F(Delete, DeletesEverythingOnlyWhereThatIsAllowed)
     expectContents(removeAll(), 0, "DELETE FROM $ ;", "");
 }
 
-TEST_F(Delete, FailsWhereTheRequestDoes)
+TEST_F(Delete, FailsWhenTheRequestIsBad)
 {
     for (const bool blDeleteAll : {false, true}) {
         for (const char* szRequest : {"null", R"("x")", R"("")", "[]", "[1]", R"([{"id":1}])", "5",
@@ -69,7 +69,7 @@ TEST_F(Delete, FailsWhereTheRequestDoes)
     }
 }
 
-TEST_F(Delete, FailsWhereMemoryRunsOut)
+TEST_F(Delete, FailsWhenMemoryRunsOut)
 {
     prepare_ = [] { doubles::state().iFailMprintf = 1; };
     for (const bool blDeleteAll : {false, true})
@@ -79,7 +79,7 @@ TEST_F(Delete, FailsWhereMemoryRunsOut)
         expectFailure(call, kNoMemoryForItem + Lines{kNoRequestConditions}, 0);
 }
 
-TEST_F(Delete, FailsWhereSqliteRefuses)
+TEST_F(Delete, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szRequest;
@@ -145,7 +145,7 @@ TEST_F(DeleteBy, RefusesAnEmptyListBeforeTheKey)
 }
 
 // recDeleteByName does not reach the list.
-TEST_F(DeleteBy, RefusesAKeyThatIsNoMember)
+TEST_F(DeleteBy, RefusesAKeyThatIsNotAMember)
 {
     for (const char* szKey : {static_cast<const char*>(nullptr), "", "undeclared", "Name", " name",
                               "vornSqlWhereFilter"}) {
@@ -163,7 +163,7 @@ TEST_F(DeleteBy, RefusesAKeyThatIsNoMember)
     }
 }
 
-TEST_F(DeleteBy, RefusesAKeyOfEveryOtherWord)
+TEST_F(DeleteBy, RefusesAKeyOfAnyOtherWord)
 {
     Json::Value jMembers;
     for (const char* szWord :

@@ -85,7 +85,7 @@ TEST_F(FormattedLists, ReadAPercentSignAsAConversion)
     for (const auto& c : cases) EXPECT_EQ(c.szText, values(c.table, json(c.szRecord)));
 }
 
-TEST_F(FormattedLists, ReadAPercentSignOfTheStatementToo)
+TEST_F(FormattedLists, ReadAPercentSignInTheStatementToo)
 {
     const Json::Value jRecord = json(R"({"a":"x","b":5})");
     EXPECT_EQ("%('x',5) ", values(integer_, jRecord, "%%%%("));
@@ -95,7 +95,7 @@ TEST_F(FormattedLists, ReadAPercentSignOfTheStatementToo)
     EXPECT_EQ("100NULL,0) ", values(integer_, jRecord, "100%"));
 }
 
-TEST_F(FormattedLists, MakeASaveFailWhereTheTextIsCut)
+TEST_F(FormattedLists, MakeASaveFailIfTheTextIsCut)
 {
     Json::Value jRecord = json(R"({"a":"100%","b":5})");
     EXPECT_EQ(-1, integer_.api.recSave(jRecord, true));

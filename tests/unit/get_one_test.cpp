@@ -44,13 +44,13 @@ TEST_F(GetOne, ReadsEveryMatchAndDropsAllButTheFirst)
     EXPECT_EQ(3U, nRows);
 }
 
-TEST_F(GetOne, LeavesTheOutputWhereNothingMatches)
+TEST_F(GetOne, LeavesTheOutputAloneWhenNothingMatches)
 {
     for (const char* szOut : {"null", "{}", R"({"id":7})", "[1]", R"("x")", "5", "true"})
         expectOutput(get(R"({"id":9})", szOut), 0, select(" WHERE  (id=9 );"), szOut);
 }
 
-TEST_F(GetOne, OverwritesMembersAndKeepsTheOthersAndThoseThatAreNullInTheRow)
+TEST_F(GetOne, OverwritesMembersButKeepsThoseThatTheRowLacks)
 {
     const char szOut[] = R"({"data":{"k":5,"m":6},"flag":"mine","mine":[1],"tags":"mine"})";
     expectOutput(get(R"({"id":1})", szOut), 1, select(" WHERE  (id=1 );"),
@@ -86,7 +86,7 @@ TEST_F(GetOne, TakesTheRequestItselfAsTheOutput)
 }
 
 // What becomes of the record touches no later one.
-TEST_F(GetOne, GivesARecordOfItsOwn)
+TEST_F(GetOne, GivesAnIndependentRecord)
 {
     Json::Value jRequest = json(R"({"id":2})");
     Json::Value jFirst;
@@ -110,7 +110,7 @@ TEST_F(GetOne, LeavesTheOutputAloneForARowOfNulls)
     expectOutput(get("null"), 1, "SELECT a FROM $ ;", "null");
 }
 
-TEST_F(GetOne, RefusesAnOutputOfAnotherKindAfterTheListing)
+TEST_F(GetOne, RefusesAnOutputOfTheWrongKindAfterTheListing)
 {
     Outcome outcome{-1, select(" WHERE  (id=2 );")};
     outcome.causes = {
@@ -120,7 +120,7 @@ TEST_F(GetOne, RefusesAnOutputOfAnotherKindAfterTheListing)
         expect(get(R"({"id":2})", szOut), outcome);
 }
 
-TEST_F(GetOne, FailsWhereTheListingDoes)
+TEST_F(GetOne, FailsWhenTheListingFails)
 {
     for (const char* szRequest : {R"("x")", "[]", "[1]", "5", "true"})
         expectFailure(get(szRequest, R"({"id":7})"), {kNoObjectOrNull}, 0);

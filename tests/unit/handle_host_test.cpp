@@ -145,7 +145,7 @@ TEST_F(HostFunctions, MayListAnotherTableAndFailAsLocked)
 using Memory = TableTest;
 
 // JSON text is never cut and nothing of a text that was not finished gets into the next one.
-TEST_F(Memory, ShortageLeavesNoHalfTextInAValueList)
+TEST_F(Memory, ShortageLeavesNoPartialTextInAValueList)
 {
     Table table(database_, R"({"j":{"cpptype":"Json::objectValue"}})", "j text");
     // Longer than the room that a JSON text begins with.

@@ -135,7 +135,7 @@ TEST_F(Handle, CopiesItsArgumentsAndLeavesThemAlone)
     expectSaved(api);
 }
 
-TEST_F(Handle, GivesBackTheMessageOfTheHost)
+TEST_F(Handle, ReturnsTheHostsMessage)
 {
     VornJsonDbApi api(database_.get(), strName_, jDefinition_, strCreate_);
     const std::string strMessage("a%s\0b", 5);

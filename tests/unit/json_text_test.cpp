@@ -62,7 +62,7 @@ TEST_F(JsonText, IsOneCompactLine)
     EXPECT_EQ(Lines(), takeLog());
 }
 
-TEST_F(JsonText, LeavesOutTheCommentsOfTheHost)
+TEST_F(JsonText, LeavesOutTheHostsComments)
 {
     Json::Value jRecord = json(R"({"a":[1,2],"o":{"k":1}})");
     const std::string strComment = "// a comment";

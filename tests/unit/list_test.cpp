@@ -57,7 +57,7 @@ TEST_F(List, ComposesOneStatement)
         expectOutput(list(row.szRequest), 0, select(row.szTail), listed(row.szIds));
 }
 
-TEST_F(List, ADeclaredMemberOffsetIsConditionAndPagingAtOnce)
+TEST_F(List, TreatsADeclaredMemberOffsetAsConditionAndPaging)
 {
     Table table(database_, R"({"offset":{"cpptype":"int"}})", "offset integer");
     pTable_ = &table;
@@ -69,7 +69,7 @@ TEST_F(List, ADeclaredMemberOffsetIsConditionAndPagingAtOnce)
                  R"([7,{"offset":1}])");
 }
 
-TEST_F(List, MakesAnArrayOfNullWithTheFirstRow)
+TEST_F(List, TurnsNullIntoAnArrayAtTheFirstRow)
 {
     expectOutput(list(R"({"id":9})", "null"), 0, select(" WHERE  (id=9 );"), "null");
     expectOutput(list(R"({"id":9})", "[]"), 0, select(" WHERE  (id=9 );"), "[]");
@@ -77,7 +77,7 @@ TEST_F(List, MakesAnArrayOfNullWithTheFirstRow)
                  std::string("[") + record('2') + "]");
 }
 
-TEST_F(List, RefusesARequestOfAnotherKindBeforeTheArray)
+TEST_F(List, RefusesARequestOfTheWrongKindBeforeTheOutput)
 {
     for (const char* szRequest :
          {R"("x")", R"("")", "[]", "[1]", R"([{"id":1}])", "5", "0", "1.5", "true", "false"})
@@ -85,7 +85,7 @@ TEST_F(List, RefusesARequestOfAnotherKindBeforeTheArray)
             expectFailure(list(szRequest, szArray), {kNoObjectOrNull});
 }
 
-TEST_F(List, RefusesAnArrayOfAnotherKindBeforeWhatTheRequestHolds)
+TEST_F(List, RefusesAnOutputOfTheWrongKindBeforeReadingTheRequest)
 {
     for (const char* szArray : {R"("x")", "{}", R"({"id":1})", "5", "1.5", "true", "false"})
         expectFailure(list(R"({"sort_by":5,"vornSqlWhereFilter":5})", szArray), {kNoArray});
@@ -101,14 +101,14 @@ TEST_F(List, PassesOnWhatAnAccessorThrows)
         expectThrow(list(szRequest));
 }
 
-TEST_F(List, RefusesARawFilterOfAnotherKindBeforeThePaging)
+TEST_F(List, RefusesARawFilterOfTheWrongKindBeforeThePaging)
 {
     for (const char* szFilter : {"5", "null", "true", "1.5", "[]", R"(["id=1"])", "{}"})
         expectFailure(list(std::string(R"({"sort_by":5,"vornSqlWhereFilter":)") + szFilter + "}"),
                       {kFilterIsNoText, kNoRequestConditions});
 }
 
-TEST_F(List, FailsWhereMemoryRunsOut)
+TEST_F(List, FailsWhenMemoryRunsOut)
 {
     prepare_ = [] { doubles::state().iFailMprintf = 1; };
     expectFailure(list(R"({"name":"Ann"})"), kNoMemoryForText + Lines{kNoRequestConditions});
@@ -118,7 +118,7 @@ TEST_F(List, FailsWhereMemoryRunsOut)
     expectFailure(list(R"({"name":"Ann","sort_by":"id"})"), {failed("!szSql"), kNoPaging});
 }
 
-TEST_F(List, FailsWhereSqliteRefuses)
+TEST_F(List, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szRequest;

@@ -125,7 +125,7 @@ TEST_F(Log, WritesEachFamilyInItsForms)
     }
 }
 
-TEST_F(Log, GivesTheSqlErrorOfEachOperationALineNumberOfItsOwn)
+TEST_F(Log, GivesEachOperationsSqlErrorItsOwnLineNumber)
 {
     database_.run("drop table " + table_.strName);
     blLogToStdout = true;
@@ -149,7 +149,7 @@ TEST_F(Log, GivesTheSqlErrorOfEachOperationALineNumberOfItsOwn)
 }
 
 // Rendering a record allocates, and so does formatting: both may leave anything in errno.
-TEST_F(Log, ShowsTheErrnoOfTheCheckThoughComposingTheLineChangesIt)
+TEST_F(Log, ShowsTheErrnoOfTheCheckEvenIfComposingTheLineChangesIt)
 {
     // The first look-up of a process makes the cache, before any check.
     VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
@@ -237,7 +237,7 @@ TEST_F(Log, IsSilentAboutSuccess)
     EXPECT_EQ(Lines(), takeLog());
 }
 
-TEST_F(Log, DropsOnlyTheLineThatFindsNoMemory)
+TEST_F(Log, DropsOnlyTheLineThatLacksMemory)
 {
     blFailNextLine = true;
     errno = ENOENT;

@@ -44,7 +44,7 @@ TEST_F(MemberCopy, FillsAndOverwrites)
     expectCopies(R"({"a":1})", R"({"A":2,"a ":3,"a\u0000b":4})", szNames, szNames);
 }
 
-TEST_F(MemberCopy, RefusesEveryOtherKind)
+TEST_F(MemberCopy, RefusesAnyOtherKind)
 {
     const Lines badDestination = {
         utilFailed("jIn.type() != Json::nullValue && jIn.type() != Json::objectValue")};

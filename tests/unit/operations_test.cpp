@@ -81,7 +81,7 @@ TEST_F(Operations, FailOnANegativeNumberOfChangedRows)
 }
 
 // Only deletes give the number.
-TEST_F(Operations, TakeAnyOtherNumberOfChangedRows)
+TEST_F(Operations, AcceptAnyOtherNumberOfChangedRows)
 {
     prepare_ = [] { doubles::state().changes = [] { return 2147483647; }; };
     for (Row row : rows_) {
@@ -91,7 +91,7 @@ TEST_F(Operations, TakeAnyOtherNumberOfChangedRows)
 }
 
 // Kept: the text of the last failure counts, whether the failing call ran SQL or not.
-TEST_F(Operations, TellAnEarlierDuplicateAgain)
+TEST_F(Operations, ReportAnEarlierDuplicateAgain)
 {
     VornJsonDbApi other(database_.get(), table_.strName, table_.jDefinition, table_.strCreate);
     Json::Value jOut;

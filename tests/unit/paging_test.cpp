@@ -65,7 +65,7 @@ TEST_F(Paging, WritesTheSortKeyAsATextLiteral)
                      {std::string(" order by '") + szLiteral + "'"});
 }
 
-TEST_F(Paging, SortsDownOnlyForDesc)
+TEST_F(Paging, SortsDescendingOnlyForDesc)
 {
     const std::string strRequest = R"({"sort_by":"name","sort_direction":)";
     expectClause(strRequest + R"("desc"})", {" order by 'name' DESC"});
@@ -106,7 +106,7 @@ TEST_F(Paging, WritesLimitAndOffsetAsJson)
     expectValue(R"({"b": 1, "a": [null, 2]})", R"({"a":[null,2],"b":1})");
 }
 
-TEST_F(Paging, LeavesOutTheCommentsOfAReader)
+TEST_F(Paging, LeavesOutCommentsOnTheNumbers)
 {
     Json::Value jRequest = json(R"({"limit":10})");
     jRequest["limit"].setComment(std::string("// ten"), Json::commentAfterOnSameLine);

@@ -72,7 +72,7 @@ TEST_F(RowDecoder, ReadsEachTypeInItsOwnWay)
         }
 }
 
-TEST_F(RowDecoder, HoldsIntegersAsSignedOnes)
+TEST_F(RowDecoder, StoresIntegersAsSigned)
 {
     EXPECT_EQ(R"([{"i":7,"ll":7,"ui":7,"ull":7}])",
               rowsOf("select 7 as i, 7 as ui, 7 as ll, 7 as ull"));
@@ -151,7 +151,7 @@ TEST_F(RowDecoder, KeepsAMemberWhoseTextIsNotJson)
     }
 }
 
-TEST_F(RowDecoder, MakesAMemberNullThatIsNestedTooDeep)
+TEST_F(RowDecoder, MakesAMemberNullIfItIsNestedTooDeeply)
 {
     for (std::size_t nLevels : {1000U, 1001U, 100000U}) {
         const std::string strNested = std::string(nLevels, '[') + std::string(nLevels, ']');
@@ -162,7 +162,7 @@ TEST_F(RowDecoder, MakesAMemberNullThatIsNestedTooDeep)
     }
 }
 
-TEST_F(RowDecoder, AppendsToNothingButAnArray)
+TEST_F(RowDecoder, AppendsOnlyToAnArray)
 {
     const std::string strStopped = runFailed("query aborted", "a text");
     state().exec = execOfRows({kRow});
@@ -227,7 +227,7 @@ TEST_F(RowDecoder, AsksForMissingTypesAtEveryRow)
 }
 
 // At places that no row of the process had before.
-TEST_F(RowDecoder, LooksUpANamelessColumnLikeEveryOther)
+TEST_F(RowDecoder, LooksUpANamelessColumnLikeAnyOther)
 {
     for (std::size_t nOthers : {70U, 80U}) {
         const bool blDeclared = 80 == nOthers;

@@ -207,7 +207,7 @@ TEST_F(Retry, LooksForTheWordsAnywhereInTheText)
         expectRun({{SQLITE_ERROR, szError}}, kMaxAttempts, -1);
 }
 
-TEST_F(Retry, TakesTheErrnoOfALockForALock)
+TEST_F(Retry, TreatsTheErrnoOfALockAsALock)
 {
     expectRun({{SQLITE_ERROR, nullptr, EAGAIN}}, kMaxAttempts, -1);
     expectRun({{SQLITE_ERROR, "disk I/O error", EAGAIN}}, kMaxAttempts, -1);
@@ -238,7 +238,7 @@ TEST_F(Retry, ClearsErrnoAndHoldsTheTextOfTheLastLockedAttempt)
     EXPECT_EQ("", lastSqlError());
 }
 
-TEST_F(Retry, TriesTheWholeTextAgain)
+TEST_F(Retry, RunsTheWholeTextAgain)
 {
     std::string strRows;
     state().exec = execCalledLocked(1);

@@ -28,7 +28,7 @@ TEST_F(Save, InsertsOrReplacesAndReadsBackInOneText)
     expect(save(szBob, false), {0, saved(false, "id,name", "8,'Bob') "), szBob, "7Ann,8Bob"});
 }
 
-TEST_F(Save, ReplacesEveryRowInItsWay)
+TEST_F(Save, ReplacesEveryConflictingRow)
 {
     pTable_ = &table_;
     const char szRecord[] = R"({"flag":true,"id":1,"name":"Bob","tags":[2]})";
@@ -100,7 +100,7 @@ TEST_F(Save, StopsAtAValueThatCannotBeWritten)
                       0, (blCreate ? "INSERT" : "REPLACE") + std::string(" INTO $ (a,b) VALUES ("));
 }
 
-TEST_F(Save, FailsWhereTheRowCannotBeReadThoughItIsWritten)
+TEST_F(Save, FailsIfTheWrittenRowCannotBeReadBack)
 {
     blWritten_ = true;
     const std::string strNoField =
@@ -123,7 +123,7 @@ TEST_F(Save, FailsWhereTheRowCannotBeReadThoughItIsWritten)
     }
 }
 
-TEST_F(Save, FailsInATableWithoutRowidThoughTheRowIsWritten)
+TEST_F(Save, FailsInATableWithoutRowidAfterWritingTheRow)
 {
     blWritten_ = true;
     const std::string strName = freshName();
@@ -134,7 +134,7 @@ TEST_F(Save, FailsInATableWithoutRowidThoughTheRowIsWritten)
                      "no such column: rowid");
 }
 
-TEST_F(Save, FailsWhereTheSelectFindsNoRow)
+TEST_F(Save, FailsWhenTheSelectFindsNoRow)
 {
     database_.run("create trigger ignored before insert on " + people_.strName +
                   " begin select raise(ignore); end");
@@ -158,7 +158,7 @@ TEST_F(Save, TakesTheFirstOfSeveralRows)
     expectOutput(save(R"({"id":9,"name":"x"})", true), 0, kAnySql, R"({"id":1})");
 }
 
-TEST_F(Save, LetsTheExceptionOfAnAccessorThrough)
+TEST_F(Save, PassesOnWhatAnAccessorThrows)
 {
     expectThrow(save(R"({"id":"5","name":"x"})", true));
 }

@@ -168,7 +168,7 @@ TEST_F(Terms, WriteTheFieldNameVerbatim)
     EXPECT_EQ("namename='x'", strField);
 }
 
-TEST_F(Terms, FollowAHostThatChangesTheMemberTypes)
+TEST_F(Terms, FollowTheHostsChangesToTheMemberTypes)
 {
     Json::Value& jType = VORN_JSON_DB::recType(table_.jDefinition, table_.strName);
     // A word that is not a text is read as one, and a missing word is an unknown one.

@@ -151,7 +151,7 @@ TEST_F(TimeText, NamesDaysAndMonths)
         EXPECT_EQ(months[i], converted(86400LL * 14 + 2635200LL * i, kGmt).substr(8, 3)) << i;
 }
 
-TEST_F(TimeText, ReachesFromTheFirstToTheLastSecondOfTheCalendar)
+TEST_F(TimeText, CoversTheCalendarFromItsFirstSecondToItsLast)
 {
     const TimeZone zone("UTC0");
     std::vector<long long> times = {LONG_MIN, LONG_MIN + 1, LONG_MAX - 1, LONG_MAX};
@@ -178,7 +178,7 @@ TEST_F(TimeText, ReachesFromTheFirstToTheLastSecondOfTheCalendar)
     EXPECT_EQ(EOVERFLOW, errno);
 }
 
-TEST_F(TimeText, FailsWhereTheCLibraryDoes)
+TEST_F(TimeText, FailsWhenTheCLibraryFails)
 {
     for (bool blStdout : {false, true}) {
         blLogToStdout = blStdout;

@@ -59,7 +59,7 @@ TEST_F(UpdateByWhere, RefusesAnEmptyConditionBeforeTheRecord)
         expectFailure(updateByWhere(szRecord, ""), {failed("strSqlWhere.empty()")});
 }
 
-TEST_F(UpdateByWhere, RefusesARecordThatIsEmptyOrOfAnotherKind)
+TEST_F(UpdateByWhere, RefusesARecordThatIsEmptyOrOfTheWrongKind)
 {
     for (const char* szRecord : {"null", "{}", "[]"})
         expectFailure(updateByWhere(szRecord, "id=1"), {failed("jRecIn.empty()")});
@@ -68,14 +68,14 @@ TEST_F(UpdateByWhere, RefusesARecordThatIsEmptyOrOfAnotherKind)
                       "UPDATE $ SET ");
 }
 
-TEST_F(UpdateByWhere, FailsWhereMemoryRunsOutInATerm)
+TEST_F(UpdateByWhere, FailsWhenMemoryRunsOutInATerm)
 {
     prepare_ = [] { doubles::state().iFailMprintf = 2; };
     expectFailure(updateByWhere(R"({"id":1,"name":"Eve"})", "id=1"),
                   kNoMemoryForText + Lines{kNoSetList}, 0, "UPDATE $ SET ");
 }
 
-TEST_F(UpdateByWhere, FailsWhereSqliteRefuses)
+TEST_F(UpdateByWhere, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szRecord;
@@ -151,7 +151,7 @@ TEST_F(UpdateByFilter, ComposesOneStatement)
                        update(row.szSet, row.szTerms), row.szContents);
 }
 
-TEST_F(UpdateByFilter, RefusesAFilterByItsKindBeforeTheValues)
+TEST_F(UpdateByFilter, RefusesAFilterOfTheWrongKindBeforeTheValues)
 {
     for (const char* szValues : {R"({"flag":true})", "[1]", "null"}) {
         for (const char* szFilter : {"null", "{}", "[]"})
@@ -162,7 +162,7 @@ TEST_F(UpdateByFilter, RefusesAFilterByItsKindBeforeTheValues)
     }
 }
 
-TEST_F(UpdateByFilter, RefusesValuesOfAnotherKindBeforeTheConditionsAreLookedAt)
+TEST_F(UpdateByFilter, RefusesValuesOfTheWrongKindBeforeReadingTheConditions)
 {
     for (const char* szFilter :
          {R"({"id":1})", R"({"vornSqlWhereFilter":5})", R"({"undeclared":1})"})
@@ -172,7 +172,7 @@ TEST_F(UpdateByFilter, RefusesValuesOfAnotherKindBeforeTheConditionsAreLookedAt)
                           {failed("jParamIn.type() != Json::objectValue")});
 }
 
-TEST_F(UpdateByFilter, ReportsAFaultOfTheFilterBeforeOneOfTheValues)
+TEST_F(UpdateByFilter, ReportsABadFilterBeforeBadValues)
 {
     const std::string strBadValues = R"({"id":"x"})";
     expectFailure(updateByFilter(R"({"vornSqlWhereFilter":5})", strBadValues),
@@ -214,12 +214,12 @@ TEST_F(UpdateByFilter, RefusesValuesOfTheWrongType)
     expectRefused("type not found!!, key=id", R"({"id":1})");
 }
 
-TEST_F(UpdateByFilter, RefusesEmptyValuesOneLevelBelow)
+TEST_F(UpdateByFilter, RefusesEmptyValuesInTheInnerUpdate)
 {
     expectFailure(updateByFilter(R"({"id":1})", "{}"), {failed("jRecIn.empty()")}, 0);
 }
 
-TEST_F(UpdateByFilter, FailsWhereSqliteRefuses)
+TEST_F(UpdateByFilter, FailsWhenSqliteRefuses)
 {
     const struct {
         const char* szFilter;

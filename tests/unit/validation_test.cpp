@@ -63,7 +63,7 @@ TEST_F(DefaultValues, AreCopiedWholeWhateverTheirKind)
     }
 }
 
-TEST_F(DefaultValues, AreCopiesOfTheirOwn)
+TEST_F(DefaultValues, AreIndependentCopies)
 {
     Table table(database_, R"({"v":{"cpptype":"Json::objectValue","cppDefaultValue":{"k":[1]}}})",
                 "v");
@@ -86,7 +86,7 @@ TEST_F(DefaultValues, LeaveARecordThatIsNotAnObjectAlone)
     }
 }
 
-TEST_F(DefaultValues, AreReportedAsLostByTheFirstName)
+TEST_F(DefaultValues, AreReportedMissingByTheFirstName)
 {
     const std::pair<const char*, const char*> cases[] = {
         {R"({"b":1})", "a"},
@@ -111,7 +111,7 @@ TEST_F(DefaultValues, AreReportedAsLostByTheFirstName)
 }
 
 // The look-up says what is wrong; the result does not.
-TEST_F(DefaultValues, AreNoneInATableWithoutMembers)
+TEST_F(DefaultValues, AreAbsentInATableWithoutMembers)
 {
     Table table(database_, "{}", "a");
     // A host may change what recType refers to.
@@ -213,7 +213,7 @@ TEST_F(TypeCheck, StopsAtTheFirstBadMember)
         expectLine(table, szRecord, "Failed [!jRecParam.isObject()]");
 }
 
-TEST_F(TypeCheck, PassesEveryObjectWhereTheTableHasNoTypes)
+TEST_F(TypeCheck, PassesEveryObjectIfTheTableHasNoTypes)
 {
     Table table(database_, "{}", "a");
     Json::Value jRecord = json(R"({"a":[],"b":null})");

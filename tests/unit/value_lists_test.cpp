@@ -167,7 +167,7 @@ TEST_F(ValueLists, LeaveTheTextAloneWhenAnAccessorThrows)
 }
 
 // Kept: words that other consumers know. A word matters only where the record holds the member.
-TEST_F(ValueLists, RefuseEveryOtherWord)
+TEST_F(ValueLists, RefuseAnyOtherWord)
 {
     for (const std::string& strWord : split(kRefused, '|'))
         for (const char* szValue : {"1", "null", "{}"})

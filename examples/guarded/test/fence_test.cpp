@@ -77,7 +77,7 @@ TEST_F(FenceTest, GivesEachAccessWhatItNeeds)
     EXPECT_EQ("1z,3d", notes());
 }
 
-TEST_F(FenceTest, GivesNoneMoreAndNothingBetweenTwoCalls)
+TEST_F(FenceTest, GivesNoFurtherAccessAndNoneBetweenCalls)
 {
     const char* kSelect = "select * from note";
     const char* kInsert = "insert into note (id) values (3)";
@@ -137,7 +137,7 @@ TEST_F(FenceTest, GivesNothingToTriggersAndOtherDatabases)
     EXPECT_EQ("1a,2b", notes());
 }
 
-TEST_F(FenceTest, TakesBackMoreThanOneChangeAndWhatFails)
+TEST_F(FenceTest, RollsBackFailuresAndMoreThanOneChange)
 {
     const std::pair<Access, const char*> calls[] = {
         {Access::kDelete, "delete from note"},
@@ -189,7 +189,7 @@ TEST_F(FenceTest, LimitsStatements)
     EXPECT_NE(std::string::npos, strError_.find("none")) << strError_;
 }
 
-TEST_F(FenceTest, StopsNobodyWhenItIsGone)
+TEST_F(FenceTest, StopsNothingOnceDestroyed)
 {
     pFence_.reset();
     EXPECT_EQ("524288", database_.value("select count(*) from note" + repeated(18, " join note")));
@@ -219,7 +219,7 @@ TEST_F(FenceTest, IsDefensiveAndDoesNotTrustTheSchema)
 
 // The guard lets these through: they are good requests, but for the size of the table. Each call
 // has all its steps.
-TEST_F(HostTest, FencedScansEndWhereTheTableIsLarge)
+TEST_F(HostTest, StopsScansOfALargeTable)
 {
     World large(World::Layers::kBoth, 200000);
     World medium(World::Layers::kBoth, 10000);
@@ -236,7 +236,7 @@ TEST_F(HostTest, FencedScansEndWhereTheTableIsLarge)
 }
 
 // The library alone would try 500 times to get a lock.
-TEST_F(HostTest, FencedAnswersBesideAnotherConnection)
+TEST_F(HostTest, AnswersWhileAnotherConnectionHoldsALock)
 {
     Database database(Database::Place::kFile);
     Host host(database.get());

@@ -106,7 +106,7 @@ TEST_F(Guard, RefusesControlCharacters)
 }
 
 // In the second list are the neighbours of what is refused.
-TEST_F(Guard, RefusesWhatIsNotUtf8)
+TEST_F(Guard, RefusesInvalidUtf8)
 {
     for (const char* szText :
          {// Begins in the middle, ends too early, or goes on with something else.
@@ -124,7 +124,7 @@ TEST_F(Guard, RefusesWhatIsNotUtf8)
 }
 
 // A table of somebody else's has other words.
-TEST_F(Guard, KnowsTheOtherWords)
+TEST_F(Guard, KnowsTheOtherTypeWords)
 {
     const Json::Value jTypes = json(
         R"({"n":{"cpptype":"int"},"o":{"cpptype":"Json::objectValue"},"x":{"cpptype":"double"}})");
@@ -170,7 +170,7 @@ TEST_F(Guard, CountsValues)
 }
 
 // A default of the wrong kind, which is the host's own mistake.
-TEST_F(Guard, IsNotAskedAboutDefaults)
+TEST_F(Guard, DoesNotCheckDefaults)
 {
     World world(World::Layers::kBoth);
     Json::Value jNone;

@@ -84,7 +84,7 @@ TEST_F(Share, NotesBeyond32BitsKeepTheirIds)
               text(answer(list("{}"))["records"]));
 }
 
-TEST_F(Share, AuthorsSaveWhatIsTheirs)
+TEST_F(Share, AuthorsSaveOnlyTheirOwnNotes)
 {
     EXPECT_EQ(0, result(kMine));
     EXPECT_EQ(0, result(save(R"({"id":1,"author":"Ann","text":"again"})")));
@@ -112,7 +112,7 @@ TEST_F(Share, EachAuthorHasAQuota)
     }
 }
 
-TEST_F(Share, CrowdDoesNotTurnTheFenceAgainstOthers)
+TEST_F(Share, CrowdDoesNotUseUpTheStepsOfOthers)
 {
     for (int i = 0; i < 40; ++i) fill("crowd" + std::to_string(i), kMaxNotes);
     EXPECT_EQ(0, result(kMine));
@@ -148,7 +148,7 @@ TEST_F(Share, AnswerIsBelowFiveMegabytes)
 }
 
 // Each allocation of operator new fails once.
-TEST_F(Share, HostGoesOnAfterALackOfMemory)
+TEST_F(Share, HostGoesOnAfterRunningOutOfMemory)
 {
     const char* kTea = R"({"author":"Ann","topics":["tea",{"cups":2}]})";
     EXPECT_EQ(0, result(create(kTea)));
@@ -180,7 +180,7 @@ TEST_F(Share, HostGoesOnAfterALackOfMemory)
 }
 
 // Even the rollback may lack memory.
-TEST_F(Share, HostGoesOnAfterAStatementThatFails)
+TEST_F(Share, HostGoesOnAfterAFailedStatement)
 {
     EXPECT_EQ(0, result(kMine));
     failStatements({"SELECT"});

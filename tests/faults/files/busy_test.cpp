@@ -96,7 +96,7 @@ protected:
     Json::Value jAll_;
 };
 
-TEST_P(BusyAt, LockIsTriedAgainFromTheStart)
+TEST_P(BusyAt, RetriesFromTheStart)
 {
     const Held& held = GetParam();
     const Operation& tested = operation(held.szOperation);
@@ -134,7 +134,7 @@ INSTANTIATE_TEST_SUITE_P(Locks, BusyAt, testing::ValuesIn(everyHeld()), [](const
 
 // Also the locks that a connection takes before its first statement. Only an INSERT into a table
 // with keys fails, at the lock of its re-selection.
-TEST_F(Busy, EveryOperationIsTriedAgainAtEachLock)
+TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
 {
     for (const Operation& operation : operations())
         for (Journal journal : {Journal::kDelete, Journal::kWal}) {

@@ -147,7 +147,7 @@ protected:
     }
 };
 
-TEST_P(FileFaults, LeaveNothingWrong)
+TEST_P(FileFaults, LeaveNothingBroken)
 {
     for (int iPageSize : isLongRun() ? std::vector<int>{512, 1024, 4096} : std::vector<int>{512})
         tryEveryPoint(

@@ -117,7 +117,7 @@ private:
     }
 };
 
-TEST_P(MemoryFaults, OfEveryAllocation)
+TEST_P(MemoryFaults, AreHandledAtEveryAllocation)
 {
     if (Kind::kMalloc == GetParam().fault.kind && !allocators::kOwnMalloc)
         GTEST_SKIP() << "malloc cannot be replaced beside the one of a sanitizer";
