@@ -127,7 +127,10 @@ TEST_P(TriedOnce, ByEveryOperation)
     error.hook(database_.get(), true);
     for (const Operation& tested : chosen) {
         const std::string strError = tested.blWrites ? error.szError : error.szErrorOfReading;
-        strError.empty() ? expectWorking(tested) : expectOnce(tested, strError);
+        if (strError.empty())
+            expectWorking(tested);
+        else
+            expectOnce(tested, strError);
     }
     error.hook(database_.get(), false);
     if (!sqlite3_get_autocommit(other_.get())) other_.run("rollback");

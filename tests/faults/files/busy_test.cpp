@@ -42,8 +42,8 @@ std::vector<Held> everyHeld()
 {
     std::vector<Held> all = {
         {"recCreate", 1, 1, 0, 1},
-        {"recCreate", 2, 1, 0, 1},
-        {"recCreate", 3, 1, 0, 1},
+        {"recCreate", 2, 2, 0, 1},
+        {"recCreate", 3, 2, 0, 1},
         {"recCreate", 1, kAlways, -1, 0},
         {"recCreate", kReselection, kAlways, -1, 500},
         // The first attempt's row is in the way of the second one.
