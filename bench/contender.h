@@ -10,7 +10,7 @@
 
 namespace bench {
 
-// Each contender opens a database in memory of its own and makes the table when it is made. Its
+// Each contender, when it is made, opens an in-memory database of its own and makes the table. Its
 // JSON may be of any library. An operation takes its JSON input, made before by makeInput(), and
 // leaves what it returns to the host in the contender until the next operation.
 class Contender {
@@ -102,7 +102,7 @@ struct ContenderEntry {
     std::unique_ptr<Contender> (*make)();
 };
 
-// The library first, then the floor, then the others as far as they were found at configure time.
+// The library first, then the floor, then those of the others that were found at configure time.
 const std::vector<ContenderEntry>& contenders();
 // Ends the program for an unknown name.
 std::unique_ptr<Contender> makeContender(const std::string& strName);
@@ -117,7 +117,7 @@ struct OperationEntry {
 const std::vector<OperationEntry>& operations();
 Operation operationOf(const std::string& strName);
 
-// How many calls the operation takes on a table of so many rows, and the call of that index.
+// How many calls the operation takes on a table of that many rows, and the call of that index.
 int callCount(Operation operation, int rows);
 void call(Contender& contender, Operation operation, int i);
 

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 // bench_count CONTENDER OPERATION ROWS, run under
 //     valgrind --tool=callgrind --instr-atstart=no
-// counts the instructions of an operation's calls on a table of so many rows: what sets up the
-// table and the input, and the first pass, which fills every cache, are not counted. What a call
-// returned is dropped within the count. Prints a digest of the first pass's results and of the
-// table after the second: the same work gives the same digest.
+// counts the instructions of an operation's calls on a table of that many rows, including those
+// that free what a call returned, but not setting up the table and the input, nor the first pass,
+// which fills every cache. Prints a digest of the first pass's results and of the table after the
+// second: the same work gives the same digest.
 #include "contender.h"
 
 #include <valgrind/callgrind.h>

@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: MIT
-// bench_listing CONTENDER ROWS lists a table of so many rows, in a process of its own, and prints
+// bench_listing CONTENDER ROWS lists a table of that many rows, in a process of its own, and prints
 // the user CPU time and the growth of the peak memory for each listed row. Small tables are listed
-// again and again, each result dropped outside the measured time, so that the clock's steps do not
-// show.
+// again and again, each result dropped outside the measured time, to hide the clock's granularity.
 #include "contender.h"
 
 #include <sys/resource.h>
@@ -43,7 +42,7 @@ int main(int argc, char** argv)
     const int rows = atoi(argv[2]);
     bench::must(0 < rows, "a number of rows");
 
-    // What only the first call needs is not the rows' cost.
+    // What only the first call needs is not part of the rows' cost.
     bench::setUp(argv[1], bench::Operation::kList, 1)->listAll();
     const auto contender = bench::setUp(argv[1], bench::Operation::kList, rows);
 
@@ -66,6 +65,6 @@ int main(int argc, char** argv)
         "\"peak_bytes_per_row\": %.1f}\n",
         argv[1], rows, seconds * 1e9 / passes / rows, peak / rows);
     fflush(stdout);
-    // Taking a million records apart is nobody's concern here.
+    // Destroying a million records is not part of the measurement.
     _Exit(0);
 }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 // bench_value_list MEMBERS BYTES, run under callgrind like bench_count, counts the instructions of
-// the value list of one record with so many text members, the first of them so many bytes long.
+// the value list of one record with MEMBERS text members, the first of them BYTES bytes long.
 #include "workload.h"
 
 #include <VornJsonDbApi.h>

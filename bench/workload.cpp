@@ -181,7 +181,7 @@ std::string tableText(sqlite3* pDb)
             static_cast<std::string*>(pText)->append(values[i] ? values[i] : "NULL").append("|");
         return 0;
     };
-    // Blanks between the JSON tokens are a matter of each writer.
+    // Each writer has its own way with blanks between the JSON tokens.
     const char* const szSql =
         "SELECT done,grp,id,json(meta),name,qty,json(tags),typeof(id),"
         "typeof(done),typeof(qty) FROM task ORDER BY id";

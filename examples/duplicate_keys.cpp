@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: MIT
 /// @file
-/// Duplicate keys: how a host tells a record that is there already from one that failed otherwise.
+/// Duplicate keys: how a host tells a record that already exists from one that failed otherwise.
 ///
 /// Each call has a transaction around it. Otherwise a call that meets the lock of another
-/// connection after its INSERT runs that again, and reports as a duplicate the record it has just
-/// written.
+/// connection after its INSERT runs the INSERT again, and reports as a duplicate the record it has
+/// just written.
 ///
 /// Prints what became of each user: stored, there already by its id or its mail address, or
 /// refused because of its type. Its last two lines show why the message has to be cleared first.
@@ -18,8 +18,8 @@ bool blDebugOutput = false;
 namespace {
 
 // Begins a transaction, in which nobody else can lock the database, and forgets earlier duplicates:
-// the message, and the handle's last SQL error, which a statement that succeeds clears. Without it
-// a later failure of another kind would be called a duplicate, too.
+// the message, and the handle's last SQL error, which a successful statement clears. Otherwise a
+// later failure of another kind would be called a duplicate, too.
 bool begin(VornJsonDbApi& user)
 {
     user.setErrMsg("");

@@ -52,7 +52,7 @@ bool countByRiver(VornJsonDbApi& city)
                               printRiver);
 }
 
-// An update replaces an object whole, so it is changed inside by SQL. An array member cannot be
+// An update replaces an object whole, so SQL is used to change it inside. An array member cannot be
 // updated at all: fetch the record, change it, and save it whole.
 bool change(VornJsonDbApi& city)
 {

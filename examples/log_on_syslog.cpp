@@ -50,7 +50,7 @@ bool useSensors(sqlite3* pDb)
 int main()
 {
     // The program's name in front of each line; LOG_PID is left out, as the lines have the process
-    // id already. LOG_PERROR repeats each line on standard error: for a look at them, not for a
+    // id already. LOG_PERROR repeats each line on standard error: for looking at them, not for a
     // daemon. Priority LOG_ERR would be silenced by setlogmask(LOG_UPTO(LOG_CRIT)).
     openlog("log_on_syslog", LOG_PERROR, LOG_USER);
 

@@ -12,7 +12,7 @@
 #include <cerrno>
 #include <iostream>
 
-// Declared by the header, which keeps them visible also where a program hides its symbols.
+// Declared by the header, which keeps them visible even if a program hides its symbols.
 bool blLogToStdout = false;
 bool blDebugOutput = false;
 
@@ -40,7 +40,7 @@ int main(int argc, char** argv)
         std::cerr << "usage: plugin MODULE\n";
         return 2;
     }
-    // RTLD_NOW: a flag that cannot be found is told here.
+    // RTLD_NOW: a flag that cannot be found is reported here.
     void* pModule = dlopen(argv[1], RTLD_NOW | RTLD_LOCAL);
     if (nullptr == pModule) {
         std::cerr << dlerror() << '\n';

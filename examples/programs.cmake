@@ -21,7 +21,7 @@ add_executable(example_sharded ${example_folder}/sharded.cpp)
 target_link_libraries(example_sharded PRIVATE VornJsonDb::vornjsondb)
 prints_expected(sharded ${CMAKE_CURRENT_BINARY_DIR}/tenants)
 
-# The program has the flags and shows them to the plugin; of the library it needs the header alone.
+# The program has the flags and shows them to the plugin; of the library it needs only the header.
 add_library(example_plugin_module MODULE ${example_folder}/plugin_module.cpp)
 target_link_libraries(example_plugin_module PRIVATE VornJsonDb::vornjsondb)
 add_executable(example_plugin ${example_folder}/plugin.cpp)

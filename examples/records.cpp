@@ -14,7 +14,7 @@
 ///
 /// "key" is this program's own and may be absent: the member that names a record in a message.
 ///
-/// Records go to standard output as JSON, one a line. Messages are one line on standard error. The
+/// Records go to standard output as JSON, one per line. Messages are one line on stderr. The
 /// exit status is 0, 1 when something failed, 2 for wrong arguments, 3 when `get` finds nothing,
 /// about which it says nothing else. `get` reads one record: it puts "limit" 1 into the request.
 #include "progress.h"
@@ -77,7 +77,7 @@ void printCount(const char* szWhat, Number count)
     print(jResult);
 }
 
-// Reads one JSON object or array; strSource names it in the message when it is none.
+// Reads one JSON object or array; strSource names it in the message if it is invalid.
 Json::Value parse(std::istream& stream, const std::string& strSource)
 {
     Json::CharReaderBuilder builder;
@@ -115,7 +115,7 @@ std::string nameOf(const Table& table, const Json::Value& jRecord)
 }
 
 // Runs one operation of the library and returns its result. After -1 it ends the command: the
-// library has a message for the user where it knows the reason, all else stands in its log.
+// library has a message for the user if it knows the reason; the log has everything else.
 template <typename Operation>
 int attempt(Table& table, const std::string& strWhat, Operation operation)
 {
@@ -143,7 +143,7 @@ void inTransaction(Table& table, Work work)
         work();
         runSql(table, "commit");
     } catch (...) {
-        // It may fail where SQLite has rolled back already, and closing the database does it too.
+        // This may fail if SQLite has rolled back already; closing the database rolls back, too.
         table.api.runSqlEx("rollback");
         throw;
     }
@@ -226,12 +226,12 @@ int update(Table& table, const Arguments& arguments)
     Json::Value jFilter = parseArgument(arguments[0], "FILTER-JSON");
     Json::Value jValues = parseArgument(arguments[1], "VALUES-JSON");
     attempt(table, toText(jFilter), [&] { return table.api.recUpdateByFilter(jFilter, jValues); });
-    // The library does not tell how many, SQLite does: all rows that the filter selected.
+    // The library does not tell how many, but SQLite does: all rows that the filter selected.
     printCount("updated", sqlite3_changes(table.pDb));
     return 0;
 }
 
-// A request that selects by nothing is refused: delete-all says it clearly.
+// A request without conditions is refused: delete-all is there for that.
 int deleteSome(Table& table, const Arguments& arguments)
 {
     Json::Value jRequest = parseArgument(arguments[0], "REQUEST-JSON");

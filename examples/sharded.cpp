@@ -42,7 +42,7 @@ Database openFile(const std::string& strPath)
     sqlite3* pDb = nullptr;
     int iStatus = sqlite3_open(strPath.c_str(), &pDb);
     Database database(pDb);
-    std::string strMode;  // the last setting answers with what it has become
+    std::string strMode;  // the last setting returns what it is set to
     if (SQLITE_OK == iStatus) iStatus = sqlite3_exec(pDb, kSettings, keepText, &strMode, nullptr);
     if (SQLITE_OK != iStatus) throw std::runtime_error(strPath + ": " + sqlite3_errmsg(pDb));
     if ("wal" != strMode) throw std::runtime_error(strPath + ": the journal is " + strMode);

@@ -46,7 +46,7 @@ Json::Int64 digits(const std::string& strText, Json::Int64 iLow, Json::Int64 iHi
     return iValue;
 }
 
-// The text and what it is as JSON; behind a syntax error jsoncpp's reader leaves what it likes.
+// The text and what it is as JSON; after a syntax error jsoncpp's reader may leave anything.
 struct Text {
     std::string strText;
     bool blJson;
@@ -87,12 +87,12 @@ void list(FuzzTable& table, const std::string& strWord, const Text& in)
     Json::Value jRows;
     const int iResult = table.api.recList(jRequest, jRows);
     require(iResult == (wanted.blReadable ? 0 : -1), strWord, ": recList");
-    // The rows in front of the first that cannot be read stay.
+    // The rows before the first that cannot be read stay.
     require((wanted.blReadable ? kRows : 1) == static_cast<int>(jRows.size()), strWord, ": rows");
     for (int i = 0; i < static_cast<int>(jRows.size()); ++i)
         requireRow(jRows[i], 0 == i, wanted, strWord);
 
-    // Again, with no NULL in front: the decoder may keep what it knows of the columns.
+    // Again, without a NULL first: the decoder may keep what it knows of the columns.
     jRequest["vornSqlWhereFilter"] = "b is not null";
     jRows = Json::Value();
     require(iResult == table.api.recList(jRequest, jRows), strWord, ": second recList");

@@ -171,6 +171,6 @@ void testInput(const std::string& strInput)
         operate(api, record.jRecord);
     }
     if (!record.blSql) database.requireOtherUntouched();
-    // The log shows all member types after a failure: what is not needed any more makes it slow.
+    // The log shows all member types after a failure: those no longer needed would make it slow.
     jTypes = Json::Value();
 }

@@ -45,7 +45,7 @@ void requireEnd(const Stored& expected, const Outcome& outcome, const std::strin
                 outcome.iResult);
 }
 
-// Runs one writing call and compares what it gives and what is fetched afterwards.
+// Runs one writing call and compares what it returns and what is fetched afterwards.
 template <typename Call>
 void write(FuzzDatabase& database, FuzzTable& table, const Stored& expected, const Json::Value& jIn,
            const std::string& strCall, Call call)

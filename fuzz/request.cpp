@@ -42,7 +42,7 @@ bool read(const std::string& strText, Input& input)
     return true;
 }
 
-// One handle on fresh rows, and the calls with what they may give.
+// One handle on fresh rows, and the calls with what they may return.
 class Session {
 public:
     explicit Session(const Input& input) : input_(input), table_(database_, members(), kColumns)
@@ -176,7 +176,7 @@ void copyMembers(const Input& input)
     }
 }
 
-// The number of rows that a request of nothing but texts selects; -1 for other requests.
+// The number of rows that a request consisting of texts selects; -1 for other requests.
 int selectedByTexts(FuzzDatabase& database, const Json::Value& jRequest)
 {
     if (!jRequest.isObject()) return -1;
@@ -195,7 +195,7 @@ int selectedByTexts(FuzzDatabase& database, const Json::Value& jRequest)
     return database.number(strSql, bound);
 }
 
-// Without SQL in the request, as many rows are deleted as are listed, and no other table is.
+// Without SQL in the request, as many rows are deleted as are listed, and only from that table.
 void deleteListed(const Input& input)
 {
     Session session(input);

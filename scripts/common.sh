@@ -5,11 +5,8 @@ cd -P "$(dirname "${BASH_SOURCE[0]}")/.."
 
 build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev libgtest-dev
                 iso-codes pkg-config sqlite3)
-# zlib is what the static SQLite of Debian stands on.
+# Debian's static SQLite depends on zlib.
 test_packages=("${build_packages[@]}" clang devscripts zlib1g-dev)
-
-# The labels of tests that no build but the developer's runs: they build and install, or take long.
-only_once='install|long'
 
 say() {
     printf '== %s\n' "$*"
@@ -19,7 +16,7 @@ as_root() {
     if [ "$(id -u)" = 0 ]; then "$@"; else sudo "$@"; fi
 }
 
-# missing_packages NAME...: those that are not installed, a line each.
+# missing_packages NAME...: those that are not installed, one per line.
 missing_packages() {
     local name
     for name in "$@"; do
@@ -38,7 +35,7 @@ need_packages() {
         --no-install-recommends "${missing[@]}" >/dev/null
 }
 
-# need_committed_tree [PATHSPEC...]: fails when something is not committed.
+# need_committed_tree [PATHSPEC...]: fails if something is not committed.
 need_committed_tree() {
     local changes
     changes=$(git status --porcelain -- "$@")
@@ -48,7 +45,7 @@ need_committed_tree() {
     exit 1
 }
 
-# within SECONDS WHAT COMMAND...: repeats the command until it succeeds; WHAT is the message when it does not.
+# within SECONDS WHAT COMMAND...: repeats the command until it succeeds; WHAT is the message if it does not.
 within() {
     local end=$((SECONDS + $1)) what=$2
     shift 2
@@ -61,7 +58,7 @@ within() {
     done
 }
 
-# build PRESET [OPTION...]: configures and builds build/PRESET; what a build says is shown when it fails.
+# build PRESET [OPTION...]: configures and builds build/PRESET; its output is shown if it fails.
 build() {
     local preset=$1
     shift
@@ -80,8 +77,8 @@ build_in() {
     fi
 }
 
-# build_package FOLDER COMMIT [OPTION...]: clones the commit into FOLDER/vornjsondb, with a folder build as a
-# developer has it, and builds the Debian packages beside it; what the build says last is shown when it fails.
+# build_package FOLDER COMMIT [OPTION...]: clones the commit into FOLDER/vornjsondb, with a build folder like a
+# developer's, and builds the Debian packages next to it; the end of the build's output is shown if it fails.
 build_package() {
     local folder=$1 commit=$2
     shift 2
@@ -96,18 +93,18 @@ build_package() {
     fi
 }
 
-# run_whole_suite FOLDER: in a build folder; what the tests say is shown when one fails.
-run_whole_suite() {
-    say "running the whole suite in $1"
-    if ! ctest --test-dir "$1" --output-on-failure -j "$(nproc)" -LE "$only_once" >"$1/tests.log" 2>&1; then
-        cat "$1/tests.log"
+# run_preset PRESET: runs its tests; their output is shown if one fails.
+run_preset() {
+    say "running the tests of the preset $1"
+    if ! ctest --preset "$1" -j "$(nproc)" >"build/$1/tests.log" 2>&1; then
+        cat "build/$1/tests.log"
         return 1
     fi
-    grep 'tests passed' "$1/tests.log"
+    grep 'tests passed' "build/$1/tests.log"
 }
 
-# figures FILE...: what test programs printed as lines "figure: NAME = NUMBER", as one table. A test that
-# also runs alone prints less then: the largest number counts.
+# figures FILE...: shows the lines "figure: NAME = NUMBER" printed by the test programs as one table. A test
+# that also runs on its own prints smaller numbers then, so the largest number counts.
 figures() {
     say "figures"
     awk -F ' = ' '

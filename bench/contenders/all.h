@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every contender; the optional ones are missing where their library was not found. "Kept" prepares
-// its statements once, without it they are prepared for each call.
+// Every contender; the optional ones are missing if their library was not found. "Kept" ones
+// prepare their statements once, the others for each call.
 #pragma once
 
 #include "contender.h"

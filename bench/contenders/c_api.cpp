@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A host written by hand on the C API: statements prepared once, values bound, columns read by
-// their types, jsoncpp with a reader and a writer that are kept.
+// A hand-written host on the C API: statements prepared once, values bound, columns read by their
+// types, jsoncpp with a reader and a writer that are kept.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
 #include "contenders/statement.h"

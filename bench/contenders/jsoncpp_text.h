@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// jsoncpp's reader and writer as a host that cares keeps them: made once, without comments.
+// jsoncpp's reader and writer as a careful host keeps them: made once, without comments.
 #pragma once
 
 #include "workload.h"

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The same host by hand on the C API, with nlohmann::json in place of jsoncpp.
+// The same hand-written host on the C API, with nlohmann::json in place of jsoncpp.
 #include "contenders/all.h"
 #include "contenders/statement.h"
 

@@ -150,7 +150,7 @@ private:
 
     Object::Ptr row(RecordSet& columns, std::size_t i)
     {
-        // What stands in a record set is of the column's declared type, and INTEGER is of 64 bits.
+        // A value in a record set is of the column's declared type, and INTEGER is of 64 bits.
         out_ = {static_cast<int>(columns.value<Poco::Int64>(0, i)),
                 columns.value<std::string>(1, i),
                 static_cast<int>(columns.value<Poco::Int64>(2, i)),

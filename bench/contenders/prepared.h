@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// How a host uses a C++ library: its statements prepared once, as hosts do that care, or for each
+// How a host uses a C++ library: its statements prepared once, as careful hosts do, or for each
 // call, as the libraries' own examples do; a result's columns in the library's type for the rows of
 // any table, or in a variable for each, bound by its position.
 #pragma once

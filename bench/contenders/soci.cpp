@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A host on SOCI, with jsoncpp as the host by hand uses it. A record comes out of SOCI's row, or of
-// a variable for each column.
+// A host on SOCI, using jsoncpp as the hand-written host does. A record comes out of SOCI's row, or
+// of a variable for each column.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
 #include "contenders/prepared.h"
@@ -133,7 +133,7 @@ private:
     static void makeTable(soci::session& session)
     {
         std::string strCreate = createStatement();
-        // What stands in a row is of the column's declared type, and INTEGER is an int.
+        // A value in a row is of the column's declared type, and INTEGER is an int.
         const std::string strQty = "qty INTEGER";
         strCreate.replace(strCreate.find(strQty), strQty.size(), "qty BIGINT");
         const std::string::size_type end = strCreate.find(';');

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// A host on SQLiteCpp, with jsoncpp as the host by hand uses it.
+// A host on SQLiteCpp, using jsoncpp as the hand-written host does.
 #include "contenders/all.h"
 #include "contenders/jsoncpp_text.h"
 #include "contenders/prepared.h"

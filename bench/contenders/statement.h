@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// What the hosts written by hand on the C API share: thin owners of a database and of statements
-// that are prepared once.
+// Shared by the hand-written hosts on the C API: thin owners of a database and of statements that
+// are prepared once.
 #pragma once
 
 #include "workload.h"

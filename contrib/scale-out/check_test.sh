@@ -10,7 +10,7 @@ rm -rf "$work"
 mkdir -p "$work"
 cd "$work"
 
-# expect WANTED [ACKNOWLEDGED]: of the judge, without the seconds
+# expect WANTED [ACKNOWLEDGED]: the judge's line, without the seconds
 expect() {
     local got
     got=$(judge records.db "${2-acknowledged}" | sed -E 's/\|[0-9]+\.[0-9]\|/|/')
@@ -55,7 +55,7 @@ refused records.db missing 'cannot open "missing"'
 wait $!
 [[ $(judge both.db both) = [1-9]*'|0|'*'|ok' ]] || { judge both.db both; exit 1; }
 
-# A second owner is told.
+# A second owner gets an error.
 mkfifo end
 sqlite3 taken.db "$exclusive_wal" 'create table record (id)' '.shell : >taken; timeout 60 cat end' &
 within 60 'the lock is not taken' test -e taken

@@ -8,7 +8,7 @@ languages=examples/tables/languages.json
 iso_codes=/usr/share/iso-codes/json/iso_639-3.json
 reserved='{"alpha_3":"qaa","name":"Reserved","scope":"I","type":"L"}'
 
-# members FORMAT: it once for each member of a language, in the order of a list.
+# members FORMAT: the format once for each member of a language, in the order of a list.
 members() {
     sqlite3 :memory: "select group_concat(printf('$1', key, key), ', ') from
         (select key from json_each(readfile('$languages'), '\$.definition.languages.member') order by key)"
@@ -24,7 +24,7 @@ differing() {
     LC_ALL=C comm -3 <(LC_ALL=C sort "$1") <(LC_ALL=C sort "$2") | wc -l
 }
 
-# languages_row CASE ACKNOWLEDGED COUNT FOUND: as many are acknowledged as have to be, and FOUND is what was wanted.
+# languages_row CASE ACKNOWLEDGED COUNT FOUND: ACKNOWLEDGED has to be COUNT, and FOUND what was wanted.
 languages_row() {
     row "$1" "$2" "$(differing "$work/wanted" "$4")" "$seconds"
     [ "$2" = "$3" ] || failed "$1: $2 in place of $3: $(tail -n 3 "$work/said")"

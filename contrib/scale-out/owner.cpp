@@ -7,7 +7,7 @@
 // ROWS records make a transaction (1: none is begun, and no other owner may be there). As soon as
 // it is acknowledged, the file ACKNOWLEDGED gets a line "SECONDS FIRST-ID LAST-ID": how long it
 // took, and which records it wrote. Then another owner can have its turn for PAUSE milliseconds.
-// There is one transaction at least. The exit status is 0, 1 when something failed, 2 for wrong
+// There is at least one transaction. The exit status is 0, 1 when something failed, 2 for wrong
 // arguments, 3 when the database belongs to another owner.
 #include <VornJsonDbApi.h>
 #include <sqlite3.h>
@@ -43,7 +43,7 @@ bool findLast(VornJsonDbApi& records, int& iLast)
     return 0 <= records.runSqlEx("select ifnull(max(id), 0) from record", keepNumber, &iLast);
 }
 
-// Those after iLast. In a transaction another owner may have moved it before.
+// Writes the records after iLast, which another owner may have moved if there is a transaction.
 bool write(VornJsonDbApi& records, int iRows, int& iLast)
 {
     if (1 != iRows && (0 > records.runSqlEx("begin immediate") || !findLast(records, iLast)))

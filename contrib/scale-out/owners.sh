@@ -114,7 +114,7 @@ cost() {
     "$owner" "$2/$1-$4.db" "$3" "$work/$1-$4" 3 "$4" || failed "cost: $1, $4"
 }
 
-# In turns, so that what else the machine does meets both.
+# In turns, so that whatever else the machine does affects both.
 costs() {
     local round rows
     cut -d ' ' -f 1 /proc/loadavg >"$work/load"

@@ -30,11 +30,11 @@ void setDefenses(sqlite3* pDb)
 {
     sqlite3_db_config(pDb, SQLITE_DBCONFIG_DEFENSIVE, 1, nullptr);
     sqlite3_db_config(pDb, SQLITE_DBCONFIG_TRUSTED_SCHEMA, 0, nullptr);
-    // A text in double quotes is no text: what the library writes after LIMIT is.
+    // Refuses double-quoted texts: the library writes such texts after LIMIT.
     sqlite3_db_config(pDb, SQLITE_DBCONFIG_DQS_DML, 0, nullptr);
 }
 
-// No copy: SQLite calls, and a lack of memory must not be thrown through it.
+// No copy: SQLite calls this, and std::bad_alloc must not pass through it.
 std::string_view textOf(const char* szText)
 {
     return nullptr == szText ? std::string_view() : szText;
@@ -74,7 +74,7 @@ int Fence::run(Access access, const std::function<int()>& work)
     return -1;
 }
 
-// Stops what takes too many steps, whatever their reason.
+// Stops what takes too many steps, for whatever reason.
 int Fence::countSteps(void* pFence)
 {
     return kMaxTicks < ++static_cast<Fence*>(pFence)->iTicks_;
@@ -99,13 +99,13 @@ bool Fence::allows(int iAction, std::string_view first, std::string_view second)
     case SQLITE_INSERT: return Access::kInsert == access_ && strTable_ == first;
     case SQLITE_UPDATE: return Access::kUpdate == access_ && strTable_ == first;
     case SQLITE_DELETE: return Access::kDelete == access_ && strTable_ == first;
-    // The library reads the row back that it inserted.
+    // The library reads back the row that it inserted.
     case SQLITE_FUNCTION: return Access::kInsert == access_ && "last_insert_rowid" == second;
     default: return false;
     }
 }
 
-// The lock is taken here, where a locked database is an answer and not a wait.
+// Takes the lock here, where a locked database is an answer and not a wait.
 bool Fence::begin(Access access)
 {
     if (0 == sqlite3_get_autocommit(pDb_)) rollBack();  // there was no memory for it
@@ -116,13 +116,13 @@ bool Fence::begin(Access access)
     return false;
 }
 
-// Fails where SQLite has rolled back itself.
+// Fails if SQLite has already rolled back by itself.
 void Fence::rollBack()
 {
     execute(Access::kTransaction, "rollback");
 }
 
-// Does one statement of the fence's own.
+// Runs one statement of the fence's own.
 bool Fence::execute(Access access, const char* szSql)
 {
     iTicks_ = 0;

@@ -25,7 +25,7 @@ public:
     // Does the work in a transaction of its own, with no more than that access. The work counts
     // only when its result is not negative and it changed at most one row; otherwise, also when it
     // throws, everything is as before. Returns the result of the work, or -1, which is also the
-    // answer where another connection holds a lock. A transaction that is open is rolled back
+    // answer if another connection holds a lock. A transaction that is open is rolled back
     // first.
     int run(Access access, const std::function<int()>& work);
 

@@ -32,7 +32,7 @@ char32_t readCodePoint(const std::string& strText, std::size_t& uAt)
     return c;
 }
 
-// Control characters, separators of lines and what turns the direction of a line around.
+// Control characters, line separators and what reverses the direction of a line.
 bool isControl(char32_t c)
 {
     constexpr char32_t kControls[][2] = {{0, 0x1f},        {0x7f, 0x9f},     {0x61c, 0x61c},
@@ -41,7 +41,7 @@ bool isControl(char32_t c)
                        [c](const char32_t(&range)[2]) { return range[0] <= c && range[1] >= c; });
 }
 
-// "%" is a conversion to the members that are formatted later, NUL cuts the text, and a newline
+// "%" is a conversion for the members that are formatted later, NUL cuts the text, and a newline
 // would begin a line of the log.
 void checkText(const std::string& strText)
 {
@@ -77,7 +77,7 @@ bool hasKind(const std::string& strWord, const Json::Value& jValue)
     return false;
 }
 
-// The library writes what stands under a numeric word as bare SQL.
+// The library writes a value under a numeric word as bare SQL.
 void checkKind(const std::string& strWord, const Json::Value& jValue)
 {
     refuseIf(!hasKind(strWord, jValue), "a member has a value of another kind");
@@ -98,7 +98,7 @@ void checkRecord(const Json::Value& jTypes, const Json::Value& jRecord)
         checkKind(checkDeclared(jTypes, it.name()), *it);
 }
 
-// SQLite gives a new note its id: the one after the greatest ever. Later it keeps id and author.
+// SQLite gives a new note its id, one above the greatest ever. After that, id and author stay.
 void checkKept(const Json::Value& jRecord, const char* szName)
 {
     if (jRecord.isMember(szName)) throw Refused(std::string("\"") + szName + "\" cannot be set");
@@ -166,7 +166,7 @@ void limitRows(Json::Value& jRequest)
     if (!jRequest.isMember("limit")) jRequest["limit"] = kMaxRows;
 }
 
-// Who changes a record says which one: {"id": 5}.
+// A change has to name its record: {"id": 5}.
 void checkOneRecord(const Json::Value& jTypes, const Json::Value& jRequest)
 {
     checkRequest(jTypes, jRequest);
@@ -174,7 +174,7 @@ void checkOneRecord(const Json::Value& jTypes, const Json::Value& jRequest)
              "the request names one record by its id");
 }
 
-// Each takes some hundred bytes, however short its text is.
+// Each value takes some hundred bytes, however short its text is.
 std::size_t countValues(const Json::Value& jValue)
 {
     std::size_t nValues = 1;
@@ -197,7 +197,7 @@ Json::Value readCommand(const std::string& strLine)
 {
     refuseIf(kMaxLine < strLine.size(), "the command is too long");
     Json::CharReaderBuilder builder;
-    Json::CharReaderBuilder::strictMode(&builder.settings_);  // also refuses a key that comes twice
+    Json::CharReaderBuilder::strictMode(&builder.settings_);  // also refuses a duplicate key
     builder["stackLimit"] = kMaxDepth;
     const std::unique_ptr<Json::CharReader> pReader(builder.newCharReader());
     Json::Value jCommand;

@@ -30,8 +30,8 @@ const Json::Value& noteTypes();
 // A handle for the table "note", which it creates with an index on the author.
 VornJsonDbApi openNotes(sqlite3* pDb);
 
-// Checks what only the table tells about a command that the guard lets through. Refuses as that
-// does.
+// Checks what only the table can tell about a command that the guard lets through. Refuses in the
+// same way.
 void checkNote(VornJsonDbApi& notes, const Json::Value& jCommand);
 
 // Performs the command unchecked; guard and fence surround this call. Adds what it reads to the
@@ -45,10 +45,10 @@ class Host {
 public:
     explicit Host(sqlite3* pDb) : notes_(openNotes(pDb)), fence_(pDb, "note") {}
 
-    // Answers one line. Throws nothing but a lack of memory.
+    // Answers one line. Throws only if memory runs out.
     Json::Value answer(const std::string& strLine);
 
-    // Writes the answer as a line, which says "failed" where memory is lacking. Throws nothing.
+    // Writes the answer as a line, which says "failed" if memory runs out. Throws nothing.
     void serve(const std::string& strLine, std::ostream& stream);
 
 private:

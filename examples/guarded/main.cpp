@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 /// @file
-/// A host that takes records and requests from strangers: one command a line on standard input, one
-/// answer a line on standard output. SECURITY.md says what is checked where.
+/// A host that takes records and requests from strangers: a command per line on standard input, an
+/// answer per line on standard output. SECURITY.md says what is checked where.
 ///
 ///     guarded DATABASE < commands.txt
 ///

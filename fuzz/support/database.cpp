@@ -16,7 +16,7 @@ struct Limit {
     int iValue;
 };
 
-// One LIKE of a long pattern can take for ever within a single step.
+// One LIKE of a long pattern can take forever within a single step.
 constexpr Limit kLimits[] = {
     {SQLITE_LIMIT_LENGTH, 200000},    {SQLITE_LIMIT_SQL_LENGTH, 200000},
     {SQLITE_LIMIT_COLUMN, 100},       {SQLITE_LIMIT_COMPOUND_SELECT, 20},
@@ -74,7 +74,7 @@ FuzzDatabase::~FuzzDatabase()
     require(SQLITE_OK == sqlite3_close(pDb_), "the connection cannot be closed");
 }
 
-// Not zero stops the statement.
+// A value other than zero stops the statement.
 int FuzzDatabase::step(void* arg)
 {
     return kMaxCalls < ++static_cast<FuzzDatabase*>(arg)->iSteps_;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// A database in memory and a table of it, made afresh for each input.
+// A database in memory with a table, new for each input.
 #pragma once
 
 #include <VornJsonDbApi.h>
@@ -9,26 +9,26 @@
 #include <string>
 #include <vector>
 
-// Whoever reaches the connection with SQL of his own can neither leave it nor keep it busy: what an
-// input makes of the statements is limited in steps, lengths and kinds.
+// SQL that an input injects can neither leave the connection nor keep it busy: what an input makes
+// of the statements is limited in steps, lengths and kinds.
 class FuzzDatabase {
 public:
     // Has a table "other" that no operation under test is asked for.
     FuzzDatabase();
-    // Looks at the connection: no statement is open, no transaction, and it can be closed.
+    // Checks that no statement or transaction is open and that the connection can be closed.
     ~FuzzDatabase();
     FuzzDatabase(const FuzzDatabase&) = delete;
     FuzzDatabase& operator=(const FuzzDatabase&) = delete;
 
     sqlite3* get() const { return pDb_; }
 
-    // The only column of the first row of the host's own query, past all limits.
+    // The only column of the first row of the host's own query, free of all limits.
     std::string value(const std::string& strSql);
     // The number in the first column of the first row, 0 without a row, of the host's own query
     // with bound texts.
     int number(const std::string& strSql, const std::vector<std::string>& bound);
 
-    // Where no input is SQL.
+    // To be called where no part of an input is SQL.
     void requireOtherUntouched();
 
 private:
@@ -39,10 +39,10 @@ private:
     int iSteps_ = 0;
 };
 
-// A table and its handle. The cache of member types, which never forgets, is told of each new
+// A table and its handle. The cache of member types, which never forgets, learns of each new
 // definition through the entry that recType hands out, so that all inputs share one name.
 struct FuzzTable {
-    // strColumns is what stands between the parentheses of the CREATE statement.
+    // strColumns is the text between the parentheses of the CREATE statement.
     FuzzTable(FuzzDatabase& database, const Json::Value& jMembers, const std::string& strColumns);
 
     std::string rows(FuzzDatabase& database) const;

@@ -57,7 +57,7 @@ int usleep(useconds_t /*uMicroseconds*/)
 
 int LLVMFuzzerTestOneInput(const uint8_t* pData, size_t nSize)
 {
-    // Both states of the flag, and each input always in the same.
+    // Tries both states of the flag, but each input always in the same one.
     blDebugOutput = 1 == nSize % 2;
     testInput(std::string(reinterpret_cast<const char*>(pData), nSize));
 

@@ -4,6 +4,6 @@
 
 #include <json/value.h>
 
-// Whether something of the request may stand in a statement outside quotes: the raw filter, a text
-// under a member whose word is a number, and paging that is no number.
+// Whether part of the request may appear in a statement outside quotes: the raw filter, a text
+// under a member whose word is a number, and paging that is not a number.
 bool mayBeSql(const Json::Value& jRequest);

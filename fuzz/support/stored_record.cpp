@@ -28,7 +28,7 @@ Json::Value narrowed(bool blNarrow, Json::Int64 iValue)
     return static_cast<int>(std::clamp<Json::Int64>(iValue, INT32_MIN, INT32_MAX));
 }
 
-// SQLite holds what is above the signed range as a real and gives 15 digits of it, "1.8...e+19".
+// SQLite holds what is above the signed range as a real and returns 15 digits of it, "1.8...e+19".
 Json::Int64 readBack(Json::UInt64 uValue)
 {
     if (uValue <= INT64_MAX) return static_cast<Json::Int64>(uValue);
@@ -84,7 +84,7 @@ Stored walk(const Json::Value& jMembers, const Json::Value& jRecord)
         blPercent = blPercent || next.blPercent;
         stored.jRow[strKey] = next.jBack;
     }
-    // The list is closed behind the last member only.
+    // The list is closed after the last member only.
     const bool blClosed = jRecord.isMember(jMembers.getMemberNames().back());
     if (!blClosed && Stored::End::kAny != stored.end) stored.end = Stored::End::kFails;
     return stored;

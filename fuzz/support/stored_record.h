@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What becomes of a record, said once more and without the library: the judge of the record target.
+// What becomes of a record, stated without the library: the reference for the record target.
 #pragma once
 
 #include <json/value.h>
@@ -7,7 +7,7 @@
 #include <string>
 
 struct Stored {
-    // kAny: a "%" stands before another value, so that the statement may become anything.
+    // kAny: a "%" precedes another value, so that the statement may become anything.
     enum class End { kRow, kFails, kThrows, kAny };
 
     End end = End::kFails;

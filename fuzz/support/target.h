@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What every fuzz target stands on. entry.cpp hands each input to testInput() and looks at the
+// What every fuzz target is built on. entry.cpp hands each input to testInput() and checks the
 // process afterwards.
 #pragma once
 
@@ -15,7 +15,7 @@ void testInput(const std::string& strInput);
 // Shows the text and ends the process.
 [[noreturn]] void finding(const std::string& strText);
 
-// The strict JSON of an input; false where it is none, or nested too deeply for jsoncpp's reader.
+// The strict JSON of an input; false if it is invalid, or nested too deeply for jsoncpp's reader.
 bool parseJson(const std::string& strText, Json::Value& jValue);
 
 inline std::string text(const char* szText)
@@ -33,14 +33,14 @@ inline std::string text(int iValue)
     return std::to_string(iValue);
 }
 
-// When the condition does not hold, that is a finding, told by the parts in a row.
+// Ends with a finding, described by the parts in a row, unless the condition holds.
 template <typename... Part>
 void require(bool blHolds, const Part&... part)
 {
     if (!blHolds) finding((text(part) + ...));
 }
 
-// Outcome of a call of the library: its result, or the only exception that is promised.
+// Outcome of a call of the library: its result, or the only exception that it may throw.
 struct Outcome {
     bool blThrew = false;
     int iResult = 0;

@@ -1,15 +1,15 @@
 # SPDX-License-Identifier: MIT
-# Clean Debian systems in folders of their own, for the scripts that run something there; sourced after
-# common.sh. The script sets root, the folder of the system, which is kept as $root.tar.zst.
+# Creates clean Debian systems, each in its own folder, for the scripts that run something in them; sourced
+# after common.sh. The script must set root, the folder of the system, which is saved as $root.tar.zst.
 # shellcheck shell=bash disable=SC2154
 
-# apart COMMAND...: as root, in a mount namespace of its own: what is mounted there is gone as soon as
-# the command ends, however it ends.
+# apart COMMAND...: runs it as root in its own mount namespace: everything mounted there is gone as soon
+# as the command ends, however it ends.
 apart() {
     as_root unshare --mount --pid --fork --kill-child "$@"
 }
 
-# in_root COMMAND...: in the clean Debian.
+# in_root COMMAND...: runs it in the clean Debian.
 in_root() {
     # shellcheck disable=SC2016 # expanded by the inner shell
     apart bash -euc 'root=$0
@@ -23,8 +23,8 @@ remove_root() {
     as_root rm -rf --one-file-system "$root"
 }
 
-# make_root SUITE ARCHITECTURE PACKAGE...: a new one with these packages, from the mirror, and by the proxy,
-# that apt of this machine uses.
+# make_root SUITE ARCHITECTURE PACKAGE...: creates a new system with these packages, using the mirror and the
+# proxy that apt uses on this machine.
 make_root() {
     local suite=$1 architecture=$2 mirror
     shift 2
@@ -46,8 +46,8 @@ make_root() {
     mv -f "$root.tar.zst.new" "$root.tar.zst"
 }
 
-# fresh_root SUITE ARCHITECTURE PACKAGE...: the clean Debian as it was made, made again when a script that
-# makes it has changed.
+# fresh_root SUITE ARCHITECTURE PACKAGE...: unpacks the saved clean Debian, or creates it again if one of the
+# scripts that create it has changed.
 fresh_root() {
     local kept=$root.tar.zst
     remove_root
@@ -61,7 +61,7 @@ fresh_root() {
     fi
 }
 
-# clone_into_root: what is committed, as /home/vornjsondb of the clean Debian.
+# clone_into_root: copies what is committed to /home/vornjsondb in the clean Debian.
 clone_into_root() {
     rm -rf "$root.clone"
     git clone --quiet --no-checkout . "$root.clone"

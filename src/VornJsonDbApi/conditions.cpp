@@ -89,8 +89,8 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
         const Json::Value* pjMember = types.find(strField);
         // Kept(Conditions.SkipUndeclaredKeys): undeclared keys of a request are ignored
         if (nullptr == pjMember && !blRawFilter) continue;
-        // Kept(Conditions.WriteTheJoinerAroundAnEmptyArray): an empty list writes its joiner and no
-        // term
+        // Kept(Conditions.WriteTheJoinerAroundAnEmptyArray): for an empty list, the joiner is
+        // written but no term
         strSqlWhereOut += blWritten ? pJoiner->szBetween : pJoiner->szBefore;
         Json::Value& jTmp = *it;
         // Kept(Conditions.PreferTheRawFilterToAMemberOfItsName): the raw filter wins over a member
@@ -136,8 +136,8 @@ int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jHostLis
     if (FAILED(jList.type() != Json::arrayValue)) return -1;
     if (jList.empty()) return 0;
 
-    // Kept(Terms.PutNothingBetweenTheItemsOfAList): several items of a list are written side by
-    // side without a comma
+    // Kept(Terms.PutNothingBetweenTheItemsOfAList): several items of a list are written without
+    // commas between them
     std::string strTerm = std::string(szField) + " in (";
     for (Json::ArrayIndex i = 0; i < jList.size(); ++i) {
         SqliteText szSql;

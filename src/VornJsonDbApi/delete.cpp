@@ -75,7 +75,7 @@ int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const c
     if (FAILED_AS(TypeWord(*pjMember).text() != "string",
                   "jType[szKey][\"cpptype\"].asString() != \"string\""))
         return fail();
-    // Cannot fail: object and key were checked before.
+    // Cannot fail: the object and the key were checked before.
     if (GUARDED(0 > VectorParamToJson(strVector, szKey, jParam))) return fail();
     if (FAILED(0 > (err = recDelete(jParam)))) return fail();
     return err;

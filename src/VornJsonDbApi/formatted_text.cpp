@@ -130,7 +130,7 @@ Conversion readConversion(const char*& szText)
     return conversion;
 }
 
-// A formatted text. Throws std::logic_error where it is null (out of memory, or too long a text),
+// A formatted text. Throws std::logic_error if it is null (out of memory, or too long a text),
 // as constructing a string from null does.
 template <typename Argument>
 SqliteText formatted(const char* szFormat, Argument argument)

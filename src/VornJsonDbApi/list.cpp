@@ -36,7 +36,7 @@ int VornJsonDbApi::recList(Json::Value& jRecParam, Json::Value& jRecArrayOut)
     if (GUARDED(0 > SqlExpandMemberName(strSqlPrefix))) return fail();
     strSqlRun = std::move(strSqlPrefix);
     strSqlRun.append(" FROM ").append(strName) += ' ';
-    // Kept(List.ComposesOneStatement, Delete.ComposesOneStatementAndCounts): there are two blanks
+    // Kept(List.ComposesOneStatement, Delete.ComposesOneStatementAndCounts): there are two spaces
     // before WHERE
     if (!strSql.empty()) strSqlRun.append(" WHERE ").append(strSql);
     strSqlRun.append(strSqlLimit) += ';';

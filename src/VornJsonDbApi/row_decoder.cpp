@@ -157,7 +157,7 @@ int saturatedToInt(long long iValue)
 
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
 {
-    // Cannot fail: the record is an object of our own.
+    // Cannot fail: the record is the library's own object.
     if (GUARDED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue)) return -1;
     // Cannot fail: the loop begins at 0.
     if (GUARDED(0 > idx)) return -1;

@@ -30,7 +30,7 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
     strSql += ") VALUES (";
     if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
     strSql.append(";select * from ").append(strName).append(" where rowid == last_insert_rowid();");
-    // Cannot fail: the text begins with its verb.
+    // Cannot fail: the statement begins with its verb.
     if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, DbCallBackFillList, &jArrayTmp))) return fail();
     // Cannot fail: a successful run clears the error text.

@@ -33,7 +33,7 @@ int VornJsonDbApi::recUpdateByWhere(Json::Value& jRecIn, std::string& strSqlWher
     if (FAILED(0 > SqlExpandMemberList(jColumnList, strSql2, VORN_SQL_WHERE_TYPE_COMMA)))
         return fail();
     strSql.append(strSql2).append(" WHERE ").append(strSqlWhere).append(";");
-    // Cannot fail: the text begins with its verb.
+    // Cannot fail: the statement begins with its verb.
     if (GUARDED(strSql.empty())) return fail();
     if (FAILED(0 > runSqlEx(strSql, NULL, NULL))) return fail();
     // Cannot fail: a successful run clears the error text.

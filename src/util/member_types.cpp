@@ -31,8 +31,8 @@ bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
     if (FAILED(!jTableDef[strJsonName].isObject())) return false;
     if (FAILED(!jTableDef[strJsonName].isMember("member"))) return false;
     if (FAILED(!jTableDef[strJsonName]["member"].isObject())) return false;
-    // Kept(MemberTypes.RefuseAnEmptyNameAfterTheLookUps): an empty table name is refused only
-    // after the look-ups
+    // Kept(MemberTypes.RefuseAnEmptyNameAfterTheLookUps): an empty table name is rejected only
+    // after the lookups
     return !FAILED(strJsonName.empty());
 }
 

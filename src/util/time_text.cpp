@@ -41,8 +41,8 @@ int VORN_JSON_DB::convert2ReadableTime(long ullTimeStamp, std::string& strOut, i
             return -1;
     }
     if (iType & kGmtLayout) {
-        // Kept(TimeText.ReadsOnlyTheThreeLowestBits): local time too may be followed by the letters
-        // GMT
+        // Kept(TimeText.ReadsOnlyTheThreeLowestBits): local time may be followed by the letters GMT
+        // too
         if (FAILED(0 == strftime(szTime, sizeof(szTime), "%a, %d %b %Y %T GMT", &sTime))) return -1;
     } else if (iType & kNumericLayout) {
         if (FAILED(0 == strftime(szTime, sizeof(szTime), "%Y-%m-%d %H:%M:%S", &sTime))) return -1;

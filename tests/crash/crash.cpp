@@ -3,7 +3,7 @@
 //
 //     crash KILLS [FOLDER]
 //
-// In FOLDER the count is kept, and a run that was interrupted goes on with it, on a new database.
+// FOLDER keeps the count, and an interrupted run is continued from there, on a new database.
 // VORN_CRASH_SEED repeats what the writers do and the moments at which they are killed, as far as a
 // machine can; the seed of a run is printed. The program starts itself as its own writers:
 //
@@ -66,7 +66,7 @@ using Clock = std::chrono::steady_clock;
 using Span = std::chrono::duration<double, std::micro>;
 
 // Either somewhere within the time that an operation takes, or from one microsecond to ten
-// milliseconds, short ones as likely as long ones. Busy, as a sleep is not that exact.
+// milliseconds, short waits as likely as long ones. A busy wait, because a sleep is less exact.
 void passSomeTime(Span operation, std::mt19937& random)
 {
     const bool blWithin = 0 == random() % 2;
@@ -91,7 +91,7 @@ int beWriter(const std::vector<std::string>& arguments)
 {
     report("open\n");
     Store store(arguments.at(0));
-    // Little room, so that pages reach the database and its log before a transaction ends.
+    // A small cache, so that pages reach the database and its log before a transaction ends.
     const std::string& strMode = arguments.at(1);
     const std::string strSql =
         "pragma journal_mode=" + strMode + "; pragma cache_size=8; pragma wal_autocheckpoint=20";
@@ -122,7 +122,7 @@ public:
         for (const char* szEnd : kFiles) fs::remove(database() + szEnd);
     }
 
-    // One kill, or two. False when something is not as it has to be.
+    // One kill, or two. False if something is wrong.
     bool round(unsigned uSeed)
     {
         const long long iRound = figures_["kills"];
@@ -138,7 +138,7 @@ public:
         return judge();
     }
 
-    // Out of the way of a later run.
+    // Moves it out of the way of a later run.
     std::string keepDatabase()
     {
         std::string strKept = folder_ / ("fault-" + std::to_string(figures_["kills"]) + ".db");
@@ -150,8 +150,8 @@ public:
 private:
     std::string database() const { return folder_ / "crash.db"; }
 
-    // Some time after a number of acknowledgements, mostly counted from where the next operation
-    // begins.
+    // Some time after a number of acknowledgements, mostly timed from the start of the next
+    // operation.
     bool killWriter(const std::string& strMode, std::mt19937& random)
     {
         const auto uSeed = static_cast<unsigned>(random());
@@ -197,7 +197,7 @@ private:
         expected_.pending.reset();
     }
 
-    // While it recovers what the killed one left, or not yet, or no more.
+    // Before, while or after it recovers what the killed writer left.
     bool killOpening(const std::string& strMode, std::mt19937& random)
     {
         Child opener({kSelf, "--write", database(), strMode}, kReport);

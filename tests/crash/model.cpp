@@ -6,7 +6,7 @@
 
 #include <iterator>
 
-// To the output of the test: nothing is logged unless an operation fails.
+// On the output of the test: nothing is logged unless an operation fails.
 bool blLogToStdout = true;
 bool blDebugOutput = false;
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 // The database that the killed writer and the checker share, what the writer does with it, and what
-// has to be in it by the writer's reports.
+// has to be in it according to the writer's reports.
 #pragma once
 
 #include <VornJsonDbApi.h>
@@ -35,7 +35,7 @@ struct Step {
     enum Kind { kCreate, kReplace, kUpdate, kUpdateKind, kDelete, kDeleteKind };
 
     Kind kind;
-    int iId;  // the two of a kind mean all records of its kind
+    int iId;  // for kUpdateKind and kDeleteKind, any id of the kind
     int iRevision;
 };
 
@@ -67,7 +67,7 @@ struct Verdict {
     enum Pending { kNone, kAbsent, kWhole };
 
     Pending pending = kNone;
-    std::string strWrong;    // what is lost, half there or not as acknowledged
+    std::string strWrong;    // what is lost, incomplete or not as acknowledged
     std::string strCorrupt;  // what SQLite finds
 };
 

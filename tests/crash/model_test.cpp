@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The check after a kill lets pass what it has to, and nothing else.
+// The check after a kill accepts what it has to, and nothing else.
 
 #include "crash/model.h"
 #include "support/connection.h"
@@ -105,7 +105,7 @@ TEST_P(Tampering, IsFound)
     expectVerdict(Verdict::kAbsent, strWrong + "; with the operation: record 3 is not revision 21");
 }
 
-// Half of an operation is the first of them.
+// The first of these is also half of an operation.
 INSTANTIATE_TEST_SUITE_P(Records, Tampering,
                          testing::Values(Tamper("delete from item where id=4", "record 4 is lost"),
                                          Tamper("delete from item where id=5", "record 5 is lost"),

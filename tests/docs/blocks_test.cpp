@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every block of code of the documentation is run, and every section of docs/limits.md by a test of
-// its own.
+// Every block of code in the documentation is run, and every section of docs/limits.md has a test
+// of its own.
 
 #include "docs/limits_page.h"
 

@@ -10,7 +10,7 @@ namespace {
 
 using doubles::state;
 
-// Runs SQL past the doubles; the result.
+// Runs SQL past the doubles and returns the result.
 int run(Database& connection, const std::string& strSql)
 {
     return doubles::realExec(connection.get(), strSql.c_str(), nullptr, nullptr, nullptr);

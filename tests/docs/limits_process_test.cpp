@@ -45,7 +45,7 @@ TEST_F(Limits, IntIdEndsAt2147483647)
     EXPECT_EQ(R"({"id":2147483647,"text":"b"})", created(small.api, R"({"text":"b"})"));
     EXPECT_EQ((Rows{{"2147483647", "a"}, {"2147483648", "b"}}),
               database_.rows("select * from " + small.strName));
-    // The second record by its own id: the first one answers.
+    // Asking for the second record by its own id finds the first.
     EXPECT_EQ(strFirst, found(small.api, R"({"id":2147483647})"));
 
     // The same table under a name with a definition of its own.
@@ -64,7 +64,7 @@ TEST_F(Limits, OneThread)
     const std::string strOther = text(other.create(R"({"name":"y"})"));
     const std::string strStored = stored(1);
 
-    // A call within a call: the rows after it are looked up among the members of the other table.
+    // A call within a call: the rows after it are looked up in the members of the other table.
     const std::function<void()> calls[] = {
         [&] { EXPECT_EQ("[" + strOther + "]", listed(other.api)); },
         [&] { VornJsonDbApi(database_.get(), other.strName, other.jDefinition, other.strCreate); },
@@ -138,7 +138,7 @@ TEST_F(Limits, ManyTables)
     const std::size_t nUsed = (mallinfo2().uordblks - nBefore) / kTables;
     EXPECT_TRUE(100 > nUsed || (800 < nUsed && 3000 > nUsed)) << nUsed;
 
-    // The host looks at the definition before it makes a handle.
+    // The host checks the definition before it makes a handle.
     const auto unknownTable = [](const std::string& strUnknown) { return strUnknown; };
     const auto unknown = [&]() -> std::string {
 #include "limits/ManyTables.inc"
@@ -178,7 +178,7 @@ TEST_F(Limits, FirstPluginsFlagsWin)
     EXPECT_EQ("00000", linesOfTwoPlugins(VORN_TWO_PLUGINS " local" + strSyslogFirst));
     EXPECT_EQ("11100", linesOfTwoPlugins(VORN_TWO_PLUGINS " global" + strStdoutFirst));
     EXPECT_EQ("00100", linesOfTwoPlugins(VORN_TWO_PLUGINS " global" + strSyslogFirst));
-    // The host's own flags rule; they begin with false.
+    // The host's own flags win; they start as false.
     EXPECT_EQ("00100", linesOfTwoPlugins(VORN_TWO_PLUGINS_OF_A_HOST " local" + strStdoutFirst));
     EXPECT_EQ("00100", linesOfTwoPlugins(VORN_TWO_PLUGINS_OF_A_HOST " global" + strSyslogFirst));
 }

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// docs/types.md: every cell of every table is run on SQLite.
+// docs/types.md: every cell of every table is checked against SQLite.
 
 #include "docs/calls.h"
 #include "support/markdown.h"
@@ -46,8 +46,8 @@ struct Sample {
         database.run("insert into " + table.strName + " " + strRow);
     }
 
-    // What recList makes of m as recSave writes it, or of the same value from another program where
-    // recSave does not write it.
+    // What recList makes of m as recSave writes it, or, if recSave does not write it, of the same
+    // value from another program.
     std::string readBack(const std::string& strValue)
     {
         std::string strLiteral = written(strValue);
@@ -70,7 +70,7 @@ struct Sample {
         return strSql;
     }
 
-    // The term; "error" where SQLite refuses it, "nothing" where its list is empty.
+    // The term; "error" if SQLite refuses it, "nothing" if its list is empty.
     std::string termOfNull(const std::string& strValue)
     {
         insert("(m) values (null)");
@@ -80,7 +80,7 @@ struct Sample {
         return "m in ( )" == term(strValue) ? "nothing" : term(strValue);
     }
 
-    // The result of recCreate or recSave, and whether a row was written all the same.
+    // The result of recCreate or recSave, and whether a row was written even so.
     std::string wrote(const std::string& strValue, bool blCreate)
     {
         database.run("delete from " + table.strName);
@@ -118,7 +118,7 @@ protected:
     const std::vector<MarkdownTable> tables_ = readPage("types.md").tables;
 };
 
-// The last row of the first table is of any other word.
+// The last row of the first table stands for any other word.
 TEST_F(TypesPage, ListsEveryTypeWord)
 {
     Cells words = matches(folderText("src"), R"re(\{"([^"]+)",\s*RowForm::)re");
@@ -176,7 +176,7 @@ TEST_F(TypesPage, RecommendsWordsThatWork)
         EXPECT_EQ(strRecord, created(sample.api, strRecord));
         EXPECT_EQ("[" + strRecord + "]", listed(sample.api, row[4]));
         EXPECT_EQ(row[5], 0 == updated(sample.api, row[4], withM(row[3])) ? "yes" : "no");
-        // Where a list cannot be updated, the whole record can be saved.
+        // If a list cannot be updated, the whole record can be saved.
         EXPECT_EQ(strRecord, saved(sample.api, strRecord, false));
         takeLog();
     }

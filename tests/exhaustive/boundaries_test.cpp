@@ -65,8 +65,8 @@ const Written kWritten[] = {
 
 const std::string kSave = R"(recSave {"m":$,"undeclared":1} insert)";
 
-// A call with each value in place of "$", on a table of each word. Its end and output are those of
-// the column between two texts.
+// A call with each value in place of "$", on a table of each word. Its result and output are the
+// column's text between the last two texts.
 const struct {
     std::string strWords;
     std::string strCall;

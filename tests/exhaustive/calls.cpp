@@ -6,7 +6,7 @@
 
 namespace {
 
-// The arguments of a call by their place, of which 0 is the function's name.
+// The arguments of a call by position, of which 0 is the function's name.
 struct Call {
     VornJsonDbApi& api;
     std::vector<std::string> words;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The functions of the interface, called by a text.
+// The functions of the interface, called from a text.
 #pragma once
 
 #include "support/matrix.h"
@@ -9,13 +9,13 @@
 #include <string>
 #include <vector>
 
-// One value of each kind that jsoncpp knows, and the edges.
+// One value of each kind that jsoncpp knows, and edge cases.
 inline constexpr const char* kKinds[] = {"null", "true", "-1",        "18446744073709551615",
                                          "1.5",  "\"\"", "\"x\"",     "[]",
                                          "[1]",  "{}",   R"({"k":1})"};
 
 struct Ended {
-    std::string strEnd;  // the result, or T where the call threw Json::LogicError
+    std::string strEnd;  // the result, or T if the call threw Json::LogicError
     std::string strOut;  // an output that was changed: its JSON, or what was appended to its text
 
     std::string whole() const { return strOut.empty() ? strEnd : strEnd + " " + strOut; }
@@ -31,8 +31,8 @@ inline bool isFailure(const std::string& strEnd)
 // pointer as nullptr, the record of CallTest as @. An output that is left out is filled before the
 // call.
 //
-// The test fails where the call changed an argument that is no output, or an output although it
-// failed or found no record, unless the function leaves there what it appended before the failure.
+// The test fails if the call changed an argument that is not an output, or an output although it
+// failed or found no record, except where the function keeps what it appended before the failure.
 Ended called(VornJsonDbApi& api, const std::string& strCall);
 
 std::string replaced(const std::string& strText, char cOld, const std::string& strNew);
@@ -49,12 +49,12 @@ class CallTest : public TableTest {
 protected:
     Table& tableOf(const std::string& strWord);
 
-    // The call by a handle on the table ends so, with W for a failure that has written all the
-    // same. It logs exactly when it gives -1. An output is compared where one is expected.
+    // The call by a handle on the table ends like this, with W for a failure that has nevertheless
+    // written. It logs exactly when it returns -1. An output is compared if one is expected.
     void checkCall(Table& table, VornJsonDbApi& api, const std::string& strCall,
                    const std::string& strExpected);
 
-    // Handle and connection work.
+    // Handle and connection still work.
     void expectSound(Table& table);
 
     std::size_t nCells_ = 0;  // calls checked

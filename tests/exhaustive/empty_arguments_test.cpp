@@ -80,7 +80,7 @@ void checkHandleWithout(int iMissing, Database& database, Table& table)
     lines.resize(expected.size());
     EXPECT_EQ(expected, lines);
     EXPECT_EQ("", api.getErrMsg());
-    // No such table is there or defined: what runs SQL fails, and all the rest ends.
+    // No such table exists or is defined: what runs SQL fails, and everything else still ends.
     for (const Row& row : kRows)
         for (const std::string& strCall : split(row.szCalls, '|')) {
             const std::string strEnd = called(api, strCall).strEnd;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Calls on types that are missing, of a wrong kind or partial, and every line that each logs.
+// Calls on types that are missing, of the wrong kind or partial, and every line that each logs.
 #pragma once
 
 #include "calls.h"
@@ -15,7 +15,7 @@ inline const std::string kDecoder = "look-up of the row decoder";
 
 inline constexpr char kRows[] = "xyz,uvw";
 
-// Calls on those rows, each for itself, of the table "$" (a, b, c).
+// Calls, each on its own, on those rows of the table "$" (a, b, c).
 struct Case {
     std::string strCalls;        // between bars
     const char* szEnd;           // the result and the output, if it changes
@@ -27,7 +27,7 @@ struct Case {
 };
 using Cases = std::vector<Case>;
 
-// Parts of the lines below, of which those with a "!" stand for a refused statement alone.
+// Parts of the lines below; those with a "!" appear only for a refused statement.
 inline const std::string kRefused = "!statement";
 inline const std::string kError = "!error";
 inline const Lines kListed = {kRefused,
@@ -60,7 +60,7 @@ inline const std::map<std::string, Lines> kAfter = {
     {"recCreate [1]", {kCreated}},
 };
 
-// Every line of the call, which finds those types.
+// Every line that the call logs when it finds those types.
 inline Lines linesOf(const Case& c, const std::string& strCall, const std::string& strTypes)
 {
     std::map<std::string, std::string> texts = {{"<types>", strTypes}};
@@ -108,7 +108,7 @@ inline const Lines kCreate = {kLookUp, kEarlyLookUp, kEarlyLookUp, kLookUp};
 
 // clang-format off
 
-// Of no types at all, beside the operations that list columns.
+// With no types at all, except for the operations that list columns.
 inline const Cases kWithoutTypes = {
     {R"(recUpdateByFilter {"a":"x"} {"a":"n"}|recDelete {"a":"x"})", "-1", kNoCondition},
     {R"(recUpdateByFilter {"vornSqlWhereFilter":"1"} {"a":"n"})", "-1",
@@ -127,7 +127,7 @@ inline const Cases kWithoutTypes = {
     {R"(SqlMakeByListField a ["x"])", "-1", kNoListField},
 };
 
-// Of no types and a definition without columns.
+// With no types and a definition without columns.
 inline const std::string kInto =
     " INTO $ () VALUES (;select * from $ where rowid == last_insert_rowid();";
 inline const Cases kWithoutColumns = {
@@ -140,7 +140,7 @@ inline const Cases kWithoutColumns = {
     {R"(SqlExpandMemberSymbol before {"a":"x"})", "0", kFound},
 };
 
-// Of types that are no object and a definition with columns: none of them is found.
+// With types that are not an object and a definition with columns: none of them is found.
 inline const Cases kWithColumns = {
     {R"(recSave {"a":"x"} insert)", "-1", kSave + Lines{kNoKey, kNoValue}},
     {R"(recCreate {"a":"x"} {"a":"x"})", "-1", kCreate + Lines{kNoKey, kNoValue}},
@@ -150,7 +150,7 @@ inline const Cases kWithColumns = {
     {R"(SqlExpandMemberSymbol before {"a":"x"})", "-1", {kLookUp, kNoKey}},
 };
 
-// Of types that end before b; only the first look-up says so. What is asked of b is not asked.
+// With types that end before b; only the first look-up says so. Checks on b are not made.
 inline const Lines kRefusedB =
     kFound + rowRefused(kNoColumn, {plain("column_name[1]=b"), plain("column_value[1]=y")});
 inline const Cases kWithPartialTypes = {
@@ -183,7 +183,7 @@ inline const Cases kWithPartialTypes = {
     {R"(SqlMakeByListField b ["y"])", "-1", kNoListField},
 };
 
-// Of types whose a has no word, which is an unknown one.
+// With types whose a has no word, which counts as an unknown one.
 inline const std::string kNoText = failed(R"(jType[szKey]["cpptype"].asString() != "string")");
 inline const std::string kNoCheck = error("type not found!!, key=a");
 inline const Cases kWithoutAWord = {
@@ -209,7 +209,7 @@ inline const Cases kWithoutAWord = {
     {R"(SqlMakeByListField a ["x"])", "0 a in (x )", {}},
 };
 
-// Of types whose a has a word that is no text and has none: nothing is logged before it is thrown.
+// With types whose a has a word that cannot be read as text: it throws before anything is logged.
 inline const Cases kWithAWordThatThrows = {
     {R"(recList {"a":"x"}|recList {"b":"y"}|recGetOne {"b":"y"}|recDelete {"a":"x"}|)"
      R"(recUpdateByFilter {"a":"x"} {"b":"n"}|recUpdateByFilter {"b":"y"} {"a":"n"}|)"

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The look-ups of member types behind every operation, on types that are missing, of a wrong kind
+// The look-ups of member types behind every operation, on types that are missing, of the wrong kind
 // or partial: the result, the whole log and what is left in the table.
 
 #include "support/lookups.h"
@@ -31,14 +31,14 @@ struct Types {
     std::string strDefinition;
     std::string strCondition = "";  // of the look-up that fails, if any
     std::string strFirst = "-";     // the table's entry when the first look-up fails
-    std::string strEntry = "null";  // and afterwards; it fails again where it is no object
+    std::string strEntry = "null";  // and afterwards; fails again unless it is an object
     std::string strLater = "";      // the definition after the column list, if it differs
-    bool blByHost = false;          // has put the entry there before the call
+    bool blByHost = false;          // the host has put the entry there before the call
 };
 
 class LookUps : public LookUpsTest {
 protected:
-    // Each call on a table of its own, and once more where later look-ups log other lines.
+    // Each call on a table of its own, and once more if later look-ups log other lines.
     void expect(const Cases& cases, const Types& types)
     {
         strName_ = freshName();

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-// Every argument of every function as every kind of JSON value, a member of every type word among
-// them: how the call ends, that it leaves alone what it should, and that handle and connection go
-// on working.
+// Every argument of every function as every kind of JSON value, including a member of every type
+// word: how the call ends, that it changes nothing that it should not, and that handle and
+// connection go on working.
 
 #include "support/matrix.h"
 #include "calls.h"
@@ -17,7 +17,7 @@ namespace {
 const std::string kRecordOf = R"({"a":"a","m":$,"z":"z"})";
 const std::string kByDefault = "recCreate by default";
 
-// An end is the result, T for a Json::LogicError or W for a failure that has written all the same.
+// An end is the result, T for a Json::LogicError or W for a failure that nevertheless wrote.
 struct Row {
     std::string strCalls;  // between bars, as the words
     std::string strWords;  // of the member m
@@ -39,7 +39,7 @@ const std::string kExpandLists =
     "SqlExpandMemberList $ before 0|SqlExpandMemberList $ before 1|SqlExpandMemberList $ before 2";
 const std::string kPage = "SqlFilterConditionFromJson $";
 
-// Of a table whose m is an int. SQLite refuses an empty raw filter and one of an unknown column,
+// On a table whose m is an int. SQLite refuses an empty raw filter and one of an unknown column,
 // and wants whole numbers of 64 bits for paging.
 // clang-format off
 const Row kArguments[] = {
@@ -149,13 +149,13 @@ const Row kMembers[] = {
     {"SqlMakeByMatchField m $|" + kListField + "|" + kMemberList, kJson,
                                                           "  0    0    0    0    0    0    0    0    0    0    0"},
 
-    // SQLite refuses an empty list, a bare value that is missing and a bare text that is no column.
+    // SQLite refuses an empty list, a missing bare value and a bare text that is not a column.
     {kFinds, "string",                                    "  0    0    0    0    0    0    0   -1    0    T    T"},
     {kFinds, kNumbers,                                    " -1    0    0    0    0   -1   -1   -1    0    T    T"},
     {kFinds, "bool",                                      "  0    0    0    T    0    T    T   -1    0    T    T"},
     {kFinds, kJson,                                       "  0    0    0    0    0    0    0   -1    0    0    0"},
 
-    // A list is no value to set.
+    // A list is not a value to set.
     {kUpdateWhere, "string",                              "  0    0    0    0    0    0    0   -1   -1    T    T"},
     {kUpdateWhere, kNumbers,                              " -1    0    0    0    0   -1   -1   -1   -1    T    T"},
     {kUpdateWhere, "bool",                                "  0    0    0    T    0    T    T   -1   -1    T    T"},
@@ -174,7 +174,7 @@ struct DefinitionRow {
     const char* szDefinition;
     const char* szList;
     const char* szSave;
-    const char* szDelete;  // recType gives null where it fails
+    const char* szDelete;  // recType returns null if it fails
 };
 
 constexpr char kFails[] = "-1 -1 -1 -1 -1 -1 -1 -1 -1 -1 -1";
@@ -189,7 +189,7 @@ const DefinitionRow kDefinitions[] = {
     {R"({"!":{"member":{"m":$}}})", kFails, kFails, kFails},
     {R"({"!":{"member":{"m":{"cpptype":$}}}})", kOfTexts, kFails, kOfTexts},
     {R"({"!":{"member":{"m":{"cpptype":"int","cppDefaultValue":$}}}})", kWorks, kWorks, kWorks},
-    // What nobody reads.
+    // Members that nobody reads.
     {R"({"!":{"member":{"m":{"cpptype":"int","x":$}},"x":$},"x":$})", kWorks, kWorks, kWorks},
     // The members before a bad one are known, but the column of the bad one is asked for.
     {R"({"!":{"member":{"m":{"cpptype":"int"},"n":$}}})", kFails, kFails, kWorks},

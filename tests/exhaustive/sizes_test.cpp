@@ -132,14 +132,14 @@ TEST_F(LargeRecords, MayHoldATextOfAMebibyte)
         takeLog());
 }
 
-// jsoncpp goes down one call a level, and so does this test; the frames of a sanitizer are larger.
+// jsoncpp recurses once per level, and so does this test; the frames of a sanitizer are larger.
 #if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
 constexpr std::size_t kStack = 64U << 20;
 #else
 constexpr std::size_t kStack = 8U << 20;
 #endif
 
-// Runs it on a stack of that size.
+// Runs the work on a stack of that size.
 void onKnownStack(std::function<void()> work)
 {
     pthread_attr_t attributes;
@@ -200,7 +200,7 @@ void storeAndAsk(Database& database, Table& table, std::size_t nLevels)
     EXPECT_EQ(1, table.api.recDeleteAll());
     EXPECT_EQ(Lines(), takeLog());
 
-    // A refused record goes into the log as deep as it is.
+    // A refused record is logged, however deep it is.
     Json::Value jBad = member("o", jRecord["a"]);
     EXPECT_EQ(-1, table.api.recCreate(jBad, jStored));
     EXPECT_EQ(plain("call create rec, rec={\"o\":" + strArrays + "}"), takeLog().back());

@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
-# configure_test.sh SOURCE WORK: a plain configuration works where no more than the library's own needs are
-# installed, and says which tests it leaves out; where all tests are required it fails. And no part of the project
+# configure_test.sh SOURCE WORK: a plain configuration works with only the library's own dependencies
+# installed, and says which tests it leaves out; if all tests are required it fails. And no part of the project
 # depends on the name of SQLite's target.
 set -euo pipefail
 source=$1 work=$2
@@ -38,7 +38,7 @@ mkdir -p "$work/bin" "$work/modules"
 left_out "All tests: left out, GoogleTest was not found" -DCMAKE_DISABLE_FIND_PACKAGE_GTest=ON
 left_out "All tests: left out, they are for the shared library" -DBUILD_SHARED_LIBS=OFF
 
-# without PROGRAM [OPTION...]: among the programs of the machine all are found but this one.
+# without PROGRAM [OPTION...]: all programs of the machine are found but this one.
 ln -s /usr/bin/* "$work/bin"
 without() {
     mkdir "$work/$1"

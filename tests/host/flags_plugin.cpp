@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A plugin with flags of its own; two_plugins loads two of them. LOG_TO_STDOUT is the flag's first
-// value.
+// A plugin with flags of its own; two_plugins loads two of them. LOG_TO_STDOUT is the flag's
+// initial value.
 
 #include <VornJsonDbApi.h>
 #include <sqlite3.h>

@@ -9,7 +9,7 @@ bool blDebugOutput = false;
 
 namespace {
 
-// Older than the library's first use, so it is gone after whatever that use has made: what main
+// Made before the library's first use, so it is gone after whatever that use has made: what main
 // took is still there, and the handle of main works.
 struct Late {
     ~Late()

@@ -12,8 +12,8 @@ for text in "Stack protected: yes" "Fortify Source functions: yes" "Read-only re
     grep -q "^ $text" <<<"$found" || { echo "hardening_test: not '$text'" >&2; exit 1; }
 done
 
-# Debian's own start files lack the mark that hardening-check reads, so a function is looked at. The compilers for
-# other processors do not know the option.
+# Debian's own start files lack the mark that hardening-check reads, so one function is checked instead. The compilers
+# for other processors do not know the option.
 if [[ $(readelf -h "${libraries[0]}") == *X86-64* ]]; then
     objdump -dC "${libraries[0]}" | grep -A 1 '<VornJsonDbApi::tableCreate()>:$' | grep endbr64 ||
         { echo "hardening_test: no control flow protection" >&2; exit 1; }

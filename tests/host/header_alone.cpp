@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// The header as the only thing that a host includes: it brings what the host opens its connection
-// with, and what it reads and writes JSON with.
+// The header as the only thing that a host includes: it declares what the host needs to open its
+// connection and to read and write JSON.
 #include <VornJsonDbApi.h>
 
 bool blLogToStdout = false;

@@ -52,7 +52,7 @@ host() {
     echo "$work/$1"
 }
 
-# printed: the block that ran last ended in what the README says.
+# printed: the block that ran last ended with what the README says.
 printed() {
     block "A host in 30 lines" "" 1 >"$work/expected"
     tail -n "$(wc -l <"$work/expected")" "$work/log" | diff -u "$work/expected" - || fail "the host prints something else"
@@ -64,7 +64,7 @@ installed() {
     find /usr /etc /opt | LC_ALL=C sort
 }
 
-# way NAME: begins one.
+# way NAME: begins a way.
 way() {
     say "$1"
     way=$1 began=$SECONDS

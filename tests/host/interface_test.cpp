@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// What a host compiles and links against, as far as abi/ and debian/libvornjsondb6.symbols do not
-// tell: they hold the exported functions, their types and, for 64 bits, the layout.
+// What a host compiles and links against, beyond what abi/ and debian/libvornjsondb6.symbols check:
+// they hold the exported functions, their types and, for 64 bits, the layout.
 
 #include "support/database.h"
 

@@ -64,7 +64,7 @@ host_project() {
     runs "$work/$1/build/host"
 }
 
-# sqlite_named TARGET: a folder with a module that finds SQLite as this target alone.
+# sqlite_named TARGET: a folder with a module that finds SQLite under this target name only.
 sqlite_named() {
     mkdir -p "$work/modules/${1%%:*}"
     cat >"$work/modules/${1%%:*}/FindSQLite3.cmake" <<MODULE

@@ -5,7 +5,7 @@
 set -euo pipefail
 . "$(dirname "$0")/package.sh"
 
-# part_alone FOLDER: a host that the library is a part of has not built its tests and examples.
+# part_alone FOLDER: the host there, which contains the library, has not built its tests and examples.
 part_alone() {
     for option in TESTS EXAMPLES; do
         grep -qx "VORNJSONDB_$option:BOOL=OFF" "$1/build/CMakeCache.txt" || fail "$1 has VORNJSONDB_$option on"
@@ -19,7 +19,7 @@ add_executable(host host.cpp)
 target_link_libraries(host PRIVATE VornJsonDb::vornjsondb)
 install(TARGETS host)"
 
-# The host's linker refuses undefined symbols, and it installs itself alone.
+# The host's linker refuses undefined symbols, and it installs only itself.
 host_project part -DCMAKE_INSTALL_PREFIX=/usr -DCMAKE_SHARED_LINKER_FLAGS=-Wl,-z,defs <<<"$project"
 part_alone "$work/part"
 DESTDIR=$work/part/stage quietly "the host does not install" cmake --install "$work/part/build"

@@ -28,7 +28,7 @@ has_inside() {
     done
 }
 
-# Found alone by CMake, over the shared SQLite and over the static one; the global's constructor comes first.
+# Found by CMake on its own, over the shared SQLite and over the static one; the global's constructor comes first.
 globals="$found_alone
 add_executable(global_host $part/global_host.cpp)
 target_link_libraries(global_host PRIVATE VornJsonDb::vornjsondb)"
@@ -68,7 +68,7 @@ for plugin in "$work/plugin/build/libplugin.so" "$work/plugin.so"; do
     "$work/plugin/build/plugin_host" "$plugin" || fail "the host of $plugin: step $?"
 done
 
-# A shared library over a static SQLite is refused, also where the host has made SQLite's target.
+# A shared library over a static SQLite is refused, even if the host has made SQLite's target.
 refused() {
     for text in "two SQLites" "first call would crash" "-DBUILD_SHARED_LIBS=OFF" "over the shared SQLite"; do
         tr -s ' \n' ' ' <"$work/log" | grep -qF -e "$text" || { cat "$work/log"; fail "it does not say $text"; }

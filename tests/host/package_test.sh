@@ -22,8 +22,8 @@ for name in sqlite3 jsoncpp stdc++ c; do
     grep -qx "lib$name" "$work/needed" || fail "it does not need $name"
 done
 
-# The linker does not refuse undefined symbols here, so the loader is asked: the host has these two, and what the
-# library needs has all others.
+# The linker does not refuse undefined symbols here, so ask the loader: the host has these two, and the library's
+# dependencies have all others.
 ldd -r "$library" 2>&1 | sed -n 's/^undefined symbol: \([^[:space:]]*\).*/\1/p' | LC_ALL=C sort >"$work/undefined"
 printf 'blDebugOutput\nblLogToStdout\n' | diff -u - "$work/undefined" || fail "other symbols than the host's two flags are undefined"
 
@@ -50,14 +50,14 @@ quietly "records against the installed library" \
 (cd "$source/examples/guarded" && "$work/found/build/guarded" :memory: <commands.txt >"$work/found/answers.txt")
 same "what guarded answers" "$source/examples/guarded/answers.txt" "$work/found/answers.txt"
 
-# Found alone, whichever name SQLite's target has.
+# Found on its own, whichever name SQLite's target has.
 host_project found_alone -DCMAKE_PREFIX_PATH="$work/moved" <<<"$found_alone"
 for target in SQLite::SQLite3 SQLite3::SQLite3; do
     host_project "found_${target%%:*}" -DCMAKE_PREFIX_PATH="$work/moved" \
         -DCMAKE_MODULE_PATH="$(sqlite_named "$target")" <<<"$found_alone"
 done
 
-# Of the version that was asked for.
+# Not found for any other version.
 for version in 5 7 6.99; do
     if echo "find_package(VornJsonDb $version CONFIG REQUIRED)" |
         configured "version_$version" -DCMAKE_PREFIX_PATH="$work/moved"; then
@@ -71,7 +71,7 @@ flags=$(PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig pkg-config --cflags --libs
 c++ -std=c++17 "$host" $flags -Wl,-rpath,"$work/moved/$libdir" -o "$work/host"
 runs "$work/host"
 
-# In folders that are not below the prefix, pkg-config names them as they stand.
+# pkg-config names folders outside the prefix as they were given.
 quietly "absolute folders do not configure" cmake -S "$source" -B "$work/absolute" -DVORNJSONDB_TESTS=OFF \
     -DVORNJSONDB_EXAMPLES=OFF -DCMAKE_INSTALL_PREFIX=/usr -DCMAKE_INSTALL_LIBDIR=/opt/lib \
     -DCMAKE_INSTALL_INCLUDEDIR=/srv/include
@@ -80,7 +80,7 @@ for variable in libdir=/opt/lib includedir=/srv/include; do
         fail "pkg-config has not $variable"
 done
 
-# One example alone, as examples/README.md has it.
+# One example on its own, as in examples/README.md.
 mkdir "$work/alone"
 ln -s "$source/examples" "$work/alone/examples"
 # shellcheck disable=SC2016 # the marks of a block
@@ -89,8 +89,8 @@ sed -n '/^```sh$/,/^```$/ { /^```/d; p }' "$source/examples/README.md" >"$work/a
 LD_LIBRARY_PATH=$work/moved/$libdir \
     bash "$source/examples/example_test.sh" "$source/examples/expected/first_steps.txt" "$work/alone/first_steps"
 
-# Installed twice, with and without DESTDIR, and removed as the README says: what was there before is left, and an
-# empty folder of it, too.
+# Installed twice, with and without DESTDIR, and removed as the README says: what was there before stays, even an
+# empty folder.
 mkdir -p "$work/removed/usr/include" "$work/removed/usr/share/man"
 : >"$work/removed/usr/include/other.h"
 (cd "$work/removed" && find . | LC_ALL=C sort) >"$work/before"

@@ -77,7 +77,7 @@ prints "{\"deleted\":${#codes[@]}}" delete-by alpha_3 "${codes[@]}"
 prints '' list
 same 'integrity at the end' ok "$(sqlite3 iso.db 'pragma integrity_check')"
 
-# The last of thousands fails: nothing of them stays.
+# The last of thousands fails: none of them stays.
 sqlite3 :memory: "select json_insert(readfile('${file[languages]}'), '\$.\"639-3\"[#]',
     json('{\"alpha_3\": \"aaa\", \"name\": \"Twice\", \"scope\": \"I\", \"type\": \"L\"}'))" >twice.json
 on t.db languages.json

@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
 # Tests examples/records as its user sees it: exit status, standard output and standard error, all
-# compared exactly, and what stands in the database file afterwards (read with the sqlite3 shell).
+# compared exactly, and what is in the database file afterwards (read with the sqlite3 shell).
 #
 # usage: records_test.sh PROGRAM TABLES-FOLDER WORK-FOLDER
 . "$(dirname "${BASH_SOURCE[0]}")/records.sh"
@@ -19,7 +19,7 @@ notes_with() {
     sqlite3 :memory: "select json_set(json_remove(readfile('notes.json'), '\$.key'), '\$.create', '$1')"
 }
 
-# What the program says of texts that are not JSON: an open brace, a text alone, nothing.
+# What the program says of texts that are not JSON: an open brace, a bare text, nothing.
 no_json='not valid JSON: Line 1, Column 2 Missing '\''}'\'' or object member name'
 no_container='Line 1, Column 1 A valid JSON document must be either an array or an object value.'
 nothing="not valid JSON: Line 1, Column 1 Syntax error: value, object or array expected. $no_container"

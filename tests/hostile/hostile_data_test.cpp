@@ -14,7 +14,7 @@ class HostileData : public HostileRoleTest {
 protected:
     std::size_t rowCount() { return database_.rows("select 1 from " + table_.strName).size(); }
 
-    // Makes record 1 anew, with that value of the member.
+    // Makes record 1 again, with that value of the member.
     void store(const char* szMember, const Json::Value& jValue)
     {
         database_.run("delete from " + table_.strName + " where n=1; insert into " +
@@ -26,7 +26,7 @@ protected:
     }
 
     // The value is stored in record 1 and fetched; as a condition, or as the item of a list, it
-    // means record 1 alone.
+    // selects record 1 only.
     void expectFinds(const char* szMember, const Json::Value& jValue, const Json::Value& jFetched)
     {
         for (const Json::Value& jCondition : {jValue, listOf(jValue)}) {
@@ -138,7 +138,7 @@ const auto asJson = [](const char* szText) { return leftByReader(szText); };
 
 struct Word {
     const char* szWord;
-    Json::Value (*value)(const char* szText);  // null where no column can be decoded
+    Json::Value (*value)(const char* szText);  // null if no column can be decoded
 };
 
 const Word kWords[] = {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What the tests share that put every hostile string into a role.
+// Shared by the tests that put every hostile string into a role.
 #pragma once
 
 #include "hostile/hostile_strings.h"

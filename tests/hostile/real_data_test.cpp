@@ -49,7 +49,7 @@ Json::Value object(const std::string& strMember, const Json::Value& jValue)
     return jObject;
 }
 
-// Entry by entry: the message of a whole map would be without end.
+// Entry by entry: the message for a whole map would be endless.
 void expectSame(const Records& expected, const Records& actual)
 {
     EXPECT_EQ(expected.size(), actual.size());
@@ -62,7 +62,7 @@ void expectSame(const Records& expected, const Records& actual)
 
 class RealData : public TableTest, public testing::WithParamInterface<std::size_t> {
 protected:
-    // Fails where the package is missing: nothing is left out quietly.
+    // Fails if the package is missing: nothing is skipped silently.
     void SetUp() override
     {
         const std::string strPath = std::string("/usr/share/iso-codes/json/") + source_.szFile;
@@ -81,7 +81,7 @@ protected:
             strColumns.insert(0, strMember + " text,");
         }
         pTable_ = std::make_unique<Table>(database_, text(jMembers), strColumns);
-        // Without these most of the time would go into reading the whole table.
+        // Without these, reading the whole table would take most of the time.
         for (const std::string& strMember : source_.conditions)
             database_.run("create index by_" + strMember + " on " + pTable_->strName + " (" +
                           strMember + ")");

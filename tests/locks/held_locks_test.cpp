@@ -107,7 +107,7 @@ std::vector<Operation> undisturbed()
 class EveryHeldLock : public HeldLock,
                       public testing::WithParamInterface<std::tuple<Situation, Operation>> {
 protected:
-    // The long run sleeps in earnest.
+    // The long run really sleeps.
     EveryHeldLock() : HeldLock(std::get<Situation>(GetParam()).szJournal)
     {
         state().blReallySleep = nullptr != getenv("VORN_SOAK");
@@ -150,7 +150,7 @@ TEST_F(HeldLock, IsGivenUpAfterFiveRealSeconds)
     Figures::of("locks, milliseconds before giving up in earnest") = elapsed.count();
 }
 
-// A transaction of the host that has read an older state can never write: all attempts are made.
+// A host's transaction that has read an older state can never write: all attempts are made.
 TEST_F(HeldLock, IsGivenUpInATransactionWithAnOlderSnapshot)
 {
     database_.run("pragma journal_mode=wal");

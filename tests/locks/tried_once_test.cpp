@@ -28,13 +28,13 @@ void interruptLoops(sqlite3* pDb, bool blSet)
     sqlite3_progress_handler(pDb, 1, blSet ? +interrupt : nullptr, pDb);
 }
 
-// What brings an error about and cures it.
+// What causes an error, and what cures it.
 struct Error {
     const char* szName;
     const char* szError;
     const char* szErrorOfReading;  // "" where reading works
     const char* szOperations;      // "" for all, but those that make a table only if told to
-    // Of the host itself, before and afterwards.
+    // The host's own SQL, before and afterwards.
     const char* szSql;
     const char* szCure;
     bool blMakesTable = false;
@@ -116,7 +116,7 @@ TEST_P(TriedOnce, ByEveryOperation)
     std::vector<Operation> chosen;
     std::istringstream names(error.szOperations);
     for (std::string strName; std::getline(names, strName, ',');)
-        chosen.push_back(operation(strName));
+        chosen.push_back(operation(strName.c_str()));
     if (chosen.empty())
         for (const Operation& candidate : operations())
             if (error.blMakesTable || !(candidate.is("constructor") || candidate.is("tableCreate")))

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Every function of the library by its name, with arguments out of JSON, for tests that bring each
-// of them into the same trouble.
+// Every function of the library by name, with arguments from JSON, for tests that put each of them
+// through the same trouble.
 #pragma once
 
 #include <VornJsonDbApi.h>
@@ -14,14 +14,14 @@
 struct Call {
     using Function = int (*)(Call& call);
 
-    // The function that the first word of a case's name is.
+    // The function that the first word of a case's name stands for.
     static Function function(const std::string& strCase);
 
     // Takes the members "first", "second", "text", "key", "vector", "flag", "number" and "now";
     // those that are left out become empty.
     void setArguments(const Json::Value& jArguments);
 
-    // Of the constructor, and the handle that it makes.
+    // The constructor's arguments, and the handle that it makes.
     sqlite3* pDb = nullptr;
     std::string strTable;
     Json::Value jDefinition;
@@ -35,7 +35,7 @@ struct Call {
     std::string strText;
     std::string strKey;
     std::vector<std::string> strVector;
-    bool blFlag = false;  // of runSqlEx: with a callback; of SqlExpandMemberName: of a record
+    bool blFlag = false;  // runSqlEx: with a callback; SqlExpandMemberName: for a record
     int iNumber = 0;      // a kind of time or list; getTimeAfterNow writes text unless it is 0
     long now = 0;         // also the number of rows that a callback was called with
     const Json::Value* pjResult = nullptr;  // what recType referred to

@@ -35,7 +35,7 @@ Child::Child(const std::vector<std::string>& command, int iReport)
     if (0 > pid_) abort();
     if (0 == pid_) {
         prctl(PR_SET_PDEATHSIG, SIGKILL);
-        // The report may be given the number of the input's end.
+        // iReport may equal the number of the input's end.
         if (!give(input[0], STDIN_FILENO) || !give(output[1], iReport)) _exit(5);
         execv(arguments[0], arguments.data());
         _exit(6);

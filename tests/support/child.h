@@ -9,9 +9,9 @@
 
 class Child {
 public:
-    // The child finds a pipe from here as its standard input, and one to here as iReport.
+    // The child gets a pipe from this process as standard input, and one back to it as iReport.
     Child(const std::vector<std::string>& command, int iReport);
-    // Kills it where it has not ended.
+    // Kills it unless it has ended.
     ~Child();
     Child(const Child&) = delete;
     Child& operator=(const Child&) = delete;
@@ -21,7 +21,7 @@ public:
     bool write(const std::string& strText) const;
     // Ends its input and returns its status.
     int finish();
-    // Sends SIGKILL; false when the process had ended by itself. Its lines can still be read.
+    // Sends SIGKILL; false if the process had already ended. Its lines can still be read.
     bool kill();
 
 private:

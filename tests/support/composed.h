@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Calls that append to a text what they compose out of JSON.
+// Calls that append what they compose from JSON to a text.
 #pragma once
 
 #include "support/matrix.h"
@@ -7,14 +7,14 @@
 #include <string>
 
 struct Composed {
-    std::string strOut;        // what is appended, also where the call fails
-    std::string strEnd = "0";  // as endOf tells it
+    std::string strOut;        // what is appended, even if the call fails
+    std::string strEnd = "0";  // as endOf gives it
     Lines lines = {};
-    int iFailMprintf = 0;  // the call of sqlite3_mprintf that finds no memory
+    int iFailMprintf = 0;  // the call of sqlite3_mprintf that runs out of memory
 };
 
 // A call of (Json::Value&, std::string&). It runs no SQL, leaves the value and the text so far
-// alone, and gives SQLite every buffer back.
+// alone, and returns every buffer to SQLite.
 template <typename Call>
 void expectComposed(const Composed& expected, const std::string& strJson, Call call)
 {

@@ -7,7 +7,7 @@
 
 namespace {
 
-// Asked from another thread, as SQLite's mutexes let their holder in again.
+// Tried from another thread, because SQLite's mutexes are recursive.
 bool isMutexFree(sqlite3* pDb)
 {
     sqlite3_mutex* const pMutex = sqlite3_db_mutex(pDb);

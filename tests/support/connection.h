@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Connections of a host to a file, without the doubles, and what must not be left on one after a
-// call of the library.
+// A host's connections to a file, without the doubles, and what a call of the library must not
+// leave behind on one.
 #pragma once
 
 #include <sqlite3.h>
@@ -9,11 +9,11 @@
 
 namespace sqlite {
 
-// Ends the program where SQLite refuses.
+// Ends the program if SQLite refuses.
 sqlite3* opened(const std::string& strPath);
 void run(sqlite3* pDb, const std::string& strSql);
 
-// All columns of all rows in one text, NULL as "NULL"; SQLite's error text where it refuses.
+// All columns of all rows in one text, NULL as "NULL"; SQLite's error text if it refuses.
 std::string value(sqlite3* pDb, const std::string& strSql);
 
 // Empty, or what is wrong: an open statement or transaction, a held mutex, a lock that keeps

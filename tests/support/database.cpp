@@ -38,7 +38,7 @@ Database::Database(Place place)
         strPath_ =
             std::filesystem::temp_directory_path() /
             ("vornjsondb-" + std::to_string(getpid()) + "-" + std::to_string(++iCount) + ".db");
-        // A process that had this number may have been killed.
+        // May be left from a killed process that had the same id.
         std::filesystem::remove(strPath_);
         std::filesystem::remove(strPath_ + "-journal");
     }

@@ -14,24 +14,23 @@
 #include <string>
 #include <vector>
 
-// Parses JSON text; the test fails where it is none.
+// Parses JSON text; the test fails if it is not valid.
 Json::Value json(const std::string& strText);
 
-// A table name of the test's own: member types are kept for the life of the process.
+// A table name that is new: member types are kept for the life of the process.
 std::string freshName();
 
 using Rows = std::vector<std::vector<std::string>>;
 
-// In memory, or in a file of its own when the environment has VORN_TEST_FILES=1 or a file is asked
-// for.
+// In memory, or in a file of its own if VORN_TEST_FILES=1 is set or a file is asked for.
 class Database {
 public:
     enum class Place { kDefault, kFile };
 
     explicit Database(Place place = Place::kDefault);
-    // In that file, which stays; a name or a URI. Through that VFS, or the default one.
+    // In that file (a name or a URI), which stays. Through that VFS, or the default one.
     explicit Database(const std::string& strFile, const char* szVfs = nullptr);
-    // Fails the test when a statement is still open.
+    // Fails the test if a statement is still open.
     ~Database();
     Database(const Database&) = delete;
     Database& operator=(const Database&) = delete;
@@ -39,7 +38,7 @@ public:
     sqlite3* get() const { return pDb_; }
     const std::string& path() const { return strPath_; }
 
-    // Past the doubles; the test fails when SQLite refuses the text.
+    // Bypasses the doubles; the test fails if SQLite refuses the text.
     void run(const std::string& strSql);
     // All rows, NULL as "NULL".
     Rows rows(const std::string& strSql);
@@ -56,11 +55,11 @@ struct Table {
     // strMembers is the "member" object of the definition; strColumns is the text between
     // the parentheses of the CREATE statement.
     Table(Database& database, const std::string& strMembers, const std::string& strColumns);
-    // On a table of that name that exists already.
+    // On an existing table of that name.
     Table(Database& database, const std::string& strTable, const std::string& strMembers,
           const std::string& strColumns);
 
-    // recCreate of JSON text that has to succeed; the stored row.
+    // Calls recCreate with the JSON text, which has to succeed, and returns the stored row.
     Json::Value create(const std::string& strRecord);
 
     std::string strName;

@@ -95,7 +95,7 @@ int doubles::realExec(sqlite3* pDb, const char* szSql, RowCallback callback, voi
     return iStatus;
 }
 
-// jsoncpp's default limit of depth as its newest releases have it, whatever is below.
+// jsoncpp's default depth limit as in its newest releases, whichever one is used.
 void Json::CharReaderBuilder::setDefaults(Json::Value* pjSettings)
 {
     static auto* const pReal =

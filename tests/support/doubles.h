@@ -28,15 +28,15 @@ struct State {
     // sqlite3_exec: the texts that were run since the last reset, and a replacement.
     std::vector<std::string> statements;
     Exec exec;
-    // usleep: never sleeps in earnest, unless told to.
+    // usleep: does not really sleep, unless told to.
     std::vector<unsigned> sleeps;
     bool blReallySleep = false;
     std::function<void()> onSleep;
     // syslog and printf.
     std::vector<LogRecord> log;
-    // sqlite3_changes: what it answers instead of the truth.
+    // sqlite3_changes: what it returns instead of the real number.
     std::function<int()> changes;
-    // sqlite3_mprintf: the n-th call from now (1 is the next one) gives NULL; 0 is never.
+    // sqlite3_mprintf: the n-th call from now (1 is the next one) returns NULL; 0 is never.
     int iFailMprintf = 0;
     // operator new: the n-th call from now throws std::bad_alloc; 0 is never.
     int iFailNew = 0;
@@ -45,7 +45,7 @@ struct State {
     // gmtime_r, localtime_r and strftime fail.
     bool blFailTime = false;
     bool blFailStrftime = false;
-    // time: what it answers instead of the truth; -1 is the truth.
+    // time: what it returns instead of the real time, unless -1.
     time_t now = -1;
     // time: fails, with -1.
     bool blNoClock = false;
@@ -56,13 +56,13 @@ State& state();
 // Back to passing every call on, with nothing recorded.
 void reset();
 
-// Is shown every line of the whole program, whatever is reset.
+// Called with every line of the whole program; reset() leaves it alone.
 extern void (*onEveryLine)(const std::string& strText);
 
 // The real sqlite3_exec, unrecorded.
 int realExec(sqlite3* pDb, const char* szSql, RowCallback callback, void* arg, char** errText);
 
-// An error text as SQLite would hand it out.
+// An error text allocated as SQLite would.
 char* errorText(const char* szText);
 
 }  // namespace doubles

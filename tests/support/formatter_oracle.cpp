@@ -12,14 +12,14 @@ using formatter_oracle::Value;
 
 constexpr unsigned kMaxField = 4096;
 
-// What a format reads, found by a scanner of the test's own.
+// What a format reads, as found by the test's own scanner.
 struct Reads {
     bool blDefined = true;  // nothing but conversions that may be called with one value
     int iCount = 0;
     std::string strFirst;  // the first conversion that reads: its length and type, "lld"
 };
 
-// Moves past the digits there, if any. False where they are a number above kMaxField.
+// Moves past the digits there, if any. False if they are a number above kMaxField.
 bool smallNumber(const std::string& strText, std::size_t& i)
 {
     const std::size_t nEnd = std::min(strText.find_first_not_of("0123456789", i), strText.size());

@@ -23,7 +23,7 @@ int countReads(const std::string& strFormat);
 // Whether the described call is one that C defines.
 bool isComparable(const std::string& strFormat, const Value& value);
 
-// What the described call gives.
+// What the described call returns.
 std::string described(const std::string& strFormat, const Value& value);
 
 }  // namespace formatter_oracle

@@ -9,5 +9,5 @@
 // The value as one compact line.
 std::string text(const Json::Value& jValue);
 
-// What jsoncpp's own reader makes of a text, also of one with a syntax error.
+// What jsoncpp's own reader makes of a text, even of one with a syntax error.
 Json::Value leftByReader(const std::string& strText);

@@ -35,7 +35,7 @@ std::string squeezed(const std::string& strText)
     return strOut;
 }
 
-// The source files of a component, each as its squeezed lines.
+// The source files of a component, each as its lines without blanks.
 const std::vector<std::vector<std::string>>& sourcesOf(const std::string& strComponent)
 {
     static std::map<std::string, std::vector<std::vector<std::string>>> components;

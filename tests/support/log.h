@@ -13,10 +13,10 @@ using Lines = std::vector<std::string>;
 //     E VornJsonDbApi: Failed [!pDb]        error family (the text without its ", err=...")
 //     P util: strJsonName=task              plain family
 //
-// after everything else of it was checked: the exact form of its variant, process id, component,
-// priority, errno, and that the line number leads to the very check in the component's sources. A
-// line that breaks a rule comes as "BROKEN ...". A number in "errno=2," has to be the errno of the
-// line and comes as "errno=?,".
+// after everything else about it has been checked: the exact form of its variant, process id,
+// component, priority, errno, and that the line number leads to the very check in the component's
+// sources. A line that breaks a rule comes as "BROKEN ...". A number in "errno=2," has to be the
+// errno of the line and comes as "errno=?,".
 Lines takeLog();
 
 // A failed check of the class, or of the free functions.
@@ -28,5 +28,5 @@ std::string error(const std::string& strMessage);
 std::string plain(const std::string& strMessage);
 std::string utilPlain(const std::string& strMessage);
 
-// The places of a text in the sources of a component, such as "util:12", one a line of its code.
+// The places of a text in the sources of a component, such as "util:12", one per line of code.
 std::multiset<std::string> placesOf(const std::string& strComponent, const std::string& strText);

@@ -64,7 +64,7 @@ protected:
         for (std::string& strLine : lines) {
             if (0 != strLine.compare(0, strDump.size(), strDump)) continue;
             const std::size_t nKey = strLine.find(strKey);
-            // The reader leaves what follows the entry.
+            // The reader ignores what follows the entry.
             strLine = strDump + (std::string::npos == nKey
                                      ? "-"
                                      : text(leftByReader(strLine.substr(nKey + strKey.size()))));

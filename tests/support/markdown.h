@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-// A file of the project, and all files below a folder of it. The test fails when there is none.
+// A file of the project, and all files below one of its folders. The test fails if there is none.
 std::string fileText(const std::string& strFile);
 std::string folderText(const std::string& strFolder);
 

@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: MIT
-// What the tests share that try very many arguments.
+// Shared by the tests that try very many arguments.
 #pragma once
 
 #include "support/database.h"
 
 #include <iostream>
 
-// The result of a call, or "T" where it throws Json::LogicError. Anything else that is thrown fails
+// The result of a call, or "T" if it throws Json::LogicError. Anything else that is thrown fails
 // the test.
 template <typename Call>
 std::string endOf(Call call)
@@ -18,15 +18,15 @@ std::string endOf(Call call)
     }
 }
 
-// The parts between the separators that are not empty.
+// The non-empty parts between the separators.
 std::vector<std::string> split(const std::string& strText, char cSeparator);
 
-// No statement is open, no transaction either, and a record can be written and read back by the
-// handle; strRecord is one that its table takes, as JSON.
+// No statement or transaction is open, and the handle can write a record and read it back;
+// strRecord is a record for its table, as JSON.
 void expectSound(Database& database, VornJsonDbApi& api, const std::string& strRecord);
 
 // Ends the process of a death test, with 0 unless a check has failed. Its fixture is never
-// destroyed, so the file of the database goes here.
+// destroyed, so the database file is removed here.
 [[noreturn]] void endProcess(const Database& database);
 
 // A line for the table of figures.

@@ -3,6 +3,7 @@
 
 #include "support/records.h"
 
+#include <cstring>
 #include <stdexcept>
 #include <utility>
 
@@ -130,7 +131,7 @@ const std::vector<Operation>& operations()
         {"recList of some",
          R"({"first":{"vornSqlWhereFilter":"id > 6","sort_by":"id","limit":3},"second":[]})", 0,
          false},
-        // The filter is SQL as it is, so it can end the statement and begin another.
+        // The filter is SQL verbatim, so it can end the statement and begin another.
         {"recList of all, twice",
          R"({"first":{"vornSqlWhereFilter":"1); SELECT id,name,note,tags FROM records WHERE (1"},
              "second":[]})",
@@ -148,9 +149,9 @@ const std::vector<Operation>& operations()
     return all;
 }
 
-const Operation& operation(const std::string& strName)
+const Operation& operation(const char* szName)
 {
     for (const Operation& candidate : operations())
-        if (strName == candidate.szName) return candidate;
-    throw std::invalid_argument(strName);
+        if (0 == strcmp(szName, candidate.szName)) return candidate;
+    throw std::invalid_argument(szName);
 }

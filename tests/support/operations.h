@@ -25,16 +25,16 @@ std::string recordsSql(const char* szColumns);
 struct Operation {
     const char* szName;       // the first word is the function
     const char* szArguments;  // as Call takes them
-    // Of an undisturbed run; the constructor's is -1 when it logged anything.
+    // Of an undisturbed run; the constructor's is -1 if it logged anything.
     int iResult;
     bool blWrites = true;
     bool blNeedsTable = true;
 
     // Sets jOutput to the record or list that the operation writes, if there is one.
     int run(Database& database, Table& table, Json::Value& jOutput) const;
-    // That output before the operation.
+    // The output's value before the operation.
     Json::Value untouched() const;
-    // The whole log where the statement failed with that error after so many retries.
+    // The whole log when the statement fails with that error after that many retries.
     Lines failure(const Table& table, const std::string& strError, const std::string& strSql,
                   std::size_t nRetries = 0) const;
 
@@ -45,12 +45,12 @@ struct Operation {
     }
 };
 
-// The statement of the only call since the last time. It was tried so often, with 10 ms after each
-// attempt that found a lock.
+// The statement of the only call since the last check. It was tried that often, with 10 ms after
+// each attempt that met a lock.
 std::string onlyStatement(std::size_t nAttempts, std::size_t nSleeps);
 
-// A name for gtest of such parts: "recSave inserts" and "wal" are recSave_inserts_wal.
+// A gtest name made of these parts: "recSave inserts" and "wal" give recSave_inserts_wal.
 std::string testName(const std::vector<std::string>& parts);
 
 const std::vector<Operation>& operations();
-const Operation& operation(const std::string& strName);
+const Operation& operation(const char* szName);

@@ -3,7 +3,7 @@
 
 namespace {
 
-// An argument that comes back as it was, also where the call throws.
+// An argument that must not change, even if the call throws.
 template <typename Value>
 struct Unchanged {
     explicit Unchanged(const Value& given) : value(given), before(given) {}

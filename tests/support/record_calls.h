@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// A table of three records, the calls of the record operations, and all that has to come of a call.
+// A table of three records, the calls of the record operations, and all that a call results in.
 #pragma once
 
 #include "support/database.h"
@@ -20,7 +20,7 @@ protected:
     // A call of one operation.
     struct Call {
         std::string strName;
-        // The second argument is the output, where there is one, and strOut its text before.
+        // The second argument is the output, if there is one, and strOut its text before.
         std::function<int(VornJsonDbApi&, Json::Value&)> run;
         // How its log ends when it fails: for each level, the innermost first, the check of what
         // the level below gives (the first: of what SQLite gives) and the lines that follow any
@@ -31,7 +31,7 @@ protected:
         bool blTracesCount = false;
     };
 
-    // The statement of a save: strValues ends in ") " where the list closes.
+    // The statement of a save: strValues ends in ") " if the list closes.
     static std::string saved(bool blCreate, const std::string& strColumns,
                              const std::string& strValues)
     {
@@ -57,12 +57,12 @@ protected:
     static Call removeByArray(const std::vector<std::string>& texts, const char* szKey);
     static Call removeByName(const std::string& strValue, const char* szKey);
 
-    // What comes of a call; "$" is the name of the table, "$types" are its member types.
+    // The outcome of a call; "$" is the name of the table, "$types" are its member types.
     struct Outcome {
         int iResult = -1;
         std::string strSql = "";           // the statement that is run; empty for none
-        const char* szOut = nullptr;       // the output; null where it is left alone
-        const char* szContents = nullptr;  // see contents(); null where they are not looked at
+        const char* szOut = nullptr;       // the output; null if it is left alone
+        const char* szContents = nullptr;  // see contents(); null if they are not checked
         std::string strError = "";         // of the statement
         Lines causes = {};                 // the lines before those of the failed level
         std::size_t nLevel = kOutermost;
@@ -77,7 +77,7 @@ protected:
     void expect(const Call& call, const Outcome& outcome);
 
     // expect() for a call that gives an output, one that changes the table, one that fails without
-    // SQL, one that fails after its statement (strError is empty where SQLite took it), and one
+    // SQL, one that fails after its statement (strError is empty if SQLite accepted it), and one
     // that passes on the exception of an accessor.
     void expectOutput(const Call& call, int iResult, const std::string& strSql,
                       const std::string& strOut)
@@ -123,7 +123,7 @@ protected:
     std::function<void()> prepare_ = [] {};
     // The retries of the statement.
     std::size_t nRetries_ = 0;
-    // Whether calls that fail change the table all the same.
+    // Whether failing calls change the table anyway.
     bool blWritten_ = false;
 
     RecordsTest();
@@ -143,7 +143,7 @@ inline const std::string kNoObjectOrNull =
 inline const std::string kFilterIsNoText = failed("!jRecParam[jmFieldName[i]].isString()");
 inline const std::string kNoRequestConditions =
     failed("0 > SqlExpandMemberList(jRecParam, strSql, VORN_SQL_WHERE_TYPE_AND)");
-// The lines of a text, and of an item of a list, that find no memory.
+// The lines when memory runs out for a text, or for an item of a list.
 inline const Lines kNoMemoryForText = {
     failed(R"(NULL == (szSql = sqlite3_mprintf("%q", jParam.asString().c_str())))"),
     failed("0 > SqlMakeByMatchField(jmFieldName[i], jTmp, strSqlWhereOut)")};

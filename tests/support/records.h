@@ -19,6 +19,6 @@ inline std::string sqlError(const std::string& strError, const std::string& strS
     return plain("sql error, err=" + strError + ", sql=" + strSql);
 }
 
-// What SQLite says where a condition is missing.
+// What SQLite says when a condition is missing.
 inline constexpr char kNearParenthesis[] = "near \")\": syntax error";
 inline constexpr char kNearWhere[] = "near \"WHERE\": syntax error";

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What the tests of running statements and decoding rows share.
+// Shared by the tests of running statements and of decoding rows.
 #pragma once
 
 #include "support/records.h"
@@ -12,8 +12,8 @@
 // known afterwards.
 doubles::RowCallback rowCallback(Table& table);
 
-// One result row as it is handed to a row callback; a null text is SQL NULL, and an empty list is
-// handed as a null pointer.
+// One result row as it is passed to a row callback; a null text is SQL NULL, and an empty list is
+// passed as a null pointer.
 struct Row {
     std::vector<const char*> names;
     std::vector<const char*> values;
@@ -25,7 +25,7 @@ struct Row {
 // A double of sqlite3_exec that hands rows to the callback until it stops, as SQLite does.
 doubles::Exec execOfRows(std::vector<Row> rows);
 
-// How a run of sqlite3_exec ends: with no error text for a null one, errno untouched for 0.
+// How a run of sqlite3_exec ends; null gives no error text, 0 leaves errno alone.
 struct End {
     int iStatus;
     const char* szError = nullptr;
@@ -41,7 +41,7 @@ inline doubles::Exec execOfStatus(int iStatus, const char* szError)
     return execOfEnds({{iStatus, szError}});
 }
 
-// A double of sqlite3_exec that runs the text, and calls it locked that many times.
+// A double of sqlite3_exec that runs the text, but reports it as locked that many times.
 doubles::Exec execCalledLocked(int nTimes);
 
 // The lines of a column that cannot be decoded, and those of a statement that the last column of a
@@ -52,7 +52,7 @@ Lines statementStopped(Lines lines, const Row& row = {});
 // The log, with "..." for the types of all tables of the process.
 Lines takeLogWithoutTypes();
 
-// With a table of which a save can end before it runs any SQL: no value list can hold "Unsavable".
+// With a table on which a save can fail before any SQL: no value list can hold "Unsavable".
 class RunSqlTest : public TableTest {
 protected:
     // The handle's SQL error text, as such a save logs it; empty for none. Takes the log.

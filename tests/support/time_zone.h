@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The time zone of the process, for a while, and which times can be asked for.
+// Sets the time zone of the process for a while, and tells which times can be asked for.
 #pragma once
 
 #include <climits>

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 // Two threads, each with handles of its own, on one connection and on two, and the host's own mutex
-// around every call: every result is right. With --without-lock the mutex is left out, which only
-// ThreadSanitizer should be shown. The status is 0 when all is well.
+// around every call: every result is right. With --without-lock the mutex is left out, which is for
+// ThreadSanitizer only. The status is 0 when all is well.
 
 #include "support/connection.h"
 
@@ -78,7 +78,7 @@ void useRecord(VornJsonDbApi& api, const Json::Value& jRecord)
     expectResult(1, "recDelete", [&] { return api.recDelete(jRequest); });
 }
 
-// On a table of that name, whose records have such a value.
+// On a table of that name, whose records hold such a value.
 void useLibrary(sqlite3* pDb, std::string strName, const char* szWord, const Json::Value& jValue)
 {
     std::string strCreate =

@@ -21,7 +21,7 @@ protected:
             (4, null, null, null, null, null))");
     }
 
-    // The ids that the statement gives, like "13", or SQLite's own words of why it does not run.
+    // The ids that the statement returns, like "13", or SQLite's error text if it does not run.
     std::string outcome(const std::string& strSql)
     {
         std::string strIds;
@@ -135,7 +135,7 @@ TEST_F(ConditionsInSql, PageThroughRowsInTableOrder)
 // written as null, and the host's value keeps them.
 class Holes : public TableTest {
 protected:
-    // A list whose last item alone is set.
+    // A list in which only the last item is set.
     static Json::Value request(const char* szMember, const Json::Value& jLast)
     {
         Json::Value jRequest;
@@ -157,7 +157,7 @@ TEST_F(Holes, StayInARequest)
     Json::Value jValues = json(R"({"id":2})");
     std::string strWhere = "id = 1";
     std::string strOut;
-    // Every operation that takes a request, with its result where the list is written.
+    // Every operation that takes a request, with its result if the list is written.
     const struct {
         const char* szEnd;
         std::function<int(Json::Value&)> call;

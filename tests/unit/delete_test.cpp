@@ -30,7 +30,7 @@ TEST_F(Delete, ComposesOneStatementAndCounts)
         {R"({"data":{"k":1}})", R"(data='{"k":1}')", 1, "2Bob0,3O'Brien1"},
         {R"({"vornSqlWhereFilter":"id > 1"})", " id > 1 ", 2, "1Ann1"},
         {R"({"vornSqlWhereFilter":"1"})", " 1 ", 3, ""},
-        // Kept: sorting and paging do not count here.
+        // Kept: sorting and paging are ignored here.
         {R"({"flag":true,"limit":1,"offset":1,"sort_by":5})", "flag=1", 2, "2Bob0"},
         {R"({"id":2,"undeclared":1})", "id=2", 1, "1Ann1,3O'Brien1"},
     };
@@ -95,7 +95,7 @@ TEST_F(Delete, FailsWhenSqliteRefuses)
     for (const auto& row : cases)
         expectSqlFailure(remove(row.szRequest, true),
                          std::string("DELETE FROM $  WHERE  (") + row.szTerms + " );", row.szError);
-    // These are the words of a duplicate, but a delete tells the host nothing.
+    // This is the text of a duplicate, but a delete sets no message for the host.
     database_.run("create trigger keep before delete on " + table_.strName +
                   " when old.id = 3 begin select raise(abort, 'UNIQUE constraint failed'); end");
     expectSqlFailure(removeAll(), "DELETE FROM $ ;", "UNIQUE constraint failed");
@@ -144,7 +144,7 @@ TEST_F(DeleteBy, RefusesAnEmptyListBeforeTheKey)
     }
 }
 
-// recDeleteByName does not reach the list.
+// recDeleteByName fails before it reaches the list.
 TEST_F(DeleteBy, RefusesAKeyThatIsNotAMember)
 {
     for (const char* szKey : {static_cast<const char*>(nullptr), "", "undeclared", "Name", " name",
@@ -179,7 +179,7 @@ TEST_F(DeleteBy, RefusesAKeyOfAnyOtherWord)
     }
 }
 
-// What the look-up of missing types logs comes before every check.
+// The log lines of looking up missing types come before those of any check.
 TEST_F(DeleteBy, LooksUpTheMembersFirst)
 {
     VORN_JSON_DB::recType(table_.jDefinition, table_.strName) = json("[1]");

@@ -23,7 +23,7 @@ protected:
         return strSql;
     }
 
-    // The same of a record that holds one value, without the ") " that closes the list.
+    // The same for a record that holds one value, without the ") " that closes the list.
     static std::string with(Table& table, const Json::Value& jValue, const std::string& strPrefix)
     {
         Json::Value jRecord;
@@ -119,7 +119,7 @@ std::string sqliteText(const std::string& strFormat, Arguments... arguments)
 
 enum class Kind { kInteger, kFloat, kText };
 
-// One conversion on its own, given the value where it is of the value's kind.
+// One conversion on its own, given the value if it is of the value's kind.
 std::string piece(const std::string& strHead, const std::string& strLength, char cType, Kind kind)
 {
     const std::string strFormat = strHead + strLength + ('z' == cType ? 's' : cType);

@@ -85,7 +85,7 @@ TEST_F(GetOne, TakesTheRequestItselfAsTheOutput)
     }
 }
 
-// What becomes of the record touches no later one.
+// Changing the record does not affect any later one.
 TEST_F(GetOne, GivesAnIndependentRecord)
 {
     Json::Value jRequest = json(R"({"id":2})");

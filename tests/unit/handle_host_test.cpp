@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Operations of a handle while the host does the unusual: it changes member types, its SQL
-// functions run inside a statement, or memory is lacking.
+// Operations of a handle while the host does something unusual: it changes member types, its SQL
+// functions run inside a statement, or memory runs out.
 
 #include "support/database.h"
 
@@ -72,7 +72,7 @@ TEST_F(ChangedTypes, ApplyFromTheNextStatementOnInEveryHandle)
 
 class HostFunctions : public TableTest {
 protected:
-    // Makes the SQL function host() of it, which gives 1, or fails with the text that it returns.
+    // Makes it the SQL function host(), which gives 1, or fails with the text that it returns.
     void setFunction(std::function<const char*()> function)
     {
         function_ = std::move(function);
@@ -144,16 +144,16 @@ TEST_F(HostFunctions, MayListAnotherTableAndFailAsLocked)
 
 using Memory = TableTest;
 
-// JSON text is never cut and nothing of a text that was not finished gets into the next one.
+// JSON text is never cut, and no part of an unfinished text gets into the next one.
 TEST_F(Memory, ShortageLeavesNoPartialTextInAValueList)
 {
     Table table(database_, R"({"j":{"cpptype":"Json::objectValue"}})", "j text");
-    // Longer than the room that a JSON text begins with.
+    // Longer than the initial capacity of a JSON text.
     const std::string strJson =
         R"({"first":"a text that is not short","second":")" + std::string(200, 'x') + "\"}";
     const Json::Value jBefore = json("{\"j\":" + strJson + "}");
     const std::string strBefore = "a text that is not short (";
-    // Whether it is composed although the n-th allocation fails.
+    // Whether it is composed even though the n-th allocation fails.
     const auto isComposed = [&](int n) {
         Json::Value jRecord = jBefore;
         std::string strSql = strBefore;

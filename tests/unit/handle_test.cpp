@@ -9,7 +9,7 @@ using doubles::state;
 
 class Handle : public TableTest {
 protected:
-    // Those lines, and then the ones of a table that was not created.
+    // The given lines, and then those of a table that was not created.
     static Lines createFailed(const std::string& strError, const std::string& strSql,
                               Lines lines = {})
     {
@@ -59,7 +59,7 @@ TEST_F(Handle, ReportsEachMissingArgument)
                     EXPECT_EQ("", api.getErrMsg());
                     database_.run("drop table if exists " + strName_);
                 }
-    // A handle that is only made does not read member types, so a bad definition spoils none.
+    // Merely making a handle does not read member types, so a bad definition spoils none.
     VornJsonDbApi api(nullptr, strName_, jDefinition_, strCreate_);
     Json::Value jRecord = json(R"({"a":"x"})");
     EXPECT_EQ(-1, api.recSave(jRecord, true));

@@ -140,7 +140,7 @@ TEST_F(List, FailsWhenSqliteRefuses)
         expectSqlFailure(list(row.szRequest), select(row.szTail), row.szError);
 }
 
-// Rows with NULL in a member of a word that no row is read through are records.
+// A member of a word that cannot be read back does no harm while it is NULL.
 TEST_F(List, KeepsTheRowsBeforeTheBadOne)
 {
     Table table(database_, R"({"id":{"cpptype":"int"},"real":{"cpptype":"double"}})", "id, real");

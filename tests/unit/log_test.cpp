@@ -27,7 +27,7 @@ auto* const pRealVasprintf =
 
 }  // namespace
 
-// What the library calls instead of the real one.
+// The library calls this instead of the real one.
 extern "C" __attribute__((format(printf, 2, 0))) int vasprintf(char** pszText, const char* szFormat,
                                                                va_list arguments) noexcept
 {
@@ -37,7 +37,7 @@ extern "C" __attribute__((format(printf, 2, 0))) int vasprintf(char** pszText, c
     return iLength;
 }
 
-// With _FORTIFY_SOURCE it is this one.
+// With _FORTIFY_SOURCE it calls this one.
 extern "C" __attribute__((format(printf, 3, 0))) int __vasprintf_chk(char** pszText, int /*iFlag*/,
                                                                      const char* szFormat,
                                                                      va_list arguments) noexcept

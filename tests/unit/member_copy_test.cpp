@@ -39,7 +39,7 @@ TEST_F(MemberCopy, FillsAndOverwrites)
     // Null counts as a member.
     expectCopies(R"({"a":null,"b":1})", R"({"a":1,"b":null})", R"({"a":null,"b":1})",
                  R"({"a":1,"b":null})");
-    // Names count whole and in their case.
+    // Names are compared whole and case-sensitively.
     const char* szNames = R"({"A":2,"a":1,"a\u0000b":4,"a ":3})";
     expectCopies(R"({"a":1})", R"({"A":2,"a ":3,"a\u0000b":4})", szNames, szNames);
 }
@@ -53,7 +53,7 @@ TEST_F(MemberCopy, RefusesAnyOtherKind)
         blLogToStdout = blStdout;
         for (const char* szKind : {"[]", R"([{"a":1}])", R"("")", R"("x")", "1", "-1",
                                    "18446744073709551615", "1.5", "true", "false"}) {
-            // The destination is looked at first.
+            // The destination is checked first.
             for (const char* szSource : {R"({"a":1})", "{}", "[]", "null"})
                 expectCopies(szKind, szSource, szKind, szKind, badDestination);
             for (const char* szIn : {"null", "{}", R"({"a":1})"})

@@ -164,7 +164,7 @@ TEST_F(MemberTypes, KeepTheFirstDefinitionForEveryHandle)
     EXPECT_EQ(Lines{failed("!jType.isMember(strKey)")}, takeLog());
 }
 
-// In processes of their own, which have not kept anything under the empty name yet.
+// In separate processes, where nothing is known yet under the empty name.
 TEST_F(MemberTypes, RefuseAnEmptyNameAfterTheLookUps)
 {
     GTEST_FLAG_SET(death_test_style, "threadsafe");

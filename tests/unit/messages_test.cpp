@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-// Hosts read the log by its texts. data/messages.txt lists each of them: the library and its
-// sources hold these and no others, and each but the guards is logged by some test. A formatter, a
-// linter or a renaming that touches one is found here.
+// Hosts search the log for its texts. data/messages.txt lists all of them: the library and its
+// sources hold these and no others, and each but the guards is logged by some test. This catches a
+// formatter, a linter or a renaming that changes one.
 
 #include "support/doubles.h"
 
@@ -23,7 +23,7 @@ std::string contents(const std::filesystem::path& path)
     return {std::istreambuf_iterator<char>(file), {}};
 }
 
-// The listed texts but those below headings that begin with one of the words.
+// The listed texts, except those below headings that begin with one of the words.
 std::set<std::string> listedTexts(const std::string& strWithout)
 {
     const std::regex heading("# (?!" + strWithout + ").*");
@@ -38,7 +38,7 @@ std::set<std::string> listedTexts(const std::string& strWithout)
     return texts;
 }
 
-// An optimiser may leave out the guards, which it can prove not to fail.
+// An optimiser may leave out the guards, because it can prove that they never fail.
 #ifdef __OPTIMIZE__
 constexpr char kLeftOut[] = "guards";
 #else
@@ -131,7 +131,7 @@ void strikeOut(const std::string& strLine)
         it = shows(strFront, *it) ? missing.erase(it) : std::next(it);
 }
 
-// It takes the whole suite in one process to tell.
+// Only the whole suite in one process can tell.
 class EveryMessage : public testing::Environment {
 public:
     void SetUp() override

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What all record operations do alike where their statement fails or has to wait.
+// What all record operations do alike when their statement fails or has to wait.
 
 #include "support/record_calls.h"
 #include "support/rows.h"
@@ -11,7 +11,7 @@ protected:
     struct Row {
         Call call;
         Outcome success;
-        bool blCounts = false;  // the number of changed rows is looked at
+        bool blCounts = false;  // the number of changed rows is checked
     };
 
     static constexpr char kEve[] = R"({"data":{},"flag":false,"id":4,"name":"Eve","tags":[]})";
@@ -71,7 +71,7 @@ TEST_F(Operations, ReportTheErrorOfTheStatement)
     for (const Row& row : rows_) expectSqlFailure(row.call, row.success.strSql, "disk I/O error");
 }
 
-// The rows are changed all the same.
+// The rows are changed nevertheless.
 TEST_F(Operations, FailOnANegativeNumberOfChangedRows)
 {
     prepare_ = [] { doubles::state().changes = [] { return -7; }; };
@@ -80,7 +80,7 @@ TEST_F(Operations, FailOnANegativeNumberOfChangedRows)
         if (row.blCounts) expectSqlFailure(row.call, row.success.strSql, "Unknow Error!!");
 }
 
-// Only deletes give the number.
+// Only deletes return the number.
 TEST_F(Operations, AcceptAnyOtherNumberOfChangedRows)
 {
     prepare_ = [] { doubles::state().changes = [] { return 2147483647; }; };
@@ -104,7 +104,7 @@ TEST_F(Operations, ReportAnEarlierDuplicateAgain)
         // Handles do not share their error texts.
         EXPECT_EQ(-1, call.run(other, jOut));
         EXPECT_EQ("", other.getErrMsg());
-        // A success empties the text, but not the message.
+        // A success clears the text, but not the message.
         EXPECT_EQ(1, get("null").run(table_.api, jOut));
         EXPECT_EQ("DUPLICATE_PRIMARY_KEY", table_.api.getErrMsg());
         table_.api.setErrMsg("");

@@ -22,7 +22,7 @@ protected:
         });
     }
 
-    // Neither a connection nor a definition is looked at.
+    // Neither a connection nor a definition is needed.
     std::string strName_ = freshName();
     Json::Value jDefinition_;
     std::string strCreate_;
@@ -74,7 +74,7 @@ TEST_F(Paging, SortsDescendingOnlyForDesc)
         expectClause(strRequest + szDirection + "}", {" order by 'name' ASC"});
 }
 
-// Of every kind, and unchecked.
+// Of any kind, and unchecked.
 TEST_F(Paging, WritesLimitAndOffsetAsJson)
 {
     const auto expectValue = [this](const std::string& strValue, const std::string& strText) {

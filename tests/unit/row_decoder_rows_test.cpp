@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Later rows and statements, which are decoded by what is known of their columns: a host sees no
-// difference.
+// Later rows and statements, which are decoded by what is already known of their columns: a host
+// sees no difference.
 
 #include "support/rows.h"
 
@@ -10,7 +10,7 @@
 
 namespace {
 
-// How many members were looked up by name, or made, as the library does it for a row by itself.
+// How many members were looked up by name or made, as decoding a row from scratch does.
 int iLookUps = 0;
 
 }  // namespace
@@ -34,14 +34,14 @@ const Row kOtherSeven = {{"other"}, {"7"}};
 
 class KeptColumns : public DecoderTest {
 protected:
-    // Until nothing about the columns is new.
+    // Repeats the row until nothing about its columns is new.
     void warmUp()
     {
         for (int i = 0; i < 3; ++i) EXPECT_EQ(R"([{"i":8,"s":"7"}])", decoded({kUsual}));
     }
 };
 
-// What a host changes through the reference of recType holds from the next statement on.
+// What a host changes through recType's reference takes effect with the next statement.
 TEST_F(KeptColumns, FollowChangedTypes)
 {
     struct Case {
@@ -64,9 +64,9 @@ TEST_F(KeptColumns, FollowChangedTypes)
           {R"({"s":{"cpptype":""}})", "null", strNoType},
           {R"({"s":{"cpptype":5}})", "null", strNoType + "5"},
           {R"({"s":{"cpptype":null}})", "null", strNoType},
-          // No text at all: jsoncpp refuses to make one of it.
+          // Not a text at all, and jsoncpp refuses to convert it.
           {R"({"s":{"cpptype":[]}})", "Json::LogicError after null", ""},
-          // The columns are looked at in the order of the row.
+          // The columns are checked in the order of the row.
           {R"({"i":{"cpptype":[]},"s":{"cpptype":"double"}})", "null", strNoType + "double"},
           {R"({"s":null})", "null", failed("!jType.isMember(strName)")},
           {R"({"i":null})", "null", failed("!jType.isMember(strName)")},
@@ -101,7 +101,7 @@ TEST_F(KeptColumns, BelongToTheRow)
         EXPECT_EQ(R"([{"other":"7"}])", decoded({kOtherSeven}));
         EXPECT_EQ("[{},{}]", decoded({{{nullptr}, {nullptr}, 0}, {{nullptr}, {nullptr}, -1}}));
     }
-    // The first statement of a text looks at one column only.
+    // A first row with one column checks the type of that column only.
     warmUp();
     jTypes_["i"]["cpptype"] = "string";
     EXPECT_EQ(R"([{"s":"7"},{"i":"8","s":"7"}])", decoded({kSeven, kUsual}));
@@ -109,7 +109,7 @@ TEST_F(KeptColumns, BelongToTheRow)
 
 TEST_F(KeptColumns, KeepTheirTypesUntilTheStatementEnds)
 {
-    // Its column is new to the place.
+    // Its column is new at this position.
     EXPECT_EQ(R"([{"other":"7"}])", decoded({kOtherSeven}));
     state().exec = [this](sqlite3*, const char*, doubles::RowCallback callback, void* arg, char**) {
         Row row = kSeven;

@@ -16,7 +16,7 @@ const std::string kTypesAreNoObject = utilFailed("jType[strJsonName].type() != J
 
 class RowDecoder : public DecoderTest {
 protected:
-    // The log of a row whose table has no types, from the check that asked for them on.
+    // The log of a row whose table has no types, from the check that asked for them onwards.
     static Lines undeclaredLines(const std::string& strCheck, const Table& table)
     {
         Lines lines = statementStopped(fieldFailed(kUndeclared));
@@ -52,7 +52,7 @@ const char kDecoded[] = R"({
     "jo":  {"'{\"k\":{\"l\":[]}}'": {"k":{"l":[]}}, "'[1]'": [1]},
     "ja":  {"'[\"\u00e9\",-1]'": ["\u00e9",-1], "'{}'": {}}})";
 
-// In the first rows after another column, as in the later ones, which are decoded in another way.
+// In the first row after another column, and in later ones, which are decoded differently.
 TEST_F(RowDecoder, ReadsEachTypeInItsOwnWay)
 {
     const Json::Value jDecoded = json(kDecoded);
@@ -157,7 +157,7 @@ TEST_F(RowDecoder, MakesAMemberNullIfItIsNestedTooDeeply)
         const std::string strNested = std::string(nLevels, '[') + std::string(nLevels, ']');
         EXPECT_EQ("[{\"i\":1,\"j\":" + (1000 < nLevels ? "null" : strNested) + "}]",
                   rowsOf("select '" + strNested + "' as j, 1 as i"));
-        // The reader is in order afterwards.
+        // The reader still works afterwards.
         EXPECT_EQ(R"([{"j":[1]}])", rowsOf("select '[1]' as j"));
     }
 }
@@ -226,7 +226,7 @@ TEST_F(RowDecoder, AsksForMissingTypesAtEveryRow)
     EXPECT_EQ(lines, takeLogWithoutTypes());
 }
 
-// At places that no row of the process had before.
+// At positions that no row of the process has had before.
 TEST_F(RowDecoder, LooksUpANamelessColumnLikeAnyOther)
 {
     for (std::size_t nOthers : {70U, 80U}) {
@@ -241,7 +241,7 @@ TEST_F(RowDecoder, LooksUpANamelessColumnLikeAnyOther)
     }
 }
 
-// The first to ask for the types of a table is the decoder, which has no definition.
+// The first to ask for a table's types is the decoder, which has no definition.
 TEST_F(RowDecoder, SpoilsTheTypesOfATableThatNobodyAskedForBefore)
 {
     Table other(database_, R"({"s":{"cpptype":"string"}})", "s");

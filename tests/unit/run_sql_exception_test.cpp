@@ -20,7 +20,7 @@ protected:
                       "(a,s) values(1,'a text that is not short'),(2,'b')");
     }
 
-    // The n-th allocation in the row callback fails from now on; SQLite itself has its own.
+    // The n-th allocation in the row callback fails from now on; SQLite has its own allocator.
     static void failAllocation(int n)
     {
         state().exec = [n](sqlite3* pDb, const char* szSql, doubles::RowCallback callback,
@@ -34,7 +34,7 @@ protected:
 
     int select() { return table_.api.runSqlEx(strSelect_, callback_, &rows_); }
 
-    // No statement is open, no mutex held, no error line was written, the text ran so many times.
+    // No statement is open, no mutex held, no error line written, and the text ran that often.
     void expectCalm(std::size_t nAttempts = 1)
     {
         EXPECT_EQ(Lines(), takeLog());
@@ -49,7 +49,7 @@ protected:
         }).join();
     }
 
-    // The next statement is not touched by what was thrown before.
+    // The next statement is not affected by what was thrown before.
     void expectSound(const std::string& strRows)
     {
         state().exec = nullptr;
@@ -67,7 +67,7 @@ protected:
     Json::Value rows_;
 };
 
-// The reader of JSON text is among what runs out of memory.
+// Even the reader of JSON text runs out of memory.
 TEST_F(CallbackException, FromAnyAllocationReachesTheHost)
 {
     using Case = std::pair<std::string, const char*>;

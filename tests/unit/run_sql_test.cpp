@@ -19,7 +19,7 @@ std::vector<unsigned> sleeps(std::size_t nTimes)
     return std::vector<unsigned>(nTimes, 10000U);
 }
 
-// Takes down the rows, and stops at the text "stop".
+// Records the rows, and stops at the text "stop".
 int collect(void* arg, int nColumns, char** values, char** names)
 {
     auto& strRows = *static_cast<std::string*>(arg);
@@ -75,7 +75,7 @@ protected:
             EXPECT_EQ(sleeps(nLocked), state().sleeps);
             EXPECT_EQ(0 > iResult ? strError : "", lastSqlError());
         }
-        // With a callback nobody counts.
+        // With a callback no changes are counted.
         state().exec = execOfEnds(ends);
         EXPECT_EQ(blDone ? 0 : iResult, table_.api.runSqlEx("a text", collect));
         EXPECT_EQ(blDone ? "" : strError, lastSqlError());

@@ -41,8 +41,8 @@ TEST_F(Save, ReturnsTheStoredRow)
     const struct {
         const char* szWord;
         const char* szColumn;  // its type and default
-        const char* szGiven;   // null where the record has no such member
-        const char* szStored;  // null where the row has none
+        const char* szGiven;   // null if the record has no such member
+        const char* szStored;  // null if the row has none
     } members[] = {
         {"int", "integer primary key", nullptr, "1"},
         {"string", "text default 'x'", nullptr, R"("x")"},

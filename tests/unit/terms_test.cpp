@@ -20,7 +20,7 @@ const struct {
     {Group::kBare,
      {"int", "unsigned int", "unsigned", "long", "unsigned long", "long long", "unsigned long long",
       "float", "double", "uid_t", "time_t"}},
-    // Unknown ones: words count whole and in their case.
+    // Unknown ones: words are compared whole and case-sensitively.
     {Group::kBare,
      {"", "String", "string ", "Bool", "Json::value", "std::string", "text", "string\\u0000"}},
 };
@@ -189,7 +189,7 @@ TEST_F(Terms, RefuseABadFieldOrList)
     const Composed noList = refused("jList.type() != Json::arrayValue");
     for (bool blStdout : {false, true}) {
         blLogToStdout = blStdout;
-        // The value is not looked at.
+        // The value is never read.
         for (const char* szField : {"Name", "name ", "vornSqlWhereFilter", "limit"}) {
             expectMatch(table_, szField, "{}", noMember);
             for (const char* szList : {R"(["x"])", "[]", R"("no list")"})

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The time helpers. No test looks at the clock or the time zone of the machine.
+// The time helpers. No test depends on the machine's clock or time zone.
 
 #include "support/database.h"
 #include "support/time_zone.h"
@@ -56,7 +56,7 @@ std::string afterNow(int iOffset, int iType)
     return endOf([&](std::string& strOut) { return getTimeAfterNow(iOffset, strOut, iType); });
 }
 
-// A time as text, which is the text too when it is the present one.
+// A time as text, which has to be the same text when it is the present time.
 std::string converted(long long iTime, int iType)
 {
     const long lTime = static_cast<long>(iTime);
@@ -107,7 +107,7 @@ TEST_F(TimeText, ShowsUtcAndLocalTimeInBothLayouts)
     }
 }
 
-// The host says when a changed zone counts: the library calls no tzset.
+// The host decides when a changed zone takes effect: the library never calls tzset.
 TEST_F(TimeText, FollowsAChangedZoneAfterTzset)
 {
     const TimeZone zone("AAA-5:30");
@@ -164,7 +164,7 @@ TEST_F(TimeText, CoversTheCalendarFromItsFirstSecondToItsLast)
         for (int iType : {0, 1, 2, 3, 4, 5, 6, 7, 12}) {
             if (!isLong(iTime)) continue;
             const bool blFits = kFirst <= iTime && kLast >= iTime;
-            // The conversion comes before the look at the layout.
+            // The conversion comes before the check of the layout.
             const std::string strFailure = !blFits     ? (0 == iType % 2 ? kNoLocal : kNoUtc)
                                            : 2 > iType ? badType(iType)
                                                        : "";
@@ -194,7 +194,7 @@ TEST_F(TimeText, FailsWhenTheCLibraryFails)
     }
 }
 
-// The time that a host got from the C library stays as it was.
+// The time that a host has from the C library stays as it was.
 TEST_F(TimeText, UsesNoStaticBuffer)
 {
     const time_t lOther = 1700000000;

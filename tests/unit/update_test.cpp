@@ -36,7 +36,7 @@ TEST_F(UpdateByWhere, ComposesOneStatement)
         {R"({"name":null})", "id=2", "name=''", "1Ann1,20,3O'Brien1"},
         {R"({"flag":null})", "id=1", "flag=0", "1Ann0,2Bob0,3O'Brien1"},
         {R"({"flag":true,"undeclared":5})", "id=2", "flag=1", "1Ann1,2Bob1,3O'Brien1"},
-        // A raw filter beside the values is no column, of whatever kind it is.
+        // A raw filter among the values is not a column, whatever its kind.
         {R"({"flag":true,"vornSqlWhereFilter":"id=3"})", "id=2", "flag=1", "1Ann1,2Bob1,3O'Brien1"},
         {R"({"flag":true,"vornSqlWhereFilter":5})", "id=2", "flag=1", "1Ann1,2Bob1,3O'Brien1"},
         // Kept: the condition is taken unchanged.
@@ -136,7 +136,7 @@ TEST_F(UpdateByFilter, ComposesOneStatement)
         {R"({"name":["Ann"]})", R"({"id":7})", "id=7", "name in ('Ann' )", "2Bob0,3O'Brien1,7Ann1"},
         {R"({"vornSqlWhereFilter":"id > 1"})", R"({"flag":false})", "flag=0", " id > 1 ",
          "1Ann1,2Bob0,3O'Brien0"},
-        // Kept: sorting and paging do not count here.
+        // Kept: sorting and paging are ignored here.
         {R"({"flag":true,"limit":1,"sort_by":"id"})", R"({"flag":false})", "flag=0", "flag=1",
          "1Ann0,2Bob0,3O'Brien0"},
         {R"({"id":9})", R"({"flag":false})", "flag=0", "id=9", kBefore},

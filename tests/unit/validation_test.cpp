@@ -14,7 +14,7 @@ const char* const kNonObjects[] = {"null", "true", "5",     "-5", "1844674407370
 
 class DefaultValues : public TableTest {
 protected:
-    // Filling mode never fails; checking mode changes nothing and fails where it logs.
+    // Filling mode never fails; checking mode changes nothing and fails exactly when it logs.
     static void expectFill(Table& table, bool blCheckOnly, const std::string& strRecord,
                            const std::string& strFilled, const Lines& lines = {})
     {
@@ -129,7 +129,7 @@ TEST_F(DefaultValues, AreAbsentInATableWithoutMembers)
 
 class TypeCheck : public TableTest {
 protected:
-    // The check fails with the line of the error family, or passes where it is empty.
+    // The check fails with the line of the error family, or passes if the line is empty.
     static void expectLine(Table& table, const std::string& strRecord, const std::string& strLine)
     {
         SCOPED_TRACE(strRecord);

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Column lists, and value lists of records that hold no percent sign; the definition and the member
-// types that they are made by.
+// Column lists, and value lists of records without a percent sign; the definition and the member
+// types that they are made from.
 
 #include "support/composed.h"
 #include "support/lookups.h"
@@ -166,7 +166,7 @@ TEST_F(ValueLists, LeaveTheTextAloneWhenAnAccessorThrows)
     for (const char* szValue : {"{}", "[1]"}) expectOfWords("string", szValue, {"", "T"});
 }
 
-// Kept: words that other consumers know. A word matters only where the record holds the member.
+// Kept: words that other consumers know. A word matters only if the record holds the member.
 TEST_F(ValueLists, RefuseAnyOtherWord)
 {
     for (const std::string& strWord : split(kRefused, '|'))
@@ -222,7 +222,7 @@ TEST_F(ValueLists, FollowTheFirstDefinitionUnderAName)
     expectColumns(more, R"({"a":1,"c":2})", "a,c");
 }
 
-// What a host changes through recType's reference holds from the next call on.
+// What a host changes through recType's reference takes effect with the next call.
 TEST_F(ValueLists, ReadTheWordFromTheTypesAsTheyAre)
 {
     Json::Value& jType = VORN_JSON_DB::recType(abc_.jDefinition, abc_.strName)["a"];
@@ -254,7 +254,7 @@ TEST_F(ValueListTypes, InsertWhatTheDefinitionLacks)
         EXPECT_EQ(Lines(), takeLog());
         Json::Value jRecord = json(R"({"a":1})");
         EXPECT_EQ(0, api.SqlExpandMemberSymbol(strSql, jRecord));
-        // It finds what the column list has left, if that came before.
+        // It finds what the column list has inserted, if that came before.
         const bool blInserted = blColumns && std::string(bad.szDefinition) != bad.szLater;
         EXPECT_EQ(named(blInserted ? lookUp(szNoMembers, bad.szLater, "-")
                                    : lookUp(bad.szCondition, bad.szDefinition, "-")),

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Every attack reaches its aim at a host without checks, and at the example it does not.
+// Every attack succeeds against a host without checks, and fails against the example.
 
 #include "attacks.h"
 
@@ -42,7 +42,7 @@ TEST_P(Attacked, IsHitOnlyWhereNothingStopsTheAttack)
         EXPECT_EQ(blHit, attack.worked(world));
         if (Layers::kNone == layers) continue;
         EXPECT_EQ("s3cr3t", world.database.value("select secret from vault"));
-        // An update by itself is not wrong, but what the host makes of it later.
+        // The update itself does no harm, but what the host makes of it later does.
         if (!blHit && (blGuard || std::string::npos == attack.strLines.find(kHostSavesAgain))) {
             EXPECT_EQ(world.strBefore, world.contents());
         }

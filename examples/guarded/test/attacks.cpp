@@ -87,7 +87,7 @@ std::string nested(unsigned uLevels)
                   "}");
 }
 
-// Guard and fence stop each of them, either of the two alone.
+// Either of guard and fence alone stops each of them.
 std::vector<Attack> againstEither()
 {
     // What follows the cut text is outside of quotes: ('x,7,' and then the text.
@@ -149,7 +149,7 @@ std::vector<Attack> againstEither()
     };
 }
 
-// The fence alone does not stop these. Some are a good command by itself.
+// The fence alone does not stop these. Some are good commands in themselves.
 std::vector<Attack> againstTheGuard()
 {
     const char* kGreatest = R"({"id":2147483647})";

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What a stranger may send to the host of examples/guarded to reach more than he is given.
+// What a stranger may send to the host of examples/guarded to get more than is granted.
 #pragma once
 
 #include "world.h"
@@ -16,7 +16,7 @@ struct Attack {
     unsigned uMoreNotes = 0;  // in the table beforehand
     // What the guard makes of the first line.
     enum class Guard { kRefuses, kLimits, kLetsThrough } guard = Guard::kRefuses;
-    // Where it ends when only SQLite's own means surround the call.
+    // What becomes of it if only SQLite's own means surround the call.
     enum class Fence { kStops, kLetsThrough } fence = Fence::kLetsThrough;
 };
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What SQLite refuses inside the fence, whatever the statement comes from.
+// What SQLite refuses inside the fence, wherever the statement comes from.
 
 #include "world.h"
 
@@ -17,7 +17,7 @@ protected:
             "insert into note values (1,'a'),(2,'b'); insert into vault values ('s')");
     }
 
-    // Runs the statements without the fence, and makes it anew.
+    // Runs the statements without the fence, and then recreates it.
     void rebuild(const std::string& strSql)
     {
         pFence_.reset();
@@ -25,7 +25,7 @@ protected:
         pFence_ = std::make_unique<Fence>(database_.get(), "note");
     }
 
-    // 0, or -1 where SQLite refuses the statement and says why.
+    // 0, or -1 if SQLite refuses the statement and says why.
     int execute(const std::string& strSql)
     {
         const auto ignore = [](void*, int, char**, char**) { return 0; };
@@ -85,7 +85,7 @@ TEST_F(FenceTest, GivesNoFurtherAccessAndNoneBetweenCalls)
     const char* kDelete = "delete from note where id=1";
     const char* kRowid = "select last_insert_rowid() from note";
     const std::vector<std::string> never = {
-        // Other tables, and the names and numbers of SQLite.
+        // Other tables, including SQLite's own.
         "select * from vault", "select count(*) from vault", "insert into vault values ('x')",
         "update vault set secret=''", "delete from vault", "drop table vault",
         "select * from sqlite_sequence", "insert into sqlite_sequence values ('note',9)",
@@ -218,7 +218,7 @@ TEST_F(FenceTest, IsDefensiveAndDoesNotTrustTheSchema)
 }
 
 // The guard lets these through: they are good requests, but for the size of the table. Each call
-// has all its steps.
+// may take all its steps.
 TEST_F(HostTest, StopsScansOfALargeTable)
 {
     World large(World::Layers::kBoth, 200000);

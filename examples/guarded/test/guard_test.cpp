@@ -24,7 +24,7 @@ std::string refusal(const std::string& strLine, const Json::Value& jTypes = note
     return std::string();
 }
 
-// Of a text inside of quotes.
+// The same for a text in quotes.
 std::string refusalOfText(const std::string& strText)
 {
     return refusal(list(R"({"author":")" + strText + "\"}"));
@@ -105,7 +105,7 @@ TEST_F(Guard, RefusesControlCharacters)
     EXPECT_EQ(kText, refusalOfText("\xc2\x9b")) << "unescaped";
 }
 
-// In the second list are the neighbours of what is refused.
+// The second list has the neighbours of what is refused.
 TEST_F(Guard, RefusesInvalidUtf8)
 {
     for (const char* szText :
@@ -123,7 +123,7 @@ TEST_F(Guard, RefusesInvalidUtf8)
         EXPECT_EQ("", refusalOfText(szText)) << testing::PrintToString(szText);
 }
 
-// A table of somebody else's has other words.
+// Another table may have other words.
 TEST_F(Guard, KnowsTheOtherTypeWords)
 {
     const Json::Value jTypes = json(

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 // Prints how deep a JSON value may be nested before jsoncpp overflows a stack of 8 MiB. Every depth
-// is tried in a process of its own. With an argument the program fails where one is less than that.
+// is tried in a process of its own. With an argument the program fails if one is less than that.
 
 #include <json/reader.h>
 #include <json/writer.h>

@@ -46,7 +46,7 @@ for ((limit = step; limit <= most; limit += step)); do
     [ "$second" != "$right_get" ] || went_on=$((went_on + 1))
 done
 
-# From the least memory with which it answers a short line at all.
+# From the least memory with which it answers even a short line.
 long="$get$(repeated 8000 ' ')"
 started=0
 for ((fine = step; fine <= most && started < 20; fine += 16)); do

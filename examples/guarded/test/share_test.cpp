@@ -58,10 +58,10 @@ protected:
     }
 
     Database database_;
-    std::unique_ptr<Host> pHost_;  // after what was in the file before it
+    std::unique_ptr<Host> pHost_;  // made on what is in the file already
 };
 
-// Those that begin like one of these.
+// Makes the statements fail that begin like one of these.
 void failStatements(const std::vector<std::string>& beginnings)
 {
     doubles::state().exec = [beginnings](sqlite3* pDb, const char* szSql,

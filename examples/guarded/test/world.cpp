@@ -11,7 +11,7 @@ namespace {
 
 constexpr int kReaderDepth = 12000;
 
-// As a host that never thought of strangers reads a line: deep, and the last of two equal keys.
+// As a host that never thought of strangers reads a line: at any depth, the last of equal keys.
 Json::Value readAnything(const std::string& strLine)
 {
     Json::CharReaderBuilder builder;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// The example's tables, the table of somebody else beside them, and the host with none, one or both
-// of its layers.
+// The example's tables, somebody else's table beside them, and the host with none, one or both of
+// its layers.
 #pragma once
 
 #include "support/database.h"

@@ -14,13 +14,13 @@ import subprocess
 SUITES = ("unit", "exhaustive", "hostile", "docs", "host")
 HOSTS = (("malloc_host",), ("cxx11_host",), ("plugin_host", "libplugin.so"))
 GIBIBYTE = 1 << 30
-# What a mutant may take is bounded in processor time, so that a busy machine makes no difference.
+# The limit for a mutant is in CPU time, so that a busy machine makes no difference.
 TIMES_THE_NORMAL_RUN = 10
 WAITING_SECONDS = 3600
 
 
 class Build:
-    """A complete build folder: its commands, its tests, and which sources stand on which header."""
+    """A complete build folder: its commands, its tests, and which sources depend on which header."""
 
     def __init__(self, project, folder, texts):
         self.project = project
@@ -40,7 +40,7 @@ class Build:
 
     @staticmethod
     def without_options(command):
-        """Without warnings, debug information and a compiler cache. Only a missing result is an error."""
+        """The command without warnings, debug information and compiler cache; only a missing return is an error."""
         words = [word for word in shlex.split(command) if not word.startswith("-W") and "-g" != word]
         return [*words[next(i for i, word in enumerate(words) if word.endswith("++")):], "-Werror=return-type"]
 
@@ -51,7 +51,7 @@ class Build:
         return any(self.stands_on(texts, name, path) for name in included)
 
     def matching_tests(self, path):
-        """The filter for the unit tests whose files are named like the source; they are tried first."""
+        """The filter for the unit tests whose files are named after the source; they are tried first."""
         stem = os.path.splitext(os.path.basename(path))[0]
         names = set()
         for name in glob.glob(os.path.join(self.project, "tests", "unit", stem + "*_test.cpp")):
@@ -61,7 +61,7 @@ class Build:
 
 
 class Judge:
-    """A folder with a copy of the one mutated file and the library that is made of it."""
+    """A folder with a copy of the mutated file and the library built from it."""
 
     def __init__(self, build, folder):
         self.build = build
@@ -75,7 +75,7 @@ class Judge:
             os.makedirs(os.path.join(self.folder, name))
 
     def measure(self, paths):
-        """Judges the library as it is, which has to pass, and notes the time of each stage."""
+        """Judges the unchanged library, which must pass, and records the time of each stage."""
         self.prepare()
         if not self.make_library([]):
             raise SystemExit("the library cannot be linked")
@@ -135,7 +135,7 @@ class Judge:
                                    stderr=subprocess.DEVNULL).returncode
 
     def passes(self, command, seconds):
-        """Whether the program ends with 0 within its bounds of time, memory and file size."""
+        """Whether the program exits with 0 within its limits for time, memory and file size."""
         def bounds():
             resource.setrlimit(resource.RLIMIT_CPU, (int(seconds) + 1, int(seconds) + 5))
             resource.setrlimit(resource.RLIMIT_AS, (4 * GIBIBYTE, 4 * GIBIBYTE))
@@ -152,7 +152,7 @@ class Judge:
         except subprocess.TimeoutExpired:
             return False
         finally:
-            # What the tests themselves started goes with them.
+            # Processes that the tests started are killed with them.
             try:
                 os.killpg(process.pid, signal.SIGKILL)
             except ProcessLookupError:

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: MIT
-"""All mutants of a source file: each is one small change that leaves every line where it is."""
+"""All mutants of a source file: each one is a small change that keeps every line in its place."""
 
 import hashlib
 import re
@@ -35,7 +35,7 @@ class Mutant:
 
 
 def scope_of(lines, index):
-    """The name of the function, type or constant that has the line."""
+    """The name of the function, type or constant that contains the line."""
     for line in reversed(lines[:index + 1]):
         name = re.match(r"(?=[A-Za-z\[]).*?(?:(?:class|struct) (\w+)|(~?\w+)[({\[]|(\w+) =)", line)
         if name:
@@ -48,7 +48,7 @@ def shown(text):
 
 
 def mutated(source, begin, end, new):
-    """The file's text with the change. What a failed check logs stays as it was."""
+    """The file's text with the change applied. The text that a failed check logs stays unchanged."""
     text = source.text
     for i, token in enumerate(source.tokens):
         if token.text not in ("FAILED", "REPORT"):
@@ -94,7 +94,7 @@ def numbers(token):
 
 
 def strings(token):
-    """Emptied, and without the last character."""
+    """The string emptied, and the string without its last character."""
     if '""' == token.text:
         yield token.begin, token.end, '"x"'
         return
@@ -105,7 +105,7 @@ def strings(token):
 
 
 def conditions(source):
-    """Conditions of checks, if, while, for and "?", turned round."""
+    """Negated conditions of checks, if, while, for and "?"."""
     for i, token in enumerate(source.tokens):
         if token.text in CHECKS or token.text in ("if", "while"):
             begin, end = i + 2, source.partner[i + 1]
@@ -126,8 +126,8 @@ def conditions(source):
 
 
 def is_turned_otherwise(source, begin, end):
-    """Whether another mutant is the same: of a single comparison, a lone "!" or a check. A condition
-    that declares a variable cannot be turned."""
+    """Whether another mutant has the same effect, as for a single comparison, a lone "!" or a check. A
+    condition that declares a variable cannot be negated."""
     texts = [source.tokens[j].text for j in source.at_top(begin, end)]
     if "const" == texts[0]:
         return True
@@ -137,7 +137,7 @@ def is_turned_otherwise(source, begin, end):
 
 
 def statements(source):
-    """Statements that are no declarations, dropped."""
+    """Removed statements, except declarations."""
     begin = 0
     i = 0
     enclosing = []
@@ -147,7 +147,7 @@ def statements(source):
             enclosing.append(begin)
             begin = i + 1
         elif "}" == token.text:
-            # Behind a lambda or a list of values the statement goes on.
+            # After a lambda or a list of values, the statement continues.
             begin = enclosing.pop()
             if source.text_of(i + 1) not in (",", ")", ";", "("):
                 begin = i + 1
@@ -176,7 +176,7 @@ def mutants(path, text, enumerators):
 
 
 def enumerators(texts):
-    """Each scoped enumerator with the one that follows it in its enumeration."""
+    """Maps each scoped enumerator to the next one in its enumeration."""
     following = {}
     for text in texts:
         for name, body in re.findall(r"enum class (\w+) \{([^}]*)\}", text):

@@ -1,8 +1,8 @@
 # SPDX-License-Identifier: MIT
 """Mutation testing of src/: every mutant, or a sample of them, judged by the tests.
 
-What was found is kept beside the build, so that a run can be stopped and goes on where it was. A killed
-mutant is tried again when its file changes, a survivor also when the tests do.
+Results are kept next to the build, so a run can be stopped and later continues where it stopped. A killed
+mutant is tried again when its file changes, a survivor also when the tests change.
 """
 
 import argparse
@@ -58,7 +58,7 @@ def texts_of(pattern):
 
 
 def sample_of(found, count, seed):
-    """The same number of each file's mutants in proportion, and at least one of each file."""
+    """A sample with the same proportion of each file's mutants, and at least one mutant per file."""
     chosen = []
     total = sum(len(of_file) for of_file in found.values())
     for path, of_file in found.items():
@@ -97,7 +97,7 @@ def judge_all(pending, state, build, workers, paths):
 
 
 def listed_survivors():
-    """(file and function, line of code, change) of each survivor that is known, with the reason."""
+    """Maps (file and function, line of code, change) of each known survivor to the reason."""
     reasons = {}
     places, changes = [], []
     with open(LISTED) as file:
@@ -120,7 +120,7 @@ def place(mutant):
 
 
 def report(chosen, found, guards, state):
-    """Prints the tables; true when the list names exactly the survivors."""
+    """Prints the tables; returns true if the list names exactly the survivors."""
     results = {mutant.key: state.result(mutant) for mutant in chosen}
     valid = [mutant for mutant in chosen if results[mutant.key] not in (None, "invalid")]
     survivors = [mutant for mutant in valid if "survived" == results[mutant.key]]
@@ -141,7 +141,7 @@ def report(chosen, found, guards, state):
         reason = reasons.get(place(mutant), "NOT LISTED")
         print(f"{mutant.path}:{mutant.line}:{mutant.column}: {mutant.change}\n    {mutant.code}\n    {reason}")
     alive = {place(mutant) for mutant in survivors}
-    # A sample does not tell about the others.
+    # A sample says nothing about the other mutants.
     unknown = {place(mutant) for of_file in found.values() for mutant in of_file if results.get(mutant.key) is None}
     stale = [listed for listed in reasons if listed[0].split(",")[0] in found and listed not in alive | unknown]
     for listed in stale:

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: MIT
-"""C++ source text as tokens, with the brackets matched."""
+"""Splits C++ source text into tokens and matches the brackets."""
 
 import re
 
@@ -26,7 +26,7 @@ class Token:
 
 
 class Source:
-    """A file's text, its tokens without comments, directives and attributes, and each bracket's partner."""
+    """A file's text, its tokens (without comments, directives and attributes), and each bracket's partner."""
 
     def __init__(self, text):
         self.text = text
@@ -45,13 +45,13 @@ class Source:
         return self.tokens[i].text if i < len(self.tokens) else ""
 
     def at_top(self, begin, end):
-        """The tokens between two others that stand in no brackets of their own."""
+        """The tokens between two others that are not inside further brackets."""
         i = begin
         while i < end:
             yield i
             i = self.partner.get(i, i) + 1
 
     def is_spaced(self, i):
-        """Whether blanks stand on both sides, as the formatter has it around binary operators only."""
+        """Whether there are spaces on both sides; the formatter puts them only around binary operators."""
         token = self.tokens[i]
         return self.text[token.begin - 1].isspace() and self.text[token.end].isspace()

@@ -17,7 +17,7 @@ constexpr char kLocked[] = "database is locked";
 // The locks of an INSERT are SHARED, RESERVED and EXCLUSIVE, in this order; the fourth is that of
 // its re-selection.
 constexpr int kReselection = 4;
-// More often than a call tries.
+// More times than a call tries.
 constexpr int kAlways = 1000;
 
 class Busy : public HostTest {
@@ -25,13 +25,13 @@ protected:
     ~Busy() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
 };
 
-// The n-th lock of so many attempts is held.
+// The n-th lock of that many attempts is held.
 struct Held {
     const char* szOperation;
     int nLock;
     int nHeld;
     int iResult;
-    // How many rows are new afterwards, or how often a list holds all records.
+    // How many rows are new afterwards, or how many times a list holds all records.
     int nTimes;
     const char* szColumns = kWithoutKeys;
     const char* szError = kLocked;
@@ -74,7 +74,7 @@ protected:
         takeStatements();
     }
 
-    // All records, so many times.
+    // All records, that many times.
     Json::Value all(int nTimes) const
     {
         Json::Value jRecords(Json::arrayValue);
@@ -83,7 +83,7 @@ protected:
         return jRecords;
     }
 
-    // How many rows there are, beyond those of the beginning, that meet the condition.
+    // How many rows beyond the initial ones meet the condition.
     int nAdded(const char* szCondition)
     {
         return std::stoi(host_.database.value(
@@ -132,7 +132,7 @@ INSTANTIATE_TEST_SUITE_P(Locks, BusyAt, testing::ValuesIn(everyHeld()), [](const
                      kWithKeys == held.szColumns ? "with keys" : "without keys"});
 });
 
-// Also the locks that a connection takes before its first statement. Only an INSERT into a table
+// Even at the locks that a connection takes before its first statement. Only an INSERT into a table
 // with keys fails, at the lock of its re-selection.
 TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
 {
@@ -142,7 +142,7 @@ TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
             const DiskFile file({journal, operation.blNeedsTable});
             std::string strUndisturbed;
             int nFailures = 0;
-            // None at first. No lock has the number after the last that is ever taken.
+            // None at first. The loop ends after the last lock that is ever taken.
             for (int nHeld = 0, nFailed = 1; 0 < nFailed; ++nHeld) {
                 file.restore();
                 {

@@ -13,7 +13,7 @@ Plan plan;
 int nCounted = 0;
 int nFailed = 0;
 
-// Counts an operation; whether it has to fail.
+// Counts an operation, and tells whether it has to fail.
 bool isDue(Kind kind)
 {
     if (0 == (plan.uKinds & kind)) return false;
@@ -35,7 +35,7 @@ sqlite3_file* real(sqlite3_file* pFile)
     return static_cast<File*>(pFile)->real();
 }
 
-// A method of the file, which fails with that status where the plan says so.
+// A method of the file, which fails with that status if the plan says so.
 template <auto method, Kind kind, int iStatus, typename... Arguments>
 int pass(sqlite3_file* pFile, Arguments... arguments)
 {
@@ -60,7 +60,7 @@ int writeFile(sqlite3_file* pFile, const void* pBytes, int nBytes, sqlite3_int64
     return plan.blDiskFull ? SQLITE_FULL : SQLITE_IOERR_WRITE;
 }
 
-// Nothing here loses its power, so the real disk need not be waited for.
+// There is no power failure here, so the real disk need not be waited for.
 int syncFile(sqlite3_file*, int)
 {
     return isDue(kSync) ? SQLITE_IOERR_FSYNC : SQLITE_OK;
@@ -124,8 +124,7 @@ int accessFile(sqlite3_vfs* pVfs, const char* szName, int iFlags, int* pOut)
     return realVfs(pVfs)->xAccess(realVfs(pVfs), szName, iFlags, pOut);
 }
 
-// Everything that has no file to fail is the default VFS's own: it does not look at its first
-// argument.
+// Everything without a file is left to the default VFS: it ignores its first argument.
 sqlite3_vfs overDefault()
 {
     sqlite3_vfs* const pDefault = sqlite3_vfs_find(nullptr);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// A VFS over the default one whose operations fail where a plan says so.
+// A VFS over the default one whose operations fail as planned.
 #pragma once
 
 namespace fault_vfs {
@@ -7,7 +7,7 @@ namespace fault_vfs {
 // To be handed to sqlite3_open_v2; registered by the first call.
 const char* name();
 
-// The kinds of operations, a bit each.
+// The kinds of operations, one bit each.
 enum Kind : unsigned {
     kOpen = 1,
     kRead = 2,
@@ -35,7 +35,7 @@ struct Plan {
     bool blDiskFull = false;
 };
 
-// From now on; the counts begin anew.
+// Takes effect at once; the counts start again.
 void follow(const Plan& plan);
 // Nothing fails any more; the counts stay.
 void lift();

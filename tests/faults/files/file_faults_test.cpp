@@ -20,8 +20,8 @@ struct Fault {
     // How many operations in a row fail.
     int nLength;
     bool blDiskFull = false;
-    // The disk recovers while the operation is still under way, or what is rare fails: for the long
-    // run only.
+    // The disk recovers while the operation is still running, or something rare fails: only in the
+    // long run.
     bool blLongRun = false;
 };
 
@@ -163,7 +163,7 @@ INSTANTIATE_TEST_SUITE_P(
                          std::get<1>(tested.param).szName, std::get<2>(tested.param).szName});
     });
 
-// Without it a loop could end at its first point and prove nothing.
+// Otherwise a loop could end at its first point and prove nothing.
 TEST(FileFaultsReach, EveryKindOfOperation)
 {
     for (unsigned uKind = kOpen; uKind < kLock; uKind *= 2) {

@@ -43,7 +43,7 @@ DiskFile::DiskFile(const Form& form)
                  ("vornjsondb-faults-" + std::to_string(getpid()) + "-" + std::to_string(++iCount));
     strFirstState_ = strFolder_ + "/first";
     strPath_ = strFolder_ + "/db";
-    fs::remove_all(strFolder_);  // of a process that had this number and was killed
+    fs::remove_all(strFolder_);  // of a killed process that had the same id
     fs::create_directory(strFolder_);
     Database(strFirstState_, fault_vfs::name()).run(firstState(form));
     restore();
@@ -74,7 +74,7 @@ std::string DiskFile::contents() const
 Host::Host(const DiskFile& file)
     : database(file.path(), fault_vfs::name()), table(untouched(database))
 {
-    // WAL: every commit is carried over into the database at once.
+    // WAL: every commit is copied into the database at once.
     sqlite3_wal_autocheckpoint(database.get(), 1);
 }
 

@@ -49,7 +49,7 @@ public:
     }
 
     // After an operation, whatever failed in it: nothing is stuck, the file has one of these
-    // contents, and the handle works on.
+    // contents, and the handle still works.
     void expectNothingLeft(const DiskFile& file, const std::vector<std::string>& contents);
 
     Database database;

@@ -47,7 +47,7 @@ std::atomic<long> nNewBlocks{0};
 std::atomic<long> nMallocBlocks{0};
 int iWaits = 0;
 
-// Whether the allocation that is asked for now has to fail.
+// Whether the current allocation has to fail.
 bool fails(Kind kind)
 {
     if (!state.blArmed) return false;

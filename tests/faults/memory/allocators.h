@@ -23,7 +23,7 @@ constexpr bool kOwnMalloc = VORN_OWN_MALLOC;
 // that each allocation reaches the allocator.
 void install();
 
-// Arms the fault for this thread until it is disarmed, which tells how many allocations failed.
+// Arms the fault for this thread until disarm(), which tells how many allocations failed.
 void arm(const Fault& fault);
 int disarm();
 
@@ -34,7 +34,7 @@ struct Blocks {
 };
 Blocks blocks();
 
-// How often the library has waited for a lock. It does not wait in earnest.
+// How often the library has waited for a lock. It does not really wait.
 int waits();
 
 }  // namespace allocators

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Fails each allocation of each operation, alone and with all that follow, and looks after each
-// whether the call ended as it may, whether the connection is sound and whether the handle goes on.
+// Fails each allocation of each operation, alone and with all that follow, and checks each time
+// that the call ended in an allowed way and that connection and handle still work.
 
 #include "faults/memory/points.h"
 #include "faults/memory/store.h"
@@ -31,8 +31,8 @@ struct Trial {
     bool blFirstUse;
 };
 
-// Those of the first use come first, as they have to. The faults of every allocator, once, are
-// those of each.
+// Those of the first use have to come first. Failing every allocator once is covered by failing
+// each one once.
 const Trial kTrials[] = {
     {"first_use_new", {Kind::kNew, 0, false}, "operator new, once, first use", true},
     {"first_use_malloc", {Kind::kMalloc, 0, false}, "malloc, once, first use", true},
@@ -88,7 +88,7 @@ protected:
     }
 
 private:
-    // In a process of its own.
+    // In a separate process.
     static Point inChild(const Case& row, const Fault& fault)
     {
         static void* const pShared =
@@ -121,7 +121,7 @@ TEST_P(MemoryFaults, AreHandledAtEveryAllocation)
 {
     if (Kind::kMalloc == GetParam().fault.kind && !allocators::kOwnMalloc)
         GTEST_SKIP() << "malloc cannot be replaced beside the one of a sanitizer";
-    // glibc falls silently back to UTC when it has no memory to read the zone.
+    // glibc silently falls back to UTC if it has no memory to read the zone.
     tzset();
     const Store theFileIsMadeOnce;
     figure("findings") = 0;

@@ -16,7 +16,7 @@ namespace {
 using allocators::Blocks;
 using allocators::Fault;
 
-// Whether an output that was being written ends somewhere on its way.
+// Whether an interrupted output is somewhere between before and after.
 bool isBetween(const Json::Value& jBefore, const Json::Value& jAfter, const Json::Value& jNow)
 {
     if (jNow == jBefore || jNow == jAfter) return true;
@@ -111,7 +111,7 @@ public:
         return 0 < iFailed;
     }
 
-    // What there is now.
+    // The current state.
     Json::Value outcome()
     {
         Json::Value jOutcome;
@@ -153,7 +153,7 @@ public:
     }
 
 private:
-    // Empty, or what must not be after a call during which memory was lacking.
+    // Empty, or what is wrong after a call that ran out of memory.
     std::string whatIsWrong(const Json::Value& jOutcome) const
     {
         if (jOutcome == jAfter_) return std::string();
@@ -195,8 +195,8 @@ private:
     const char* szThrown_ = nullptr;
 };
 
-// Lines of the log that are written whole: no part of an earlier one is kept, and what the writer
-// of JSON keeps for lists is there.
+// Logs whole lines, so that no part of an earlier one is kept and the memory that the JSON writer
+// keeps for lists is there.
 void settle()
 {
     Json::Value jNoTable;

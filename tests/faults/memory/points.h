@@ -24,11 +24,11 @@
 // szChange is a JSON object with what an undisturbed call changes, a result of -1 where it is left
 // out:
 //
-//     "result"          0 where it is left out, "Json::LogicError" where that is thrown
+//     "result"          0 if it is left out, "Json::LogicError" if that is thrown
 //     "first", "second", "text", "message", "now", "type", "rows", "made": afterwards, otherwise as
 //                       before
-//     "grows"           "thrown": where it throws without memory, an output may end between before
-//                       and after; "refused": also where it gives -1
+//     "grows"           "thrown": if it throws without memory, an output may end between before
+//                       and after; "refused": also if it returns -1
 //     "silent"          true: the result does not tell whether the rows were written
 constexpr char kFailure[] = R"({"result": -1})";
 struct Case {

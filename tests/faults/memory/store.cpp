@@ -78,7 +78,7 @@ const char kDefinition[] = R"({
 Store::Store() : strPath_(path(".db"))
 {
     static const std::string& strFresh = *new std::string(freshFile());
-    // Of a process that had this number and was killed: SQLite would play it back.
+    // Of a killed process that had the same id: SQLite would play it back.
     fs::remove(strPath_ + "-journal");
     std::ofstream(strPath_, std::ios::binary) << strFresh;
     pDb_ = openedQuick(strPath_);

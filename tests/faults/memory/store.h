@@ -6,7 +6,7 @@
 
 #include <string>
 
-// JSON that is longer than the room that any text or statement begins with.
+// JSON that exceeds the initial capacity of any text or statement.
 #define LONG_LIST                                                  \
     "[1,2,3,4,5,6,7,8,9,10,11,12,13,14,15,16,17,18,19,20,"         \
     "21,22,23,24,25,26,27,28,29,30,31,32,33,34,35,36,37,38,39,40," \
@@ -33,7 +33,7 @@ public:
     std::string rows();
     bool hasMade();
 
-    // Back to the rows of the beginning, by the host's connection.
+    // Restores the initial rows through the host's connection.
     void restore();
 
 private:
