@@ -5,10 +5,14 @@
 //
 // FOLDER keeps the count, and an interrupted run is continued from there, on a new database.
 // VORN_CRASH_SEED repeats what the writers do and the moments at which they are killed, as far as a
-// machine can; the seed of a run is printed.
+// machine can; the seed of a run is printed. The program starts itself as its own writers:
+//
+//     crash --write DATABASE JOURNAL_MODE SEED LAST_REVISION    writes until it is killed
+//     crash --write DATABASE JOURNAL_MODE                       opens the database and lists it
 
 #include "crash/model.h"
 #include "support/child.h"
+#include "support/connection.h"
 
 #include <unistd.h>
 #include <chrono>
@@ -23,6 +27,8 @@ namespace {
 namespace fs = std::filesystem;
 using Figures = std::map<std::string, long long>;
 
+// The file descriptor of a writer's reports.
+constexpr int kReport = 3;
 constexpr unsigned kMostAcknowledged = 12;
 constexpr double kLongestMicroseconds = 10000;
 constexpr const char* kFiles[] = {"", "-journal", "-wal", "-shm"};
@@ -71,6 +77,44 @@ void passSomeTime(Span operation, std::mt19937& random)
     }
 }
 
+constexpr char kSelf[] = "/proc/self/exe";
+
+void report(const std::string& strLine)
+{
+    if (static_cast<ssize_t>(strLine.size()) != write(kReport, strLine.data(), strLine.size()))
+        std::exit(4);
+}
+
+// A host that writes until it is killed. It tells its parent when it begins an operation of the
+// plan and when that is done, and ends by itself only when something fails.
+int beWriter(const std::vector<std::string>& arguments)
+{
+    report("open\n");
+    Store store(arguments.at(0));
+    // A small cache, so that pages reach the database and its log before a transaction ends.
+    const std::string& strMode = arguments.at(1);
+    const std::string strSql =
+        "pragma journal_mode=" + strMode + "; pragma cache_size=8; pragma wal_autocheckpoint=20";
+    if (strMode + "20" != sqlite::value(store.pDb, strSql)) return 2;
+    State state;
+    Json::Value jRecords;
+    if (!store.list(jRecords)) return 2;
+    for (const Json::Value& jRecord : jRecords)
+        state[jRecord["id"].asInt()] = jRecord["rev"].asInt();
+    if (2 == arguments.size())
+        for (;;) pause();
+
+    std::mt19937 random(static_cast<unsigned>(std::stoul(arguments.at(2))));
+    int iRevision = std::stoi(arguments.at(3));
+    for (;;) {
+        const Operation operation = plan(state, random, iRevision);
+        report("begin\n");
+        if (!perform(store, operation)) return 3;
+        report("done\n");
+        state = after(state, operation);
+    }
+}
+
 class Run {
 public:
     Run(fs::path folder, Figures& figures) : folder_(std::move(folder)), figures_(figures)
@@ -110,31 +154,53 @@ private:
     // operation.
     bool killWriter(const std::string& strMode, std::mt19937& random)
     {
-        Child writer({VORN_CRASH_WRITER, database(), strMode, std::to_string(random()),
-                      std::to_string(expected_.iLastRevision)},
+        const auto uSeed = static_cast<unsigned>(random());
+        Child writer({kSelf, "--write", database(), strMode, std::to_string(uSeed),
+                      std::to_string(iRevision_)},
                      kReport);
-        const long long iBefore = expected_.iAcknowledged;
+        plans_.seed(uSeed);
+        long long& iAcknowledged = figures_["acknowledged operations"];
+        const long long iBefore = iAcknowledged;
         const long long iUntil = iBefore + static_cast<int>(random() % (kMostAcknowledged + 1));
         bool blGood = true;
         const bool blWithin = 0 != random() % 4;
         const auto begin = Clock::now();
         do {
-            blGood = expected_.take(writer.line());
-        } while (blGood && (expected_.iAcknowledged < iUntil || (blWithin && !expected_.pending)));
+            blGood = take(writer.line());
+        } while (blGood && (iAcknowledged < iUntil || (blWithin && !expected_.pending)));
         if (iBefore < iUntil) operation_ = (Clock::now() - begin) / (iUntil - iBefore);
         passSomeTime(operation_, random);
         blGood = writer.kill() && blGood;
         for (std::string strLine; blGood && !(strLine = writer.line()).empty();)
-            blGood = expected_.take(strLine);
-        figures_["acknowledged operations"] += expected_.iAcknowledged - iBefore;
+            blGood = take(strLine);
         ++figures_["kills"];
         return blGood;
+    }
+
+    // A report of the writer. False when it is none, or out of place.
+    bool take(const std::string& strLine)
+    {
+        if ("open" == strLine) return true;
+        if ((expected_.pending ? "done" : "begin") != strLine) return false;
+        if (!expected_.pending) {
+            expected_.pending = plan(expected_.state, plans_, iRevision_);
+            return true;
+        }
+        ++figures_["acknowledged operations"];
+        acknowledge();
+        return true;
+    }
+
+    void acknowledge()
+    {
+        expected_.state = after(expected_.state, *expected_.pending);
+        expected_.pending.reset();
     }
 
     // Before, while or after it recovers what the killed writer left.
     bool killOpening(const std::string& strMode, std::mt19937& random)
     {
-        Child opener({VORN_CRASH_WRITER, database(), strMode}, kReport);
+        Child opener({kSelf, "--write", database(), strMode}, kReport);
         const bool blGood = !opener.line().empty();
         passSomeTime(operation_, random);
         ++figures_["kills while the next one opens"];
@@ -160,8 +226,7 @@ private:
                                         "killed in an operation, absent",
                                         "killed in an operation, whole"};
         ++figures_[kEndings[verdict.pending]];
-        if (Verdict::kWhole == verdict.pending)
-            expected_.state = after(expected_.state, *expected_.pending);
+        if (Verdict::kWhole == verdict.pending) acknowledge();
         expected_.pending.reset();
         return verdict.strWrong.empty() && verdict.strCorrupt.empty();
     }
@@ -169,6 +234,8 @@ private:
     fs::path folder_;
     Figures& figures_;
     Expected expected_;
+    std::mt19937 plans_;  // of the present writer
+    int iRevision_ = 0;   // the last one planned
     Span operation_{1000};
 };
 
@@ -184,6 +251,7 @@ bool show(Figures& figures)
 
 int main(int argc, char** argv)
 {
+    if (3 < argc && std::string("--write") == argv[1]) return beWriter({argv + 2, argv + argc});
     const long long iKills = 1 < argc ? std::strtoll(argv[1], nullptr, 10) : 0;
     if (1 > iKills) {
         std::cerr << "usage: crash KILLS [FOLDER]\n";

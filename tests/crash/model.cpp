@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: MIT
 #include "crash/model.h"
 
-#include <algorithm>
+#include "support/connection.h"
+#include "support/json_text.h"
+
 #include <iterator>
-#include <sstream>
 
 // On the output of the test: nothing is logged unless an operation fails.
 bool blLogToStdout = true;
@@ -11,23 +12,18 @@ bool blDebugOutput = false;
 
 namespace {
 
+constexpr char kCreate[] =
+    "create table if not exists item (data text, id integer primary key, kind text,"
+    " rev integer, text text);create index if not exists item_rev on item (rev)";
+constexpr char kDefinition[] = R"({"item": {"member": {
+    "data": {"cpptype": "Json::objectValue"}, "id": {"cpptype": "int"},
+    "kind": {"cpptype": "string"}, "rev": {"cpptype": "int"}, "text": {"cpptype": "string"}}}})";
+
 constexpr int kKinds = 7;
 constexpr std::size_t kFewRecords = 40;
 constexpr std::size_t kManyRecords = 200;
 constexpr const char* kPieces[] = {"a",  "record ", "'", "\"", "%s", "%",
                                    "\n", "\\",      "ä", "日", ";",  "--"};
-
-Json::Value definition(const std::string& strName)
-{
-    Json::Value jDefinition;
-    Json::Value& jMember = jDefinition[strName]["member"];
-    jMember["data"]["cpptype"] = "Json::objectValue";
-    jMember["id"]["cpptype"] = "int";
-    jMember["kind"]["cpptype"] = "string";
-    jMember["rev"]["cpptype"] = "int";
-    jMember["text"]["cpptype"] = "string";
-    return jDefinition;
-}
 
 std::string kindOf(int iId)
 {
@@ -74,7 +70,6 @@ void applyStep(State& state, const Step& step)
         for (auto it = state.begin(); it != state.end();)
             it = kindOf(it->first) == kindOf(step.iId) ? state.erase(it) : std::next(it);
         break;
-    case Step::kEnd: break;
     }
 }
 
@@ -100,16 +95,15 @@ bool performStep(Store& store, const Step& step)
     Json::Value jFilter;
     Json::Value jStored;
     switch (step.kind) {
-    case Step::kCreate: return 0 == store.api().recCreate(jRecord, jStored) && jWritten == jStored;
-    case Step::kReplace: return 0 == store.api().recSave(jRecord, false) && jWritten == jRecord;
+    case Step::kCreate: return 0 == store.api.recCreate(jRecord, jStored) && jWritten == jStored;
+    case Step::kReplace: return 0 == store.api.recSave(jRecord, false) && jWritten == jRecord;
     case Step::kUpdateKind:
     case Step::kDeleteKind: jFilter["kind"] = jRecord["kind"]; break;
     default: jFilter["id"] = step.iId; break;
     }
     if (Step::kDelete == step.kind || Step::kDeleteKind == step.kind)
-        return 0 < store.api().recDelete(jFilter);
-    return 0 == store.api().recUpdateByFilter(jFilter, jRevision) &&
-           0 < sqlite3_changes(store.connection());
+        return 0 < store.api.recDelete(jFilter);
+    return 0 == store.api.recUpdateByFilter(jFilter, jRevision) && 0 < sqlite3_changes(store.pDb);
 }
 
 // The first difference; empty when there is none.
@@ -127,6 +121,12 @@ std::string difference(const Json::Value& jRecords, State state)
     return state.empty() ? "" : "record " + std::to_string(state.begin()->first) + " is lost";
 }
 
+// SQL of the host itself; false when SQLite refuses.
+bool run(Store& store, const char* szSql)
+{
+    return sqlite::value(store.pDb, szSql).empty();
+}
+
 void compare(const Json::Value& jRecords, const Expected& expected, Verdict& verdict)
 {
     verdict.strWrong = difference(jRecords, expected.state);
@@ -138,61 +138,29 @@ void compare(const Json::Value& jRecords, const Expected& expected, Verdict& ver
         verdict.pending = Verdict::kWhole;
         verdict.strWrong.clear();
     } else {
-        verdict.strWrong += "; with the operation [" + toLine(*expected.pending) + "]: " + strWhole;
+        verdict.strWrong += "; with the operation: " + strWhole;
     }
 }
 
 }  // namespace
 
 Store::Store(const std::string& strPath)
-    : pDb_(sqlite::opened(strPath)),
-      strCreate_(
-          "create table if not exists item (data text, id integer primary key, kind text,"
-          " rev integer, text text);create index if not exists item_rev on item (rev)"),
-      jDefinition_(definition(strName_)),
-      api_(pDb_, strName_, jDefinition_, strCreate_)
+    : pDb(sqlite::opened(strPath)),
+      strCreate(kCreate),
+      jDefinition(leftByReader(kDefinition)),
+      api(pDb, strName, jDefinition, strCreate)
 {
 }
 
-bool Store::close()
+Store::~Store()
 {
-    const bool blClosed = SQLITE_OK == sqlite3_close(pDb_);
-    if (blClosed) pDb_ = nullptr;
-    return blClosed;
+    sqlite3_close_v2(pDb);
 }
 
 bool Store::list(Json::Value& jRecords)
 {
     Json::Value jAll;
-    return 0 == api_.recList(jAll, jRecords);
-}
-
-std::string toLine(const Operation& operation)
-{
-    std::ostringstream line;
-    line << operation.frame << ' ' << operation.steps.size();
-    for (const Step& step : operation.steps)
-        line << ' ' << step.kind << ' ' << step.iId << ' ' << step.iRevision;
-    return line.str();
-}
-
-bool fromLine(const std::string& strLine, Operation& operation)
-{
-    std::istringstream line(strLine);
-    int iFrame = 0;
-    std::size_t nSteps = 0;
-    if (!(line >> iFrame >> nSteps) || iFrame < Operation::kAlone || iFrame > Operation::kRollback)
-        return false;
-    operation = {static_cast<Operation::Frame>(iFrame), {}};
-    for (std::size_t i = 0; i < nSteps; ++i) {
-        int iKind = 0;
-        Step step{};
-        if (!(line >> iKind >> step.iId >> step.iRevision) || iKind < 0 || iKind >= Step::kEnd)
-            return false;
-        step.kind = static_cast<Step::Kind>(iKind);
-        operation.steps.push_back(step);
-    }
-    return line.peek() == std::istringstream::traits_type::eof();
+    return 0 == api.recList(jAll, jRecords);
 }
 
 State after(State state, const Operation& operation)
@@ -220,27 +188,10 @@ Operation plan(const State& state, std::mt19937& random, int& iRevision)
 bool perform(Store& store, const Operation& operation)
 {
     const bool blAlone = Operation::kAlone == operation.frame;
-    if (!blAlone && !store.run("begin immediate")) return false;
+    if (!blAlone && !run(store, "begin immediate")) return false;
     for (const Step& step : operation.steps)
         if (!performStep(store, step)) return false;
-    return blAlone || store.run(Operation::kCommit == operation.frame ? "commit" : "rollback");
-}
-
-bool Expected::take(const std::string& strLine)
-{
-    const std::string strBegin = "begin ";
-    if ("open" == strLine || "ready" == strLine) return true;
-    if ("done" == strLine && pending) {
-        state = after(state, *pending);
-        pending.reset();
-        ++iAcknowledged;
-        return true;
-    }
-    if (0 != strLine.find(strBegin) || pending) return false;
-    pending.emplace();
-    if (!fromLine(strLine.substr(strBegin.size()), *pending)) return false;
-    for (const Step& step : pending->steps) iLastRevision = std::max(iLastRevision, step.iRevision);
-    return true;
+    return blAlone || run(store, Operation::kCommit == operation.frame ? "commit" : "rollback");
 }
 
 Verdict check(const std::string& strPath, const Expected& expected)
@@ -252,8 +203,9 @@ Verdict check(const std::string& strPath, const Expected& expected)
         compare(jRecords, expected, verdict);
     else
         verdict.strWrong = "the records cannot be listed";
-    const std::string strIntegrity = sqlite::value(store.connection(), "pragma integrity_check");
+    const std::string strIntegrity = sqlite::value(store.pDb, "pragma integrity_check");
     if ("ok" != strIntegrity) verdict.strCorrupt = strIntegrity;
-    if (!store.close()) verdict.strCorrupt += " a statement was left open";
+    if (nullptr != sqlite3_next_stmt(store.pDb, nullptr))
+        verdict.strCorrupt += " a statement was left open";
     return verdict;
 }

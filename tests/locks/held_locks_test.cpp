@@ -21,11 +21,6 @@ struct Situation {
     const char* szSql;
     bool blBlocksReaders;
     bool blBlocksWriters;
-
-    friend std::ostream& operator<<(std::ostream& out, const Situation& situation)
-    {
-        return out << situation.szName;
-    }
 };
 
 const Situation kSituations[] = {
@@ -74,20 +69,6 @@ protected:
         return iResult;
     }
 
-    // The holder lets go after 20 sleeps, which are 0.2 s.
-    void expectWaitedOut(const Operation& operation, const char* szHold, bool blBlocks)
-    {
-        Holder holder(database_.path(), szHold);
-        state().onSleep = [&holder] {
-            if (20 == state().sleeps.size()) holder.release();
-        };
-        EXPECT_EQ(operation.iResult, run(operation));
-        onlyStatement(blBlocks ? 21 : 1, blBlocks ? 20 : 0);
-        EXPECT_EQ(Lines(), takeLog());
-        state().onSleep = nullptr;
-        if (blBlocks) ++Figures::of("locks, waited out");
-    }
-
     // While somebody holds a lock.
     void expectEveryAttempt(const Operation& operation)
     {
@@ -107,9 +88,6 @@ protected:
             expectEveryAttempt(operation);
         }
         EXPECT_EQ(before, database_.rows("select * from records"));
-        EXPECT_EQ(operation.iResult, run(operation));
-        takeStatements();
-        EXPECT_EQ(Lines(), takeLog());
         ++Figures::of("locks, given up after 500 attempts");
     }
 
@@ -130,30 +108,27 @@ class EveryHeldLock : public HeldLock,
                       public testing::WithParamInterface<std::tuple<Situation, Operation>> {
 protected:
     // The long run really sleeps.
-    EveryHeldLock() : HeldLock(situation().szJournal)
+    EveryHeldLock() : HeldLock(std::get<Situation>(GetParam()).szJournal)
     {
         state().blReallySleep = nullptr != getenv("VORN_SOAK");
     }
-
-    static const Situation& situation() { return std::get<Situation>(GetParam()); }
-    static const Operation& tested() { return std::get<Operation>(GetParam()); }
-    static bool isBlocked()
-    {
-        return tested().blWrites ? situation().blBlocksWriters : situation().blBlocksReaders;
-    }
 };
 
-TEST_P(EveryHeldLock, IsWaitedOut)
+// The holder of the second lock lets go after 20 sleeps, which are 0.2 s.
+TEST_P(EveryHeldLock, IsGivenUpAfterFiveHundredAttemptsOrWaitedOut)
 {
-    expectWaitedOut(tested(), situation().szSql, isBlocked());
-}
-
-TEST_P(EveryHeldLock, EndsTheCallAfterFiveHundredAttempts)
-{
-    if (isBlocked()) return expectGivenUp(tested(), situation().szSql);
-    const Holder holder(database_.path(), situation().szSql);
-    EXPECT_EQ(tested().iResult, run(tested()));
-    onlyStatement(1, 0);
+    const auto& [situation, tested] = GetParam();
+    const bool blBlocked = tested.blWrites ? situation.blBlocksWriters : situation.blBlocksReaders;
+    if (blBlocked) expectGivenUp(tested, situation.szSql);
+    Holder holder(database_.path(), situation.szSql);
+    state().onSleep = [&holder] {
+        if (20 == state().sleeps.size()) holder.release();
+    };
+    EXPECT_EQ(tested.iResult, run(tested));
+    onlyStatement(blBlocked ? 21 : 1, blBlocked ? 20 : 0);
+    EXPECT_EQ(Lines(), takeLog());
+    state().onSleep = nullptr;
+    if (blBlocked) ++Figures::of("locks, waited out");
 }
 
 INSTANTIATE_TEST_SUITE_P(Locks, EveryHeldLock,

@@ -5,8 +5,7 @@
 #include "faults/files/host.h"
 #include "support/figures.h"
 
-#include <cerrno>
-#include <functional>
+#include <algorithm>
 
 namespace {
 
@@ -21,36 +20,58 @@ constexpr int kReselection = 4;
 // More times than a call tries.
 constexpr int kAlways = 1000;
 
-// The n-th lock of each of that many attempts.
-std::function<bool(int n)> lockOf(int nLock, int nAttempts)
+class Busy : public HostTest {
+protected:
+    ~Busy() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
+};
+
+// The n-th lock of that many attempts is held.
+struct Held {
+    const char* szOperation;
+    int nLock;
+    int nHeld;
+    int iResult;
+    // How many rows are new afterwards, or how many times a list holds all records.
+    int nTimes;
+    const char* szColumns = kWithoutKeys;
+    const char* szError = kLocked;
+};
+
+// Kept: the INSERT of each attempt stays, and the rows of each attempt stay in the array.
+std::vector<Held> everyHeld()
 {
-    return [=](int n) { return 0 == n % nLock && n / nLock <= nAttempts; };
+    std::vector<Held> all = {
+        {"recCreate", 1, 1, 0, 1},
+        {"recCreate", 2, 2, 0, 1},
+        {"recCreate", 3, 2, 0, 1},
+        {"recCreate", 1, kAlways, -1, 0},
+        {"recCreate", kReselection, kAlways, -1, 500},
+        // The first attempt's row is in the way of the second one.
+        {"recCreate", kReselection, 1, -1, 1, kWithKeys, kUnique},
+        {"recSave inserts", kReselection, 1, -1, 1, kWithKeys, kUnique},
+        {"recSave replaces", kReselection, 7, 0, 0, kWithKeys},
+        {"recList", 1, 1, 0, 1},
+        {"recList of all, twice", 1, 1, 0, 2},
+        {"recList of all, twice", 2, kAlways, -1, 500},
+    };
+    for (int nHeld : {1, 2, 7, 499}) {
+        for (const char* szOperation : {"recCreate", "recSave inserts", "recSave replaces"})
+            all.push_back({szOperation, kReselection, nHeld, 0, nHeld + 1});
+        all.push_back({"recList of all, twice", 2, nHeld, 0, nHeld + 2});
+    }
+    return all;
 }
 
 // An operation on a connection that holds its pages in memory already, so that it only has to lock
 // the file.
-class Busy : public HostTest {
+class BusyAt : public Busy, public testing::WithParamInterface<Held> {
 protected:
-    explicit Busy(const char* szColumns = kWithoutKeys)
-        : file_({Journal::kDelete, true, 4096, szColumns}), host_(file_)
+    BusyAt()
     {
         // No page has to be written before the statement's end, which would take a lock as well.
         host_.database.run("pragma cache_size=1000");
-        EXPECT_EQ(0, operation("recList").run(host_.database, host_.table, jAll_));
+        EXPECT_EQ(0, host_.run(operation("recList"), jAll_));
         takeStatements();
-    }
-
-    ~Busy() override { Figures::of("locks, findings") += HasFailure() ? 1 : 0; }
-
-    // The result of an operation that is tried that many times.
-    int run(const char* szOperation, int nLock, int nHeld, std::size_t nAttempts)
-    {
-        follow({kLock, lockOf(nLock, nHeld)});
-        const int iResult = host_.run(operation(szOperation), jOutput_);
-        lift();
-        strSql_ = onlyStatement(nAttempts, 500 == nAttempts && -1 == iResult ? 500 : nAttempts - 1);
-        Figures::of("locks, points failed") += failed();
-        return iResult;
     }
 
     // All records, that many times.
@@ -63,85 +84,44 @@ protected:
     }
 
     // How many rows beyond the initial ones meet the condition.
-    int nAdded(const char* szCondition = "1")
+    int nAdded(const char* szCondition)
     {
         return std::stoi(host_.database.value(
             "select count(*) from (select * from records limit -1 offset 12) where " +
             std::string(szCondition)));
     }
 
-    const DiskFile file_;
-    Host host_;
+    const DiskFile file_{{Journal::kDelete, true, 4096, GetParam().szColumns}};
+    Host host_{file_};
     Json::Value jAll_;
-    Json::Value jOutput_;
-    std::string strSql_;
-};
-
-const char kStored[] = R"({"id":50,"name":"new","note":"none","tags":{}})";
-const char kStoredRow[] = "id = 50 and name = 'new' and note = 'none' and tags = '{}'";
-
-// The n-th lock of that many attempts is held.
-struct Held {
-    const char* szOperation;
-    int nLock;
-    int nHeld;
-    int iResult;
-    std::size_t nAttempts;
-    // How many rows are new afterwards, or how many times a list holds all records.
-    int nTimes;
-    const char* szColumns = kWithoutKeys;
-    const char* szError = kLocked;
-};
-
-// Kept: the INSERT of each attempt stays, and the rows of each attempt stay in the array.
-std::vector<Held> everyHeld()
-{
-    std::vector<Held> all = {
-        {"recCreate", 1, 1, 0, 2, 1},
-        {"recCreate", 2, 1, 0, 2, 1},
-        {"recCreate", 3, 1, 0, 2, 1},
-        {"recCreate", 1, kAlways, -1, 500, 0},
-        {"recCreate", kReselection, kAlways, -1, 500, 500},
-        // The first attempt's row is in the way of the second one.
-        {"recCreate", kReselection, 1, -1, 2, 1, kWithKeys, kUnique},
-        {"recSave inserts", kReselection, 1, -1, 2, 1, kWithKeys, kUnique},
-        {"recSave replaces", kReselection, 7, 0, 8, 0, kWithKeys},
-        {"recList", 1, 1, 0, 2, 1},
-        {"recList", 2, 1, 0, 1, 1},
-        {"recList of all, twice", 1, 1, 0, 2, 2},
-        {"recList of all, twice", 2, kAlways, -1, 500, 500},
-    };
-    for (int nHeld : {1, 2, 7, 499}) {
-        const std::size_t nAttempts = static_cast<std::size_t>(nHeld) + 1;
-        for (const char* szOperation : {"recCreate", "recSave inserts", "recSave replaces"})
-            all.push_back({szOperation, kReselection, nHeld, 0, nAttempts, nHeld + 1});
-        all.push_back({"recList of all, twice", 2, nHeld, 0, nAttempts, nHeld + 2});
-    }
-    return all;
-}
-
-class BusyAt : public Busy, public testing::WithParamInterface<Held> {
-protected:
-    BusyAt() : Busy(GetParam().szColumns) {}
 };
 
 TEST_P(BusyAt, RetriesFromTheStart)
 {
     const Held& held = GetParam();
     const Operation& tested = operation(held.szOperation);
-    EXPECT_EQ(held.iResult, run(held.szOperation, held.nLock, held.nHeld, held.nAttempts));
-    EXPECT_EQ(tested.is("recList") ? 0 : held.nTimes, nAdded());
-    const bool blStored = tested.is("recCreate") && 0 == held.iResult;
-    EXPECT_EQ(tested.is("recList") ? all(held.nTimes)
-              : blStored           ? json(kStored)
-                                   : tested.untouched(),
-              jOutput_);
-    EXPECT_EQ(tested.is("recCreate") ? held.nTimes : 0, nAdded(kStoredRow));
-    const std::size_t nRetries = 500 == held.nAttempts ? 500 : held.nAttempts - 1;
+    follow({kLock, held.nLock, held.nHeld, held.nLock});
+    Json::Value jOutput;
+    EXPECT_EQ(held.iResult, host_.run(tested, jOutput));
+    lift();
+    Figures::of("locks, points failed") += failed();
+    const auto nRetries = static_cast<std::size_t>(std::min(held.nHeld, 500));
+    const std::string strSql = onlyStatement(std::min<std::size_t>(nRetries + 1, 500), nRetries);
+
+    const bool blList = tested.is("recList");
+    const bool blCreate = tested.is("recCreate");
+    EXPECT_EQ(blList ? 0 : held.nTimes, nAdded("1"));
+    EXPECT_EQ(blCreate ? held.nTimes : 0,
+              nAdded("id = 50 and name = 'new' and note = 'none' and tags = '{}'"));
+    const Json::Value jStored = json(R"({"id":50,"name":"new","note":"none","tags":{}})");
+    EXPECT_EQ(blList                          ? all(held.nTimes)
+              : blCreate && 0 == held.iResult ? jStored
+                                              : tested.untouched(),
+              jOutput);
     EXPECT_EQ(
-        0 == held.iResult ? Lines() : tested.failure(host_.table, held.szError, strSql_, nRetries),
+        0 == held.iResult ? Lines() : tested.failure(host_.table, held.szError, strSql, nRetries),
         takeLog());
-    EXPECT_EQ(tested.is("recCreate") && kUnique == held.szError ? "DUPLICATE_PRIMARY_KEY" : "",
+    EXPECT_EQ(blCreate && kUnique == held.szError ? "DUPLICATE_PRIMARY_KEY" : "",
               host_.table.api.getErrMsg());
 }
 
@@ -151,61 +131,6 @@ INSTANTIATE_TEST_SUITE_P(Locks, BusyAt, testing::ValuesIn(everyHeld()), [](const
                      std::to_string(held.nHeld),
                      kWithKeys == held.szColumns ? "with keys" : "without keys"});
 });
-
-TEST_F(Busy, EachRetryIsTraced)
-{
-    blDebugOutput = true;
-    EXPECT_EQ(0, run("recSave inserts", kReselection, 2, 3));
-    const std::string strTail =
-        ", errno=?, run sql failed, error=database is locked, sql=" + strSql_;
-    const Lines expected{plain("retry, i=0" + strTail), plain("retry, i=1" + strTail)};
-    EXPECT_EQ(expected, takeLog());
-}
-
-class BusyInTransaction : public Busy, public testing::WithParamInterface<const char*> {
-protected:
-    BusyInTransaction() : Busy(GetParam()) {}
-};
-
-INSTANTIATE_TEST_SUITE_P(Tables, BusyInTransaction, testing::Values(kWithKeys, kWithoutKeys));
-
-// Inside the host's transaction every lock that could fail half-way is already held.
-TEST_P(BusyInTransaction, EveryOperationRunsOnce)
-{
-    for (const char* szOperation : {"recList", "recList of all, twice", "recDelete", "recCreate"}) {
-        host_.database.run("begin immediate");
-        EXPECT_EQ(operation(szOperation).iResult, run(szOperation, 1, kAlways, 1)) << szOperation;
-        EXPECT_EQ(0, counted(kLock)) << szOperation;
-        host_.database.run(operation(szOperation).is("recCreate") ? "commit" : "rollback");
-    }
-    EXPECT_EQ(1, nAdded(kStoredRow));
-    EXPECT_EQ(kStored, text(jOutput_));
-    EXPECT_EQ(Lines(), takeLog());
-}
-
-// Kept: EAGAIN counts as a lock, whatever failed. Such a failure can come between two rows, and a
-// transaction does not help.
-TEST_F(Busy, ListRepeatsItsFirstRowsIfAReadHasToWait)
-{
-    const DiskFile file({Journal::kDelete});
-    std::size_t nRepeated = 0;
-    for (int nFailing = 1, iFailed = 1; 0 < iFailed; ++nFailing) {
-        file.restore();
-        Host host(file);
-        follow({kRead, lockOf(nFailing, 1), false, EAGAIN});
-        EXPECT_EQ(0, host.run(operation("recList"), jOutput_));
-        lift();
-        iFailed = failed();
-        EXPECT_EQ(0 < iFailed ? 2U : 1U, takeStatements().size()) << nFailing;
-        ASSERT_LE(jAll_.size(), jOutput_.size());
-        const Json::ArrayIndex nFirst = jOutput_.size() - jAll_.size();
-        nRepeated += nFirst;
-        for (Json::ArrayIndex i = 0; i < jOutput_.size(); ++i)
-            EXPECT_EQ(jAll_[i < nFirst ? i : i - nFirst], jOutput_[i]) << nFailing;
-    }
-    EXPECT_LT(0U, nRepeated);
-    EXPECT_EQ(Lines(), takeLog());
-}
 
 // Even at the locks that a connection takes before its first statement. Only an INSERT into a table
 // with keys fails, at the lock of its re-selection.
@@ -217,21 +142,21 @@ TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
             const DiskFile file({journal, operation.blNeedsTable});
             std::string strUndisturbed;
             int nFailures = 0;
-            // The loop ends after the last lock that is ever taken.
-            for (int nHeld = kAlways, iFailed = 1; 0 < iFailed; nHeld = nHeld % kAlways + 1) {
+            // None at first. The loop ends after the last lock that is ever taken.
+            for (int nHeld = 0, nFailed = 1; 0 < nFailed; ++nHeld) {
                 file.restore();
                 {
                     Host host(file);
-                    follow({kLock | kLockShared, lockOf(nHeld, 1)});
+                    follow({kLock | kLockShared, nHeld});
                     Json::Value jOutput;
                     const int iResult = host.run(operation, jOutput);
                     lift();
-                    iFailed = kAlways == nHeld ? 1 : failed();
+                    nFailed = 0 == nHeld ? 1 : failed();
                     Figures::of("locks, points failed") += failed();
                     if (iResult != operation.iResult) ++nFailures;
                     EXPECT_EQ(-1 == iResult, !takeLog().empty());
                 }
-                if (kAlways == nHeld) strUndisturbed = file.contents();
+                if (0 == nHeld) strUndisturbed = file.contents();
                 EXPECT_EQ(strUndisturbed, file.contents()) << nHeld;
             }
             const std::string strName = operation.szName;

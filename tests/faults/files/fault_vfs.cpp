@@ -4,26 +4,24 @@
 #include <sqlite3.h>
 
 #include <cerrno>
-#include <map>
-#include <utility>
 
 namespace {
 
 using namespace fault_vfs;
 
 Plan plan;
-int iCounted = 0;
-std::map<Kind, int> countedByKind;
-int iFailed = 0;
+int nCounted = 0;
+int nFailed = 0;
 
 // Counts an operation, and tells whether it has to fail.
 bool isDue(Kind kind)
 {
     if (0 == (plan.uKinds & kind)) return false;
-    ++countedByKind[kind];
-    if (!plan.fails(++iCounted)) return false;
-    ++iFailed;
-    errno = plan.blDiskFull ? ENOSPC : plan.iErrno;
+    const int nBeyond = ++nCounted - plan.nFirst;
+    if (0 == plan.nFirst || 0 > nBeyond) return false;
+    if (0 != nBeyond % plan.nStep || nBeyond / plan.nStep >= plan.nTimes) return false;
+    ++nFailed;
+    errno = plan.blDiskFull ? ENOSPC : EIO;
     return true;
 }
 
@@ -150,12 +148,10 @@ const char* fault_vfs::name()
     return SQLITE_OK == iRegistered ? vfs.zName : nullptr;
 }
 
-void fault_vfs::follow(Plan newPlan)
+void fault_vfs::follow(const Plan& newPlan)
 {
-    plan = std::move(newPlan);
-    iCounted = 0;
-    countedByKind.clear();
-    iFailed = 0;
+    plan = newPlan;
+    nCounted = nFailed = 0;
 }
 
 void fault_vfs::lift()
@@ -163,12 +159,12 @@ void fault_vfs::lift()
     plan = Plan();
 }
 
-int fault_vfs::failed()
+int fault_vfs::counted()
 {
-    return iFailed;
+    return nCounted;
 }
 
-int fault_vfs::counted(Kind kind)
+int fault_vfs::failed()
 {
-    return countedByKind[kind];
+    return nFailed;
 }

@@ -2,8 +2,6 @@
 // A VFS over the default one whose operations fail as planned.
 #pragma once
 
-#include <functional>
-
 namespace fault_vfs {
 
 // To be handed to sqlite3_open_v2; registered by the first call.
@@ -28,22 +26,21 @@ constexpr unsigned kEverythingButLocks = kLock - 1;
 struct Plan {
     // The kinds that are counted, together and from 1.
     unsigned uKinds = 0;
-    // Whether the n-th of them fails.
-    std::function<bool(int n)> fails;
+    // So many of them fail: the n-th and then each that is a step further. None for 0.
+    int nFirst = 0;
+    int nTimes = 1;
+    int nStep = 1;
     // What a failure means: no space left, or a broken device. A lock that fails is held by
     // somebody else. A write that fails leaves the first half of its bytes.
     bool blDiskFull = false;
-    // What a broken device leaves in errno.
-    int iErrno = 5;
 };
 
 // Takes effect at once; the counts start again.
-void follow(Plan plan);
+void follow(const Plan& plan);
 // Nothing fails any more; the counts stay.
 void lift();
 
+int counted();
 int failed();
-// How many operations of that kind were counted.
-int counted(Kind kind);
 
 }  // namespace fault_vfs

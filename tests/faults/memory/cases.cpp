@@ -156,6 +156,7 @@ const std::vector<Case> kCases = {
     {"recDelete", R"({"first": {"flag": true, "vornSqlWhereFilter": "id < 100000"}})",
      R"({"result": 2, "rows": "2 Bob 0"})"},
     {"recDelete of everything", R"({"flag": true, "first": {}})", R"({"result": 3, "rows": ""})"},
+    {"recDelete finds nothing", R"({"first": {"id": 9}})", "{}"},
     {"recDelete that selects by nothing", R"({"first": {"undeclared": 1}})"},
     {"recDelete by a request of a wrong kind", R"({"first": ["a long enough text"]})"},
     {"recDelete is refused", R"({"first": {"vornSqlWhereFilter": "no such condition"}})"},

@@ -6,6 +6,7 @@
 #include "support/connection.h"
 #include "support/json_text.h"
 
+#include <cstdio>
 #include <cstring>
 #include <new>
 #include <stdexcept>
@@ -14,24 +15,6 @@ namespace {
 
 using allocators::Blocks;
 using allocators::Fault;
-
-constexpr char kDefinition[] = R"({
-    "task": {"member": {
-        "any": {"cpptype": "Json::Value"}, "big": {"cpptype": "long long"},
-        "data": {"cpptype": "Json::objectValue"}, "flag": {"cpptype": "bool"},
-        "id": {"cpptype": "int"},
-        "name": {"cpptype": "string", "cppDefaultValue": "somebody unnamed"},
-        "rate": {"cpptype": "double"},
-        "tags": {"cpptype": "Json::arrayValue", "cppDefaultValue": [1, 2]}}},
-    "plain": {"member": {
-        "data": {"cpptype": "Json::objectValue"}, "id": {"cpptype": "int"},
-        "name": {"cpptype": "string"}}},
-    "made": {"member": {"id": {"cpptype": "int"}}},
-    "partial": {"member": {"a": {"cpptype": "int"}, "b": {}}},
-    "words": {"member": {
-        "a": {"cpptype": "string"}, "b": {"cpptype": "int"}, "c": {"cpptype": "unsigned int"},
-        "d": {"cpptype": "unsigned long long"}, "e": {"cpptype": "float"},
-        "f": {"cpptype": "double"}, "g": {"cpptype": "Json::arrayValue"}}}})";
 
 // Whether an interrupted output is somewhere between before and after.
 bool isBetween(const Json::Value& jBefore, const Json::Value& jAfter, const Json::Value& jNow)
@@ -102,34 +85,29 @@ public:
         call_.setArguments(jState_);
         if (nullptr != call_.pApi) call_.pApi->setErrMsg(jState_["message"].asString());
         jResult_ = 0;
-        ending_ = Ending::kRefused;
     }
 
     // The call alone, with the fault armed; tells whether an allocation failed.
     bool call(const Fault& fault)
     {
-        int iFailed = 0;
-        const auto thrown = [&](const char* szType, Ending ending) {
-            iFailed = allocators::disarm();
-            jResult_ = szType;
-            ending_ = ending;
-        };
+        int iResult = 0;
+        szThrown_ = nullptr;
         allocators::arm(fault);
         try {
-            const int iResult = function_(call_);
-            iFailed = allocators::disarm();
-            jResult_ = iResult;
+            iResult = function_(call_);
         } catch (const std::bad_alloc&) {
-            thrown("std::bad_alloc", Ending::kBadAlloc);
+            szThrown_ = "std::bad_alloc";
         } catch (const Json::RuntimeError&) {
-            thrown("Json::RuntimeError", Ending::kRuntimeError);
+            szThrown_ = "Json::RuntimeError";
         } catch (const Json::LogicError&) {
-            thrown("Json::LogicError", Ending::kOther);
+            szThrown_ = "Json::LogicError";
         } catch (const std::logic_error&) {
-            thrown("std::logic_error", Ending::kLogicError);
+            szThrown_ = "std::logic_error";
         } catch (...) {
-            thrown("another exception", Ending::kOther);
+            szThrown_ = "another exception";
         }
+        const int iFailed = allocators::disarm();
+        jResult_ = nullptr == szThrown_ ? Json::Value(iResult) : Json::Value(szThrown_);
         return 0 < iFailed;
     }
 
@@ -149,14 +127,32 @@ public:
         return jOutcome;
     }
 
-    // After an undisturbed call.
-    const Json::Value& after() const { return jAfter_; }
-
-    Ending ending(const Json::Value& jOutcome) const
+    // Empty, or what is wrong after the call.
+    std::string check(Point& point)
     {
-        return jOutcome == jAfter_ ? Ending::kAsUndisturbed : ending_;
+        std::string strProblem = sqlite::whatIsStuck(store_.get(), store_.other());
+        if (!strProblem.empty()) return strProblem;
+        const Json::Value jOutcome = outcome();
+        point.szEnding = jOutcome == jAfter_    ? "absorbed"
+                         : nullptr == szThrown_ ? "result -1"
+                                                : szThrown_;
+        strProblem = whatIsWrong(jOutcome);
+        if (!strProblem.empty()) return strProblem + ": " + text(jOutcome);
+
+        // Twice: what the library keeps between statements is complete then.
+        for (int i = 0; i < 2; ++i) {
+            store_.restore();
+            prepare();
+            call(Fault());
+            const Json::Value jAgain = outcome();
+            if (jAgain != jAfter_)
+                return "the next call: " + text(jAgain) + " instead of " + text(jAfter_);
+        }
+        if (0 < allocators::waits()) return "it waited for a lock";
+        return sqlite::whatIsStuck(store_.get(), store_.other());
     }
 
+private:
     // Empty, or what is wrong after a call that ran out of memory.
     std::string whatIsWrong(const Json::Value& jOutcome) const
     {
@@ -167,7 +163,7 @@ public:
             if (jOutcome[szKey] != jBefore_[szKey] && jOutcome[szKey] != jAfter_[szKey])
                 return szKey;
         const bool blGrows =
-            "refused" == strGrows_ || ("thrown" == strGrows_ && Ending::kRefused != ending_);
+            "refused" == strGrows_ || ("thrown" == strGrows_ && nullptr != szThrown_);
         for (const char* szKey : {"first", "second", "text", "now", "type"}) {
             if (jOutcome[szKey] == jBefore_[szKey]) continue;
             if (!blGrows || !isBetween(jBefore_[szKey], jAfter_[szKey], jOutcome[szKey]))
@@ -176,12 +172,11 @@ public:
         return std::string();
     }
 
-private:
     // Which exceptions the header names.
     bool mayThrow() const
     {
-        if (Ending::kBadAlloc == ending_ || Ending::kRuntimeError == ending_) return true;
-        if (Ending::kLogicError != ending_) return false;
+        if (jResult_ == "std::bad_alloc" || jResult_ == "Json::RuntimeError") return true;
+        if (jResult_ != "std::logic_error") return false;
         for (const char* szName : {"recSave", "recCreate", "SqlExpandMemberSymbol"})
             if (0 == strncmp(szName_, szName, strlen(szName))) return true;
         return false;
@@ -197,31 +192,8 @@ private:
     Json::Value jResult_;
     std::string strGrows_;
     bool blSilent_ = false;
-    Ending ending_ = Ending::kRefused;
+    const char* szThrown_ = nullptr;
 };
-
-// Empty, or what is wrong after the call.
-std::string check(Attempt& attempt, Store& store, Point& point)
-{
-    std::string strProblem = sqlite::whatIsStuck(store.get(), store.other());
-    if (!strProblem.empty()) return strProblem;
-    const Json::Value jOutcome = attempt.outcome();
-    point.ending = attempt.ending(jOutcome);
-    strProblem = attempt.whatIsWrong(jOutcome);
-    if (!strProblem.empty()) return strProblem + ": " + text(jOutcome);
-
-    // Twice: what the library keeps between statements is complete then.
-    for (int i = 0; i < 2; ++i) {
-        store.restore();
-        attempt.prepare();
-        attempt.call(Fault());
-        const Json::Value jAgain = attempt.outcome();
-        if (jAgain != attempt.after())
-            return "the next call: " + text(jAgain) + " instead of " + text(attempt.after());
-    }
-    if (0 < allocators::waits()) return "it waited for a lock";
-    return sqlite::whatIsStuck(store.get(), store.other());
-}
 
 // Logs whole lines, so that no part of an earlier one is kept and the memory that the JSON writer
 // keeps for lists is there.
@@ -242,19 +214,14 @@ Point atPoint(const Case& row, const Fault& fault)
     const sqlite3_int64 nUsed = sqlite3_memory_used();
     {
         Store store;
-        std::string strProblem;
-        {
-            Attempt attempt(row, store);
-            point.blFailed = attempt.call(fault);
-            strProblem = check(attempt, store, point);
-        }
-        const std::string strClosed = store.close();
-        if (strProblem.empty()) strProblem = strClosed;
-        const sqlite3_int64 nKept = sqlite3_memory_used() - nUsed;
-        if (strProblem.empty() && 0 != nKept)
-            strProblem = "SQLite keeps " + std::to_string(nKept) + " bytes";
+        Attempt attempt(row, store);
+        point.blFailed = attempt.call(fault);
+        const std::string strProblem = attempt.check(point);
         strProblem.copy(point.szProblem, sizeof(point.szProblem) - 1);
     }
+    const sqlite3_int64 nKept = sqlite3_memory_used() - nUsed;
+    if ('\0' == *point.szProblem && 0 != nKept)
+        snprintf(point.szProblem, sizeof(point.szProblem), "SQLite keeps %lld bytes", nKept);
     settle();
     point.kept = {allocators::blocks().nNew - blocks.nNew,
                   allocators::blocks().nMalloc - blocks.nMalloc};

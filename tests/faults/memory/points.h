@@ -41,12 +41,9 @@ struct Case {
 
 extern const std::vector<Case> kCases;
 
-enum class Ending { kAsUndisturbed, kRefused, kBadAlloc, kRuntimeError, kLogicError, kOther };
-
-// Plain data: a child process sends it to its parent.
 struct Point {
     bool blFailed = false;  // an allocation did fail; otherwise the loop has reached its end
-    Ending ending = Ending::kAsUndisturbed;
+    const char* szEnding = "";
     // Blocks that are allocated since the point began, after everything of the host was released.
     // They may only be the library's own that last as long as the process.
     allocators::Blocks kept;

@@ -57,6 +57,24 @@ std::string freshFile()
 
 }  // namespace
 
+const char kDefinition[] = R"({
+    "task": {"member": {
+        "any": {"cpptype": "Json::Value"}, "big": {"cpptype": "long long"},
+        "data": {"cpptype": "Json::objectValue"}, "flag": {"cpptype": "bool"},
+        "id": {"cpptype": "int"},
+        "name": {"cpptype": "string", "cppDefaultValue": "somebody unnamed"},
+        "rate": {"cpptype": "double"},
+        "tags": {"cpptype": "Json::arrayValue", "cppDefaultValue": [1, 2]}}},
+    "plain": {"member": {
+        "data": {"cpptype": "Json::objectValue"}, "id": {"cpptype": "int"},
+        "name": {"cpptype": "string"}}},
+    "made": {"member": {"id": {"cpptype": "int"}}},
+    "partial": {"member": {"a": {"cpptype": "int"}, "b": {}}},
+    "words": {"member": {
+        "a": {"cpptype": "string"}, "b": {"cpptype": "int"}, "c": {"cpptype": "unsigned int"},
+        "d": {"cpptype": "unsigned long long"}, "e": {"cpptype": "float"},
+        "f": {"cpptype": "double"}, "g": {"cpptype": "Json::arrayValue"}}}})";
+
 Store::Store() : strPath_(path(".db"))
 {
     static const std::string& strFresh = *new std::string(freshFile());
@@ -69,7 +87,8 @@ Store::Store() : strPath_(path(".db"))
 
 Store::~Store()
 {
-    close();
+    sqlite3_close_v2(pDb_);
+    sqlite3_close_v2(pOther_);
     fs::remove(strPath_);
 }
 
@@ -87,18 +106,4 @@ void Store::restore()
 {
     sqlite::run(pDb_, std::string("begin immediate;") + kSchema + "commit");
     sqlite3_set_last_insert_rowid(pDb_, 0);
-}
-
-std::string Store::close()
-{
-    std::string strProblem;
-    for (sqlite3** ppDb : {&pDb_, &pOther_}) {
-        const int iStatus = sqlite3_close(*ppDb);
-        if (SQLITE_OK != iStatus) {
-            strProblem = "sqlite3_close gave " + std::to_string(iStatus);
-            sqlite3_close_v2(*ppDb);
-        }
-        *ppDb = nullptr;
-    }
-    return strProblem;
 }

@@ -14,6 +14,9 @@
     "61,62,63,64,65,66,67,68,69,70,71,72,73,74,75,76,77,78,79,80," \
     "81,82,83,84,85,86,87,88,89,90,91,92,93,94,95,96,97,98,99,100]"
 
+// The tables of the file and the definitions of some that are not there.
+extern const char kDefinition[];
+
 class Store {
 public:
     // A fresh copy of the same file each time.
@@ -32,9 +35,6 @@ public:
 
     // Restores the initial rows through the host's connection.
     void restore();
-
-    // Closes both; empty, or what went wrong.
-    std::string close();
 
 private:
     std::string strPath_;
