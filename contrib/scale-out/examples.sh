@@ -58,7 +58,7 @@ the_examples() {
         delete '{"type": "E"}'
 
     say "examples/records $1: every command and refusal"
-    bash tests/records_iso_codes_test.sh "$PWD/$records" "$PWD/examples/tables" "$2/records_iso_codes" ||
+    bash tests/host/records_iso_codes_test.sh "$PWD/$records" "$PWD/examples/tables" "$2/records_iso_codes" ||
         failed "examples/records $1"
 
     name="examples/sharded $1: eight files"
