@@ -13,7 +13,7 @@ using bench::Operation;
 
 constexpr int kRows = 40;
 
-// What an operation left behind.
+// What is left after an operation.
 struct Outcome {
     std::vector<Json::Value> results;
     std::string strTable;

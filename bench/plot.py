@@ -1,6 +1,5 @@
 # SPDX-License-Identifier: MIT
-"""Plots as SVG text: bars side by side and lines on a logarithmic axis. Each function takes the figures
-and returns the whole file."""
+"""Plots as SVG text, bars or lines on a logarithmic axis: each function returns the whole file."""
 
 import math
 from html import escape

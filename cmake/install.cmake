@@ -35,7 +35,7 @@ install(FILES
   ${CMAKE_CURRENT_BINARY_DIR}/VornJsonDbConfigVersion.cmake
   DESTINATION ${package_folder} COMPONENT vornjsondb_development)
 
-# Relative to the file itself, which stands in LIBDIR/pkgconfig.
+# Relative to the file itself, which is in LIBDIR/pkgconfig.
 file(RELATIVE_PATH prefix_from_pc
   ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
 string(REGEX REPLACE "/$" "" prefix_from_pc "${prefix_from_pc}")

@@ -16,8 +16,8 @@ bool blDebugOutput = false;
 namespace {
 
 // "title like '%O''Clock%'": the text between quotes, with its own quotes doubled. A text from
-// outside becomes part of a filter in no other way; % and _ in it match as LIKE has them. Empty
-// when memory runs out.
+// outside must not become part of a filter in any other way; % and _ in it match as in LIKE. Empty
+// if memory runs out.
 std::string containing(const std::string& strText)
 {
     const std::string strPattern = "%" + strText + "%";

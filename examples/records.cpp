@@ -173,7 +173,7 @@ Json::Value readArray(const Arguments& arguments)
     Json::Value jTop = readFile(strPath);
     if (1 == arguments.size()) {
         if (jTop.isArray()) return jTop;
-        throw std::runtime_error(strPath + ": not an array, KEY has to name the member that is");
+        throw std::runtime_error(strPath + ": not an array, KEY must name the member that is");
     }
     const std::string& strKey = arguments[1];
     if (jTop.isObject() && jTop[strKey].isArray()) return jTop[strKey];

@@ -4,7 +4,7 @@
 /// commits and rolls back with statements of its own.
 ///
 /// Prints how many commits it took to store records one by one, how many to store a thousand in one
-/// transaction, and that nothing is left of one that failed in its middle. A commit waits until
+/// transaction, and that nothing is left of one that failed halfway. A commit waits until
 /// the disk has the data, which takes longer than all the rest: one for a thousand records instead
 /// of a thousand is why one transaction is fast.
 #include <VornJsonDbApi.h>

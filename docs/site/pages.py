@@ -46,7 +46,7 @@ def anchor_of(heading):
 
 
 def code(text):
-    """That Doxygen shows as it stands."""
+    """What Doxygen shows unchanged."""
     text = re.sub(r"[\\@#$%*_`|\[\]!]|::|--", r"\\\g<0>", html.escape(text, quote=False))
     text = text.replace('"', "&quot;").replace("'", "&apos;").replace("  ", " &nbsp;")
     return f"<code>{text}</code>"
@@ -97,7 +97,7 @@ class Guide:
         return f"# {text} {{#{page_of(self.path)}}}\n\n[TOC]"
 
     def text(self, text):
-        """What stands between two blocks of code. Code and anchors are put in last, so that nothing changes them."""
+        """The text between two blocks of code. Code and anchors are put in last, so that nothing changes them."""
         spans = []
 
         def keep(match):

@@ -208,7 +208,7 @@ Json::Value readCommand(const std::string& strLine)
     } catch (const Json::RuntimeError&) {
         throw Refused("the command is nested too deep");
     }
-    refuseIf(!blRead || !jCommand.isObject(), "the command is no JSON object");
+    refuseIf(!blRead || !jCommand.isObject(), "the command is not a JSON object");
     refuseIf(kMaxValues < countValues(jCommand), "the command holds too many values");
     return jCommand;
 }

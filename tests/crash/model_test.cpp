@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The check after a kill accepts what it has to, and nothing else.
+// The check after a kill accepts what it must, and nothing else.
 
 #include "crash/model.h"
 #include "support/connection.h"

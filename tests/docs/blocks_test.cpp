@@ -13,7 +13,7 @@ namespace {
 std::vector<std::string> pages()
 {
     std::vector<std::string> pages;
-    for (const std::string strFolder : {"", "bench/", "docs/", "examples/"})
+    for (const std::string strFolder : {"", "bench/", "contrib/scale-out/", "docs/", "examples/"})
         for (const auto& entry : std::filesystem::directory_iterator(VORN_DOCS "/../" + strFolder))
             if (".md" == entry.path().extension())
                 pages.push_back(strFolder + entry.path().filename().string());

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// docs/limits.md, requests and records: each limit, and its way around.
+// docs/limits.md, requests and records: each limit, and how to work around it.
 
 #include "docs/limits_page.h"
 

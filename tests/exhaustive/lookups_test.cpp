@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The look-ups of member types behind every operation, on types that are missing, of the wrong kind
+// The lookups of member types in every operation, on types that are missing, of the wrong kind
 // or partial: the result, the whole log and what is left in the table.
 
 #include "support/lookups.h"

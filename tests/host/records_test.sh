@@ -95,7 +95,7 @@ refuses_import "the record: $log" '[{"id": 20}, 7]'
 refuses_import 'in.json: not valid JSON: Line 2, Column 1 Syntax error: value, object or array expected.' \
     $'[{"id": 20},\n'
 refuses_import "in.json: $nothing" ''
-fails 'keyed.json: not an array, KEY has to name the member that is' import keyed.json
+fails 'keyed.json: not an array, KEY must name the member that is' import keyed.json
 fails 'keyed.json: no array under "a"' import keyed.json a
 fails 'keyed.json: no array under "b\n"' import keyed.json $'b\n'
 fails 'plain.json: no array under "id"' import plain.json id

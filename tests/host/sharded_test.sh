@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
-# sharded_test.sh PROGRAM EXPECTED WORK: what examples/sharded says where a tenant's file is not a database,
+# sharded_test.sh PROGRAM EXPECTED WORK: what examples/sharded says if a tenant's file is not a database,
 # belongs to another owner or cannot be made, and that the other files are as they were.
 . "$(dirname "${BASH_SOURCE[0]}")/../../scripts/common.sh"
 program=$1 expected=$2 work=$3

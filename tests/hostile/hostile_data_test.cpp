@@ -50,7 +50,7 @@ protected:
     }
 };
 
-TEST_F(HostileData, IsEnough)
+TEST_F(HostileData, CoversEveryKindOfString)
 {
     const auto& strings = hostileStrings();
     const std::size_t nStrings = std::set<std::string>(strings.begin(), strings.end()).size();

@@ -26,7 +26,7 @@ protected:
     const Json::Value jTypes_ = types();
 };
 
-TEST_F(HostileSql, InARequest)
+TEST_F(HostileSql, EndsCleanlyInARequest)
 {
     forEachString(5, [&](const std::string& strHostile) {
         const std::string strNumber = doubled(strHostile);
@@ -59,7 +59,7 @@ TEST_F(HostileSql, InARequest)
     });
 }
 
-TEST_F(HostileSql, InTheNameOfAMember)
+TEST_F(HostileSql, EndsCleanlyInTheNameOfAMember)
 {
     forEachString(1, [&](const std::string& strHostile) {
         types() = member(strHostile, member("cpptype", "string"));
@@ -80,7 +80,7 @@ TEST_F(HostileSql, InTheNameOfAMember)
     });
 }
 
-TEST_F(HostileSql, InATypeWord)
+TEST_F(HostileSql, EndsCleanlyInATypeWord)
 {
     const Json::Value jRecord = json(R"({"s":"x"})");
     forEachString(1, [&](const std::string& strHostile) {
@@ -108,7 +108,7 @@ TEST_F(HostileSql, InATypeWord)
     });
 }
 
-TEST_F(HostileSql, InACreateStatementAndInSqlToRun)
+TEST_F(HostileSql, EndsCleanlyInACreateStatementAndInSqlToRun)
 {
     const auto ignore = [](void*, int, char**, char**) { return 0; };
     forEachString(2, [&](const std::string& strHostile) {
@@ -128,7 +128,7 @@ TEST_F(HostileSql, InACreateStatementAndInSqlToRun)
 }
 
 // In a process of its own, because the member types of the names would stay.
-TEST_F(HostileSql, InTheNameOfATable)
+TEST_F(HostileSql, EndsCleanlyInTheNameOfATable)
 {
     GTEST_FLAG_SET(death_test_style, "threadsafe");
     const auto useName = [&](const std::string& strHostile) {

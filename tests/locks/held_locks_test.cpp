@@ -147,7 +147,7 @@ TEST_F(HeldLock, IsGivenUpAfterFiveRealSeconds)
     expectGivenUp(operation("recCreate"), "begin exclusive");
     const auto elapsed = duration_cast<milliseconds>(steady_clock::now() - start);
     EXPECT_LE(5000, elapsed.count());
-    Figures::of("locks, milliseconds before giving up in earnest") = elapsed.count();
+    Figures::of("locks, milliseconds before really giving up") = elapsed.count();
 }
 
 // A host's transaction that has read an older state can never write: all attempts are made.

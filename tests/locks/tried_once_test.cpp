@@ -39,7 +39,7 @@ struct Error {
     const char* szCure;
     bool blMakesTable = false;
     const char* szParameter = "";
-    // Of the second connection, which is rolled back at the end.
+    // The second connection's SQL, which is rolled back at the end.
     const char* szOther = "";
     Hook hook = [](sqlite3*, bool) {};
 };

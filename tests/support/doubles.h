@@ -36,9 +36,9 @@ struct State {
     std::vector<LogRecord> log;
     // sqlite3_changes: what it returns instead of the real number.
     std::function<int()> changes;
-    // sqlite3_mprintf: the n-th call from now (1 is the next one) returns NULL; 0 is never.
+    // sqlite3_mprintf: the n-th call from now (1 is the next one) returns NULL; 0 means never.
     int iFailMprintf = 0;
-    // operator new: the n-th call from now throws std::bad_alloc; 0 is never.
+    // operator new: the n-th call from now throws std::bad_alloc; 0 means never.
     int iFailNew = 0;
     // operator new: what it leaves in errno, as an allocator may; 0 leaves errno alone.
     int iErrnoOfNew = 0;

@@ -45,7 +45,7 @@ TEST_F(Guard, RefusesWithAReason)
           list(R"({"author":"Ann","sort_by":"text","sort_direction":"asc"})"),
           list(R"({"id":1,"sort_by":"id","limit":0})"), get(R"({"id":1})"),
           update(R"({"id":1})", R"({"text":"x"})"), erase(R"({"id":1})")}},
-        {"the command is no JSON object",
+        {"the command is not a JSON object",
          {"", "[]", list("{}") + " {}", R"({"op":"list","request":{},"request":{}})"}},
         {"there is no such operation",
          {R"({"op":7,"request":{}})", R"({"op":{},"request":{}})", Command{"drop"}("{}")}},
@@ -186,7 +186,7 @@ TEST_F(Guard, ReadsLineByLine)
         EXPECT_EQ(strExpected, strLine);
     }
     for (int i = 0; i < 2; ++i) EXPECT_FALSE(guard::readLine(stream, strLine));
-    EXPECT_EQ("the command is no JSON object", refusal(strLongest));
+    EXPECT_EQ("the command is not a JSON object", refusal(strLongest));
     EXPECT_EQ("the command is too long", refusal(strLongest + "x"));
 }
 

@@ -132,6 +132,25 @@ INSTANTIATE_TEST_SUITE_P(Locks, BusyAt, testing::ValuesIn(everyHeld()), [](const
                      kWithKeys == held.szColumns ? "with keys" : "without keys"});
 });
 
+// In the host's own write transaction no operation takes another lock, so none can be held.
+TEST_F(Busy, NoOperationNeedsALockInAWriteTransaction)
+{
+    const DiskFile file({Journal::kDelete});
+    for (const Operation& operation : operations()) {
+        SCOPED_TRACE(operation.szName);
+        file.restore();
+        Host host(file);
+        host.database.run("pragma cache_size=1000; begin immediate");
+        follow({kLock, 1, kAlways});
+        Json::Value jOutput;
+        EXPECT_EQ(operation.iResult, host.run(operation, jOutput));
+        lift();
+        EXPECT_EQ(0, counted());
+        EXPECT_EQ(-1 == operation.iResult, !takeLog().empty());
+        host.database.run("rollback");
+    }
+}
+
 // Even at the locks that a connection takes before its first statement. Only an INSERT into a table
 // with keys fails, at the lock of its re-selection.
 TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
