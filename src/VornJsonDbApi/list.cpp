@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/operation.h"
-#include "VornJsonDbApi/row_decoder.h"
+#include "VornJsonDbApi/row_callback.h"
 #include "util/json_text.h"
 #include "util/log.h"
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-#include "VornJsonDbApi/row_decoder.h"
+#include "VornJsonDbApi/row_callback.h"
 #include "util/log.h"
 #include "util/sqlite_text.h"
 

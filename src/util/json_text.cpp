@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "util/json_text.h"
 
-#include "util/no_destructor.h"
+#include "util/thread_state.h"
 
 #include <json/reader.h>
 #include <json/writer.h>
@@ -48,8 +48,10 @@ private:
     std::string strText_;
 };
 
-class Writer {
+class Writer : public ThreadPart {
 public:
+    static constexpr Kind kKind = kWriter;
+
     Writer()
     {
         // So that running out of memory reaches the caller instead of leaving half a text.
@@ -88,6 +90,11 @@ private:
     return builder.newCharReader();
 }
 
+struct Reader : ThreadPart {
+    static constexpr Kind kKind = kReader;
+    std::unique_ptr<Json::CharReader> pReader{newReader()};
+};
+
 bool isDepthLimit(const Json::RuntimeError& error)
 {
     return nullptr != strstr(error.what(), "stackLimit");
@@ -97,15 +104,14 @@ bool isDepthLimit(const Json::RuntimeError& error)
 
 std::string toString(const Json::Value& jValue)
 {
-    static NoDestructor<Writer> writer;
-    return (*writer).text(jValue);
+    return ofThisThread<Writer>().text(jValue);
 }
 
 void fromString(const char* szText, Json::Value& jValue)
 {
-    static NoDestructor<std::unique_ptr<Json::CharReader>> reader(newReader());
+    Json::CharReader& reader = *ofThisThread<Reader>().pReader;
     try {
-        (*reader)->parse(szText, szText + strlen(szText), &jValue, nullptr);
+        reader.parse(szText, szText + strlen(szText), &jValue, nullptr);
     } catch (const Json::RuntimeError& error) {
         if (!isDepthLimit(error)) throw;
         jValue = Json::nullValue;

@@ -2,24 +2,30 @@
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
-#include "util/no_destructor.h"
+#include "util/name_table.h"
+#include "util/thread_state.h"
 
 #include <VornJsonDbApi.h>
 
+#include <algorithm>
 #include <utility>
+#include <vector>
 
 using namespace vorn;
 
 namespace {
 
+using Table = NameTable<Json::Value>::Entry;
+
 // The member types of every table that was asked for.
 // Kept(MemberTypes.KeepTheFirstDefinitionForEveryHandle): the first definition under a table name
 // wins
-struct Cache {
-    Json::Value jType;
-    // The last entry that was asked for: an operation asks for the same one several times.
-    std::string strLastName;
-    Json::Value* pjLast = nullptr;
+NameTable<Json::Value> tables;
+
+// The last table that the thread asked for: an operation asks for the same one several times.
+struct LastTypes : ThreadPart {
+    static constexpr Kind kKind = kLastTypes;
+    Table* pTable = nullptr;
 };
 
 // False, after logging the failed check, if jTableDef does not define the members of a table.
@@ -57,51 +63,69 @@ bool readMembers(Json::Value& jTableDef, std::string& strJsonName, Json::Value& 
     return true;
 }
 
-// Fills the table's entry.
+// The table of that name with the types of its definition; null, after logging the failed check, if
+// the definition does not give them all.
 // Kept(MemberTypes.KeepTheEntryOfABadDefinition): a bad definition leaves a null or
 // partial entry for the life of the process
-bool fillEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jType)
+Table* newTable(Json::Value& jTableDef, std::string& strJsonName)
 {
-    if (!definesTable(jTableDef, strJsonName)) return false;
+    if (!definesTable(jTableDef, strJsonName)) return nullptr;
     Json::Value jEntry;
     const bool blComplete = readMembers(jTableDef, strJsonName, jEntry);
-    if (!jEntry.isNull()) jType[strJsonName] = std::move(jEntry);
-    if (!blComplete) return false;
-    return !FAILED(jType == Json::nullValue || !jType.isMember(strJsonName));
+    Table* const pTable =
+        jEntry.isNull() ? tables.find(strJsonName) : tables.insert(strJsonName, std::move(jEntry));
+    if (!blComplete) return nullptr;
+    if (FAILED_AS(nullptr == pTable, "jType == Json::nullValue || !jType.isMember(strJsonName)"))
+        return nullptr;
+    return pTable;
 }
 
-// The table's entry, filled if it is new; null, after logging the failed check, if none is usable.
-Json::Value* findEntry(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jType)
+// The table, with its types filled in if it is new; null, after logging the failed check, if there
+// are no usable ones.
+Table* findTable(Json::Value& jTableDef, std::string& strJsonName)
 {
-    Json::Value* pjEntry = findMember(jType, strJsonName);
-    if (nullptr == pjEntry) {
-        if (!fillEntry(jTableDef, strJsonName, jType)) return nullptr;
-        pjEntry = findMember(jType, strJsonName);
-    }
-    if (FAILED_AS(pjEntry->type() != Json::objectValue,
+    Table* pTable = tables.find(strJsonName);
+    if (nullptr == pTable) pTable = newTable(jTableDef, strJsonName);
+    if (nullptr == pTable) return nullptr;
+    if (FAILED_AS(pTable->value.type() != Json::objectValue,
                   "jType[strJsonName].type() != Json::objectValue"))
         return nullptr;
-    return pjEntry;
+    return pTable;
+}
+
+// The entries of all tables as one JSON object, or null where there are none.
+std::string allTypes()
+{
+    std::vector<const Table*> sorted;
+    tables.forEach([&sorted](const Table& table) { sorted.push_back(&table); });
+    if (sorted.empty()) return "null";
+    std::sort(sorted.begin(), sorted.end(), [](const Table* pLeft, const Table* pRight) {
+        return pLeft->strName < pRight->strName;
+    });
+    std::string strAll;
+    for (const Table* pTable : sorted)
+        strAll.append(strAll.empty() ? "{" : ",")
+            .append(toString(pTable->strName))
+            .append(":")
+            .append(toString(pTable->value));
+    return strAll + "}";
 }
 
 }  // namespace
 
 Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonName)
 {
-    static NoDestructor<Cache> instance;
-    Cache& cache = *instance;
-    if (nullptr != cache.pjLast && cache.strLastName == strJsonName && cache.pjLast->isObject())
-        return *cache.pjLast;
+    Table*& pLast = ofThisThread<LastTypes>().pTable;
+    if (nullptr != pLast && pLast->strName == strJsonName && pLast->value.isObject())
+        return pLast->value;
 
-    Json::Value& jType = cache.jType;
-    if (Json::Value* pjEntry = findEntry(jTableDef, strJsonName, jType)) {
-        cache.strLastName = strJsonName;
-        cache.pjLast = pjEntry;
-        return *pjEntry;
+    if (Table* pTable = findTable(jTableDef, strJsonName)) {
+        pLast = pTable;
+        return pTable->value;
     }
     LOG_PLAIN("strJsonName=%s", strJsonName.c_str());
     LOG_PLAIN("jTableDef=%s", toString(jTableDef).c_str());
-    LOG_PLAIN("jType=%s", toString(jType).c_str());
+    LOG_PLAIN("jType=%s", allTypes().c_str());
     // A name that was absent gets a null entry, which stays.
-    return jType[strJsonName];
+    return tables.insert(strJsonName, Json::Value())->value;
 }

@@ -2,6 +2,7 @@
 // docs/limits.md, definitions and the process: names, ids, threads, plugins, the reader.
 
 #include "docs/limits_page.h"
+#include "support/records.h"
 
 #include <json/reader.h>
 
@@ -56,7 +57,7 @@ TEST_F(Limits, IntIdEndsAt2147483647)
     EXPECT_EQ(strLast, created(large.api, strLast));
 }
 
-TEST_F(Limits, OneThread)
+TEST_F(Limits, Threads)
 {
     table_.create(R"({"id":1,"text":"x"})");
     table_.create(R"({"id":2,"text":"x"})");
@@ -84,19 +85,54 @@ TEST_F(Limits, OneThread)
     }
     database_.run("delete from " + table_.strName + " where id = 2");
 
-    // Two threads with one lock around every call.
-    std::mutex vornMutex;
-    const auto listMany = [&vornMutex](VornJsonDbApi& task, const std::string& strExpected) {
+    // Two threads that share a connection, with one lock around every call.
+    std::mutex connectionMutex;
+    const auto listMany = [&connectionMutex](VornJsonDbApi& task, const std::string& strExpected) {
         for (int i = 0; i < 200; ++i) {
             Json::Value jRequest;
             Json::Value jRecords;
-#include "limits/OneThread.inc"
+#include "limits/Threads.inc"
             EXPECT_EQ("[" + strExpected + "]", text(jRecords));
         }
     };
     std::thread thread(listMany, std::ref(other.api), strOther);
     listMany(api_, strStored);
     thread.join();
+
+    // A connection for each, even without SQLite's own lock: no lock at all.
+    const auto listAlone = [this] {
+        sqlite3* pDb = nullptr;
+        EXPECT_EQ(SQLITE_OK,
+                  sqlite3_open_v2(":memory:", &pDb,
+                                  SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_NOMUTEX,
+                                  nullptr));
+        {
+            VornJsonDbApi api(pDb, table_.strName, table_.jDefinition, table_.strCreate);
+            EXPECT_EQ(R"({"id":7,"lang":"en","tags":[],"text":"own"})",
+                      created(api, R"({"id":7,"text":"own"})"));
+            for (int i = 0; i < 200; ++i)
+                EXPECT_EQ(R"([{"id":7,"lang":"en","tags":[],"text":"own"}])", listed(api));
+        }
+        EXPECT_EQ(SQLITE_OK, sqlite3_close(pDb));
+    };
+    std::thread first(listAlone);
+    listAlone();
+    first.join();
+
+    // A lock on a table of a shared cache is not waited for.
+    const std::string strShared = "file:" + freshName() + "?mode=memory&cache=shared";
+    Database writer(strShared);
+    Database reader(strShared);
+    const char szMembers[] = R"({"id":{"cpptype":"int"}})";
+    Table written(writer, szMembers, "id integer");
+    Table read(reader, written.strName, szMembers, "id integer");
+    writer.run("begin immediate; insert into " + written.strName + " values (1)");
+    takeLog();
+    EXPECT_EQ("-1", listed(read.api));
+    EXPECT_EQ(runFailed("database table is locked: " + written.strName,
+                        "SELECT id FROM " + written.strName + " ;"),
+              takeLog().at(0));
+    writer.run("rollback");
 }
 
 TEST_F(Limits, FirstDefinitionWins)

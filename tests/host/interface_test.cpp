@@ -62,4 +62,17 @@ TEST_F(Interface, LeavesTheFlagsAndTheReplaceableCallsToTheProgram)
         EXPECT_EQ(0U, names.count(szName)) << szName;
 }
 
+// Of what is set aside for libraries that are loaded late.
+TEST_F(Interface, TakesOnePointerOfThreadLocalStorage)
+{
+    FILE* pPipe = popen("readelf -lW " VORN_LIBRARY, "r");
+    ASSERT_NE(nullptr, pPipe);
+    std::size_t nBytes = 0;
+    char buffer[4096];
+    while (nullptr != fgets(buffer, sizeof(buffer), pPipe))
+        sscanf(buffer, " TLS %*s %*s %*s %*s %zx", &nBytes);
+    EXPECT_EQ(0, pclose(pPipe));
+    EXPECT_EQ(sizeof(void*), nBytes);
+}
+
 }  // namespace

@@ -57,7 +57,8 @@ add_library(plugin MODULE $part/plugin.cpp)
 target_link_libraries(plugin PRIVATE VornJsonDb::vornjsondb)
 add_executable(plugin_host $part/plugin_host.cpp)
 target_include_directories(plugin_host PRIVATE \$<TARGET_PROPERTY:VornJsonDb::vornjsondb,INTERFACE_INCLUDE_DIRECTORIES>)
-target_link_libraries(plugin_host PRIVATE JsonCpp::JsonCpp \${CMAKE_DL_LIBS})
+find_package(Threads REQUIRED)
+target_link_libraries(plugin_host PRIVATE JsonCpp::JsonCpp Threads::Threads \${CMAKE_DL_LIBS})
 set_target_properties(plugin_host PROPERTIES ENABLE_EXPORTS ON)
 PROJECT
 quietly "the plugin does not build" cmake --build "$work/plugin/build" -j "$(nproc)"

@@ -7,6 +7,8 @@
 #include <dlfcn.h>
 
 #include <cstdlib>
+#include <future>
+#include <thread>
 
 bool blLogToStdout = true;
 bool blDebugOutput = false;
@@ -38,7 +40,17 @@ int main(int argc, char** argv)
     if (2 != argc) return 1;
     pPlugin = dlopen(argv[1], RTLD_NOW);
     if (nullptr == pPlugin || !createsRecord(1)) _Exit(2);
+    // A thread that has used the plugin ends after it was unloaded.
+    std::promise<bool> used;
+    std::promise<void> unloaded;
+    std::thread thread([&] {
+        used.set_value(createsRecord(4));
+        unloaded.get_future().wait();
+    });
+    if (!used.get_future().get()) _Exit(5);
     dlclose(pPlugin);
+    unloaded.set_value();
+    thread.join();
     pPlugin = dlopen(argv[1], RTLD_NOW);
     if (nullptr == pPlugin || !createsRecord(2)) _Exit(3);
     return 0;

@@ -4,6 +4,7 @@
 #include <json/reader.h>
 
 #include <unistd.h>
+#include <atomic>
 #include <cerrno>
 #include <cstdlib>
 #include <filesystem>
@@ -26,7 +27,7 @@ Json::Value json(const std::string& strText)
 
 std::string freshName()
 {
-    static int iCount = 0;
+    static std::atomic<int> iCount{0};
     return "t" + std::to_string(++iCount);
 }
 
@@ -34,7 +35,7 @@ Database::Database(Place place)
 {
     const char* szFiles = getenv("VORN_TEST_FILES");
     if (Place::kFile == place || (nullptr != szFiles && '1' == *szFiles)) {
-        static int iCount = 0;
+        static std::atomic<int> iCount{0};
         strPath_ =
             std::filesystem::temp_directory_path() /
             ("vornjsondb-" + std::to_string(getpid()) + "-" + std::to_string(++iCount) + ".db");

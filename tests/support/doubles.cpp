@@ -21,7 +21,7 @@ void (*onEveryLine)(const std::string& strText) = nullptr;
 
 State& state()
 {
-    static State state;
+    static thread_local State state;
     return state;
 }
 
@@ -55,7 +55,7 @@ Function* real(const char* szName)
     va_end(arguments)
 
 // SQLite calls sqlite3_exec itself while it loads a schema; those calls are not the library's.
-int iExecDepth = 0;
+thread_local int iExecDepth = 0;
 
 // True once, when the n-th call is reached.
 bool isDue(int& iCountdown)

@@ -51,6 +51,7 @@ struct State {
     bool blNoClock = false;
 };
 
+// Each thread has its own.
 State& state();
 
 // Back to passing every call on, with nothing recorded.

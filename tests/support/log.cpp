@@ -38,7 +38,7 @@ std::string squeezed(const std::string& strText)
 // The source files of a component, each as its lines without blanks.
 const std::vector<std::vector<std::string>>& sourcesOf(const std::string& strComponent)
 {
-    static std::map<std::string, std::vector<std::vector<std::string>>> components;
+    static thread_local std::map<std::string, std::vector<std::vector<std::string>>> components;
     auto& files = components[strComponent];
     if (!files.empty()) return files;
     for (const auto& entry : std::filesystem::directory_iterator(VORN_SOURCES "/" + strComponent)) {

@@ -3,7 +3,11 @@
 
 #include "support/database.h"
 
+#include <cstdint>
 #include <cstdlib>
+#include <cstring>
+#include <functional>
+#include <iterator>
 #include <utility>
 
 namespace {
@@ -163,6 +167,43 @@ TEST_F(MemberTypes, KeepTheFirstDefinitionForEveryHandle)
     EXPECT_EQ(-1, second.api.SqlExpandMemberSymbol(strSql, jText));
     EXPECT_EQ(Lines{failed("!jType.isMember(strKey)")}, takeLog());
 }
+
+#if defined(__GLIBCXX__) && 8 == __SIZEOF_SIZE_T__
+// A name of 16 bytes that ends so that it has the hash of the other one: libstdc++ hashes eight
+// bytes at a time, and each step can be undone.
+std::string nameOfSameHash(const std::string& strOther, std::uint64_t uBegin)
+{
+    constexpr std::uint64_t kFactor = 0xc6a4a7935bd1e995;
+    std::uint64_t uInverse = kFactor;
+    for (int i = 0; i < 5; ++i) uInverse *= 2 - kFactor * uInverse;
+    const auto mix = [](std::uint64_t u) { return u ^ u >> 47; };
+    const auto step = [=](std::uint64_t u) { return mix(u * kFactor) * kFactor; };
+    std::uint64_t other[2];
+    memcpy(other, strOther.data(), sizeof(other));
+    const std::uint64_t uStart = 0xc70f6907UL ^ sizeof(other) * kFactor;
+    const std::uint64_t uWanted =
+        step(other[1]) ^ (uStart ^ step(other[0])) * kFactor ^ (uStart ^ step(uBegin)) * kFactor;
+    const std::uint64_t name[2] = {uBegin, mix(uWanted * uInverse) * uInverse};
+    return std::string(reinterpret_cast<const char*>(name), sizeof(name));
+}
+
+TEST_F(MemberTypes, AreKeptForNamesOfTheSameHash)
+{
+    const std::string strFirst = "a name of sixtee";
+    const std::string names[] = {strFirst, nameOfSameHash(strFirst, 1),
+                                 nameOfSameHash(strFirst, 2)};
+    for (int iRound = 0; iRound < 2; ++iRound)
+        for (std::size_t i = 0; i < std::size(names); ++i) {
+            strName_ = names[i];
+            EXPECT_EQ(std::hash<std::string>()(strFirst), std::hash<std::string>()(strName_));
+            Json::Value jDefinition;
+            jDefinition[strName_]["member"]["m" + std::to_string(i)]["cpptype"] = "int";
+            EXPECT_TRUE(jDefinition[strName_]["member"] ==
+                        VORN_JSON_DB::recType(jDefinition, strName_));
+        }
+    EXPECT_EQ(Lines(), takeLog());
+}
+#endif
 
 // In separate processes, where nothing is known yet under the empty name.
 TEST_F(MemberTypes, RefuseAnEmptyNameAfterTheLookUps)

@@ -1,0 +1,92 @@
+// SPDX-License-Identifier: MIT
+#include "VornJsonDbApi/row_layout.h"
+
+#include "VornJsonDbApi/row_value.h"
+#include "util/json_members.h"
+#include "util/name_table.h"
+
+#include <algorithm>
+#include <cstring>
+#include <utility>
+
+namespace vorn {
+
+namespace {
+
+// A copy of the name that is never released, so that all records of all threads can share it as
+// their key.
+const char* sharedName(const char* szName)
+{
+    struct Nothing {};
+    static NameTable<Nothing> names;
+    auto* pEntry = names.find(szName);
+    if (nullptr == pEntry) pEntry = names.insert(szName, {});
+    return pEntry->strName.c_str();
+}
+
+}  // namespace
+
+RowLayout::RowLayout(const Json::Value& jTypes, std::size_t nColumns, char** column_name)
+{
+    columns_.reserve(nColumns);
+    for (std::size_t i = 0; i < nColumns; ++i) {
+        const char* szName = sharedName(column_name[i]);
+        std::string strType = TypeWord(jTypes[szName]).text();
+        const RowForm form = formsOf(strType).row;
+        columns_.push_back({szName, std::move(strType), form, i});
+        Json::Value& jMember = jBlank_[Json::StaticString(szName)];
+        if (RowForm::kBool == form) jMember = false;
+        blRefused_ = blRefused_ || RowForm::kNo == form;
+    }
+    std::sort(columns_.begin(), columns_.end(), [](const Column& left, const Column& right) {
+        return 0 > strcmp(left.szName, right.szName);
+    });
+}
+
+bool RowLayout::hasColumns(std::size_t nColumns, char** column_name) const
+{
+    if (columns_.size() != nColumns) return false;
+    return std::all_of(columns_.begin(), columns_.end(), [column_name](const Column& column) {
+        const char* szName = column_name[column.iPlace];
+        return nullptr != szName && 0 == strcmp(column.szName, szName);
+    });
+}
+
+bool RowLayout::hasTypes(const Json::Value& jTypes) const
+{
+    MemberWalk types(jTypes);
+    return std::all_of(columns_.begin(), columns_.end(), [&types](const Column& column) {
+        const Json::Value* pjMember = types.find(column.szName);
+        return nullptr != pjMember && TypeWord(*pjMember).is(column.strType);
+    });
+}
+
+bool RowLayout::decodes(char** column_value) const
+{
+    if (jBlank_.size() != columns_.size()) return false;
+    return !blRefused_ ||
+           std::all_of(columns_.begin(), columns_.end(), [column_value](const Column& column) {
+               return RowForm::kNo != column.form || nullptr == column_value[column.iPlace];
+           });
+}
+
+Json::Value RowLayout::record(char** column_value) const
+{
+    Json::Value jRecord = jBlank_;
+    bool blNull = false;
+    auto it = jRecord.begin();
+    for (const Column& column : columns_) {
+        const char* szValue = column_value[column.iPlace];
+        if (nullptr != szValue)
+            decode(column.form, szValue, *it);
+        else
+            blNull = true;
+        ++it;
+    }
+    if (!blNull) return jRecord;
+    for (const Column& column : columns_)
+        if (nullptr == column_value[column.iPlace]) jRecord.removeMember(column.szName);
+    return jRecord;
+}
+
+}  // namespace vorn

@@ -1,0 +1,47 @@
+// SPDX-License-Identifier: MIT
+// What rows of the same columns become, so that only the first of them is decoded by name.
+#pragma once
+
+#include "util/type_words.h"
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+namespace vorn {
+
+// Made from the columns of a row and the member types of its table, each of which has all of the
+// columns, and never changed.
+class RowLayout {
+public:
+    RowLayout(const Json::Value& jTypes, std::size_t nColumns, char** column_name);
+
+    // Whether a row has these columns; its names may be null.
+    bool hasColumns(std::size_t nColumns, char** column_name) const;
+
+    // Whether the member types, which a host may change, are still those of the columns. Never
+    // throws.
+    bool hasTypes(const Json::Value& jTypes) const;
+
+    // Whether record() gives the same as decoding by name would: no two columns of one name, and no
+    // value that is refused.
+    bool decodes(char** column_value) const;
+
+    // The row as a record: a copy of the blank one, filled in the order of its members without a
+    // search for any.
+    Json::Value record(char** column_value) const;
+
+private:
+    struct Column {
+        const char* szName;  // never released
+        std::string strType;
+        RowForm form;
+        std::size_t iPlace;  // in the row
+    };
+
+    std::vector<Column> columns_;  // in byte order of their names
+    Json::Value jBlank_{Json::objectValue};
+    bool blRefused_ = false;  // whether the type of a column is
+};
+
+}  // namespace vorn

@@ -1,0 +1,330 @@
+// SPDX-License-Identifier: MIT
+// When threads begin, end and fork, and how little stack they may have. No doubles here, which
+// would see the library's own variables of a thread come and go.
+
+#include "support/connection.h"
+
+#include <VornJsonDbApi.h>
+#include <gtest/gtest.h>
+
+#include <dlfcn.h>
+#include <pthread.h>
+#include <sys/wait.h>
+#include <unistd.h>
+#include <atomic>
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <memory>
+#include <new>
+#include <string>
+#include <thread>
+#include <utility>
+#include <vector>
+
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+#define VORN_SANITIZED 1
+#else
+#define VORN_SANITIZED 0
+#endif
+
+bool blLogToStdout = false;
+bool blDebugOutput = false;
+
+namespace {
+
+std::atomic<int> iLines{0};
+
+// A connection in memory with a table, as a thread of a host has it.
+class Store {
+public:
+    explicit Store(std::string strName = "kept")
+        : strName_(std::move(strName)), pDb_(sqlite::opened(":memory:"))
+    {
+        jDefinition_[strName_]["member"]["id"]["cpptype"] = "int";
+        jDefinition_[strName_]["member"]["value"]["cpptype"] = "Json::Value";
+        strCreate_ = "create table " + strName_ + " (id integer, value text)";
+        api_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition_, strCreate_);
+    }
+    ~Store()
+    {
+        api_.reset();
+        sqlite3_close(pDb_);
+    }
+    Store(const Store&) = delete;
+    Store& operator=(const Store&) = delete;
+
+    // Decodes a row, which takes all that the library keeps for a thread, and logs a failure.
+    bool works() { return reads("[1,{\"a\":2}]") && -1 == api_->runSqlEx("nonsense"); }
+
+    bool reads(const std::string& strJson)
+    {
+        sqlite::run(pDb_, "delete from " + strName_ + ";insert into " + strName_ + " values (1,'" +
+                              strJson + "')");
+        Json::Value jRequest;
+        Json::Value jRecords;
+        return 0 == api_->recList(jRequest, jRecords) && 1U == jRecords.size() &&
+               !jRecords[0]["value"].isNull();
+    }
+
+    sqlite3* connection() const { return pDb_; }
+
+private:
+    std::string strName_;
+    sqlite3* pDb_;
+    Json::Value jDefinition_;
+    std::string strCreate_;
+    std::unique_ptr<VornJsonDbApi> api_;
+};
+
+const Json::Value& typesOf(std::string strName)
+{
+    Json::Value jDefinition;
+    jDefinition[strName]["member"]["a"]["cpptype"] = "int";
+    return VORN_JSON_DB::recType(jDefinition, strName);
+}
+
+// What happens when the library makes its key, or keeps a value under it.
+enum class Trouble { kNone, kNoKey, kNoValue, kLate } trouble = Trouble::kNone;
+
+// The first call of the library in the process.
+struct FirstUse {
+    FirstUse()
+    {
+        trouble = Trouble::kNoKey;
+        try {
+            typesOf("first");
+        } catch (const std::bad_alloc&) {
+            blRefused = true;
+        }
+        trouble = Trouble::kLate;
+        typesOf("first");
+    }
+    bool blRefused = false;
+};
+const FirstUse firstUse;
+
+// A host's global handle: it works before main and after it.
+struct GlobalStore : Store {
+    ~GlobalStore()
+    {
+        if (!works()) _exit(3);
+    }
+};
+GlobalStore globalStore;
+
+std::string program()
+{
+    return std::filesystem::read_symlink("/proc/self/exe");
+}
+
+long residentBytes()
+{
+    long lPages = 0;
+    std::ifstream("/proc/self/statm") >> lPages >> lPages;
+    return lPages * sysconf(_SC_PAGESIZE);
+}
+
+TEST(ThreadLifetimes, MayBeginWithALackOfMemory)
+{
+    if (VORN_SANITIZED) GTEST_SKIP() << "a sanitizer makes keys before anything can be replaced";
+    EXPECT_TRUE(firstUse.blRefused);
+    EXPECT_EQ(Trouble::kNone, trouble) << "another thread made the key first";
+    std::thread([] {
+        trouble = Trouble::kNoValue;
+        EXPECT_THROW(typesOf("second"), std::bad_alloc);
+        trouble = Trouble::kNone;
+        EXPECT_EQ(1U, typesOf("second").size());
+    }).join();
+}
+
+TEST(ThreadLifetimes, LeaveNothingBehind)
+{
+    const auto runThreads = [](int nThreads) {
+        for (int i = 0; i < nThreads; ++i) std::thread([] { EXPECT_TRUE(Store().works()); }).join();
+    };
+    constexpr int kThreads = 10000;
+    constexpr int kFirst = 100;
+    runThreads(kFirst);
+    const long lBefore = residentBytes();
+    runThreads(kThreads - kFirst);
+    const long lGrowth = residentBytes() - lBefore;
+    printf("figure: threads in sequence = %d\n", kThreads);
+    printf("figure: their growth in KiB after the first %d = %ld\n", kFirst, lGrowth / 1024);
+    EXPECT_GT(1 << 20, lGrowth);
+}
+
+void useAtTheEnd(void* pStore)
+{
+    std::unique_ptr<Store> pOwned(static_cast<Store*>(pStore));
+    if (!pOwned->works()) abort();
+}
+
+// The library has released what it kept for the thread by then, and keeps it anew.
+TEST(ThreadLifetimes, EndAfterWhatTheHostStillDoes)
+{
+    pthread_key_t before = 0;
+    ASSERT_EQ(0, pthread_key_create(&before, useAtTheEnd));
+    std::thread([] { EXPECT_TRUE(Store().works()); }).join();
+    pthread_key_t after = 0;
+    ASSERT_EQ(0, pthread_key_create(&after, useAtTheEnd));
+    struct AtTheEnd {
+        ~AtTheEnd() { EXPECT_TRUE(Store().works()); }
+    };
+    std::thread([=] {
+        static thread_local AtTheEnd atTheEnd;
+        EXPECT_TRUE(Store().works());
+        EXPECT_EQ(0, pthread_setspecific(before, new Store));
+        EXPECT_EQ(0, pthread_setspecific(after, new Store));
+        EXPECT_NE(nullptr, &atTheEnd);
+    }).join();
+    EXPECT_EQ(0, pthread_key_delete(before));
+    EXPECT_EQ(0, pthread_key_delete(after));
+}
+
+// Run by itself, by main below: what unwinds here must not meet the frames of a test.
+[[noreturn]] void endMainFirst()
+{
+    Store().works();
+    std::thread([] {
+        // ThreadSanitizer cannot join the main thread.
+        const std::string strState = "/proc/self/task/" + std::to_string(getpid()) + "/stat";
+        for (std::string strLine; std::string::npos == strLine.find(") Z");)
+            std::getline(std::ifstream(strState), strLine);
+        exit(Store().works() && globalStore.works() ? 0 : 1);
+    }).detach();
+    pthread_exit(nullptr);
+}
+
+TEST(ThreadLifetimes, GoOnAfterMainHasEnded)
+{
+    EXPECT_EQ(0, system((program() + " --end-main-first").c_str()));
+}
+
+// Only SQLite's own mutexes, which no other thread may hold then, keep a host from more.
+TEST(ThreadLifetimes, MayForkWhileOthersPublish)
+{
+#ifdef __SANITIZE_THREAD__
+    GTEST_SKIP() << "ThreadSanitizer does not support forks beside threads";
+#endif
+    constexpr int kNamesAFork = 30;
+    std::atomic<int> iForks{0};  // or -1 at the end
+    std::atomic<int> iNames{0};
+    std::vector<std::thread> publishers;
+    for (int i = 0; i < 3; ++i)
+        publishers.emplace_back([&] {
+            while (0 <= iForks) {
+                if (kNamesAFork * iForks <= iNames) {
+                    std::this_thread::yield();
+                    continue;
+                }
+                EXPECT_EQ(1U, typesOf("published" + std::to_string(iNames++)).size());
+            }
+        });
+    constexpr int kForks = VORN_SANITIZED ? 100 : 1000;
+    int nWorking = 0;
+    for (int i = 0; i < kForks; ++i) {
+        ++iForks;
+        const pid_t child = fork();
+        if (0 == child)
+            _exit(Store("forked" + std::to_string(i)).works() && Store().works() ? 0 : 1);
+        int iStatus = -1;
+        EXPECT_EQ(child, waitpid(child, &iStatus, 0));
+        nWorking += 0 == iStatus ? 1 : 0;
+    }
+    iForks = -1;
+    for (std::thread& publisher : publishers) publisher.join();
+    EXPECT_EQ(kForks, nWorking);
+    printf("figure: forks beside threads that publish = %d\n", kForks);
+    printf("figure: names that they published = %d\n", iNames.load());
+}
+
+// Runs the work in a thread with that much stack.
+void withStack(std::size_t nBytes, const std::function<void()>& work)
+{
+    pthread_attr_t attributes;
+    ASSERT_EQ(0, pthread_attr_init(&attributes));
+    ASSERT_EQ(0, pthread_attr_setstacksize(&attributes, nBytes));
+    const auto run = [](void* arg) -> void* {
+        (*static_cast<const std::function<void()>*>(arg))();
+        return nullptr;
+    };
+    pthread_t thread{};
+    ASSERT_EQ(0,
+              pthread_create(&thread, &attributes, run, const_cast<std::function<void()>*>(&work)));
+    EXPECT_EQ(0, pthread_join(thread, nullptr));
+    pthread_attr_destroy(&attributes);
+}
+
+TEST(ThreadLifetimes, NeedAStackForNestedJson)
+{
+    constexpr std::size_t kStack = VORN_SANITIZED ? 16 << 20 : 512 << 10;
+    const std::string strDeep = std::string(1000, '[') + std::string(1000, ']');
+    withStack(kStack, [&] { EXPECT_TRUE(Store().reads(strDeep)); });
+}
+
+TEST(ThreadLifetimes, MayBeCancelledBetweenCalls)
+{
+    Store store;
+    std::atomic<bool> blUsed{false};
+    std::thread thread([&] {
+        for (;;) {
+            int iBefore = 0;
+            pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &iBefore);
+            EXPECT_TRUE(store.works());
+            blUsed = true;
+            pthread_setcancelstate(iBefore, nullptr);
+            pthread_testcancel();
+        }
+    });
+    while (!blUsed) std::this_thread::yield();
+    EXPECT_EQ(0, pthread_cancel(thread.native_handle()));
+    thread.join();
+    EXPECT_TRUE(store.works());
+}
+
+}  // namespace
+
+extern "C" {
+
+#if !VORN_SANITIZED
+int pthread_key_create(pthread_key_t* pKey, void (*destructor)(void*)) noexcept
+{
+    static const auto pReal =
+        reinterpret_cast<decltype(&pthread_key_create)>(dlsym(RTLD_NEXT, "pthread_key_create"));
+    if (Trouble::kNoKey == trouble) return EAGAIN;
+    if (Trouble::kLate == std::exchange(trouble, Trouble::kNone))
+        std::thread([] { typesOf("by another thread"); }).join();
+    return pReal(pKey, destructor);
+}
+
+int pthread_setspecific(pthread_key_t key, const void* pValue) noexcept
+{
+    static const auto pReal =
+        reinterpret_cast<decltype(&pthread_setspecific)>(dlsym(RTLD_NEXT, "pthread_setspecific"));
+    return Trouble::kNoValue == trouble ? ENOMEM : pReal(key, pValue);
+}
+#endif
+
+// The log is only counted.
+void syslog(int, const char*, ...)
+{
+    ++iLines;
+}
+
+void __syslog_chk(int, int, const char*, ...)
+{
+    ++iLines;
+}
+
+}  // extern "C"
+
+int main(int argc, char** argv)
+{
+    if (2 == argc && 0 == strcmp("--end-main-first", argv[1])) endMainFirst();
+    testing::InitGoogleTest(&argc, argv);
+    return RUN_ALL_TESTS();
+}
