@@ -60,6 +60,25 @@ def count_value_lists(programs):
     return {"both": count(50, MEBIBYTE), "long_alone": count(1, MEBIBYTE), "many_alone": count(50, 5)}
 
 
+KEPT = ["fetch", "fetch, two tables", "fetch, after a wide table", "create", "create, two tables",
+        "create, after a wide table", "rows", "rows, NULL in every second", "rows, NULLs in alternating members",
+        "types of 10 tables", "types of 100000 tables", "adding 1000 tables", "adding 100000 tables"]
+
+
+def count_kept(programs):
+    """Instructions of a call for each case of bench_kept."""
+    say("counting the instructions of what is kept of tables and rows")
+    with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
+        counts = pool.map(lambda case: programs.counted("bench_kept", case), KEPT)
+        return {case: count["instructions"] / count["calls"] for case, count in zip(KEPT, counts)}
+
+
+def time_threads(programs):
+    say("taking the times of several threads")
+    return {"with": json.loads(programs.output("bench_threads")),
+            "without": json.loads(programs.output("bench_threads", "--without-statistics"))}
+
+
 def take_times(programs):
     say("taking the times of the operations")
     output = programs.output("bench_times", "--benchmark_format=json", "--benchmark_min_time=0.02",
@@ -126,7 +145,9 @@ def main():
     results["rows"] = ROWS
     results["counts"] = count_operations(programs, names, lists["operations"])
     results["value_lists"] = count_value_lists(programs)
+    results["kept"] = count_kept(programs)
     results["times"] = take_times(programs)
+    results["threads"] = time_threads(programs)
     results["listings"], results["largest_skipped"] = list_tables(programs, listed)
     results["machine"] = machine()
     with open(sys.argv[2], "w") as file:

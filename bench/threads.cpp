@@ -1,0 +1,92 @@
+// SPDX-License-Identifier: MIT
+// bench_threads [--without-statistics]: how many times as much work threads with a database each do
+// as one of them alone, from 2 threads to one for each processor; the library and the floor in
+// turn, the median of nine. The option switches SQLite's global memory statistics off, whose lock
+// all threads share.
+#include "contender.h"
+
+#include <sqlite3.h>
+
+#include <algorithm>
+#include <atomic>
+#include <chrono>
+#include <cstdio>
+#include <cstring>
+#include <string>
+#include <thread>
+#include <vector>
+
+namespace {
+
+constexpr int kRows = 1000;
+constexpr int kRuns = 9;
+constexpr int kPasses = 4;
+
+// Of the passes over all records that each thread makes at the same time as the others.
+double secondsOf(const char* szContender, bench::Operation operation, int nThreads)
+{
+    const int nCalls = bench::callCount(operation, kRows);
+    std::atomic<int> iReady{0};
+    std::atomic<bool> blGo{false};
+    std::vector<std::thread> threads;
+    for (int iThread = 0; iThread < nThreads; ++iThread)
+        threads.emplace_back([&] {
+            const auto contender = bench::setUp(szContender, operation, kRows);
+            ++iReady;
+            while (!blGo) std::this_thread::yield();
+            // A pass over all records is one call of some operations and a thousand of others.
+            for (int iPass = 0; iPass < kPasses; ++iPass) {
+                bench::run(contender->connection(), "BEGIN");
+                for (int i = 0; i < nCalls; ++i) bench::call(*contender, operation, i);
+                contender->dropResult();
+                bench::run(contender->connection(), "ROLLBACK");
+            }
+        });
+    while (iReady < nThreads) std::this_thread::yield();
+    const auto begin = std::chrono::steady_clock::now();
+    blGo = true;
+    for (std::thread& thread : threads) thread.join();
+    return std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count();
+}
+
+double speedUp(const char* szContender, bench::Operation operation, int nThreads)
+{
+    const double dAlone = secondsOf(szContender, operation, 1);
+    return nThreads * dAlone / secondsOf(szContender, operation, nThreads);
+}
+
+double median(std::vector<double> values)
+{
+    std::sort(values.begin(), values.end());
+    return values[values.size() / 2];
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    if (1 < argc && 0 == strcmp("--without-statistics", argv[1]))
+        bench::must(SQLITE_OK == sqlite3_config(SQLITE_CONFIG_MEMSTATUS, 0), "sqlite3_config");
+    const int nProcessors = static_cast<int>(std::max(2U, std::thread::hardware_concurrency()));
+    const char* szComma = "";
+    printf("[");
+    for (const char* szOperation : {"create", "fetch", "list"})
+        for (int nThreads = 2; nThreads <= nProcessors; ++nThreads) {
+            const bench::Operation operation = bench::operationOf(szOperation);
+            std::vector<double> library;
+            std::vector<double> floor;
+            std::vector<double> ratios;
+            for (int i = 0; i < kRuns; ++i) {
+                library.push_back(speedUp("library", operation, nThreads));
+                floor.push_back(speedUp("floor", operation, nThreads));
+                ratios.push_back(library.back() / floor.back());
+            }
+            printf(
+                "%s\n{\"operation\": \"%s\", \"threads\": %d, \"library\": %.3f, \"floor\": %.3f, "
+                "\"ratio\": %.3f}",
+                szComma, szOperation, nThreads, median(library), median(floor), median(ratios));
+            szComma = ",";
+        }
+    printf("\n]\n");
+    return 0;
+}
