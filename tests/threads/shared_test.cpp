@@ -1,0 +1,100 @@
+// SPDX-License-Identifier: MIT
+// What threads share: the member types of tables, and a file.
+
+#include "in_threads.h"
+#include "support/rows.h"
+
+#include <atomic>
+#include <set>
+
+namespace {
+
+using SharedByThreads = HostTest;
+
+// Each definition may be the first that a name meets.
+TEST_F(SharedByThreads, TypesOfANewTableAreTheSame)
+{
+    const char* const definitions[] = {R"({"$":{"member":{"a":{"cpptype":"int"}}}})",
+                                       R"({"$":{"member":{"b":{"cpptype":"bool"},"c":{}}}})",
+                                       R"({"$":{"member":{}}})", "null"};
+    constexpr int kNames = 1000;
+    std::atomic<int> iReady{0};
+    std::vector<std::vector<const Json::Value*>> found(kThreads);
+    inThreads(kThreads, [&](int i) {
+        for (int iName = 0; iName < kNames; ++iName) {
+            std::string strName = "first" + std::to_string(iName);
+            const int iFirst = iName % 5;  // all bring the same definition where it is 4
+            const int iDefinition = 4 == iFirst ? 0 : (i + iFirst) % kThreads;
+            Json::Value jDefinition = json(replaced(definitions[iDefinition], '$', strName));
+            for (++iReady; iReady < kThreads * (iName + 1);) std::this_thread::yield();
+            const Json::Value& jTypes = VORN_JSON_DB::recType(jDefinition, strName);
+            found[static_cast<std::size_t>(i)].push_back(&jTypes);
+            const Lines lines = takeLogWithoutTypes();
+            const bool blLogs = 0 != iDefinition || jTypes.isNull();
+            EXPECT_TRUE(blLogs || lines.empty()) << lines[0];
+        }
+    });
+    const std::string strWhole = R"({"a":{"cpptype":"int"}})";
+    const std::set<std::string> possible = {strWhole, R"({"b":{"cpptype":"bool"}})", "null"};
+    for (std::size_t iName = 0; iName < kNames; ++iName) {
+        for (const auto& ofThread : found) EXPECT_EQ(found[0][iName], ofThread[iName]);
+        const std::string strTypes = text(*found[0][iName]);
+        EXPECT_EQ(1U, possible.count(strTypes)) << strTypes;
+        EXPECT_TRUE(4 != iName % 5 || strWhole == strTypes) << strTypes;
+    }
+    printf("figure: threads, first uses of one name at once = %d\n", kNames);
+}
+
+// Member types may be changed while no other thread is in the library.
+TEST_F(SharedByThreads, TypesMayBeChangedBefore)
+{
+    Database database;
+    const char szMembers[] = R"({"a":{"cpptype":"int"}})";
+    Table table(database, szMembers, "a");
+    const auto listedByThreads = [&] {
+        std::vector<std::string> listed(kThreads);
+        inThreads(kThreads, [&](int i) {
+            Database own;
+            Table ofThread(own, table.strName, szMembers, "a");
+            own.run("insert into " + table.strName + " values (7)");
+            listed[static_cast<std::size_t>(i)] = called(ofThread.api, {"recGetOne", "{}"}).whole();
+        });
+        return std::set<std::string>(listed.begin(), listed.end());
+    };
+    Json::Value& jType = VORN_JSON_DB::recType(table.jDefinition, table.strName)["a"];
+    EXPECT_EQ(std::set<std::string>{R"(1 {"a":7,"kept":1})"}, listedByThreads());
+    jType["cpptype"] = "string";
+    EXPECT_EQ(std::set<std::string>{R"(1 {"a":"7","kept":1})"}, listedByThreads());
+}
+
+TEST_F(SharedByThreads, FileHasTheRecordsOfAll)
+{
+    Database file(Database::Place::kFile);
+    file.run("pragma journal_mode=wal");
+    const int nRecords = 50 * kMore;
+    const auto open = [&](Database& database) {
+        return Table(database, "shared", R"({"id":{"cpptype":"int"},"v":{"cpptype":"string"}})",
+                     "id integer primary key, v text");
+    };
+    Table all = open(file);
+    inThreads(kThreads, [&](int i) {
+        doubles::state().blReallySleep = true;
+        Database database(file.path());
+        sqlite3_busy_timeout(database.get(), 1000);
+        Table table = open(database);
+        for (int n = 0; n < nRecords; ++n) {
+            const std::string strId = std::to_string(n * kThreads + i);
+            const std::string strRecord = R"({"id":)" + strId + R"(,"v":"of )" + strId + "\"}";
+            EXPECT_EQ(json(strRecord), table.create(strRecord));
+            EXPECT_EQ("1 " + strRecord,
+                      called(table.api, {"recGetOne", R"({"id":)" + strId + "}", "{}"}).whole());
+        }
+        EXPECT_EQ(Lines(), takeLog());
+    });
+    Json::Value jAll;
+    Json::Value jRequest;
+    EXPECT_EQ(0, all.api.recList(jRequest, jAll));
+    EXPECT_EQ(static_cast<unsigned>(nRecords * kThreads), jAll.size());
+}
+
+}  // namespace
