@@ -12,6 +12,7 @@
 #include <chrono>
 #include <cstdio>
 #include <cstring>
+#include <memory>
 #include <string>
 #include <thread>
 #include <vector>
@@ -20,22 +21,26 @@ namespace {
 
 constexpr int kRows = 1000;
 constexpr int kRuns = 9;
-constexpr int kPasses = 4;
+// Of each thread; a list is one call, of a thousand rows.
+constexpr int kCallsOfCreate = 4000;
+constexpr int kCallsOfList = 60;
 
 // Of the passes over all records that each thread makes at the same time as the others.
 double secondsOf(const char* szContender, bench::Operation operation, int nThreads)
 {
     const int nCalls = bench::callCount(operation, kRows);
+    const int nPasses = 1 == nCalls ? kCallsOfList : kCallsOfCreate / nCalls;
     std::atomic<int> iReady{0};
     std::atomic<bool> blGo{false};
-    std::vector<std::thread> threads;
+    std::vector<std::unique_ptr<bench::Contender>> contenders;
     for (int iThread = 0; iThread < nThreads; ++iThread)
+        contenders.push_back(bench::setUp(szContender, operation, kRows));
+    std::vector<std::thread> threads;
+    for (const auto& contender : contenders)
         threads.emplace_back([&] {
-            const auto contender = bench::setUp(szContender, operation, kRows);
             ++iReady;
             while (!blGo) std::this_thread::yield();
-            // A pass over all records is one call of some operations and a thousand of others.
-            for (int iPass = 0; iPass < kPasses; ++iPass) {
+            for (int iPass = 0; iPass < nPasses; ++iPass) {
                 bench::run(contender->connection(), "BEGIN");
                 for (int i = 0; i < nCalls; ++i) bench::call(*contender, operation, i);
                 contender->dropResult();
