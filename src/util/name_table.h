@@ -4,7 +4,6 @@
 
 #include <atomic>
 #include <cstddef>
-#include <cstdint>
 #include <functional>
 #include <memory>
 #include <string>
@@ -36,35 +35,33 @@ public:
     Entry* find(std::string_view strName) const
     {
         const std::size_t uHash = hash(strName);
-        const Node* pNode = &root_;
-        for (unsigned nBits = 0;; nBits += kBits) {
-            const std::uintptr_t uSlot = pNode->slot(uHash, nBits).load(std::memory_order_acquire);
-            if (!isNode(uSlot)) return named(entryOf(uSlot), strName);
-            pNode = nodeOf(uSlot);
-        }
+        const Place* pPlace = &root_.at(uHash, 0);
+        unsigned nBits = 0;
+        while (const Node* pBelow = pPlace->pBelow.load(std::memory_order_acquire))
+            pPlace = &pBelow->at(uHash, nBits += kBits);
+        Entry* pEntry = pPlace->pEntry.load(std::memory_order_acquire);
+        while (nullptr != pEntry && pEntry->strName != strName)
+            pEntry = pEntry->pNext.load(std::memory_order_acquire);
+        return pEntry;
     }
 
     // The entry that has the name from now on: a new one with the value, or that of another thread.
     Entry* insert(std::string_view strName, Value value)
     {
         auto pNew = std::make_unique<Entry>(strName, hash(strName), std::move(value));
-        Node* pNode = &root_;
+        Place* pPlace = &root_.at(pNew->uHash, 0);
         for (unsigned nBits = 0;;) {
-            std::atomic<std::uintptr_t>& slot = pNode->slot(pNew->uHash, nBits);
-            std::uintptr_t uSlot = slot.load(std::memory_order_acquire);
-            if (isNode(uSlot)) {
-                pNode = nodeOf(uSlot);
-                nBits += kBits;
-            } else if (0 == uSlot) {
-                if (published(slot, uSlot, pNew.get())) return pNew.release();
-            } else if (entryOf(uSlot)->uHash == pNew->uHash) {
-                return appended(entryOf(uSlot), std::move(pNew));
-            } else {
-                // Both go one level down.
-                auto pBelow = std::make_unique<Node>();
-                pBelow->slot(entryOf(uSlot)->uHash, nBits + kBits) = uSlot;
-                if (published(slot, uSlot, pBelow.get(), kNodeTag)) (void)pBelow.release();
+            if (Node* pBelow = pPlace->pBelow.load(std::memory_order_acquire)) {
+                pPlace = &pBelow->at(pNew->uHash, nBits += kBits);
+                continue;
             }
+            Entry* const pFirst = published(pPlace->pEntry, pNew.get());
+            if (nullptr == pFirst) return pNew.release();
+            if (pFirst->uHash == pNew->uHash) return appended(pFirst, std::move(pNew));
+            // Both go one level down; where it was, the first one is not looked at any more.
+            auto pBelow = std::make_unique<Node>();
+            pBelow->at(pFirst->uHash, nBits + kBits).pEntry = pFirst;
+            if (nullptr == published(pPlace->pBelow, pBelow.get())) (void)pBelow.release();
         }
     }
 
@@ -77,43 +74,38 @@ public:
 
 private:
     static constexpr unsigned kBits = 4;
-    // Tells the address of a node from that of an entry.
-    static constexpr std::uintptr_t kNodeTag = 1;
 
+    struct Node;
+    struct Place {
+        std::atomic<Entry*> pEntry{nullptr};
+        std::atomic<Node*> pBelow{nullptr};
+    };
     struct Node {
-        std::atomic<std::uintptr_t>& slot(std::size_t uHash, unsigned nBits)
+        Place& at(std::size_t uHash, unsigned nBits)
         {
-            return slots[uHash >> nBits & ((1U << kBits) - 1)];
+            return places[uHash >> nBits & (kPlaces - 1)];
         }
-        const std::atomic<std::uintptr_t>& slot(std::size_t uHash, unsigned nBits) const
+        const Place& at(std::size_t uHash, unsigned nBits) const
         {
-            return const_cast<Node*>(this)->slot(uHash, nBits);
+            return places[uHash >> nBits & (kPlaces - 1)];
         }
 
-        std::atomic<std::uintptr_t> slots[1U << kBits] = {};
+        static constexpr std::size_t kPlaces = 1U << kBits;
+        Place places[kPlaces];
     };
 
     static std::size_t hash(std::string_view strName)
     {
         return std::hash<std::string_view>()(strName);
     }
-    static bool isNode(std::uintptr_t uSlot) { return 0 != (uSlot & kNodeTag); }
-    static Node* nodeOf(std::uintptr_t uSlot) { return reinterpret_cast<Node*>(uSlot - kNodeTag); }
-    static Entry* entryOf(std::uintptr_t uSlot) { return reinterpret_cast<Entry*>(uSlot); }
 
+    // Null, or what was there already and stays.
     template <typename Pointed>
-    static bool published(std::atomic<std::uintptr_t>& slot, std::uintptr_t uSeen, Pointed* pNew,
-                          std::uintptr_t uTag = 0)
+    static Pointed* published(std::atomic<Pointed*>& pointer, Pointed* pNew)
     {
-        return slot.compare_exchange_strong(uSeen, reinterpret_cast<std::uintptr_t>(pNew) + uTag,
-                                            std::memory_order_acq_rel);
-    }
-
-    static Entry* named(Entry* pEntry, std::string_view strName)
-    {
-        while (nullptr != pEntry && pEntry->strName != strName)
-            pEntry = pEntry->pNext.load(std::memory_order_acquire);
-        return pEntry;
+        Pointed* pThere = nullptr;
+        pointer.compare_exchange_strong(pThere, pNew, std::memory_order_acq_rel);
+        return pThere;
     }
 
     // At the end of the entries of one hash, unless one of them has the name.
@@ -121,9 +113,8 @@ private:
     {
         for (;;) {
             if (pEntry->strName == pNew->strName) return pEntry;
-            Entry* pNext = nullptr;
-            if (pEntry->pNext.compare_exchange_strong(pNext, pNew.get(), std::memory_order_acq_rel))
-                return pNew.release();
+            Entry* const pNext = published(pEntry->pNext, pNew.get());
+            if (nullptr == pNext) return pNew.release();
             pEntry = pNext;
         }
     }
@@ -131,13 +122,12 @@ private:
     template <typename Visit>
     static void visitAll(const Node& node, Visit& visit)
     {
-        for (const auto& slot : node.slots) {
-            const std::uintptr_t uSlot = slot.load(std::memory_order_acquire);
-            if (isNode(uSlot)) {
-                visitAll(*nodeOf(uSlot), visit);
+        for (const Place& place : node.places) {
+            if (const Node* pBelow = place.pBelow.load(std::memory_order_acquire)) {
+                visitAll(*pBelow, visit);
                 continue;
             }
-            const Entry* pEntry = entryOf(uSlot);
+            const Entry* pEntry = place.pEntry.load(std::memory_order_acquire);
             for (; nullptr != pEntry; pEntry = pEntry->pNext.load(std::memory_order_acquire))
                 visit(*pEntry);
         }
