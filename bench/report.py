@@ -213,10 +213,10 @@ the library and the floor in turn), and the same without SQLite's global memory 
 
 {threads_table(results)}
 
-SQLite counts the memory of the whole process under one lock. A host that does not need these figures can call
-`sqlite3_config(SQLITE_CONFIG_MEMSTATUS, 0)` before it opens its first connection: threads then scale almost freely,
-and even a single thread saves time. The price is that `sqlite3_memory_used`, `sqlite3_memory_highwater` and the heap
-limits no longer work.
+SQLite counts the memory of the whole process under one lock, which small operations of several threads spend most of
+their time waiting for, the floor's as well. A host that does not need these figures can call
+`sqlite3_config(SQLITE_CONFIG_MEMSTATUS, 0)` before it opens its first connection. The price is that
+`sqlite3_memory_used`, `sqlite3_memory_highwater` and the heap limits no longer work.
 
 ## Long lists
 
