@@ -3,9 +3,7 @@
 // tables, so the tests of look-ups run before the wide tables here.
 
 #include "support/matrix.h"
-
-#include <pthread.h>
-#include <functional>
+#include "support/stack.h"
 
 namespace {
 
@@ -134,28 +132,8 @@ TEST_F(LargeRecords, MayHoldATextOfAMebibyte)
         takeLog());
 }
 
-// jsoncpp recurses once per level, and so does this test; the frames of a sanitizer are larger.
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-constexpr std::size_t kStack = 64U << 20;
-#else
-constexpr std::size_t kStack = 8U << 20;
-#endif
-
-// Runs the work on a stack of that size.
-void onKnownStack(std::function<void()> work)
-{
-    pthread_attr_t attributes;
-    ASSERT_EQ(0, pthread_attr_init(&attributes));
-    ASSERT_EQ(0, pthread_attr_setstacksize(&attributes, kStack));
-    const auto run = [](void* pWork) -> void* {
-        (*static_cast<std::function<void()>*>(pWork))();
-        return nullptr;
-    };
-    pthread_t thread;
-    ASSERT_EQ(0, pthread_create(&thread, &attributes, run, &work));
-    EXPECT_EQ(0, pthread_join(thread, nullptr));
-    pthread_attr_destroy(&attributes);
-}
+// jsoncpp recurses once per level, and so does this test.
+constexpr std::size_t kStack = (VORN_SANITIZED ? 64U : 8U) << 20;
 
 // [[[]]] or {"k":{"k":{}}}
 Json::Value nested(Json::ValueType type, std::size_t nLevels)
@@ -216,7 +194,7 @@ TEST_F(LargeRecords, MayHaveManyLevels)
     Table table(database_,
                 R"({"a":{"cpptype":"Json::arrayValue"},"o":{"cpptype":"Json::objectValue"}})",
                 "a, o");
-    onKnownStack([&] {
+    withStack(kStack, [&] {
         for (std::size_t nLevels : {1U, 999U, 1000U, 1001U, 10000U})
             storeAndAsk(database_, table, nLevels);
     });

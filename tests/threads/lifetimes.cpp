@@ -2,7 +2,8 @@
 // When threads begin, end and fork, and how little stack they may have. No doubles here, which
 // would see the library's own variables of a thread come and go.
 
-#include "store.h"
+#include "host/task.h"
+#include "support/stack.h"
 
 #include <VornJsonDbApi.h>
 #include <gtest/gtest.h>
@@ -17,19 +18,12 @@
 #include <cstring>
 #include <filesystem>
 #include <fstream>
-#include <functional>
 #include <memory>
 #include <new>
 #include <string>
 #include <thread>
 #include <utility>
 #include <vector>
-
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-#define VORN_SANITIZED 1
-#else
-#define VORN_SANITIZED 0
-#endif
 
 bool blLogToStdout = false;
 bool blDebugOutput = false;
@@ -65,14 +59,27 @@ struct FirstUse {
 };
 const FirstUse firstUse;
 
+// Decodes a row, which takes all that the library keeps for a thread, and logs a failure.
+bool works(Task& task)
+{
+    return task.works(1) && -1 == task.api().runSqlEx("nonsense");
+}
+
+bool works()
+{
+    Task task;
+    return works(task);
+}
+
 // A host's global handle: it works before main and after it.
-struct GlobalStore : Store {
-    ~GlobalStore()
+struct GlobalTask : Task {
+    GlobalTask() { api(); }
+    ~GlobalTask()
     {
-        if (!works()) _exit(3);
+        if (!::works(*this)) _exit(3);
     }
 };
-GlobalStore globalStore;
+GlobalTask globalTask;
 
 std::string program()
 {
@@ -102,7 +109,7 @@ TEST(ThreadLifetimes, MayBeginWithALackOfMemory)
 TEST(ThreadLifetimes, LeaveNothingBehind)
 {
     const auto runThreads = [](int nThreads) {
-        for (int i = 0; i < nThreads; ++i) std::thread([] { EXPECT_TRUE(Store().works()); }).join();
+        for (int i = 0; i < nThreads; ++i) std::thread([] { EXPECT_TRUE(works()); }).join();
     };
     constexpr int kThreads = 10000;
     constexpr int kFirst = 100;
@@ -115,10 +122,10 @@ TEST(ThreadLifetimes, LeaveNothingBehind)
     EXPECT_GT(1 << 20, lGrowth);
 }
 
-void useAtTheEnd(void* pStore)
+void useAtTheEnd(void* pTask)
 {
-    std::unique_ptr<Store> pOwned(static_cast<Store*>(pStore));
-    if (!pOwned->works()) abort();
+    const std::unique_ptr<Task> pOwned(static_cast<Task*>(pTask));
+    if (!works(*pOwned)) abort();
 }
 
 // The library has released what it kept for the thread by then, and keeps it anew.
@@ -126,17 +133,17 @@ TEST(ThreadLifetimes, EndAfterWhatTheHostStillDoes)
 {
     pthread_key_t before = 0;
     ASSERT_EQ(0, pthread_key_create(&before, useAtTheEnd));
-    std::thread([] { EXPECT_TRUE(Store().works()); }).join();
+    std::thread([] { EXPECT_TRUE(works()); }).join();
     pthread_key_t after = 0;
     ASSERT_EQ(0, pthread_key_create(&after, useAtTheEnd));
     struct AtTheEnd {
-        ~AtTheEnd() { EXPECT_TRUE(Store().works()); }
+        ~AtTheEnd() { EXPECT_TRUE(works()); }
     };
     std::thread([=] {
         static thread_local AtTheEnd atTheEnd;
-        EXPECT_TRUE(Store().works());
-        EXPECT_EQ(0, pthread_setspecific(before, new Store));
-        EXPECT_EQ(0, pthread_setspecific(after, new Store));
+        EXPECT_TRUE(works());
+        EXPECT_EQ(0, pthread_setspecific(before, new Task));
+        EXPECT_EQ(0, pthread_setspecific(after, new Task));
         EXPECT_NE(nullptr, &atTheEnd);
     }).join();
     EXPECT_EQ(0, pthread_key_delete(before));
@@ -146,13 +153,13 @@ TEST(ThreadLifetimes, EndAfterWhatTheHostStillDoes)
 // Run by itself, by main below: what unwinds here must not meet the frames of a test.
 [[noreturn]] void endMainFirst()
 {
-    Store().works();
+    works();
     std::thread([] {
         // ThreadSanitizer cannot join the main thread.
         const std::string strState = "/proc/self/task/" + std::to_string(getpid()) + "/stat";
         for (std::string strLine; std::string::npos == strLine.find(") Z");)
             std::getline(std::ifstream(strState), strLine);
-        exit(Store().works() && globalStore.works() ? 0 : 1);
+        exit(works() && works(globalTask) ? 0 : 1);
     }).detach();
     pthread_exit(nullptr);
 }
@@ -188,7 +195,7 @@ TEST(ThreadLifetimes, MayForkWhileOthersPublish)
         ++iForks;
         const pid_t child = fork();
         if (0 == child)
-            _exit(Store("forked" + std::to_string(i)).works() && Store().works() ? 0 : 1);
+            _exit(1U == typesOf("forked" + std::to_string(i)).size() && works() ? 0 : 1);
         int iStatus = -1;
         EXPECT_EQ(child, waitpid(child, &iStatus, 0));
         nWorking += 0 == iStatus ? 1 : 0;
@@ -200,39 +207,31 @@ TEST(ThreadLifetimes, MayForkWhileOthersPublish)
     printf("figure: names that they published = %d\n", iNames.load());
 }
 
-// Runs the work in a thread with that much stack.
-void withStack(std::size_t nBytes, const std::function<void()>& work)
-{
-    pthread_attr_t attributes;
-    ASSERT_EQ(0, pthread_attr_init(&attributes));
-    ASSERT_EQ(0, pthread_attr_setstacksize(&attributes, nBytes));
-    const auto run = [](void* arg) -> void* {
-        (*static_cast<const std::function<void()>*>(arg))();
-        return nullptr;
-    };
-    pthread_t thread{};
-    ASSERT_EQ(0,
-              pthread_create(&thread, &attributes, run, const_cast<std::function<void()>*>(&work)));
-    EXPECT_EQ(0, pthread_join(thread, nullptr));
-    pthread_attr_destroy(&attributes);
-}
-
 TEST(ThreadLifetimes, NeedAStackForNestedJson)
 {
-    constexpr std::size_t kStack = VORN_SANITIZED ? 16 << 20 : 512 << 10;
-    const std::string strDeep = std::string(1000, '[') + std::string(1000, ']');
-    withStack(kStack, [&] { EXPECT_TRUE(Store().reads(strDeep)); });
+    withStack(VORN_SANITIZED ? 16 << 20 : 1 << 20, [] {
+        Task task;
+        Json::Value jRecord = Task::record(1);
+        for (int i = 2; i < 1000; ++i) {
+            Json::Value jOuter;
+            jOuter["k"].swap(jRecord["data"]);
+            jRecord["data"].swap(jOuter);
+        }
+        Json::Value jStored;
+        EXPECT_EQ(0, task.api().recCreate(jRecord, jStored));
+        EXPECT_TRUE(jRecord == jStored);
+    });
 }
 
 TEST(ThreadLifetimes, MayBeCancelledBetweenCalls)
 {
-    Store store;
+    Task task;
     std::atomic<bool> blUsed{false};
     std::thread thread([&] {
         for (;;) {
             int iBefore = 0;
             pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &iBefore);
-            EXPECT_TRUE(store.works());
+            EXPECT_TRUE(works(task));
             blUsed = true;
             pthread_setcancelstate(iBefore, nullptr);
             pthread_testcancel();
@@ -241,7 +240,7 @@ TEST(ThreadLifetimes, MayBeCancelledBetweenCalls)
     while (!blUsed) std::this_thread::yield();
     EXPECT_EQ(0, pthread_cancel(thread.native_handle()));
     thread.join();
-    EXPECT_TRUE(store.works());
+    EXPECT_TRUE(works(task));
 }
 
 }  // namespace
