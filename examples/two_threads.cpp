@@ -5,6 +5,7 @@
 /// Prints how many messages each thread has stored, and how many it found to be there already.
 #include <VornJsonDbApi.h>
 
+#include <functional>
 #include <iostream>
 #include <string>
 #include <thread>

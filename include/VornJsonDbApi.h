@@ -40,10 +40,10 @@
 ///
 /// Threads: any number of threads may use the library at once, as long as a connection, and the
 /// handles on it, are used by one thread at a time. The library takes no locks. Change member types
-/// through the reference of recType() only while no other thread is in the library. Do not cancel a
-/// thread inside a call (see pthread_setcancelstate(3)). In any thread, do not call the library
-/// while one of its statements is running: a handle constructed at that point takes over the table
-/// name for the remaining rows.
+/// through the reference of recType(), and the two flags, only while no other thread is in it. Do
+/// not cancel a thread inside a call (see pthread_setcancelstate(3)). In any thread, do not call
+/// the library while one of its statements is running: a handle constructed at that point takes
+/// over the table name for the remaining rows.
 ///
 /// Exceptions: the only exception that the library itself throws is std::logic_error, from
 /// SqlExpandMemberSymbol(), recSave() and recCreate(), if a value list is too long. If a jsoncpp

@@ -14,6 +14,7 @@
 #include <iterator>
 #include <list>
 #include <map>
+#include <optional>
 #include <string>
 #include <utility>
 
@@ -60,25 +61,34 @@ const Json::Value& memberTypes()
     return *pjTypes;
 }
 
+// The type word of a column; null, after logging the failed check, if the table has no such member.
+// A running statement keeps the words of its first row.
+std::optional<std::string> typeOf(const char* szName, int idx)
+{
+    const RowLayout* pLayout = ofThisThread<Rows>().pLayout;
+    if (nullptr != pLayout) return pLayout->typeAt(static_cast<std::size_t>(idx));
+    const Json::Value* pjMember = findMember(memberTypes(), szName);
+    if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strName)")) return std::nullopt;
+    return TypeWord(*pjMember).text();
+}
+
 int DbCallBackFillField(Json::Value& jRec, char** column_name, char** column_value, int idx)
 {
-    const Json::Value& jType = memberTypes();
     // Cannot fail: the record is the library's own object.
     if (GUARDED(jRec.type() != Json::objectValue && jRec.type() != Json::nullValue)) return -1;
     // Cannot fail: the loop begins at 0.
     if (GUARDED(0 > idx)) return -1;
     const char* szName = column_name[idx];
-    const Json::Value* pjMember = findMember(jType, szName);
-    if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strName)")) return -1;
-    const std::string strType = TypeWord(*pjMember).text();
+    const std::optional<std::string> strType = typeOf(szName, idx);
+    if (!strType) return -1;
 
     // NULL means absent, whatever the type word.
     const char* szValue = column_value[idx];
     if (nullptr == szValue) return 0;
 
-    const RowForm form = formsOf(strType).row;
+    const RowForm form = formsOf(*strType).row;
     if (RowForm::kNo == form) {
-        LOG_ERROR("type error, strType=%s", strType.c_str());
+        LOG_ERROR("type error, strType=%s", strType->c_str());
         return -1;
     }
     Json::Value& jMember = jRec[szName];

@@ -70,6 +70,13 @@ bool RowLayout::decodes(char** column_value) const
            });
 }
 
+const std::string& RowLayout::typeAt(std::size_t iPlace) const
+{
+    return std::find_if(columns_.begin(), columns_.end(),
+                        [iPlace](const Column& column) { return iPlace == column.iPlace; })
+        ->strType;
+}
+
 Json::Value RowLayout::record(char** column_value) const
 {
     Json::Value jRecord = jBlank_;

@@ -27,6 +27,9 @@ public:
     // value that is refused.
     bool decodes(char** column_value) const;
 
+    // The type word of the column at that place.
+    const std::string& typeAt(std::size_t iPlace) const;
+
     // The row as a record: a copy of the blank one, filled in the order of its members without a
     // search for any.
     Json::Value record(char** column_value) const;

@@ -127,5 +127,6 @@ Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonN
     LOG_PLAIN("jTableDef=%s", toString(jTableDef).c_str());
     LOG_PLAIN("jType=%s", allTypes().c_str());
     // A name that was absent gets a null entry, which stays.
-    return tables.insert(strJsonName, Json::Value())->value;
+    Table* const pTable = tables.find(strJsonName);
+    return (nullptr == pTable ? tables.insert(strJsonName, Json::Value()) : pTable)->value;
 }

@@ -24,19 +24,20 @@ void release(void* pEnded)
 }
 
 // The key whose destructor releases a thread's state. Not a static variable of the function: a
-// process that is forked while another thread makes that one would wait for it for ever.
+// process that is forked while another thread makes that one would wait for it forever.
 pthread_key_t key()
 {
-    constexpr long long kNone = -1;
-    static std::atomic<long long> published{kNone};
-    long long iKey = published.load(std::memory_order_acquire);
-    if (kNone != iKey) return static_cast<pthread_key_t>(iKey);
+    // The key plus one, or 0.
+    static std::atomic<unsigned> published{0};
+    static_assert(std::atomic<unsigned>::is_always_lock_free);
+    unsigned uThere = published.load(std::memory_order_acquire);
+    if (0 != uThere) return uThere - 1;
 
     pthread_key_t made = 0;
     if (0 != pthread_key_create(&made, release)) throw std::bad_alloc();
-    if (published.compare_exchange_strong(iKey, made, std::memory_order_acq_rel)) return made;
+    if (published.compare_exchange_strong(uThere, made + 1, std::memory_order_acq_rel)) return made;
     pthread_key_delete(made);
-    return static_cast<pthread_key_t>(iKey);
+    return uThere - 1;
 }
 
 // Not inlined: it is called once a thread.

@@ -79,7 +79,7 @@ public:
     // Whether it is that text. Never throws.
     bool is(std::string_view strWord) const
     {
-        return nullptr != pjWord_ && textOf(*pjWord_) == strWord;
+        return nullptr != pjWord_ && pjWord_->isString() && textOf(*pjWord_) == strWord;
     }
 
 private:

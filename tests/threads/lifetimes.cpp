@@ -11,6 +11,7 @@
 #include <dlfcn.h>
 #include <pthread.h>
 #include <sys/wait.h>
+#include <syslog.h>
 #include <unistd.h>
 #include <atomic>
 #include <cerrno>
@@ -30,8 +31,6 @@ bool blDebugOutput = false;
 
 namespace {
 
-std::atomic<int> iLines{0};
-
 const Json::Value& typesOf(std::string strName)
 {
     Json::Value jDefinition;
@@ -42,10 +41,13 @@ const Json::Value& typesOf(std::string strName)
 // What happens when the library makes its key, or keeps a value under it.
 enum class Trouble { kNone, kNoKey, kNoValue, kLate } trouble = Trouble::kNone;
 
-// The first call of the library in the process.
+void useAtTheEnd(void* pTask);
+
+// The first call of the library in the process, after the host has made a key of its own.
 struct FirstUse {
     FirstUse()
     {
+        pthread_key_create(&before, useAtTheEnd);
         trouble = Trouble::kNoKey;
         try {
             typesOf("first");
@@ -55,6 +57,7 @@ struct FirstUse {
         trouble = Trouble::kLate;
         typesOf("first");
     }
+    pthread_key_t before = 0;
     bool blRefused = false;
 };
 const FirstUse firstUse;
@@ -119,7 +122,8 @@ TEST(ThreadLifetimes, LeaveNothingBehind)
     const long lGrowth = residentBytes() - lBefore;
     printf("figure: threads in sequence = %d\n", kThreads);
     printf("figure: their growth in KiB after the first %d = %ld\n", kFirst, lGrowth / 1024);
-    EXPECT_GT(1 << 20, lGrowth);
+    // A sanitizer keeps what was freed, and finds leaks itself.
+    EXPECT_TRUE(VORN_SANITIZED || 1 << 20 > lGrowth) << lGrowth;
 }
 
 void useAtTheEnd(void* pTask)
@@ -128,12 +132,9 @@ void useAtTheEnd(void* pTask)
     if (!works(*pOwned)) abort();
 }
 
-// The library has released what it kept for the thread by then, and keeps it anew.
-TEST(ThreadLifetimes, EndAfterWhatTheHostStillDoes)
+// What the library kept for the thread may be released by then; it is made again.
+TEST(ThreadLifetimes, AllowCallsUntilTheirVeryEnd)
 {
-    pthread_key_t before = 0;
-    ASSERT_EQ(0, pthread_key_create(&before, useAtTheEnd));
-    std::thread([] { EXPECT_TRUE(works()); }).join();
     pthread_key_t after = 0;
     ASSERT_EQ(0, pthread_key_create(&after, useAtTheEnd));
     struct AtTheEnd {
@@ -142,11 +143,10 @@ TEST(ThreadLifetimes, EndAfterWhatTheHostStillDoes)
     std::thread([=] {
         static thread_local AtTheEnd atTheEnd;
         EXPECT_TRUE(works());
-        EXPECT_EQ(0, pthread_setspecific(before, new Task));
+        EXPECT_EQ(0, pthread_setspecific(firstUse.before, new Task));
         EXPECT_EQ(0, pthread_setspecific(after, new Task));
         EXPECT_NE(nullptr, &atTheEnd);
     }).join();
-    EXPECT_EQ(0, pthread_key_delete(before));
     EXPECT_EQ(0, pthread_key_delete(after));
 }
 
@@ -266,22 +266,12 @@ int pthread_setspecific(pthread_key_t key, const void* pValue) noexcept
 }
 #endif
 
-// The log is only counted.
-void syslog(int, const char*, ...)
-{
-    ++iLines;
-}
-
-void __syslog_chk(int, int, const char*, ...)
-{
-    ++iLines;
-}
-
 }  // extern "C"
 
 int main(int argc, char** argv)
 {
     if (2 == argc && 0 == strcmp("--end-main-first", argv[1])) endMainFirst();
+    setlogmask(LOG_MASK(LOG_DEBUG));  // which drops the library's lines
     testing::InitGoogleTest(&argc, argv);
     return RUN_ALL_TESTS();
 }

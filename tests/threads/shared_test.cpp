@@ -9,10 +9,10 @@
 
 namespace {
 
-using SharedByThreads = HostTest;
+using ThreadsTogether = HostTest;
 
 // Each definition may be the first that a name meets.
-TEST_F(SharedByThreads, TypesOfANewTableAreTheSame)
+TEST_F(ThreadsTogether, AgreeOnTheTypesOfANewTable)
 {
     const char* const definitions[] = {R"({"$":{"member":{"a":{"cpptype":"int"}}}})",
                                        R"({"$":{"member":{"b":{"cpptype":"bool"},"c":{}}}})",
@@ -46,7 +46,7 @@ TEST_F(SharedByThreads, TypesOfANewTableAreTheSame)
 }
 
 // Member types may be changed while no other thread is in the library.
-TEST_F(SharedByThreads, TypesMayBeChangedBefore)
+TEST_F(ThreadsTogether, SeeTypesThatWereChangedBefore)
 {
     Database database;
     const char szMembers[] = R"({"a":{"cpptype":"int"}})";
@@ -67,7 +67,7 @@ TEST_F(SharedByThreads, TypesMayBeChangedBefore)
     EXPECT_EQ(std::set<std::string>{R"(1 {"a":"7","kept":1})"}, listedByThreads());
 }
 
-TEST_F(SharedByThreads, FileHasTheRecordsOfAll)
+TEST_F(ThreadsTogether, StoreTheirRecordsInOneFile)
 {
     Database file(Database::Place::kFile);
     file.run("pragma journal_mode=wal");

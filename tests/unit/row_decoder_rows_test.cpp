@@ -131,6 +131,32 @@ TEST_F(KeptColumns, BelongToTheRunningTable)
     }
 }
 
+// Also where a row has to be decoded by name.
+TEST_F(KeptColumns, KeepARefusedTypeUntilTheStatementEnds)
+{
+    state().exec = [this](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
+                          char** errText) {
+        Row first{{"s", "d"}, {"7", nullptr}};
+        EXPECT_EQ(0, first.handTo(callback, arg));
+        jTypes_["d"]["cpptype"] = "string";
+        Row second{{"s", "d"}, {"7", "8"}};
+        EXPECT_EQ(-1, second.handTo(callback, arg));
+        return End{SQLITE_ABORT, "query aborted"}.leaveIn(errText);
+    };
+    EXPECT_EQ(R"([{"s":"7"}])", decoded(table_));
+    EXPECT_EQ(error("type error, strType=double"), takeLog()[0]);
+    jTypes_ = jTypesBefore_;
+}
+
+TEST_F(KeptColumns, NoticeAnEmptyWordThatBecomesAnArray)
+{
+    const Row row{{"s", "empty"}, {"7", nullptr}};
+    for (int i = 0; i < 2; ++i) EXPECT_EQ(R"([{"s":"7"}])", decoded({row}));
+    jTypes_["empty"]["cpptype"] = Json::arrayValue;
+    EXPECT_EQ("Json::LogicError after null", decoded({row}));
+    jTypes_ = jTypesBefore_;
+}
+
 class ManyRows : public DecoderTest {};
 
 TEST_F(ManyRows, AreDecodedLikeSingleOnes)
