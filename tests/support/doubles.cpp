@@ -11,6 +11,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <new>
+#include <utility>
 
 bool blLogToStdout = false;
 bool blDebugOutput = false;
@@ -67,11 +68,13 @@ __attribute__((format(printf, 3, 0))) void record(bool blSyslog, int iPriority,
                                                   const char* szFormat, va_list arguments)
 {
     const int iErrno = errno;
+    const int iFailNew = std::exchange(state().iFailNew, 0);  // not for the double's own memory
     char* szText = nullptr;
     if (0 > vasprintf(&szText, szFormat, arguments)) abort();
     state().log.push_back({blSyslog, iPriority, iErrno, szText});
     if (nullptr != doubles::onEveryLine) doubles::onEveryLine(szText);
     free(szText);
+    state().iFailNew = iFailNew;
     // The real ones may leave anything in errno.
     errno = ENOTTY;
 }

@@ -114,7 +114,7 @@ TEST(ThreadLifetimes, LeaveNothingBehind)
     const auto runThreads = [](int nThreads) {
         for (int i = 0; i < nThreads; ++i) std::thread([] { EXPECT_TRUE(works()); }).join();
     };
-    constexpr int kThreads = 10000;
+    constexpr int kThreads = VORN_SANITIZED ? 500 : 10000;
     constexpr int kFirst = 100;
     runThreads(kFirst);
     const long lBefore = residentBytes();
@@ -189,7 +189,7 @@ TEST(ThreadLifetimes, MayForkWhileOthersPublish)
                 EXPECT_EQ(1U, typesOf("published" + std::to_string(iNames++)).size());
             }
         });
-    constexpr int kForks = VORN_SANITIZED ? 100 : 1000;
+    constexpr int kForks = VORN_SANITIZED ? 5 : 1000;
     int nWorking = 0;
     for (int i = 0; i < kForks; ++i) {
         ++iForks;
