@@ -2,9 +2,12 @@
 // bench_threads [--without-statistics]: how many times as much work threads with a database each do
 // as one of them alone, from 2 threads to one for each processor; the library and the floor in
 // turn, the median of nine. The option switches SQLite's global memory statistics off, whose lock
-// all threads share.
+// all threads share. Each thread has a processor of its own: a scheduler that lets two of them
+// begin on the same one would be measured with them.
 #include "contender.h"
 
+#include <pthread.h>
+#include <sched.h>
 #include <sqlite3.h>
 
 #include <algorithm>
@@ -22,8 +25,17 @@ namespace {
 constexpr int kRows = 1000;
 constexpr int kRuns = 9;
 // Of each thread; a list is one call, of a thousand rows.
-constexpr int kCallsOfCreate = 4000;
-constexpr int kCallsOfList = 60;
+constexpr int kCallsOfCreate = 8000;
+constexpr int kCallsOfList = 120;
+
+void runOnProcessor(int iProcessor)
+{
+    cpu_set_t processors;
+    CPU_ZERO(&processors);
+    CPU_SET(iProcessor, &processors);
+    bench::must(0 == pthread_setaffinity_np(pthread_self(), sizeof(processors), &processors),
+                "pthread_setaffinity_np");
+}
 
 // Of the passes over all records that each thread makes at the same time as the others.
 double secondsOf(const char* szContender, bench::Operation operation, int nThreads)
@@ -36,8 +48,10 @@ double secondsOf(const char* szContender, bench::Operation operation, int nThrea
     for (int iThread = 0; iThread < nThreads; ++iThread)
         contenders.push_back(bench::setUp(szContender, operation, kRows));
     std::vector<std::thread> threads;
-    for (const auto& contender : contenders)
-        threads.emplace_back([&] {
+    for (int iThread = 0; iThread < nThreads; ++iThread)
+        threads.emplace_back([&, iThread] {
+            runOnProcessor(iThread);
+            const auto& contender = contenders[static_cast<std::size_t>(iThread)];
             ++iReady;
             while (!blGo) std::this_thread::yield();
             for (int iPass = 0; iPass < nPasses; ++iPass) {
@@ -54,10 +68,16 @@ double secondsOf(const char* szContender, bench::Operation operation, int nThrea
     return std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count();
 }
 
+// Of the fastest of three turns each: what else the machine does is no part of it.
 double speedUp(const char* szContender, bench::Operation operation, int nThreads)
 {
-    const double dAlone = secondsOf(szContender, operation, 1);
-    return nThreads * dAlone / secondsOf(szContender, operation, nThreads);
+    double dAlone = secondsOf(szContender, operation, 1);
+    double dTogether = secondsOf(szContender, operation, nThreads);
+    for (int i = 1; i < 3; ++i) {
+        dAlone = std::min(dAlone, secondsOf(szContender, operation, 1));
+        dTogether = std::min(dTogether, secondsOf(szContender, operation, nThreads));
+    }
+    return nThreads * dAlone / dTogether;
 }
 
 double median(std::vector<double> values)
