@@ -114,9 +114,10 @@ namespace VORN_JSON_DB {
 /// members before the first one without a "cpptype" string; later calls return that same entry. The
 /// cache of member types is never destroyed, so the reference stays valid until the process ends.
 ///
-/// If the host changes a type word through the reference, the change takes effect with the next
-/// statement. If it damages a member there, so that it has no "cpptype" or is not even an object,
-/// the library leaves the member alone and treats its type word as unknown.
+/// The host may change a type word through the reference while no other thread uses the library;
+/// the change takes effect with the next statement. If it damages a member there, so that it has no
+/// "cpptype" or is not even an object, the library leaves the member alone and treats its type word
+/// as unknown.
 VORN_JSON_DB_EXPORT Json::Value& recType(Json::Value& jTableDef, std::string& strJsonName);
 
 /// Copies the members of the object @p jSubSet into @p jIn, which is an object or null: those that

@@ -53,7 +53,7 @@ const Json::Value& memberTypes()
     const Json::Value*& pjTypes = rows.pTable->pjTypes;
     // If it is not an object it is looked up again, which logs.
     if (nullptr == pjTypes || !pjTypes->isObject()) {
-        // Kept(RowDecoder.SpoilsTheTypesOfATableThatNobodyAskedForBefore): a row that is decoded
+        // Kept(RowCallback.SpoilsTheTypesOfATableThatNobodyAskedForBefore): a row that is decoded
         // before anybody has asked for the table's types spoils them
         Json::Value jTableDef;
         pjTypes = &VORN_JSON_DB::recType(jTableDef, rows.strCurJsonName);
@@ -101,8 +101,8 @@ int DbCallBackFillRec(Json::Value* pjRec, int n_column, char** column_value, cha
 {
     if (FAILED(NULL == column_name || NULL == column_value)) return -1;
     const auto fail = [&](int i) {
-        // Kept(RowDecoder.ShowsTheFailedColumnUnlessItIsTheFirst): the first column of a bad row is
-        // not traced
+        // Kept(RowCallback.ShowsTheFailedColumnUnlessItIsTheFirst): the first column of a bad row
+        // is not traced
         if (0 < i) {
             LOG_PLAIN("column_name[%d]=%s", i, column_name[i]);
             LOG_PLAIN("column_value[%d]=%s", i, column_value[i]);
@@ -140,7 +140,7 @@ const RowLayout* newLayout(Table& table, std::size_t nColumns, char** column_nam
     return &layouts.front();
 }
 
-// Kept(RowDecoder.AppendsTheRowsOfEveryAttempt, RowDecoder.KeepsTheRowsBeforeAFailure): rows are
+// Kept(RowCallback.AppendsTheRowsOfEveryAttempt, RowCallback.KeepsTheRowsBeforeAFailure): rows are
 // appended to the array, also by every retried attempt, and those before a failure stay
 int fillList(Json::Value* pjRecArray, int n_column, char** column_value, char** column_name)
 {

@@ -36,7 +36,7 @@ inline int saturatedToInt(long long iValue)
     const auto set = [&jMember](Json::Value jValue) { jMember.swapPayload(jValue); };
     switch (form) {
     case RowForm::kText: set(szValue); break;
-    // Kept(RowDecoder.StoresIntegersAsSigned): unsigned words are read through signed
+    // Kept(RowCallback.StoresIntegersAsSigned): unsigned words are read through signed
     // conversions and saturate
     case RowForm::kInt32: set(saturatedToInt(integerOf(szValue))); break;
     case RowForm::kInt64: set(Json::Int64(integerOf(szValue))); break;

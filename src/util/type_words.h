@@ -27,7 +27,7 @@ struct TypeForms {
     CheckedKind checked;
 };
 
-// Kept(ValueLists.RefuseAnyOtherWord, RowDecoder.RefusesAValueOfAnyOtherType,
+// Kept(ValueLists.RefuseAnyOtherWord, RowCallback.RefusesAValueOfAnyOtherType,
 // TypeCheck.KnowsNoOtherWord): each consumer knows its own type words: a "double" is written but
 // not read back, a "Json::Value" read but not written
 // clang-format off

@@ -7,6 +7,8 @@
 #include <json/reader.h>
 
 #include <malloc.h>
+#include <pthread.h>
+#include <atomic>
 #include <cstdio>
 #include <cstring>
 #include <functional>
@@ -133,6 +135,26 @@ TEST_F(Limits, Threads)
                         "SELECT id FROM " + written.strName + " ;"),
               takeLog().at(0));
     writer.run("rollback");
+}
+
+TEST_F(Limits, CancelledThreads)
+{
+    const std::string strStored = text(table_.create(R"({"id":1,"text":"x"})"));
+    VornJsonDbApi& task = api_;
+    std::atomic<bool> blListed{false};
+    std::thread thread([&] {
+        for (;; pthread_testcancel()) {
+            Json::Value jRequest;
+            Json::Value jRecords;
+#include "limits/CancelledThreads.inc"
+            EXPECT_EQ("[" + strStored + "]", text(jRecords));
+            blListed = true;
+        }
+    });
+    while (!blListed) std::this_thread::yield();
+    EXPECT_EQ(0, pthread_cancel(thread.native_handle()));
+    thread.join();
+    EXPECT_EQ("[" + strStored + "]", listed(api_));
 }
 
 TEST_F(Limits, FirstDefinitionWins)

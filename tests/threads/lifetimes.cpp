@@ -221,26 +221,6 @@ TEST(ThreadLifetimes, NeedAStackForNestedJson)
     });
 }
 
-TEST(ThreadLifetimes, MayBeCancelledBetweenCalls)
-{
-    Task task;
-    std::atomic<bool> blUsed{false};
-    std::thread thread([&] {
-        for (;;) {
-            int iBefore = 0;
-            pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &iBefore);
-            EXPECT_TRUE(works(task));
-            blUsed = true;
-            pthread_setcancelstate(iBefore, nullptr);
-            pthread_testcancel();
-        }
-    });
-    while (!blUsed) std::this_thread::yield();
-    EXPECT_EQ(0, pthread_cancel(thread.native_handle()));
-    thread.join();
-    EXPECT_TRUE(works(task));
-}
-
 }  // namespace
 
 extern "C" {

