@@ -62,7 +62,7 @@ const Json::Value& memberTypes()
 }
 
 // The type word of a column; null, after logging the failed check, if the table has no such member.
-// A running statement keeps the words of its first row.
+// Rows of the same columns keep the words of the first of them while the statement runs.
 std::optional<std::string> typeOf(const char* szName, int idx)
 {
     const RowLayout* pLayout = ofThisThread<Rows>().pLayout;
@@ -180,12 +180,13 @@ void beginStatement(const std::string& strTable)
     Rows& rows = ofThisThread<Rows>();
     rows.pLayout = nullptr;
     if (nullptr != rows.pTable && rows.strCurJsonName == strTable) return;
+    std::string strName = strTable;
     const auto it = rows.tables.try_emplace(strTable).first;
-    rows.strCurJsonName = strTable;
+    rows.strCurJsonName.swap(strName);
     rows.pTable = &it->second;
     if (kMaxTables >= rows.tables.size()) return;
-    const auto first = rows.tables.begin();
-    rows.tables.erase(it == first ? std::next(first) : first);
+    const auto next = std::next(it);
+    rows.tables.erase(rows.tables.end() == next ? rows.tables.begin() : next);
 }
 
 std::exception_ptr takeThrown()

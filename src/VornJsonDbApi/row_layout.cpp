@@ -55,8 +55,11 @@ bool RowLayout::hasColumns(std::size_t nColumns, char** column_name) const
 bool RowLayout::hasTypes(const Json::Value& jTypes) const
 {
     MemberWalk types(jTypes);
-    return std::all_of(columns_.begin(), columns_.end(), [&types](const Column& column) {
-        const Json::Value* pjMember = types.find(column.szName);
+    const char* szLast = nullptr;
+    const Json::Value* pjMember = nullptr;
+    return std::all_of(columns_.begin(), columns_.end(), [&](const Column& column) {
+        // Columns of equal names share the name.
+        if (szLast != column.szName) pjMember = types.find(szLast = column.szName);
         return nullptr != pjMember && TypeWord(*pjMember).is(column.strType);
     });
 }

@@ -54,8 +54,8 @@ int VornJsonDbApi::runSqlEx(std::string strSql, int (*callback)(void*, int, char
     // Kept(Retry.RunsTheWholeTextAgain): a retry runs the whole text again
     for (;;) {
         if (nullptr != errText) strSqlError = errText;
-        errno = 0;
         beginStatement(strName);
+        errno = 0;
         const int iStatus = sqlite3_exec(pDb, strSql.c_str(), callback, arg, errText.receive());
 
         if (const std::exception_ptr pThrown = takeThrown()) {

@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
-// docs/limits.md, other connections: locks, what waiting costs, and what a retry does.
+// docs/limits.md: locks, what waiting costs, what a retry does, and what a cancelled thread leaves.
 
 #include "docs/limits_page.h"
 
+#include <pthread.h>
 #include <cerrno>
+#include <thread>
 #include <utility>
 
 namespace {
@@ -149,4 +151,31 @@ TEST_F(Limits, WhatWaitingCosts)
         EXPECT_EQ(blWriter ? 0U : 500U, waits());
         EXPECT_LE(0, api_.runSqlEx("rollback"));
     }
+}
+
+TEST_F(Limits, CancelledThreads)
+{
+    // Never closed: with its mutex locked that would wait forever.
+    static auto& database = *new Database;
+    static auto& table = *new Table(database, R"({"id":{"cpptype":"int"}})", "id int");
+    table.create(R"({"id":1})");
+    const auto cancel = [](sqlite3_context* pContext, int, sqlite3_value**) {
+        pthread_cancel(pthread_self());
+        pthread_testcancel();
+        sqlite3_result_int(pContext, 1);
+    };
+    EXPECT_EQ(SQLITE_OK, sqlite3_create_function(database.get(), "cancel", 0, SQLITE_UTF8, nullptr,
+                                                 cancel, nullptr, nullptr));
+    std::thread([&task = table.api] {
+        Json::Value jRequest = json(R"x({"vornSqlWhereFilter":"cancel()"})x");
+        Json::Value jRecords;
+#include "limits/CancelledThreads.inc"
+        EXPECT_EQ(R"([{"id":1}])", text(jRecords));
+        pthread_testcancel();
+        ADD_FAILURE() << "it was not cancelled";
+    }).join();
+    EXPECT_EQ(R"([{"id":1}])", listed(table.api));
+
+    std::thread([] { table.api.runSqlEx("select cancel()"); }).join();
+    EXPECT_EQ(SQLITE_BUSY, sqlite3_mutex_try(sqlite3_db_mutex(database.get())));
 }

@@ -2,6 +2,7 @@
 // SqlMakeByMatchField and SqlMakeByListField: one term by type word and value. VectorParamToJson.
 
 #include "support/composed.h"
+#include "support/matrix.h"
 
 #include <memory>
 
@@ -62,18 +63,12 @@ const Value kValues[] = {
     {R"(["it's",2])", kThrows, kThrows},
 };
 
-std::string quoted(const std::string& strText)
-{
-    std::string strOut = "'";
-    for (char c : strText) strOut.append('\'' == c ? 2 : 1, c);
-    return strOut + "'";
-}
-
 // A term of the value in its group, between the texts.
 Composed term(const char* szBefore, const Value& value, Group group, const char* szAfter)
 {
     const char* szBare = Group::kBool == group ? value.szBool : value.szBare;
-    if (Group::kJson == group) return {szBefore + quoted(value.szJson) + szAfter};
+    if (Group::kJson == group)
+        return {szBefore + ("'" + replaced(value.szJson, '\'', "''") + "'") + szAfter};
     if (kThrows == szBare) return {"", "T"};
     const char* szQuote = Group::kText == group ? "'" : "";
     return {std::string(szBefore) + szQuote + szBare + szQuote + szAfter};

@@ -206,6 +206,34 @@ TEST_F(ManyRows, AreFilledWithoutLookingUpMembers)
     EXPECT_GE(12, lookUps(1000));
 }
 
+TEST_F(ManyRows, LookUpEqualNamesOnce)
+{
+    const Row twice{{"i", "i"}, {"1", "2"}};
+    decoded({twice});
+    iLookUps = 0;
+    EXPECT_EQ(R"([{"i":2}])", decoded({twice}));
+    EXPECT_EQ(0, iLookUps);
+}
+
+TEST_F(ManyRows, OfTwoTablesInTurnAreLookedUpOnceEvenAmongAThousand)
+{
+    for (int i = 0; i < 1000; ++i) {
+        std::string strOther = "B" + std::to_string(i);
+        VornJsonDbApi(database_.get(), strOther, table_.jDefinition, table_.strCreate);
+    }
+    const char szMembers[] = R"({"s":{"cpptype":"string"}})";
+    Table first(database_, "A0", szMembers, "s");
+    Table second(database_, "A1", szMembers, "s");
+    for (Table* pTable : {&first, &second})
+        VORN_JSON_DB::recType(pTable->jDefinition, pTable->strName);
+    state().exec = execOfRows({kSeven});
+    for (int i = 0; i < 4; ++i) {
+        if (2 == i) iLookUps = 0;
+        for (Table* pTable : {&first, &second}) EXPECT_EQ(R"([{"s":"7"}])", decoded(*pTable));
+    }
+    EXPECT_EQ(0, iLookUps);
+}
+
 // A record is the host's own, whatever it shares with others inside the library.
 TEST_F(ManyRows, AreIndependentRecords)
 {

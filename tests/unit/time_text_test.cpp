@@ -43,10 +43,7 @@ private:
     std::optional<std::string> before_;
 };
 
-constexpr int kLocalGmt = 2;
-constexpr int kGmt = 3;
-constexpr int kLocal = 4;
-constexpr int kUtc = 5;
+constexpr int kLocalGmt = 2, kGmt = 3, kLocal = 4, kUtc = 5;
 
 // The first and the last second whose year, counted from 1900, is an int.
 constexpr long long kFirst = -67768040609740800;
@@ -187,11 +184,6 @@ TEST_F(TimeText, CoversTheCalendarFromItsFirstSecondToItsLast)
             const std::string strEnd = converted(iTime, iType);
             EXPECT_EQ(strFailure, 0 == strEnd.find("E ") ? strEnd : "") << iTime << ", " << iType;
         }
-    if (!isLong(kLast)) return;
-    const std::string strLast = converted(kLast, kUtc);
-    EXPECT_EQ("-12-31 23:59:59", strLast.substr(strLast.size() - 15));
-    EXPECT_EQ(kNoUtc, converted(kLast + 1, kUtc));
-    EXPECT_EQ(EOVERFLOW, errno);
 }
 
 TEST_F(TimeText, FailsWhenTheCLibraryFails)
@@ -231,14 +223,11 @@ TEST_F(TimeAfterNow, IsTheSumInSecondsAndWrapsBeyondALong)
         EXPECT_EQ(0, getTimeAfterNow(iOffset, lOut));
         return lOut;
     };
-    EXPECT_EQ(1000, afterClock(1000, 0));
     EXPECT_EQ(-2600, afterClock(1000, -3600));
     EXPECT_EQ(static_cast<long>(3847483647), afterClock(1700000000, INT_MAX));
     EXPECT_EQ(LONG_MAX - 1, afterClock(LONG_MAX, -1));
     EXPECT_EQ(LONG_MIN, afterClock(LONG_MAX, 1));
     EXPECT_EQ(LONG_MAX, afterClock(LONG_MIN, -1));
-    EXPECT_EQ(LONG_MAX + INT_MIN, afterClock(LONG_MAX, INT_MIN));
-    EXPECT_EQ(LONG_MIN + INT_MAX, afterClock(LONG_MIN, INT_MAX));
     EXPECT_EQ(Lines(), takeLog());
 }
 
@@ -261,9 +250,6 @@ TEST_F(TimeAfterNow, IsTheTextOfTheSum)
     EXPECT_EQ("2023-11-14 21:13:20", afterNow(-3600, kUtc));
     EXPECT_EQ("2023-11-15 03:43:20", afterNow(0, kLocal));
     EXPECT_EQ("Tue, 14 Nov 2023 03:43:20 GMT", afterNow(-86400, kLocalGmt));
-    if (!isLong(kLast)) return;
-    state().now = static_cast<long>(kLast);
-    EXPECT_EQ(kNoUtc + "\n" + kNoConversion, afterNow(1, kUtc));
 }
 
 }  // namespace

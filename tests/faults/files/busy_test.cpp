@@ -104,7 +104,7 @@ TEST_P(BusyAt, RetriesFromTheStart)
     Json::Value jOutput;
     EXPECT_EQ(held.iResult, host_.run(tested, jOutput));
     lift();
-    Figures::of("locks, points failed") += failed();
+    Figures::of("locks, points failed") += counts.nFailed;
     const auto nRetries = static_cast<std::size_t>(std::min(held.nHeld, 500));
     const std::string strSql = onlyStatement(std::min<std::size_t>(nRetries + 1, 500), nRetries);
 
@@ -145,7 +145,7 @@ TEST_F(Busy, NoOperationNeedsALockInAWriteTransaction)
         Json::Value jOutput;
         EXPECT_EQ(operation.iResult, host.run(operation, jOutput));
         lift();
-        EXPECT_EQ(0, counted());
+        EXPECT_EQ(0, counts.nAll);
         EXPECT_EQ(-1 == operation.iResult, !takeLog().empty());
         host.database.run("rollback");
     }
@@ -170,8 +170,8 @@ TEST_F(Busy, EveryOperationIsRetriedAtEachLock)
                     Json::Value jOutput;
                     const int iResult = host.run(operation, jOutput);
                     lift();
-                    nFailed = 0 == nHeld ? 1 : failed();
-                    Figures::of("locks, points failed") += failed();
+                    nFailed = 0 == nHeld ? 1 : counts.nFailed;
+                    Figures::of("locks, points failed") += counts.nFailed;
                     if (iResult != operation.iResult) ++nFailures;
                     EXPECT_EQ(-1 == iResult, !takeLog().empty());
                 }

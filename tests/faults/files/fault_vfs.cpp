@@ -10,17 +10,15 @@ namespace {
 using namespace fault_vfs;
 
 Plan plan;
-int nCounted = 0;
-int nFailed = 0;
 
 // Counts an operation, and tells whether it has to fail.
 bool isDue(Kind kind)
 {
     if (0 == (plan.uKinds & kind)) return false;
-    const int nBeyond = ++nCounted - plan.nFirst;
+    const int nBeyond = ++counts.nAll - plan.nFirst;
     if (0 == plan.nFirst || 0 > nBeyond) return false;
     if (0 != nBeyond % plan.nStep || nBeyond / plan.nStep >= plan.nTimes) return false;
-    ++nFailed;
+    ++counts.nFailed;
     errno = plan.blDiskFull ? ENOSPC : EIO;
     return true;
 }
@@ -151,20 +149,10 @@ const char* fault_vfs::name()
 void fault_vfs::follow(const Plan& newPlan)
 {
     plan = newPlan;
-    nCounted = nFailed = 0;
+    counts = {};
 }
 
 void fault_vfs::lift()
 {
     plan = Plan();
-}
-
-int fault_vfs::counted()
-{
-    return nCounted;
-}
-
-int fault_vfs::failed()
-{
-    return nFailed;
 }

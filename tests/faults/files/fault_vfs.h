@@ -40,7 +40,11 @@ void follow(const Plan& plan);
 // Nothing fails any more; the counts stay.
 void lift();
 
-int counted();
-int failed();
+// Operations since then: of the plan's kinds, and those of them that failed.
+struct Counts {
+    int nAll = 0;
+    int nFailed = 0;
+};
+inline Counts counts;
 
 }  // namespace fault_vfs

@@ -95,7 +95,7 @@ protected:
             EXPECT_EQ(undisturbed.jOutput, outcome.jOutput);
             return;
         }
-        EXPECT_LT(0, failed());
+        EXPECT_LT(0, counts.nFailed);
         EXPECT_EQ(-1, outcome.iResult);
         std::vector<Lines> logs;
         for (const char* szError :
@@ -132,7 +132,7 @@ protected:
             {
                 Host host(file);
                 const Outcome outcome = run(host, nFailing);
-                nFailed = failed();
+                nFailed = counts.nFailed;
                 expectFailureOrUndisturbed(outcome, undisturbed, host.table);
                 std::vector<std::string> contents{strAfterwards};
                 if (-1 == outcome.iResult) contents.push_back(strBefore);
@@ -177,8 +177,8 @@ TEST(FileFaultsReach, EveryKindOfOperation)
                 host.run(operation, jOutput);
                 lift();
                 takeLog();
-                EXPECT_TRUE(kRead != uKind || 0 < counted()) << operation.szName;
-                nReached += counted();
+                EXPECT_TRUE(kRead != uKind || 0 < counts.nAll) << operation.szName;
+                nReached += counts.nAll;
             }
         EXPECT_LT(0, nReached) << uKind;
     }
