@@ -3,6 +3,7 @@
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/member_types.h"
 #include "util/sqlite_text.h"
 #include "util/type_words.h"
 
@@ -72,7 +73,7 @@ int appendMatch(std::string_view strField, const Json::Value& jMember, const Jso
 int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strSqlWhereOut,
                                        int andType)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     if (FAILED(jRecParam.type() != Json::objectValue && jRecParam.type() != Json::nullValue))
         return -1;
     const Joiner* pJoiner = joinerOf(andType);
@@ -117,7 +118,7 @@ int VornJsonDbApi::SqlExpandMemberList(Json::Value& jRecParam, std::string& strS
 
 int VornJsonDbApi::SqlMakeByMatchField(std::string& strField, Json::Value& jParam, std::string& out)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     const Json::Value* pjMember = findMember(jType, strField);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(strField)")) return -1;
     return appendMatch(strField, *pjMember, jParam, out);
@@ -128,7 +129,7 @@ int VornJsonDbApi::SqlMakeByListField(const char* szField, Json::Value& jHostLis
 {
     // Const, because non-const access by index would fill the holes of the host's array.
     const Json::Value& jList = jHostList;
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     if (FAILED(!szField || !szField[0])) return -1;
     const Json::Value* pjMember = findMember(jType, szField);
     if (FAILED_AS(nullptr == pjMember, "!jType.isMember(szField)")) return -1;

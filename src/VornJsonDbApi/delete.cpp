@@ -2,6 +2,7 @@
 #include "VornJsonDbApi/operation.h"
 #include "util/json_members.h"
 #include "util/log.h"
+#include "util/member_types.h"
 #include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
@@ -59,7 +60,7 @@ int VornJsonDbApi::recDeleteAll()
 
 int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const char* szKey)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     Json::Value jParam(Json::objectValue);
     int err = 0;
     const auto fail = [&] {
@@ -83,7 +84,7 @@ int VornJsonDbApi::recDeleteByArray(std::vector<std::string>& strVector, const c
 
 int VornJsonDbApi::recDeleteByName(std::string& strValue, const char* szKey)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     std::vector<std::string> strVector;
     int err = 0;
     const auto fail = [&] {

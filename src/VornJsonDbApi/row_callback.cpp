@@ -5,6 +5,7 @@
 #include "VornJsonDbApi/row_value.h"
 #include "util/json_members.h"
 #include "util/log.h"
+#include "util/member_types.h"
 #include "util/thread_state.h"
 
 #include <VornJsonDbApi.h>
@@ -29,7 +30,7 @@ constexpr std::size_t kMaxTables = 1000;
 
 struct Table {
     // Its member types, once a row has asked for them: the entry never moves.
-    const Json::Value* pjTypes = nullptr;
+    const TableTypes* pTypes = nullptr;
     std::list<RowLayout> layouts;
 };
 
@@ -50,15 +51,15 @@ struct Rows : ThreadPart {
 const Json::Value& memberTypes()
 {
     Rows& rows = ofThisThread<Rows>();
-    const Json::Value*& pjTypes = rows.pTable->pjTypes;
+    const TableTypes*& pTypes = rows.pTable->pTypes;
     // If it is not an object it is looked up again, which logs.
-    if (nullptr == pjTypes || !pjTypes->isObject()) {
+    if (nullptr == pTypes || !pTypes->json().isObject()) {
         // Kept(RowCallback.SpoilsTheTypesOfATableThatNobodyAskedForBefore): a row that is decoded
         // before anybody has asked for the table's types spoils them
         Json::Value jTableDef;
-        pjTypes = &VORN_JSON_DB::recType(jTableDef, rows.strCurJsonName);
+        pTypes = &tableTypes(jTableDef, rows.strCurJsonName);
     }
-    return *pjTypes;
+    return pTypes->json();
 }
 
 // The type word of a column; null, after logging the failed check, if the table has no such member.
@@ -123,9 +124,9 @@ const RowLayout* findLayout(const Rows& rows, std::size_t nColumns, char** colum
 {
     if (nullptr != rows.pLayout && rows.pLayout->hasColumns(nColumns, column_name))
         return rows.pLayout;
-    if (nullptr == rows.pTable->pjTypes) return nullptr;
+    if (nullptr == rows.pTable->pTypes) return nullptr;
     for (const RowLayout& layout : rows.pTable->layouts)
-        if (layout.hasColumns(nColumns, column_name) && layout.hasTypes(*rows.pTable->pjTypes))
+        if (layout.hasColumns(nColumns, column_name) && layout.hasTypes(*rows.pTable->pTypes))
             return &layout;
     return nullptr;
 }
@@ -135,7 +136,7 @@ const RowLayout* newLayout(Table& table, std::size_t nColumns, char** column_nam
 {
     if (0 == nColumns) return nullptr;
     std::list<RowLayout>& layouts = table.layouts;
-    layouts.emplace_front(*table.pjTypes, nColumns, column_name);
+    layouts.emplace_front(table.pTypes->json(), nColumns, column_name);
     if (kMaxLayouts < layouts.size()) layouts.pop_back();
     return &layouts.front();
 }

@@ -14,14 +14,14 @@ namespace vorn {
 namespace {
 
 // A copy of the name that is never released, so that all records of all threads can share it as
-// their key.
-const char* sharedName(const char* szName)
+// their key; it ends with a zero.
+std::string_view sharedName(const char* szName)
 {
     struct Nothing {};
     static NameTable<Nothing> names;
     auto* pEntry = names.find(szName);
-    if (nullptr == pEntry) pEntry = names.insert(szName, {});
-    return pEntry->strName.c_str();
+    if (nullptr == pEntry) pEntry = names.insert(szName, Nothing());
+    return pEntry->strName;
 }
 
 }  // namespace
@@ -30,17 +30,16 @@ RowLayout::RowLayout(const Json::Value& jTypes, std::size_t nColumns, char** col
 {
     columns_.reserve(nColumns);
     for (std::size_t i = 0; i < nColumns; ++i) {
-        const char* szName = sharedName(column_name[i]);
-        std::string strType = TypeWord(jTypes[szName]).text();
+        const std::string_view strName = sharedName(column_name[i]);
+        std::string strType = TypeWord(jTypes[strName.data()]).text();
         const RowForm form = formsOf(strType).row;
-        columns_.push_back({szName, std::move(strType), form, i});
-        Json::Value& jMember = jBlank_[Json::StaticString(szName)];
+        columns_.push_back({strName, std::move(strType), form, i});
+        Json::Value& jMember = jBlank_[Json::StaticString(strName.data())];
         if (RowForm::kBool == form) jMember = false;
         blRefused_ = blRefused_ || RowForm::kNo == form;
     }
-    std::sort(columns_.begin(), columns_.end(), [](const Column& left, const Column& right) {
-        return 0 > strcmp(left.szName, right.szName);
-    });
+    std::sort(columns_.begin(), columns_.end(),
+              [](const Column& left, const Column& right) { return left.strName < right.strName; });
 }
 
 bool RowLayout::hasColumns(std::size_t nColumns, char** column_name) const
@@ -48,18 +47,20 @@ bool RowLayout::hasColumns(std::size_t nColumns, char** column_name) const
     if (columns_.size() != nColumns) return false;
     return std::all_of(columns_.begin(), columns_.end(), [column_name](const Column& column) {
         const char* szName = column_name[column.iPlace];
-        return nullptr != szName && 0 == strcmp(column.szName, szName);
+        return nullptr != szName && 0 == strcmp(column.strName.data(), szName);
     });
 }
 
-bool RowLayout::hasTypes(const Json::Value& jTypes) const
+bool RowLayout::hasTypes(const TableTypes& types) const
 {
-    MemberWalk types(jTypes);
+    if (nullptr != types.unchanged()) return true;
+    MemberWalk walk(types.json());
     const char* szLast = nullptr;
     const Json::Value* pjMember = nullptr;
     return std::all_of(columns_.begin(), columns_.end(), [&](const Column& column) {
         // Columns of equal names share the name.
-        if (szLast != column.szName) pjMember = types.find(szLast = column.szName);
+        if (szLast != column.strName.data()) pjMember = walk.find(column.strName);
+        szLast = column.strName.data();
         return nullptr != pjMember && TypeWord(*pjMember).is(column.strType);
     });
 }
@@ -95,7 +96,7 @@ Json::Value RowLayout::record(char** column_value) const
     }
     if (!blNull) return jRecord;
     for (const Column& column : columns_)
-        if (nullptr == column_value[column.iPlace]) jRecord.removeMember(column.szName);
+        if (nullptr == column_value[column.iPlace]) jRecord.removeMember(column.strName.data());
     return jRecord;
 }
 

@@ -2,10 +2,12 @@
 // What rows of the same columns become, so that only the first of them is decoded by name.
 #pragma once
 
+#include "util/member_types.h"
 #include "util/type_words.h"
 
 #include <cstddef>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace vorn {
@@ -21,7 +23,7 @@ public:
 
     // Whether the member types, which a host may change, are still those of the columns. Never
     // throws.
-    bool hasTypes(const Json::Value& jTypes) const;
+    bool hasTypes(const TableTypes& types) const;
 
     // Whether record() gives the same as decoding by name would: no two columns of one name, and no
     // value that is refused.
@@ -36,7 +38,7 @@ public:
 
 private:
     struct Column {
-        const char* szName;  // never released
+        std::string_view strName;  // never released, and ends with a zero
         std::string strType;
         RowForm form;
         std::size_t iPlace;  // in the row

@@ -3,6 +3,7 @@
 #include "VornJsonDbApi/row_callback.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/member_types.h"
 
 #include <VornJsonDbApi.h>
 
@@ -15,7 +16,7 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
 {
     std::string strSql;
     Json::Value jArrayTmp(Json::arrayValue);
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     const auto fail = [&] {
         LOG_PLAIN("blCreate=%d, jRecInOut=%s", blCreate, toString(jRecInOut).c_str());
         LOG_PLAIN("jType=%s", toString(jType).c_str());

@@ -2,6 +2,7 @@
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/member_types.h"
 #include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
@@ -27,7 +28,7 @@ bool isOfKind(CheckedKind kind, const Json::Value& jValue)
 
 int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     if (!jType.isObject()) return 0;
     MemberWalk present(jParam);
     for (auto it = jType.begin(), end = jType.end(); it != end; ++it) {
@@ -48,7 +49,7 @@ int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
 
 int VornJsonDbApi::checkJsonType(Json::Value& jRecParam)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     if (FAILED(!jRecParam.isObject())) return -1;
     MemberWalk types(jType);
     const Json::Value& jRec = jRecParam;

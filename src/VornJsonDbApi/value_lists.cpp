@@ -3,6 +3,7 @@
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
+#include "util/member_types.h"
 #include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
@@ -80,7 +81,7 @@ int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
 
 int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
 {
-    const Json::Value& jType = VORN_JSON_DB::recType(jTableDef, strName);
+    const Json::Value& jType = memberTypes(jTableDef, strName);
     // A copy: sql changes only when every member is written.
     FormattedText text(sql);
     const Json::Value& jMembers = declaredMembers(jTableDef, strName);

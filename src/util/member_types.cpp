@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: MIT
+#include "util/member_types.h"
+
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
@@ -15,12 +17,12 @@ using namespace vorn;
 
 namespace {
 
-using Table = NameTable<Json::Value>::Entry;
+using Table = NameTable<TableTypes>::Entry;
 
 // The member types of every table that was asked for.
 // Kept(MemberTypes.KeepTheFirstDefinitionForEveryHandle): the first definition under a table name
 // wins
-NameTable<Json::Value> tables;
+NameTable<TableTypes> tables;
 
 // The last table that the thread asked for: an operation asks for the same one several times.
 struct LastTypes : ThreadPart {
@@ -29,7 +31,7 @@ struct LastTypes : ThreadPart {
 };
 
 // False, after logging the failed check, if jTableDef does not define the members of a table.
-bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
+bool definesTable(Json::Value& jTableDef, const std::string& strJsonName)
 {
     if (FAILED(jTableDef.empty())) return false;
     if (FAILED_AS(!hasMember(jTableDef, strJsonName), "!jTableDef.isMember(strJsonName)"))
@@ -44,7 +46,7 @@ bool definesTable(Json::Value& jTableDef, std::string& strJsonName)
 
 // Copies what the library reads of each declared member into jEntry; false, after logging the
 // failed check, at the first member without a type word.
-bool readMembers(Json::Value& jTableDef, std::string& strJsonName, Json::Value& jEntry)
+bool readMembers(Json::Value& jTableDef, const std::string& strJsonName, Json::Value& jEntry)
 {
     const Json::Value& jMembers = jTableDef[strJsonName]["member"];
     for (const std::string& strKey : jMembers.getMemberNames()) {
@@ -67,7 +69,7 @@ bool readMembers(Json::Value& jTableDef, std::string& strJsonName, Json::Value& 
 // the definition does not give them all.
 // Kept(MemberTypes.KeepTheEntryOfABadDefinition): a bad definition leaves a null or
 // partial entry for the life of the process
-Table* newTable(Json::Value& jTableDef, std::string& strJsonName)
+Table* newTable(Json::Value& jTableDef, const std::string& strJsonName)
 {
     if (!definesTable(jTableDef, strJsonName)) return nullptr;
     Json::Value jEntry;
@@ -82,12 +84,12 @@ Table* newTable(Json::Value& jTableDef, std::string& strJsonName)
 
 // The table, with its types filled in if it is new; null, after logging the failed check, if there
 // are no usable ones.
-Table* findTable(Json::Value& jTableDef, std::string& strJsonName)
+Table* findTable(Json::Value& jTableDef, const std::string& strJsonName)
 {
     Table* pTable = tables.find(strJsonName);
     if (nullptr == pTable) pTable = newTable(jTableDef, strJsonName);
     if (nullptr == pTable) return nullptr;
-    if (FAILED_AS(pTable->value.type() != Json::objectValue,
+    if (FAILED_AS(pTable->value.json().type() != Json::objectValue,
                   "jType[strJsonName].type() != Json::objectValue"))
         return nullptr;
     return pTable;
@@ -107,16 +109,22 @@ std::string allTypes()
         strAll.append(strAll.empty() ? "{" : ",")
             .append(toString(pTable->strName))
             .append(":")
-            .append(toString(pTable->value));
+            .append(toString(pTable->value.json()));
     return strAll + "}";
 }
 
 }  // namespace
 
-Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonName)
+TableTypes::TableTypes(Json::Value jMembers) : jMembers_(std::move(jMembers))
+{
+    for (auto it = jMembers_.begin(), end = jMembers_.end(); end != it; ++it)
+        members_.push_back({it.name(), &TypeWord(*it).forms()});
+}
+
+TableTypes& vorn::tableTypes(Json::Value& jTableDef, const std::string& strJsonName)
 {
     Table*& pLast = ofThisThread<LastTypes>().pTable;
-    if (nullptr != pLast && pLast->strName == strJsonName && pLast->value.isObject())
+    if (nullptr != pLast && pLast->strName == strJsonName && pLast->value.json().isObject())
         return pLast->value;
 
     if (Table* pTable = findTable(jTableDef, strJsonName)) {
@@ -129,4 +137,16 @@ Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonN
     // A name that was absent gets a null entry, which stays.
     Table* const pTable = tables.find(strJsonName);
     return (nullptr == pTable ? tables.insert(strJsonName, Json::Value()) : pTable)->value;
+}
+
+const TableTypes* vorn::knownTypes(const std::string& strTable)
+{
+    const Table* pTable = ofThisThread<LastTypes>().pTable;
+    if (nullptr == pTable || pTable->strName != strTable) pTable = tables.find(strTable);
+    return nullptr == pTable ? nullptr : &pTable->value;
+}
+
+Json::Value& VORN_JSON_DB::recType(Json::Value& jTableDef, std::string& strJsonName)
+{
+    return tableTypes(jTableDef, strJsonName).handOut();
 }

@@ -20,8 +20,9 @@ template <typename Value>
 class NameTable {
 public:
     struct Entry {
-        Entry(std::string_view strOf, std::size_t uOf, Value&& of)
-            : strName(strOf), uHash(uOf), value(std::move(of))
+        template <typename From>
+        Entry(std::string_view strOf, std::size_t uOf, From&& from)
+            : strName(strOf), uHash(uOf), value(std::forward<From>(from))
         {
         }
 
@@ -45,10 +46,12 @@ public:
         return pEntry;
     }
 
-    // The entry that has the name from now on: a new one with the value, or that of another thread.
-    Entry* insert(std::string_view strName, Value value)
+    // The entry that has the name from now on: a new one with a value that is made from the
+    // argument, or that of another thread.
+    template <typename From>
+    Entry* insert(std::string_view strName, From&& from)
     {
-        auto pNew = std::make_unique<Entry>(strName, hash(strName), std::move(value));
+        auto pNew = std::make_unique<Entry>(strName, hash(strName), std::forward<From>(from));
         Place* pPlace = &root_.at(pNew->uHash, 0);
         for (unsigned nBits = 0;;) {
             if (Node* pBelow = pPlace->pBelow.load(std::memory_order_acquire)) {
