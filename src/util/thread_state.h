@@ -14,7 +14,7 @@ public:
     ThreadPart& operator=(const ThreadPart&) = delete;
     virtual ~ThreadPart() = default;
 
-    enum Kind { kLastTypes, kWriter, kReader, kRows, kCount };
+    enum Kind { kLastTypes, kReader, kRows, kCount };
 };
 
 // Where the calling thread keeps the part of that kind; empty before its first use. It is released
