@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "util/json_text.h"
 
+#include "util/plain_json.h"
 #include "util/thread_state.h"
 
 #include <json/reader.h>
@@ -37,6 +38,7 @@ bool isDepthLimit(const Json::RuntimeError& error)
 
 void fromString(const char* szText, Json::Value& jValue)
 {
+    if (readPlainJson(szText, jValue)) return;
     Json::CharReader& reader = *ofThisThread<Reader>().pReader;
     try {
         reader.parse(szText, szText + strlen(szText), &jValue, nullptr);

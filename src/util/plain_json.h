@@ -1,0 +1,15 @@
+// SPDX-License-Identifier: MIT
+// JSON text of the usual kind, read straight into a value.
+#pragma once
+
+#include <json/value.h>
+
+namespace vorn {
+
+// Gives what jsoncpp's reader gives for objects, arrays, strings, numbers and literals as the
+// standard writes them: the same kinds, values, order, last of equal names, and offsets. False,
+// with jValue as it was, for every text that holds anything else or that releases of jsoncpp read
+// differently; only that reader knows what becomes of it.
+bool readPlainJson(const char* szText, Json::Value& jValue);
+
+}  // namespace vorn
