@@ -2,6 +2,7 @@
 #include "util/plain_json.h"
 
 #include "util/json_scanner.h"
+#include "util/shared_keys.h"
 
 #include <string_view>
 
@@ -105,6 +106,8 @@ private:
 
     static Json::Value& member(Json::Value& jObject, std::string_view strName)
     {
+        if (const SharedKey* pKey = sharedKey(strName))
+            return jObject[Json::StaticString(pKey->strName.c_str())];
         return *jObject.demand(strName.data(), strName.data() + strName.size());
     }
 
