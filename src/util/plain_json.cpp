@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
 #include "util/plain_json.h"
 
+#include "util/json_members.h"
 #include "util/json_scanner.h"
 #include "util/shared_keys.h"
 
+#include <memory>
 #include <string_view>
 
 namespace vorn {
@@ -78,10 +80,23 @@ private:
         scanner_.skip('{');
         scanner_.skipBlanks();
         if (scanner_.skip('}')) return set(jObject, Json::objectValue);
+        const char* const szFirst = scanner_.at();
         std::string_view strName;
         if (!readName(strName)) return false;
+        SharedKey* const pKey = sharedKey(strName);
+        const bool blShape = nullptr != pKey && !pKey->blShapeless;
+        const Json::Value* pjShape =
+            blShape ? pKey->pjShape.load(std::memory_order_acquire) : nullptr;
+        if (nullptr != pjShape) {
+            if (fillShape(jObject, *pjShape, strName, nLevels)) return true;
+            pKey->blShapeless = true;
+            scanner_.goTo(szFirst);
+            readName(strName);
+        }
         set(jObject, Json::objectValue);
-        return readMembers(jObject, strName, nLevels);
+        if (!readMembers(jObject, strName, nLevels)) return false;
+        if (blShape && nullptr == pjShape) learnShape(*pKey, jObject);
+        return true;
     }
 
     // The name of a member, up to its value.
@@ -109,6 +124,37 @@ private:
         if (const SharedKey* pKey = sharedKey(strName))
             return jObject[Json::StaticString(pKey->strName.c_str())];
         return *jObject.demand(strName.data(), strName.data() + strName.size());
+    }
+
+    // The same for an object whose members are those of the shape, in its order, which saves the
+    // insertion of each.
+    bool fillShape(Json::Value& jObject, const Json::Value& jShape, std::string_view strName,
+                   int nLevels)
+    {
+        set(jObject, jShape);
+        for (auto it = jObject.begin(), end = jObject.end();;) {
+            if (memberName(it) != strName || !readValue(*it, nLevels)) return false;
+            scanner_.skipBlanks();
+            if (++it == end) return scanner_.skip('}');
+            if (!scanner_.skip(',') || !readName(strName)) return false;
+        }
+    }
+
+    static void learnShape(SharedKey& first, const Json::Value& jObject)
+    {
+        constexpr Json::ArrayIndex kMostMembers = 16;
+        auto pjShape = std::make_unique<Json::Value>(Json::objectValue);
+        for (auto it = jObject.begin(), end = jObject.end(); end != it; ++it) {
+            const SharedKey* pKey = sharedKey(memberName(it));
+            if (nullptr == pKey || kMostMembers < jObject.size()) {
+                first.blShapeless = true;
+                return;
+            }
+            (*pjShape)[Json::StaticString(pKey->strName.c_str())] = Json::Value();
+        }
+        const Json::Value* pjNone = nullptr;
+        if (first.pjShape.compare_exchange_strong(pjNone, pjShape.get(), std::memory_order_acq_rel))
+            static_cast<void>(pjShape.release());
     }
 
     const char* const szText_;

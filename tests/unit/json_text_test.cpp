@@ -87,6 +87,22 @@ TEST_F(JsonText, IsReadWithoutItsComments)
             EXPECT_FALSE(pjValue->hasComment(place)) << text(*pjValue) << ' ' << place;
 }
 
+// Names are shared by all values, but only so many short ones, and objects that begin alike are
+// expected to be alike.
+TEST_F(JsonText, IsReadWhateverItsNames)
+{
+    const std::string strLong(33, 'n');
+    std::string strArray = "[";
+    for (int i = 0; i < 2000; ++i) {
+        const std::string strName = std::to_string(i);
+        strArray += R"({"a)" + strName + R"(":1,"b":{"c)" + strName + R"(":2},")" + strLong +
+                    R"(":{"d":1}},{"z":1,"y":2,"e\u0000)" + strName + R"(":3},{"f":1,"g)" +
+                    std::to_string(i % 3) + R"(":2},)";
+    }
+    strArray.back() = ']';
+    EXPECT_EQ(leftByReader(strArray), readBack(strArray, "{}")["a"]);
+}
+
 TEST_F(JsonText, IsTheSameInTheLog)
 {
     Json::Value jRecord = json(R"({"b":"ž\n","a":[0.1,NaN,{"k":"%s%n"}]})");
