@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/operation.h"
 #include "VornJsonDbApi/row_callback.h"
+#include "VornJsonDbApi/validation.h"
+#include "VornJsonDbApi/value_lists.h"
 #include "util/json_text.h"
 #include "util/log.h"
 #include "util/member_types.h"
@@ -16,20 +18,22 @@ int VornJsonDbApi::recSave(Json::Value& jRecInOut, bool blCreate)
 {
     std::string strSql;
     Json::Value jArrayTmp(Json::arrayValue);
-    const Json::Value& jType = memberTypes(jTableDef, strName);
+    const TableTypes& types = tableTypes(jTableDef, strName);
     const auto fail = [&] {
         LOG_PLAIN("blCreate=%d, jRecInOut=%s", blCreate, toString(jRecInOut).c_str());
-        LOG_PLAIN("jType=%s", toString(jType).c_str());
+        LOG_PLAIN("jType=%s", toString(types.json()).c_str());
         LOG_SQL_ERROR(strSqlError, strSql);
         return -1;
     };
 
     strSql.reserve(kUsualStatement);
     strSql.append(blCreate ? "INSERT INTO " : "REPLACE INTO ").append(strName).append(" (");
-    // Cannot fail: it always returns 0.
-    if (GUARDED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();
-    strSql += ") VALUES (";
-    if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
+    if (!appendLists(strSql, jTableDef, strName, types, jRecInOut)) {
+        // Cannot fail: it always returns 0.
+        if (GUARDED(0 > SqlExpandMemberName(strSql, &jRecInOut))) return fail();
+        strSql += ") VALUES (";
+        if (FAILED(0 > SqlExpandMemberSymbol(strSql, jRecInOut))) return fail();
+    }
     strSql.append(";select * from ").append(strName).append(" where rowid == last_insert_rowid();");
     // Cannot fail: the statement begins with its verb.
     if (GUARDED(strSql.empty())) return fail();
@@ -57,9 +61,11 @@ int VornJsonDbApi::recCreate(Json::Value& jRecIn, Json::Value& jRecOut)
     };
 
     if (FAILED(jRecIn.empty())) return fail();
-    // Cannot fail: filling always returns 0.
-    if (GUARDED(0 > fillDefaultValue(jParam, false))) return fail();
-    if (FAILED(0 > checkJsonType(jParam))) return fail();
+    if (!isCompleteAndValid(jParam, knownTypes(strName))) {
+        // Cannot fail: filling always returns 0.
+        if (GUARDED(0 > fillDefaultValue(jParam, false))) return fail();
+        if (FAILED(0 > checkJsonType(jParam))) return fail();
+    }
     if (FAILED(0 > recSave(jParam, true))) return fail();
     jRecOut = std::move(jParam);
     return 0;

@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: MIT
+#include "VornJsonDbApi/validation.h"
+
 #include "util/json_members.h"
 #include "util/json_text.h"
 #include "util/log.h"
@@ -6,6 +8,8 @@
 #include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
+
+#include <algorithm>
 
 using namespace vorn;
 
@@ -25,6 +29,19 @@ bool isOfKind(CheckedKind kind, const Json::Value& jValue)
 }
 
 }  // namespace
+
+bool vorn::isCompleteAndValid(const Json::Value& jRec, const TableTypes* pTypes)
+{
+    const std::vector<DeclaredMember>* pMembers = nullptr == pTypes ? nullptr : pTypes->unchanged();
+    if (nullptr == pMembers || !jRec.isObject() || jRec.size() != pMembers->size()) return false;
+    auto it = jRec.begin();
+    return std::all_of(pMembers->begin(), pMembers->end(), [&it](const DeclaredMember& member) {
+        const bool blValid =
+            memberName(it) == member.strName && isOfKind(member.pForms->checked, *it);
+        ++it;
+        return blValid;
+    });
+}
 
 int VornJsonDbApi::fillDefaultValue(Json::Value& jParam, bool blCheckOnly)
 {

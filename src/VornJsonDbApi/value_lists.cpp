@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: MIT
+#include "VornJsonDbApi/value_lists.h"
+
 #include "VornJsonDbApi/formatted_text.h"
 #include "util/json_members.h"
 #include "util/json_text.h"
@@ -7,6 +9,9 @@
 #include "util/type_words.h"
 
 #include <VornJsonDbApi.h>
+
+#include <algorithm>
+#include <utility>
 
 using namespace vorn;
 
@@ -17,22 +22,29 @@ bool mayHoldMembers(const Json::Value& jValue)
     return jValue.isNull() || jValue.isObject();
 }
 
-// The members that the definition declares for the table, an object or null.
+// The members that the definition declares for the table; null if it declares none.
+const Json::Value* findDeclared(const Json::Value& jTableDef, const std::string& strName)
+{
+    const Json::Value* pjTable = findMember(jTableDef, strName);
+    const Json::Value* pjMembers = nullptr == pjTable ? nullptr : findMember(*pjTable, "member");
+    return nullptr != pjMembers && pjMembers->isObject() ? pjMembers : nullptr;
+}
+
+// The same as an object or null.
 // Kept(ValueListTypes.InsertWhatTheDefinitionLacks): the list functions insert a missing table or
 // "member" into the handle's definition
 const Json::Value& declaredMembers(Json::Value& jTableDef, const std::string& strName)
 {
-    if (!mayHoldMembers(jTableDef)) return Json::Value::nullSingleton();
-    Json::Value& jTable = jTableDef[strName];
-    if (!mayHoldMembers(jTable)) return Json::Value::nullSingleton();
-    const Json::Value& jMembers = jTable["member"];
-    return jMembers.isObject() ? jMembers : Json::Value::nullSingleton();
+    if (const Json::Value* pjMembers = findDeclared(jTableDef, strName)) return *pjMembers;
+    if (mayHoldMembers(jTableDef) && mayHoldMembers(jTableDef[strName]))
+        static_cast<void>(jTableDef[strName]["member"]);
+    return Json::Value::nullSingleton();
 }
 
-// Appends one member's value as an SQL literal; false when its type word has none.
-bool appendLiteral(FormattedText& text, const Json::Value& jMember, const Json::Value& jValue)
+// Appends a value as an SQL literal; false if there is no form for it.
+bool appendLiteral(FormattedText& text, LiteralForm form, const Json::Value& jValue)
 {
-    switch (TypeWord(jMember).forms().literal) {
+    switch (form) {
     case LiteralForm::kText:
         text.appendValue("%Q", FormatArgument::text(jValue.asString().c_str()));
         return true;
@@ -60,7 +72,51 @@ bool appendLiteral(FormattedText& text, const Json::Value& jMember, const Json::
     return false;
 }
 
+// Appends the names, each with a comma behind it; false if definition and record do not have these
+// very members, or one of them cannot be written.
+bool appendNames(std::string& strSql, const std::vector<DeclaredMember>& members,
+                 const Json::Value& jMembers, const Json::Value& jRec)
+{
+    auto declared = jMembers.begin();
+    auto value = jRec.begin();
+    return std::all_of(members.begin(), members.end(), [&](const DeclaredMember& member) {
+        if (memberName(declared) != member.strName || memberName(value) != member.strName)
+            return false;
+        (strSql += member.strName) += ',';
+        ++declared;
+        ++value;
+        return LiteralForm::kNo != member.pForms->literal;
+    });
+}
+
 }  // namespace
+
+bool vorn::appendLists(std::string& strSql, const Json::Value& jTableDef,
+                       const std::string& strTable, const TableTypes& types,
+                       const Json::Value& jRec)
+{
+    const std::vector<DeclaredMember>* pMembers = types.unchanged();
+    const Json::Value* pjMembers = findDeclared(jTableDef, strTable);
+    if (nullptr == pMembers || nullptr == pjMembers || !jRec.isObject()) return false;
+    const std::size_t nMembers = pMembers->size();
+    if (0 == nMembers || pjMembers->size() != nMembers || jRec.size() != nMembers) return false;
+    const std::size_t nBefore = strSql.size();
+    if (!appendNames(strSql, *pMembers, *pjMembers, jRec)) {
+        strSql.resize(nBefore);
+        return false;
+    }
+    strSql.back() = ')';
+    strSql += " VALUES (";
+    FormattedText text(std::move(strSql));
+    auto value = jRec.begin();
+    for (const DeclaredMember& member : *pMembers) {
+        appendLiteral(text, member.pForms->literal, *value);
+        ++value;
+        text.append(&member == &pMembers->back() ? ") " : ",");
+    }
+    strSql = text.take();
+    return true;
+}
 
 int VornJsonDbApi::SqlExpandMemberName(std::string& sql, Json::Value* rec)
 {
@@ -96,8 +152,9 @@ int VornJsonDbApi::SqlExpandMemberSymbol(std::string& sql, Json::Value& rec)
         const Json::Value* pjValue = values.find(strKey);
         if (nullptr == pjValue) continue;
 
-        if (!appendLiteral(text, *pjMember, *pjValue)) {
-            LOG_ERROR("cannot support this type=%s", TypeWord(*pjMember).text().c_str());
+        const TypeWord word(*pjMember);
+        if (!appendLiteral(text, word.forms().literal, *pjValue)) {
+            LOG_ERROR("cannot support this type=%s", word.text().c_str());
             return -1;
         }
         text.append(0 < nLeft ? "," : ") ");
