@@ -28,9 +28,8 @@ inline int saturatedToInt(long long iValue)
     return static_cast<int>(std::clamp<long long>(iValue, INT_MIN, INT_MAX));
 }
 
-// Sets the member from its column's text; a bool is already false. Inlined, because a call would
-// cost as much as most of its branches.
-[[gnu::always_inline]] inline void decode(RowForm form, const char* szValue, Json::Value& jMember)
+// Sets the member from its column's text; a bool is already false.
+inline void decode(RowForm form, const char* szValue, Json::Value& jMember)
 {
     // Cheaper than an assignment, which moves comments and offsets too.
     const auto set = [&jMember](Json::Value jValue) { jMember.swapPayload(jValue); };

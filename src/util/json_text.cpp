@@ -13,8 +13,7 @@ namespace vorn {
 
 namespace {
 
-// Not inlined, because its frame would slow down every parse.
-[[gnu::noinline]] Json::CharReader* newReader()
+Json::CharReader* newReader()
 {
     Json::CharReaderBuilder builder;
     builder["collectComments"] = false;
