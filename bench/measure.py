@@ -73,6 +73,20 @@ def count_kept(programs):
         return {case: count["instructions"] / count["calls"] for case, count in zip(KEPT, counts)}
 
 
+TEXTS = ["objects", "nested", "integers", "doubles", "escapes"]
+TEXT_SIZES = [3000, 300000]
+
+
+def count_texts(programs):
+    """Instructions of a row with each text, and of jsoncpp's own parse of the text."""
+    say("counting the instructions of reading JSON texts")
+    jobs = [(kind, size, contender) for kind in TEXTS for size in TEXT_SIZES for contender in ("library", "jsoncpp")]
+    with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
+        counts = pool.map(lambda job: programs.counted("bench_texts", job[2], job[0], str(job[1])), jobs)
+        return [{"kind": kind, "bytes": size, "contender": contender, "instructions": count["instructions"] / count["calls"]}
+                for (kind, size, contender), count in zip(jobs, counts)]
+
+
 def time_threads(programs):
     say("taking the times of several threads")
     return {"with": json.loads(programs.output("bench_threads")),
@@ -146,6 +160,7 @@ def main():
     results["counts"] = count_operations(programs, names, lists["operations"])
     results["value_lists"] = count_value_lists(programs)
     results["kept"] = count_kept(programs)
+    results["texts"] = count_texts(programs)
     results["times"] = take_times(programs)
     results["threads"] = time_threads(programs)
     results["listings"], results["largest_skipped"] = list_tables(programs, listed)
