@@ -16,6 +16,7 @@ const std::vector<ContenderEntry>& contenders()
 #endif
 #ifdef BENCH_SQLITECPP
         {"sqlitecpp", "SQLiteCpp, jsoncpp", makeSqliteCpp},
+        {"sqlitecpp-exec", "SQLiteCpp, jsoncpp, exec", makeSqliteCppExec},
         {"sqlitecpp-kept", "SQLiteCpp, jsoncpp, kept", makeSqliteCppKept},
 #endif
 #ifdef BENCH_SOCI

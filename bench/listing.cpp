@@ -5,6 +5,7 @@
 #include "contender.h"
 
 #include <sys/resource.h>
+#include <valgrind/callgrind.h>
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
@@ -48,9 +49,14 @@ int main(int argc, char** argv)
 
     const double heldBefore = memory("VmRSS");
     double seconds = -userSeconds();
+    CALLGRIND_START_INSTRUMENTATION;
     contender->listAll();
+    CALLGRIND_STOP_INSTRUMENTATION;
     seconds += userSeconds();
     const double peak = memory("VmHWM") - heldBefore;
+    CALLGRIND_START_INSTRUMENTATION;
+    contender->dropResult();
+    CALLGRIND_STOP_INSTRUMENTATION;
 
     const int passes = std::max(1, kLeastRowsListed / rows);
     for (int i = 1; i < passes; ++i) {

@@ -14,6 +14,7 @@ import sys
 
 ROWS = 1000
 SIZES = [1000, 10000, 100000, 1000000]
+GROWTH_SIZES = [10000, 1000000]
 LARGEST_NEEDS_BYTES = 6 * 1024**3
 RUNS = 5
 MEBIBYTE = 1048576
@@ -62,6 +63,7 @@ def count_value_lists(programs):
 
 KEPT = ["fetch", "fetch, two tables", "fetch, after a wide table", "create", "create, two tables",
         "create, after a wide table", "rows", "rows, NULL in every second", "rows, NULLs in alternating members",
+        "rows, 100 members",
         "types of 10 tables", "types of 100000 tables", "adding 1000 tables", "adding 100000 tables"]
 
 
@@ -130,6 +132,17 @@ def list_tables(programs, contenders):
     return listings, skipped
 
 
+def count_growth(programs, skipped):
+    """Instructions of a listed row, by contender and size of the table."""
+    sizes = [size for size in GROWTH_SIZES if not skipped or size < max(SIZES)]
+    say("counting the instructions of long lists")
+    jobs = [(contender, size) for size in sizes for contender in ("library", "capi")]
+    with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
+        counts = pool.map(lambda job: programs.counted("bench_listing", job[0], str(job[1])), jobs)
+        return [{"contender": contender, "rows": size, "instructions": count["instructions"] / size}
+                for (contender, size), count in zip(jobs, counts)]
+
+
 def machine():
     def first(pattern, path):
         with open(path) as file:
@@ -154,7 +167,7 @@ def main():
     lists = json.loads(programs.output("bench_check", "--lists"))
     names = [c["name"] for c in lists["contenders"]]
     # Long lists are taken of one host for each library; keeping statements makes no difference to them.
-    listed = [name for name in names if not name.endswith(("-kept", "-variables"))]
+    listed = [name for name in names if not name.endswith(("-exec", "-kept", "-variables"))]
     results = dict(lists)
     results["rows"] = ROWS
     results["counts"] = count_operations(programs, names, lists["operations"])
@@ -164,6 +177,7 @@ def main():
     results["times"] = take_times(programs)
     results["threads"] = time_threads(programs)
     results["listings"], results["largest_skipped"] = list_tables(programs, listed)
+    results["growth"] = count_growth(programs, results["largest_skipped"])
     results["machine"] = machine()
     with open(sys.argv[2], "w") as file:
         json.dump(results, file, indent=1)

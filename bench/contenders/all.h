@@ -12,6 +12,7 @@ std::unique_ptr<Contender> makeFloor();
 std::unique_ptr<Contender> makeCApi();
 std::unique_ptr<Contender> makeNlohmann();
 std::unique_ptr<Contender> makeSqliteCpp();
+std::unique_ptr<Contender> makeSqliteCppExec();
 std::unique_ptr<Contender> makeSqliteCppKept();
 std::unique_ptr<Contender> makeSoci();
 std::unique_ptr<Contender> makeSociVariables();

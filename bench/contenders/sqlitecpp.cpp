@@ -67,6 +67,9 @@ public:
         statement.reset();
     }
 
+protected:
+    SQLite::Database database_ = opened();
+
 private:
     using Statement = Prepared<SQLite::Statement>;
 
@@ -119,7 +122,6 @@ private:
 
     const Prepare when_;
     const std::string select_ = std::string("SELECT ") + kColumns + " FROM task";
-    SQLite::Database database_ = opened();
     Statement insert_ =
         prepared(std::string("INSERT INTO task (") + kColumns + ") VALUES (?,?,?,?,?,?,?)");
     Statement stored_ = prepared(select_ + " WHERE rowid = last_insert_rowid()");
@@ -131,11 +133,33 @@ private:
     JsoncppText text_;
 };
 
+// Updates and deletes with Database::exec, as in SQLiteCpp's own examples.
+class SqliteCppExec : public SqliteCpp {
+public:
+    SqliteCppExec() : SqliteCpp(Prepare::kEachCall) {}
+
+    void update(int id) override
+    {
+        database_.exec("UPDATE task SET name='" + change(id)["name"].asString() +
+                       "' WHERE id=" + std::to_string(request(id)["id"].asInt()));
+    }
+
+    void remove(int id) override
+    {
+        database_.exec("DELETE FROM task WHERE id=" + std::to_string(request(id)["id"].asInt()));
+    }
+};
+
 }  // namespace
 
 std::unique_ptr<Contender> makeSqliteCpp()
 {
     return std::make_unique<SqliteCpp>(Prepare::kEachCall);
+}
+
+std::unique_ptr<Contender> makeSqliteCppExec()
+{
+    return std::make_unique<SqliteCppExec>();
 }
 
 std::unique_ptr<Contender> makeSqliteCppKept()
