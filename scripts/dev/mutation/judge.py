@@ -13,6 +13,7 @@ import subprocess
 
 SUITES = ("unit", "exhaustive", "hostile", "docs", "host")
 HOSTS = (("malloc_host",), ("cxx11_host",), ("plugin_host", "libplugin.so"))
+CORPORA = ("json", "column", "definition", "formatter", "record", "request")
 GIBIBYTE = 1 << 30
 # The limit for a mutant is in CPU time, so that a busy machine makes no difference.
 TIMES_THE_NORMAL_RUN = 10
@@ -103,6 +104,7 @@ class Judge:
 
     def stages(self, path):
         stages = [(suite, self.suite(suite, "*")) for suite in SUITES]
+        stages[1:1] = [("corpus " + corpus, self.corpus(corpus)) for corpus in CORPORA]
         stages += [(host[0], [os.path.join(self.build.tests, "host", word) for word in host]) for host in HOSTS]
         if path and self.build.filters[path]:
             stages.insert(0, ("matching", self.suite("unit", self.build.filters[path])))
@@ -111,6 +113,10 @@ class Judge:
     def suite(self, name, chosen):
         program = os.path.join(self.build.tests, name, name + "_tests")
         return [program, "--gtest_fail_fast", "--gtest_brief=1", "--gtest_filter=" + chosen]
+
+    def corpus(self, name):
+        return [os.path.join(self.build.folder, "fuzz", "fuzz_replay_" + name),
+                os.path.join(self.build.project, "fuzz", "corpus", name)]
 
     def make_library(self, sources):
         objects = {}
