@@ -3,7 +3,26 @@
 
 #include "support/database.h"
 
+#include <dlfcn.h>
+#include <atomic>
+#include <thread>
 #include <utility>
+
+namespace {
+
+std::atomic<int> nReaders{0};
+
+}  // namespace
+
+// Counts jsoncpp's readers.
+Json::CharReader* Json::CharReaderBuilder::newCharReader() const
+{
+    using Function = Json::CharReader*(const Json::CharReaderBuilder*);
+    static auto* const real = reinterpret_cast<Function*>(
+        dlsym(RTLD_NEXT, "_ZNK4Json17CharReaderBuilder13newCharReaderEv"));
+    ++nReaders;
+    return real(this);
+}
 
 namespace {
 
@@ -85,6 +104,32 @@ TEST_F(JsonText, IsReadWithoutItsComments)
          {&jRecord["a"], &jRecord["a"][0], &jRecord["a"][1], &jRecord["o"], &jRecord["o"]["k"]})
         for (auto place : {Json::commentBefore, Json::commentAfterOnSameLine, Json::commentAfter})
             EXPECT_FALSE(pjValue->hasComment(place)) << text(*pjValue) << ' ' << place;
+}
+
+// A thread has a reader of jsoncpp's once it has read a text that needs one.
+TEST_F(JsonText, IsReadWithoutJsoncppIfItIsUsual)
+{
+    const auto readers = [this](const std::string& strArray) {
+        const int nBefore = nReaders;
+        std::thread([&] { readBack(strArray, " {\t\"k\"\n:\r1 , \"l\" : { } } "); }).join();
+        return nReaders - nBefore;
+    };
+    for (const char* szText : {
+             "[]",
+             "[ 1 , 2 ]",
+             "[0,-0,-9223372036854775808,9223372036854775807]",
+             "[9223372036854775808,18446744073709551615]",
+             "[true,false,null]",
+             R"([["x"],{"":[]}])",
+             R"(["\"\\\/\b\f\n\r\t\u00e9\ud83d\udE00\u0000"])",
+             R"([{"a":{"b":1}},{"a":{"b":2}}])",
+#ifdef __cpp_lib_to_chars
+             "[0.5,-1.25e+3,1E5,2e-7]",
+#endif
+         })
+        EXPECT_EQ(0, readers(szText)) << szText;
+    EXPECT_EQ(0, readers(std::string(199, '[') + std::string(199, ']')));
+    EXPECT_EQ(1, readers("[/**/]"));
 }
 
 // Names are shared by all values, but only so many short ones, and objects that begin alike are
