@@ -8,6 +8,7 @@ when a limit is missed.
 import json
 import os
 import sys
+import textwrap
 
 import plot
 
@@ -205,22 +206,26 @@ def plots(results):
         lambda value: f"{value:,.0f}")
 
 
-def document(results, notes):
-    facts = results.all["machine"]
-    skipped = ("\n**Skipped:** the table of 1,000,000 rows, because less than 6 GB of memory were free.\n"
-               if results.all["largest_skipped"] else "")
+def summary(results):
     times = lambda rival, o: results.counts[rival, o] / results.counts["library", o]
-    return f"""# Performance
-
-## Which is faster, and by how much?
-
-Listing many rows, this library is {times("capi", "list"):.1f} times as fast as a loop over SQLite's C API with
+    return f"""Listing many rows, this library is {times("capi", "list"):.1f} times as fast as a loop over SQLite's C API with
 prepared statements and jsoncpp; a list of ten rows takes as long as that loop ({times("capi", "group"):.2f}), and a
 single record by its key takes {1 / times("capi", "fetch"):.1f} times as long, because every call prepares its statement.
 Compared with libraries that prepare for each call too, it is {times("sqlitecpp", "fetch"):.2f} times as fast as
 SQLiteCpp at fetching a record, {times("soci", "fetch"):.1f} times as fast as SOCI and {times("poco", "fetch"):.1f} times
 as fast as Poco::Data. Updates and deletes cost up to {1 / times("sqlitecpp", "update"):.1f} times as much as with
-SQLiteCpp, whose host writes the statement by hand.
+SQLiteCpp, whose host writes the statement by hand."""
+
+
+def document(results, notes):
+    facts = results.all["machine"]
+    skipped = ("\n**Skipped:** the table of 1,000,000 rows, because less than 6 GB of memory were free.\n"
+               if results.all["largest_skipped"] else "")
+    return f"""# Performance
+
+## Which is faster, and by how much?
+
+{textwrap.fill(summary(results), 120)}
 
 How many times as fast this library is, by instructions (below 1: slower):
 
@@ -243,8 +248,8 @@ For each operation, the library builds one SQL string and runs it through `sqlit
 string, ready-made, with a callback that discards the rows: anything above the floor is the library's own cost.
 "Kept" means that statements are prepared once and reused, as in the handwritten contenders; SQLiteCpp, SOCI and
 Poco::Data are shown both with statements that are prepared for each call, as in their own examples, and with kept
-ones; "exec" runs updates and deletes as one text, which SQLiteCpp's examples do. A host that keeps its statements saves the cost of preparing them, which is most of a small operation; this
-library's interface cannot do that.
+ones; "exec" runs updates and deletes as one text, which SQLiteCpp's examples do. A host that keeps its statements
+saves the cost of preparing them, which is most of a small operation; this library's interface cannot do that.
 
 SOCI and Poco::Data are used in two ways: with the type that each provides for rows of any table (`soci::row`,
 `Poco::Data::RecordSet`), and with variables bound to the columns. Both find columns by position. The limits apply
