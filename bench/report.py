@@ -81,6 +81,10 @@ class Results:
         return next(t["instructions"] for t in self.all["texts"]
                     if (t["kind"], t["bytes"], t["contender"]) == (kind, size, contender))
 
+    def times(self, rival, operation):
+        """How many times as fast the library is as the rival."""
+        return self.counts[rival, operation] / self.counts["library", operation]
+
     def figure(self, kind, *keys):
         """The measured ratio, None where it was not measured."""
         if kind == "count":
@@ -148,10 +152,8 @@ RIVALS = ["capi", "sqlitecpp", "soci", "poco"]
 
 
 def speed_table(results):
-    """How many times as fast the library is as each rival."""
-    times = lambda rival, o: results.counts[rival, o] / results.counts["library", o]
     return table(("as fast as", *(TITLES[o] for o in results.operations)),
-                 [(results.titles[rival], *(f"{times(rival, o):.2f}" for o in results.operations))
+                 [(results.titles[rival], *(f"{results.times(rival, o):.2f}" for o in results.operations))
                   for rival in RIVALS if rival in results.titles])
 
 
@@ -186,10 +188,9 @@ def plots(results):
     thousands = lambda value: f"{value / 1000:,.1f} k"
     microseconds = lambda nanoseconds: f"{nanoseconds / 1000:,.1f} µs".replace(".0 ", " ")
     largest = results.sizes[-1]
-    relative = lambda name, o: results.counts[name, o] / results.counts["library", o]
     yield "speed.svg", plot.bars(
         "Instructions of each operation, relative to this library",
-        [(TITLES[o], [(n, results.titles[n], relative(n, o)) for n in ["library", *RIVALS] if n in results.titles])
+        [(TITLES[o], [(n, results.titles[n], results.times(n, o)) for n in ["library", *RIVALS] if n in results.titles])
          for o in results.operations], lambda value: f"{value:.2f}")
     yield "operations.svg", plot.bars(
         "Instructions of each operation",
@@ -207,7 +208,7 @@ def plots(results):
 
 
 def summary(results):
-    times = lambda rival, o: results.counts[rival, o] / results.counts["library", o]
+    times = results.times
     return f"""Listing many rows, this library is {times("capi", "list"):.1f} times as fast as a loop over SQLite's C API with
 prepared statements and jsoncpp; a list of ten rows takes as long as that loop ({times("capi", "group"):.2f}), and a
 single record by its key takes {1 / times("capi", "fetch"):.1f} times as long, because every call prepares its statement.
