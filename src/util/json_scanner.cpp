@@ -2,8 +2,11 @@
 #include "util/json_scanner.h"
 
 #include <cctype>
+#include <cfenv>
+#include <cfloat>
 #include <charconv>
 #include <climits>
+#include <cmath>
 #include <cstdint>
 #include <cstring>
 #include <locale>
@@ -113,8 +116,7 @@ bool JsonScanner::readNumber(Json::Value& jNumber)
     return set(static_cast<Json::Int64>(blNegative ? 0 - uValue : uValue));
 }
 
-// Without a library that reads them, and under a locale of the host's, which jsoncpp follows, none
-// is taken.
+// Without a library that reads them, none is taken.
 bool JsonScanner::readReal(const char* szBegin, Json::Value& jNumber)
 {
     if (skip('.') && !skipDigits()) return false;
@@ -124,8 +126,10 @@ bool JsonScanner::readReal(const char* szBegin, Json::Value& jNumber)
     }
     double dValue = 0;
 #ifdef __cpp_lib_to_chars
-    if (std::locale() != std::locale::classic()) return false;
+    // jsoncpp follows the locale and the rounding mode of the host, and sets errno close to zero.
+    if (std::locale() != std::locale::classic() || FE_TONEAREST != fegetround()) return false;
     if (std::errc() != std::from_chars(szBegin, szAt_, dValue).ec) return false;
+    if (0 != dValue && DBL_MIN >= std::abs(dValue)) return false;
 #else
     return false;
 #endif

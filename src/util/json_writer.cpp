@@ -69,47 +69,40 @@ void appendReal(std::string& strOut, double dValue)
         strOut += 0 > dValue ? "-Infinity" : "Infinity";
 }
 
-void appendValue(std::string& strOut, const Json::Value& jValue);
-
-void appendArray(std::string& strOut, const Json::Value& jArray)
-{
-    strOut += '[';
-    Json::ArrayIndex i = 0;
-    for (auto it = jArray.begin(), end = jArray.end(); end != it; ++it, ++i) {
-        // An item that was never set reads as null.
-        for (; it.index() != i; ++i) strOut += "null,";
-        appendValue(strOut, *it);
-        strOut += ',';
-    }
-    if (0 != i) strOut.pop_back();
-    strOut += ']';
-}
-
-void appendObject(std::string& strOut, const Json::Value& jObject)
-{
-    strOut += '{';
-    for (auto it = jObject.begin(), end = jObject.end(); end != it; ++it) {
-        appendString(strOut, memberName(it));
-        strOut += ':';
-        appendValue(strOut, *it);
-        strOut += ',';
-    }
-    if (',' == strOut.back()) strOut.pop_back();
-    strOut += '}';
-}
-
-void appendValue(std::string& strOut, const Json::Value& jValue)
+[[gnu::noinline]] void appendScalar(std::string& strOut, const Json::Value& jValue)
 {
     switch (jValue.type()) {
-    case Json::nullValue: strOut += "null"; break;
     case Json::intValue: appendInteger(strOut, jValue.asLargestInt()); break;
     case Json::uintValue: appendInteger(strOut, jValue.asLargestUInt()); break;
     case Json::realValue: appendReal(strOut, jValue.asDouble()); break;
     case Json::stringValue: appendString(strOut, textOf(jValue)); break;
     case Json::booleanValue: strOut += jValue.asBool() ? "true" : "false"; break;
-    case Json::arrayValue: appendArray(strOut, jValue); break;
-    case Json::objectValue: appendObject(strOut, jValue); break;
+    default: strOut += "null";
     }
+}
+
+[[gnu::noinline]] void appendName(std::string& strOut, const Json::Value::const_iterator& it)
+{
+    appendString(strOut, memberName(it));
+    strOut += ':';
+}
+
+// Its frame is on the stack once for each level of nesting, so the two above are not inlined.
+void appendValue(std::string& strOut, const Json::Value& jValue)
+{
+    const bool blObject = jValue.isObject();
+    if (!blObject && !jValue.isArray()) return appendScalar(strOut, jValue);
+    strOut += blObject ? '{' : '[';
+    Json::ArrayIndex nItems = 0;
+    for (auto it = jValue.begin(), end = jValue.end(); end != it; ++it, ++nItems) {
+        if (blObject) appendName(strOut, it);
+        // An item that was never set reads as null.
+        for (; !blObject && it.index() != nItems; ++nItems) strOut += "null,";
+        appendValue(strOut, *it);
+        strOut += ',';
+    }
+    if (0 != nItems) strOut.pop_back();
+    strOut += blObject ? '}' : ']';
 }
 
 }  // namespace

@@ -15,7 +15,7 @@ namespace {
 // Texts that are nested more deeply are left to jsoncpp, which has a limit of its own.
 constexpr int kMaxLevels = 200;
 
-// Each function returns false where the text is left to jsoncpp.
+// Each function returns false where the text is left to jsoncpp's reader.
 class PlainReader {
 public:
     explicit PlainReader(const char* szText) : szText_(szText), scanner_(szText) {}
@@ -80,22 +80,16 @@ private:
         scanner_.skip('{');
         scanner_.skipBlanks();
         if (scanner_.skip('}')) return set(jObject, Json::objectValue);
-        const char* const szFirst = scanner_.at();
         std::string_view strName;
         if (!readName(strName)) return false;
         SharedKey* const pKey = sharedKey(strName);
         const bool blShape = nullptr != pKey && !pKey->blShapeless;
-        const Json::Value* pjShape =
-            blShape ? pKey->pjShape.load(std::memory_order_acquire) : nullptr;
-        if (nullptr != pjShape) {
-            if (fillShape(jObject, *pjShape, strName, nLevels)) return true;
-            pKey->blShapeless = true;
-            scanner_.goTo(szFirst);
-            readName(strName);
-        }
+        if (const Json::Value* pjShape =
+                blShape ? pKey->pjShape.load(std::memory_order_acquire) : nullptr)
+            return fillShape(jObject, *pKey, *pjShape, nLevels);
         set(jObject, Json::objectValue);
         if (!readMembers(jObject, strName, nLevels)) return false;
-        if (blShape && nullptr == pjShape) learnShape(*pKey, jObject);
+        if (blShape) learnShape(*pKey, jObject);
         return true;
     }
 
@@ -126,18 +120,27 @@ private:
         return *jObject.demand(strName.data(), strName.data() + strName.size());
     }
 
-    // The same for an object whose members are those of the shape, in its order, which saves the
-    // insertion of each.
-    bool fillShape(Json::Value& jObject, const Json::Value& jShape, std::string_view strName,
-                   int nLevels)
+    // The same for an object that is expected to have the members of the shape in their order,
+    // which saves the insertion of each. From the first that differs on, they are inserted.
+    bool fillShape(Json::Value& jObject, SharedKey& first, const Json::Value& jShape, int nLevels)
     {
         set(jObject, jShape);
-        for (auto it = jObject.begin(), end = jObject.end();;) {
-            if (memberName(it) != strName || !readValue(*it, nLevels)) return false;
+        std::string_view strName = first.strName;
+        bool blClosed = false;
+        auto shape = jShape.begin();
+        const auto end = jShape.end();
+        for (auto it = jObject.begin(); end != shape && memberName(shape) == strName; ++it) {
+            if (!readValue(*it, nLevels)) return false;
+            ++shape;
             scanner_.skipBlanks();
-            if (++it == end) return scanner_.skip('}');
+            blClosed = scanner_.skip('}');
+            if (blClosed) break;
             if (!scanner_.skip(',') || !readName(strName)) return false;
         }
+        if (blClosed && end == shape) return true;
+        first.blShapeless = true;
+        for (; end != shape; ++shape) jObject.removeMember(memberName(shape).data());
+        return blClosed || readMembers(jObject, strName, nLevels);
     }
 
     static void learnShape(SharedKey& first, const Json::Value& jObject)

@@ -19,7 +19,7 @@ struct SharedKey {
     // What objects look like whose first member has this name: an object with null for each member.
     // Null before the first such object; never changed and never released.
     std::atomic<const Json::Value*> pjShape{nullptr};
-    // Whether such objects differ, or have no shape.
+    // Whether such objects have been seen to differ, or have no shape.
     std::atomic<bool> blShapeless{false};
 };
 

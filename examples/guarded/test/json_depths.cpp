@@ -1,9 +1,11 @@
 // SPDX-License-Identifier: MIT
-// Prints how deep a JSON value may be nested before jsoncpp overflows a stack of 8 MiB. Every depth
-// is tried in a process of its own. With an argument the program fails if one is less than that.
+// Prints how deep a JSON value may be nested before jsoncpp, or the library's writer of JSON text,
+// overflows a stack of 8 MiB. Every depth is tried in a process of its own. With an argument the
+// program fails if one is less than that.
+
+#include <VornJsonDbApi.h>
 
 #include <json/reader.h>
-#include <json/writer.h>
 
 #include <pthread.h>
 #include <sys/resource.h>
@@ -13,6 +15,9 @@
 #include <string>
 #include <thread>
 #include <utility>
+
+bool blLogToStdout = true;
+bool blDebugOutput = false;
 
 namespace {
 
@@ -48,9 +53,16 @@ void read(std::size_t nDepth, bool blObject)
 
 void write(std::size_t nDepth, bool blObject)
 {
-    Json::StreamWriterBuilder builder;
-    builder["indentation"] = "";
-    if (2 * nDepth > Json::writeString(builder, nested(nDepth, blObject)).size()) _exit(1);
+    std::string strName;
+    std::string strText;
+    Json::Value jDefinition;
+    VornJsonDbApi api(nullptr, strName, jDefinition, strText);
+    Json::Value jRequest;
+    jRequest["limit"].swap(nested(nDepth, blObject));
+    api.SqlFilterConditionFromJson(jRequest, strText);
+    if (2 * nDepth > strText.size()) _exit(1);
+    // Not destroyed, because that recurses.
+    _exit(0);
 }
 
 void copy(std::size_t nDepth, bool blObject)
@@ -69,7 +81,8 @@ bool survives(Operation run, std::size_t nDepth, bool blObject)
     if (0 == iChild) {
         const rlimit noCore = {0, 0};
         setrlimit(RLIMIT_CORE, &noCore);
-        if (nullptr == freopen("/dev/null", "w", stderr)) _exit(1);
+        for (FILE* pFile : {stdout, stderr})
+            if (nullptr == freopen("/dev/null", "w", pFile)) _exit(1);
         std::thread([=] {
             run(nDepth, blObject);
             _exit(0);
@@ -105,6 +118,8 @@ int main(int argc, char** argv)
         const std::size_t nArrays = deepest(run, false);
         const std::size_t nObjects = deepest(run, true);
         std::printf("%-10s  arrays %7zu  objects %7zu\n", szName, nArrays, nObjects);
+        // Or the children would write it again.
+        fflush(stdout);
         blDeepEnough = blDeepEnough && nLeast <= nArrays && nLeast <= nObjects;
     }
     return blDeepEnough ? 0 : 1;

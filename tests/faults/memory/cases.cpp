@@ -95,8 +95,9 @@ const std::vector<Case> kCases = {
          "name": "O'Brien"}], "grows": "refused"})"},
     {"recList of rows alike", R"({"name": "plain", "first": {}, "second": [1]})",
      R"({"second": [1, {"data": {"n": 1}, "id": 1, "name": "the first of the rows alike"},
-         {"data": {"n": 2}, "id": 2, "name": "the second of the rows alike"}, {"data": {"n":
-         )" LONG_LIST R"(}, "id": 3, "name": "the third of the rows alike"}], "grows": "refused"})",
+         {"data": {"n": )" OBJECTS R"(}, "id": 2, "name": "the second of the rows alike"},
+         {"data": {"n": )" LONG_LIST
+     R"(}, "id": 3, "name": "the third of the rows alike"}], "grows": "refused"})",
      true},
     {"recList by everything", R"({"first": {"flag": true, "name": ["O'Brien"], "vornSqlWhereFilter":
          "id > 0 and id < 1000000", "sort_by": "name", "sort_direction": "desc", "limit": 10,

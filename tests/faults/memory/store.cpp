@@ -22,7 +22,8 @@ constexpr char kSchema[] =
     " (3, 'O''Brien', 1, null, null);"
     "create table plain (data text, id integer primary key, name text);"
     "insert into plain values ('{\"n\":1}', 1, 'the first of the rows alike'),"
-    " ('{\"n\":2}', 2, 'the second of the rows alike'),"
+    " ('{\"n\":" OBJECTS
+    "}', 2, 'the second of the rows alike'),"
     " ('{\"n\":" LONG_LIST "}', 3, 'the third of the rows alike');";
 
 constexpr char kRows[] =

@@ -14,6 +14,12 @@
     "61,62,63,64,65,66,67,68,69,70,71,72,73,74,75,76,77,78,79,80," \
     "81,82,83,84,85,86,87,88,89,90,91,92,93,94,95,96,97,98,99,100]"
 
+// An object of each kind of member: like the one before it, unlike it, of a name that is not
+// shared.
+#define OBJECTS                                                                     \
+    R"([{"k":1.5,"l":"a long enough text\n"},{"k":{},"l":[18446744073709551615]},)" \
+    R"({"k":true},{"a name that is too long to be shared":{"l":"\u00e9"}}])"
+
 // The tables of the file and the definitions of some that are not there.
 extern const char kDefinition[];
 
