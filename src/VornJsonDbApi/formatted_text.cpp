@@ -226,10 +226,10 @@ bool isPlain(const std::string& strText)
 
 }  // namespace
 
-FormattedText::FormattedText(std::string strText)
-    : strText_(std::move(strText)), blPlain_(isPlain(strText_))
+FormattedText::FormattedText(const std::string& strText) : blPlain_(isPlain(strText))
 {
-    strText_.reserve(strText_.size() + kUsualList);
+    strText_.reserve(strText.size() + kUsualList);
+    strText_ = strText;
 }
 
 void FormattedText::appendValue(const char* szConversion, const FormatArgument& argument)

@@ -34,7 +34,7 @@ struct FormatArgument {
 // arguments that were never passed. formatted_text.cpp has the rules.
 class FormattedText {
 public:
-    explicit FormattedText(std::string strText);
+    explicit FormattedText(const std::string& strText);
 
     // Appends one conversion of sqlite3_mprintf ("%Q", "%lld", "%llu", "%f", "%lf") and formats the
     // text with the argument. Throws std::logic_error if SQLite runs out of memory or finds the

@@ -11,7 +11,6 @@
 #include <VornJsonDbApi.h>
 
 #include <algorithm>
-#include <utility>
 
 using namespace vorn;
 
@@ -107,7 +106,7 @@ bool vorn::appendLists(std::string& strSql, const Json::Value& jTableDef,
     }
     strSql.back() = ')';
     strSql += " VALUES (";
-    FormattedText text(std::move(strSql));
+    FormattedText text(strSql);
     auto value = jRec.begin();
     for (const DeclaredMember& member : *pMembers) {
         appendLiteral(text, member.pForms->literal, *value);
