@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: MIT
-# What is installed: the library, a shared one with its links, the header, a package for find_package and one for
+# What is installed: the library, a shared one with its links, the headers, a package for find_package and one for
 # pkg-config, the manual pages and the licence. Both packages can be moved with what they belong to.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
@@ -21,7 +21,7 @@ install(TARGETS vornjsondb EXPORT VornJsonDb
     NAMELINK_COMPONENT vornjsondb_development
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT vornjsondb_development
   INCLUDES DESTINATION ${header_folder})
-install(FILES include/VornJsonDbApi.h DESTINATION ${header_folder}
+install(FILES include/VornJsonDbApi.h include/VornJsonTable.h DESTINATION ${header_folder}
   COMPONENT vornjsondb_development)
 
 install(EXPORT VornJsonDb NAMESPACE VornJsonDb:: FILE VornJsonDbTargets.cmake

@@ -1,0 +1,1479 @@
+// SPDX-License-Identifier: MIT
+/// @file
+/// A table of records for requests from people: whatever it stores comes back as it was sent, and
+/// whatever it cannot do exactly it refuses with a reason in words. It stands on VornJsonDbApi.h
+/// and needs nothing else of the library.
+///
+///     #include <VornJsonTable.h>
+///     #include <cstdio>
+///
+///     bool blLogToStdout = false;  // the host defines both flags
+///     bool blDebugOutput = false;
+///
+///     int main()
+///     {
+///         sqlite3* pDb = nullptr;
+///         if (SQLITE_OK != sqlite3_open("stock.db", &pDb)) return 1;
+///         Json::Value jDefinition, jRecord, jStored, jCondition, jOptions, jRecords;
+///         jDefinition["item"]["member"]["id"]["cpptype"] = "long long";
+///         jDefinition["item"]["member"]["name"]["cpptype"] = "string";
+///         jDefinition["item"]["member"]["qty"]["cpptype"] = "long long";
+///         jDefinition["item"]["member"]["qty"]["cppDefaultValue"] = 0;
+///         {
+///             VornJsonTable items(pDb, "item", jDefinition,
+///                                 "create table if not exists item (id integer primary key, "
+///                                 "name text unique, qty integer)");
+///             jRecord["name"] = "100% wool";
+///             if (0 > items.create(jRecord, jStored)) puts(items.reason().c_str());
+///             jCondition["qty"]["$lt"] = 5;
+///             jOptions["sort"][0] = "-qty";
+///             jOptions["limit"] = 10;
+///             if (0 > items.list(jCondition, jOptions, jRecords)) puts(items.reason().c_str());
+///         }
+///         sqlite3_close(pDb);
+///     }
+///
+/// Results: every operation returns 0 or more, or -1. After -1, reason() says in words which
+/// member, operator or option is wrong, which kind of value it has and what was expected; cause()
+/// tells a duplicate from a lock. Outputs are written only on success, and nothing has been
+/// written to the table. After any result, no statement and no transaction of the table's own is
+/// open.
+///
+/// Exceptions: nothing is thrown except std::bad_alloc, for lack of memory.
+///
+/// Transactions: a call that writes runs in a transaction of its own (`begin immediate`), or in a
+/// savepoint if the host has a transaction open; a call that reads runs in a read transaction. Some
+/// errors make SQLite roll back the host's transaction too: a full disk, `on conflict rollback`,
+/// a statement that is out of steps. The reason then says so.
+///
+/// Locks: while another connection holds a lock, a call tries again for five seconds or more, as
+/// the calls of VornJsonDbApi do. If the lock outlasts that, the cause is kLocked.
+///
+/// Conditions: an object whose keys are members. All must hold; an empty object or null selects
+/// every record:
+///
+///     {"qty": {"$gte": 5, "$lt": 9}, "lang": {"$in": ["de", "fr"]}, "name": {"$like": "A%"},
+///      "note": null, "$or": [{"id": 1}, {"id": 2}]}
+///
+/// - `{"qty": 5}` and `{"qty": {"$eq": 5}}`: equals; null means that the member is absent;
+/// - `$ne`: differs; a record without the member differs from every value;
+/// - `$gt`, `$gte`, `$lt`, `$lte`: order of "string", "int" and "long long" members;
+/// - `$in`, `$nin`: one of the values of an array, or none of them;
+/// - `$like`: a pattern for a "string" member, with `%`, `_` and a backslash as escape;
+/// - `$and`, `$or`: an array of conditions.
+///
+/// JSON members know `$eq`, `$ne`, `$in`, `$nin` and null, and compare their stored text. For such
+/// a member an object without a key that begins with "$" is a value; write `{"$eq": value}` if the
+/// value comes from outside. docs/front.md shows the SQL for each operator and type word.
+///
+/// Options of list() and each(), an object or null:
+///
+///     {"sort": ["-created", "name"], "limit": 10, "offset": 20, "after": <last record>}
+///
+/// Records come in the order of "sort" ("-" means descending; a missing member sorts as SQLite
+/// sorts NULL: before every value), then by the primary key, in the direction of the last of
+/// "sort". "after" takes the last record of a page and gives what follows it.
+///
+/// Log: the library logs every statement that SQLite refuses, duplicates too, with the values in
+/// it. What the table itself refuses is not logged. docs/front.md says how to keep values out.
+///
+/// Threads: as for VornJsonDbApi. Do not change the member types of the table through
+/// VORN_JSON_DB::recType(), nor the columns of the table, while the object exists.
+///
+/// Ownership: the host owns the connection, which must outlive the object. The object copies its
+/// other arguments and owns its VornJsonDbApi.
+#ifndef VORNJSONTABLE_H
+#define VORNJSONTABLE_H
+
+#include <VornJsonDbApi.h>
+
+#include <algorithm>
+#include <cctype>
+#include <cerrno>
+#include <cmath>
+#include <cstdint>
+#include <cstring>
+#include <functional>
+#include <iterator>
+#include <map>
+#include <memory>
+#include <new>
+#include <string>
+#include <utility>
+#include <vector>
+
+/// One SQLite table as a store of JSON records that come back as they were sent.
+class VornJsonTable {
+public:
+    /// Why a call failed.
+    enum class Cause {
+        kNone,       ///< it did not
+        kRefused,    ///< the table, the record or the request cannot be handled exactly
+        kDuplicate,  ///< another record has the same values in the columns of a constraint
+        kLocked,     ///< another connection held a lock for too long
+        kChanged,    ///< the row was ignored, or is not as it was sent: a trigger, as a rule
+        kLimit,      ///< one of the limits was reached
+        kFailed      ///< SQLite failed: another constraint, the disk, memory
+    };
+
+    /// Limits for requests of strangers. 0 means no limit. The defaults suit a small service.
+    struct Limits {
+        std::size_t nRequestMembers = 1000;           ///< values in the arguments of a call
+        std::size_t nRequestBytes = 1024 * 1024;      ///< bytes of their names and texts
+        std::size_t nAnswerRows = 1000;               ///< records of a list, or of a page
+        std::size_t nAnswerBytes = 16 * 1024 * 1024;  ///< bytes of their values
+        /// Steps of SQLite's virtual machine in a call. Counting them takes the connection's one
+        /// progress handler during each call and leaves the connection without one. A call that
+        /// runs out of them rolls back the host's transaction.
+        long long nSteps = 0;
+    };
+
+    /// Gets one record; returns false to stop.
+    using RowCallback = std::function<bool(const Json::Value& jRecord)>;
+
+    /// Binds the open connection @p pDb to the table @p strName as @p jDefinition defines it (the
+    /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate, which has to succeed if the
+    /// table already exists (`create table if not exists ...`).
+    ///
+    /// If the table cannot be handled exactly, cause() is kRefused after the construction, reason()
+    /// names the member or column and what to use instead, and every operation returns -1 with that
+    /// reason. Refused are
+    ///
+    /// - type words other than "string", "int", "long long", "bool", "Json::objectValue",
+    ///   "Json::arrayValue" and "Json::Value", and defaults of another kind than the type word;
+    /// - columns that change a value or its order: text in a column that is not text, integers in
+    ///   one that is text or real, JSON in one that is not text; anything but "long long" over an
+    ///   integer primary key;
+    /// - columns that are missing, not in the definition, generated, or spelt in another case;
+    /// - names that are not plain identifiers, or that SQLite does not take without quotes;
+    /// - another definition of the same table name earlier in the process.
+    VornJsonTable(sqlite3* pDb, std::string strName, Json::Value jDefinition,
+                  std::string strCreate);
+
+    VornJsonTable(const VornJsonTable&) = delete;
+    VornJsonTable& operator=(const VornJsonTable&) = delete;
+
+    /// Why the last call, or the construction, failed; empty and kNone if it did not.
+    const std::string& reason() const { return strReason_; }
+    Cause cause() const { return cause_; }
+
+    /// After a duplicate: the columns of the constraint, in its order; empty for an index on
+    /// expressions.
+    const std::vector<std::string>& columns() const { return columns_; }
+
+    /// After a failed createMany(): which record failed, counted from 0.
+    Json::ArrayIndex position() const { return uPosition_; }
+
+    /// The members of the primary key, in its order; empty if there is none.
+    const std::vector<std::string>& key() const { return key_; }
+
+    /// Sets limits for the calls from now on. A new table has none: setLimits({}) sets the defaults
+    /// of Limits.
+    void setLimits(const Limits& limits) { limits_ = limits; }
+
+    /// Inserts the record @p jRecord and sets @p jStored to the row as it was read back.
+    ///
+    /// Defaults of the definition are filled in for members left out; other members left out get
+    /// the default of their column. Null is stored as NULL and comes back as an absent member; in
+    /// an integer primary key it means the same as leaving it out. The row is compared with what
+    /// was sent, member by member: if it differs, it is not kept. Refused are undeclared members,
+    /// values of another kind, integers beyond the type word, NUL bytes in a text, invalid UTF-8,
+    /// numbers that are not finite, JSON of more than 1,000 levels, and a record without its key
+    /// where SQLite does not make one.
+    ///
+    /// Returns 0 or -1.
+    int create(const Json::Value& jRecord, Json::Value& jStored);
+
+    /// Inserts every record of the array @p jRecords as create() does, all of them or none.
+    /// Records of the same members go into one statement. Returns their number, or -1.
+    long long createMany(const Json::Value& jRecords);
+
+    /// Updates the row that has the key of @p jRecord, or inserts the record as create() does, and
+    /// sets @p jStored to the row as it was read back. The record must contain the whole key.
+    /// Members left out keep their value. No other row is touched: a conflict with another
+    /// constraint is a duplicate. Returns 0 or -1.
+    int save(const Json::Value& jRecord, Json::Value& jStored);
+
+    /// Sets @p jRecords to the array of the records that the condition selects. Returns their
+    /// number, or -1.
+    long long list(const Json::Value& jCondition, const Json::Value& jOptions,
+                   Json::Value& jRecords);
+
+    /// Calls @p callback with each record that the condition selects, in the order of the options.
+    /// It reads pages of 200 records, so it needs the memory of one page, and a primary key. Each
+    /// page is read as a whole before its records are handed out, and no statement is open
+    /// meanwhile, so the callback may use the table. Open a transaction around the call if all
+    /// pages have to show the same state.
+    ///
+    /// Returns the number of calls, also if the callback stopped, or -1. If the callback throws
+    /// anything but std::bad_alloc, the result is -1 with its message as the reason.
+    long long each(const Json::Value& jCondition, const Json::Value& jOptions,
+                   const RowCallback& callback);
+
+    /// Sets @p jRecord to the first record, in the order of the key, that the condition selects.
+    /// Returns 1, or 0 if there is none, or -1.
+    int get(const Json::Value& jCondition, Json::Value& jRecord);
+
+    /// Returns the number of records that the condition selects, or -1.
+    long long count(const Json::Value& jCondition);
+
+    /// Sets the members of the object @p jValues, arrays too, in every record that the condition
+    /// selects, and compares the rows with them. It keeps the keys of these records in memory.
+    /// Refused are empty conditions and empty values. Returns the number of records, or -1.
+    long long update(const Json::Value& jCondition, const Json::Value& jValues);
+
+    /// The same for every record of the table.
+    long long updateAll(const Json::Value& jValues);
+
+    /// Deletes the records that the condition selects. An empty condition is refused. Returns the
+    /// number of rows deleted, or -1.
+    long long remove(const Json::Value& jCondition);
+
+    /// Deletes every record. Returns the number of rows deleted, or -1.
+    long long removeAll();
+
+private:
+    // What a type word means: the rows of kForms.
+    enum Form { kText, kInt, kLong, kBool, kObject, kArray, kAny };
+
+    struct FormRow {
+        const char* szWord;
+        Json::ValueType type;  // of its values
+        const char* szExpected;
+    };
+
+    struct Member {
+        std::string strName;
+        Form form;
+        bool blColumn = false;         // the table has the column
+        bool blNullable = true;        // which may hold NULL
+        bool blColumnDefault = false;  // and has a value of its own if the member is left out
+    };
+
+    // Thrown and caught inside.
+    struct Failure {
+        Cause cause;
+        std::string strReason;
+        std::vector<std::string> columns = {};
+    };
+
+    struct SortKey {
+        const Member* pMember;  // null: the rowid
+        bool blDescending;
+    };
+
+    struct Query {
+        std::string strOrder;
+        std::vector<std::string> ranges = {"1"};  // what follows "after", part by part
+        long long iLimit = -1;
+        long long iOffset = 0;
+    };
+
+    using Texts = std::vector<std::string>;
+
+    static constexpr FormRow kForms[] = {
+        {"string", Json::stringValue, "a string"},
+        {"int", Json::intValue, "an integer from -2147483648 to 2147483647"},
+        {"long long", Json::intValue,
+         "an integer from -9223372036854775808 to 9223372036854775807"},
+        {"bool", Json::booleanValue, "a boolean"},
+        {"Json::objectValue", Json::objectValue, "an object"},
+        {"Json::arrayValue", Json::arrayValue, "an array"},
+        {"Json::Value", Json::nullValue, "a JSON value"}};
+    static constexpr char kFraction[] =
+        "fractions are not kept exactly; use \"long long\" over an integer column for a number of "
+        "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
+    static constexpr int kMaxLevels = 1000;     // of JSON, as the library reads it
+    static constexpr int kMaxTerms = 300;       // of a condition
+    static constexpr int kMaxNesting = 10;      // of "$and" and "$or"
+    static constexpr std::size_t kBatch = 100;  // rows of a statement
+    static constexpr std::size_t kBatchBytes = 1024 * 1024;
+    static constexpr long long kPage = 200;  // rows of a page of each()
+    static constexpr int kPeriod = 1000;     // steps between two looks at their number
+
+    // ---- Calls
+
+    template <typename... Parts>
+    [[noreturn]] static void fail(Cause cause, const Parts&... parts)
+    {
+        Failure failure{cause, ""};
+        ((failure.strReason += parts), ...);
+        throw failure;
+    }
+
+    template <typename... Parts>
+    [[noreturn]] static void refuse(const Parts&... parts)
+    {
+        fail(Cause::kRefused, parts...);
+    }
+
+    template <typename... Parts>
+    [[noreturn]] static void refuseMember(const std::string& strMember, const Parts&... parts)
+    {
+        refuse("member ", quoted(strMember), ": ", parts...);
+    }
+
+    // A transaction of the call, or a savepoint in the host's; undone unless it is committed.
+    class Transaction {
+    public:
+        explicit Transaction(VornJsonTable& table, const char* szBegin = "begin immediate")
+            : table_(table), blHosts_(0 == sqlite3_get_autocommit(table.pDb_))
+        {
+            table_.run(blHosts_ ? "savepoint vorn_json_table" : szBegin);
+            blOpen_ = true;
+        }
+        // Twice, because the first attempt may lack memory. SQLite may have rolled back by itself.
+        ~Transaction()
+        {
+            const char* szUndo =
+                blHosts_ ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
+            table_.nStepsLeft_ = 0;
+            for (int i = 0; i < 2 && blOpen_ && 0 == sqlite3_get_autocommit(table_.pDb_); ++i)
+                blOpen_ = SQLITE_OK != sqlite3_exec(table_.pDb_, szUndo, nullptr, nullptr, nullptr);
+        }
+        Transaction(const Transaction&) = delete;
+        Transaction& operator=(const Transaction&) = delete;
+        void commit()
+        {
+            table_.run(blHosts_ ? "release vorn_json_table" : "commit");
+            blOpen_ = false;
+        }
+
+    private:
+        VornJsonTable& table_;
+        const bool blHosts_;
+        bool blOpen_ = false;
+    };
+
+    // Counts the steps of a call, if there is a limit to them.
+    class Steps {
+    public:
+        explicit Steps(VornJsonTable& table) : table_(table)
+        {
+            table_.nStepsLeft_ = table_.limits_.nSteps;
+            table_.blStepsSpent_ = false;
+            const long long nPeriod = std::min<long long>(kPeriod, table_.nStepsLeft_);
+            if (0 < nPeriod)
+                sqlite3_progress_handler(table_.pDb_, static_cast<int>(nPeriod), count, &table_);
+        }
+        ~Steps()
+        {
+            if (0 < table_.limits_.nSteps)
+                sqlite3_progress_handler(table_.pDb_, 0, nullptr, nullptr);
+        }
+        Steps(const Steps&) = delete;
+        Steps& operator=(const Steps&) = delete;
+
+    private:
+        // Stops a statement. With EAGAIN in errno, the library would try it again.
+        static int count(void* pTable)
+        {
+            auto& table = *static_cast<VornJsonTable*>(pTable);
+            if (0 >= table.nStepsLeft_) return 0;  // rolling back
+            table.nStepsLeft_ -= kPeriod;
+            if (0 < table.nStepsLeft_) return 0;
+            table.blStepsSpent_ = true;
+            errno = 0;
+            return 1;
+        }
+
+        VornJsonTable& table_;
+    };
+
+    // Every operation goes through here: what is thrown inside becomes -1 and a reason.
+    template <typename Work>
+    long long call(std::initializer_list<const Json::Value*> arguments, Work work)
+    {
+        const bool blHosts = nullptr != pDb_ && 0 == sqlite3_get_autocommit(pDb_);
+        Failure end{Cause::kNone, ""};
+        long long iResult = -1;
+        try {
+            if (!strRefused_.empty()) refuse(strRefused_);
+            checkSize(arguments);
+            const Steps steps(*this);
+            iResult = work();
+        } catch (const Failure& failure) {
+            end = failure;
+        } catch (const std::bad_alloc&) {
+            throw;
+        } catch (const std::exception& error) {
+            end = {Cause::kFailed, error.what()};
+        }
+        if (0 > iResult && blHosts && 0 != sqlite3_get_autocommit(pDb_))
+            end.strReason += "; SQLite has rolled back the host's transaction";
+        std::swap(cause_, end.cause);
+        strReason_.swap(end.strReason);
+        columns_.swap(end.columns);
+        return iResult;
+    }
+
+    void checkSize(std::initializer_list<const Json::Value*> arguments) const
+    {
+        if (0 == limits_.nRequestMembers && 0 == limits_.nRequestBytes) return;
+        std::size_t nMembers = 0;
+        std::size_t nBytes = 0;
+        for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes, 1);
+        if (0 < limits_.nRequestMembers && limits_.nRequestMembers < nMembers)
+            fail(Cause::kLimit, "the request has more than ",
+                 std::to_string(limits_.nRequestMembers), " members");
+        if (0 < limits_.nRequestBytes && limits_.nRequestBytes < nBytes)
+            fail(Cause::kLimit, "the request has more than ", std::to_string(limits_.nRequestBytes),
+                 " bytes");
+    }
+
+    // What is deeper than this is refused by name.
+    static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes,
+                        int iLevel)
+    {
+        if (2 * kMaxLevels < iLevel) return;
+        if (jValue.isString()) nBytes += jValue.asString().size();
+        for (auto it = jValue.begin(); it != jValue.end(); ++it) {
+            ++nMembers;
+            if (jValue.isObject()) nBytes += it.name().size();
+            measure(*it, nMembers, nBytes, iLevel + 1);
+        }
+    }
+
+    // ---- Statements
+
+    // Throws what SQLite says about the statement that has just failed.
+    [[noreturn]] void failSql() const
+    {
+        const int iCode = sqlite3_extended_errcode(pDb_);
+        const std::string strError = sqlite3_errmsg(pDb_);
+        if (blStepsSpent_)
+            fail(Cause::kLimit, "the call takes more than ", std::to_string(limits_.nSteps),
+                 " steps");
+        if (SQLITE_BUSY == (iCode & 0xff) || SQLITE_LOCKED == (iCode & 0xff))
+            fail(Cause::kLocked, "locked: ", strError);
+        Failure failure{Cause::kFailed, strError};
+        if (SQLITE_CONSTRAINT_UNIQUE == iCode || SQLITE_CONSTRAINT_PRIMARYKEY == iCode ||
+            SQLITE_CONSTRAINT_ROWID == iCode)
+            readDuplicate(failure);
+        throw failure;
+    }
+
+    // UNIQUE constraint failed: item.name, item.lang
+    void readDuplicate(Failure& failure) const
+    {
+        const std::string strError = failure.strReason + ", ";
+        std::size_t uAt = strError.find(": ");
+        while (std::string::npos != uAt && strError.size() > uAt + 2) {
+            uAt += 2;
+            const std::size_t uEnd = strError.find(", ", uAt);
+            const std::size_t uDot = strError.find('.', uAt);
+            if (uDot < uEnd) {
+                const std::string strTable = strError.substr(uAt, uDot - uAt);
+                // A trigger may have written to another table.
+                if (0 != sqlite3_stricmp(strTable.c_str(), strName_.c_str())) return;
+                failure.columns.push_back(strError.substr(uDot + 1, uEnd - uDot - 1));
+            }
+            uAt = uEnd;
+        }
+        failure.cause = Cause::kDuplicate;
+        failure.strReason = "duplicate: " + failure.strReason;
+    }
+
+    // Runs one statement that gives no rows and returns the number of rows changed.
+    int run(const std::string& strSql)
+    {
+        const int iChanges = pApi_->runSqlEx(strSql);
+        if (0 > iChanges) failSql();
+        return iChanges;
+    }
+
+    // From here on, no read in the transaction meets a lock.
+    void lockForReading() { run("select 1 from " + strName_ + " limit 1"); }
+
+    std::unique_ptr<sqlite3_stmt, int (*)(sqlite3_stmt*)> prepare(const std::string& strSql) const
+    {
+        sqlite3_stmt* pStatement = nullptr;
+        sqlite3_prepare_v2(pDb_, strSql.c_str(), -1, &pStatement, nullptr);
+        return {pStatement, sqlite3_finalize};
+    }
+
+    // The rows of a statement of the table's own, NULL as an empty text.
+    std::vector<Texts> select(const std::string& strSql) const
+    {
+        const auto pStatement = prepare(strSql);
+        if (nullptr == pStatement) failSql();
+        std::vector<Texts> rows;
+        int iStatus = sqlite3_step(pStatement.get());
+        for (; SQLITE_ROW == iStatus; iStatus = sqlite3_step(pStatement.get())) {
+            rows.emplace_back();
+            for (int i = 0; i < sqlite3_column_count(pStatement.get()); ++i) {
+                const auto* szText = sqlite3_column_text(pStatement.get(), i);
+                rows.back().emplace_back(szText ? reinterpret_cast<const char*>(szText) : "");
+            }
+        }
+        if (SQLITE_DONE != iStatus) failSql();
+        return rows;
+    }
+
+    // The records that the raw filter selects, as the library decodes them.
+    Json::Value rows(const std::string& strFilter)
+    {
+        Json::Value jRequest;
+        jRequest["vornSqlWhereFilter"] = strFilter;
+        Json::Value jRows(Json::arrayValue);
+        if (0 > pApi_->recList(jRequest, jRows)) failSql();
+        return jRows;
+    }
+
+    // The SQL of a value that fits.
+    std::string literal(const Member& member, const Json::Value& jValue)
+    {
+        if (jValue.isNull()) return "null";
+        if (kBool == member.form) return jValue.asBool() ? "1" : "0";
+        if (kInt == member.form || kLong == member.form) return std::to_string(jValue.asInt64());
+        if (kText == member.form) {
+            const std::unique_ptr<char, void (*)(void*)> szQuoted(
+                sqlite3_mprintf("%Q", jValue.asCString()), sqlite3_free);
+            if (nullptr == szQuoted) throw std::bad_alloc();
+            return szQuoted.get();
+        }
+        // The library's own text of JSON, after "name=".
+        std::string strField = member.strName;
+        std::string strTerm;
+        if (0 > pApi_->SqlMakeByMatchField(strField, const_cast<Json::Value&>(jValue), strTerm))
+            throw std::bad_alloc();
+        return strTerm.substr(strField.size() + 1);
+    }
+
+    std::string equals(const Member& member, const Json::Value& jValue)
+    {
+        return member.strName + (jValue.isNull() ? " is null" : "=" + literal(member, jValue));
+    }
+
+    static std::string join(const Texts& texts, const char* szBetween)
+    {
+        std::string strOut;
+        for (const std::string& strText : texts)
+            strOut += (strOut.empty() ? "" : szBetween) + strText;
+        return strOut;
+    }
+
+    // ---- Construction
+
+    void open(Json::Value& jDefinition, std::string& strCreate)
+    {
+        if (nullptr == pDb_) refuse("the connection is null");
+        if (strCreate.empty()) refuse("the CREATE statement is empty");
+        checkName("table ", strName_);
+        const Json::Value& jConst = jDefinition;
+        const bool blTable = jConst.isObject() && jConst[strName_].isObject();
+        const Json::Value jMembers = blTable ? jConst[strName_]["member"] : Json::Value();
+        if (!jMembers.isObject() || jMembers.empty())
+            refuse("the definition has no members for the table ", quoted(strName_));
+        for (auto it = jMembers.begin(); it != jMembers.end(); ++it) declare(it.name(), *it);
+
+        pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strCreate);
+        // The constructor cannot say whether the statement failed.
+        if (0 > pApi_->tableCreate()) failSql();
+        Transaction transaction(*this, "begin");
+        lockForReading();
+        readColumns();
+        const std::string& strFirst = members_.begin()->first;
+        if (!prepare("insert into " + strName_ + " (" + strFirst + ") values (null)") ||
+            !prepare("update " + strName_ + " set " + strFirst + "=null"))
+            refuse("table ", quoted(strName_), ": ", sqlite3_errmsg(pDb_));
+        checkTypes(jDefinition, jMembers);
+        transaction.commit();
+    }
+
+    // Names are written without quotes. SQLite takes some of its words as names, but
+    // "current_time" is the time even so.
+    void checkName(const char* szWhat, const std::string& strName) const
+    {
+        const bool blPlain =
+            !strName.empty() && !std::isdigit(static_cast<unsigned char>(strName[0])) &&
+            std::all_of(strName.begin(), strName.end(),
+                        [](unsigned char c) { return '_' == c || (0x80 > c && std::isalnum(c)); });
+        if (!blPlain)
+            refuse(szWhat, quoted(strName),
+                   ": expected a name of letters, digits and \"_\" that begins with no digit");
+        const std::string strSql = "with " + strName + " as (select 7 as \"" + strName +
+                                   "\") select " + strName + "," + strName + " from " + strName +
+                                   " where (" + strName + "=7) order by " + strName + " desc";
+        if (!prepare(strSql) || std::vector<Texts>{{"7", "7"}} != select(strSql))
+            refuse(szWhat, quoted(strName),
+                   ": SQLite does not take the name without quotes; use another one");
+    }
+
+    void declare(const std::string& strMember, const Json::Value& jMember)
+    {
+        checkName("member ", strMember);
+        const bool blWord = jMember.isObject() && jMember["cpptype"].isString();
+        if (!blWord) refuseMember(strMember, "no type word, expected one such as \"string\"");
+        const std::string strWord = jMember["cpptype"].asString();
+        if ("float" == strWord || "double" == strWord)
+            refuseMember(strMember, "type word ", quoted(strWord), ": ", kFraction);
+        for (const char* szWord : {"unsigned int", "unsigned", "long", "unsigned long",
+                                   "unsigned long long", "uid_t", "time_t"})
+            if (szWord == strWord)
+                refuseMember(strMember, "type word ", quoted(strWord),
+                             ": not every number is written and read; use \"long long\"");
+        const auto found = std::find_if(std::begin(kForms), std::end(kForms),
+                                        [&](const auto& row) { return row.szWord == strWord; });
+        if (std::end(kForms) == found)
+            refuseMember(strMember, "type word ", quoted(strWord),
+                         ": unknown; use \"string\", \"int\", \"long long\", \"bool\", "
+                         "\"Json::objectValue\", \"Json::arrayValue\" or \"Json::Value\"");
+        const Member member{strMember, static_cast<Form>(found - std::begin(kForms))};
+        const Json::Value& jDefault = jMember["cppDefaultValue"];
+        if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
+        members_.emplace(strMember, member);
+    }
+
+    // The columns of the pragma: cid, name, type, notnull, dflt_value, pk, hidden.
+    void readColumns()
+    {
+        std::string strRowid;
+        for (const char* szName : {"oid", "_rowid_", "rowid"}) {
+            const bool blTaken = std::any_of(members_.begin(), members_.end(), [&](auto& item) {
+                return 0 == sqlite3_stricmp(item.first.c_str(), szName);
+            });
+            if (!blTaken && prepare(std::string("select ") + szName + " from " + strName_))
+                strRowid = szName;
+        }
+        std::map<int, std::string> keys;
+        bool blInteger = false;
+        for (const Texts& row : select("pragma table_xinfo(" + strName_ + ")")) {
+            if ("1" == row[6]) continue;  // hidden in a virtual table
+            Member& member = memberOf(row[1]);
+            if ("0" != row[6]) refuseMember(row[1], "the column is generated");
+            member.blColumn = true;
+            checkAffinity(member, row[2]);
+            member.blNullable = "0" == row[3];
+            member.blColumnDefault = !row[4].empty();
+            if ("0" == row[5]) continue;
+            keys[std::stoi(row[5])] = row[1];
+            blInteger = 0 == sqlite3_stricmp(row[2].c_str(), "integer");
+        }
+        for (const auto& item : members_)
+            if (!item.second.blColumn) refuseMember(item.first, "the table has no such column");
+        for (const auto& key : keys) key_.push_back(key.second);
+        identity_ = strRowid.empty() ? key_ : Texts{strRowid};
+        if (identity_.empty()) refuse("table ", quoted(strName_), ": no key and no rowid");
+        blRowidKey_ = !strRowid.empty() && blInteger && 1 == key_.size();
+        if (!blRowidKey_) return;
+        identity_ = key_;
+        Member& key = members_.at(key_[0]);
+        key.blNullable = false;
+        if (kLong != key.form)
+            refuseMember(key_[0], "an integer primary key holds 64 bits; use \"long long\"");
+    }
+
+    Member& memberOf(const std::string& strColumn)
+    {
+        const auto found = members_.find(strColumn);
+        if (members_.end() != found) return found->second;
+        for (const auto& item : members_)
+            if (0 == sqlite3_stricmp(item.first.c_str(), strColumn.c_str()))
+                refuseMember(item.first, "the column is called ", quoted(strColumn),
+                             "; use that name");
+        refuse("column ", quoted(strColumn), ": not in the definition; declare it");
+    }
+
+    static void checkAffinity(const Member& member, const std::string& strType)
+    {
+        std::string strUpper = strType;
+        for (char& c : strUpper) c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+        const auto has = [&](const char* szPart) {
+            return std::string::npos != strUpper.find(szPart);
+        };
+        const bool blInteger = has("INT");
+        const bool blText = !blInteger && (has("CHAR") || has("CLOB") || has("TEXT"));
+        const bool blNone = strType.empty() || (!blInteger && !blText && has("BLOB"));
+        const bool blReal =
+            !blInteger && !blText && !blNone && (has("REAL") || has("FLOA") || has("DOUB"));
+        const bool blTextWord = kText == member.form || isJson(member.form);
+        if (blNone || (blTextWord ? blText : !blText && !blReal)) return;
+        refuseMember(member.strName, "column type ", quoted(strType), ": ",
+                     blReal       ? kFraction
+                     : blTextWord ? "text like 007 becomes a number; make the column text"
+                                  : "numbers compare as text; make the column integer");
+    }
+
+    // Member types are kept by table name for the life of the process.
+    void checkTypes(Json::Value& jDefinition, const Json::Value& jMembers) const
+    {
+        std::string strName = strName_;
+        const Json::Value& jHeld = VORN_JSON_DB::recType(jDefinition, strName);
+        bool blSame = jHeld.isObject() && jHeld.size() == members_.size();
+        for (const auto& item : members_) {
+            const Json::Value& jType = blSame ? jHeld[item.first] : Json::Value::nullSingleton();
+            for (const char* szKey : {"cpptype", "cppDefaultValue"})
+                if (!jType.isObject() || !same(jType[szKey], jMembers[item.first][szKey]))
+                    refuseMember(item.first, "the process already holds the table ",
+                                 quoted(strName_),
+                                 " with other types; use the same definition or another name");
+        }
+    }
+
+    // ---- Values
+
+    const Member& declared(const std::string& strMember) const
+    {
+        const auto found = members_.find(strMember);
+        if (members_.end() == found)
+            refuseMember(strMember, "not declared for the table ", quoted(strName_));
+        return found->second;
+    }
+
+    // A text from outside in a reason: one line, and not too long.
+    static std::string quoted(const std::string& strText)
+    {
+        constexpr std::size_t kMost = 60;
+        const std::string strShort = strText.substr(0, kMost);
+        return Json::valueToQuotedString(
+            (strShort + (kMost < strText.size() ? "..." : "")).c_str());
+    }
+
+    static std::string kindOf(const Json::Value& jValue)
+    {
+        constexpr const char* kKinds[] = {
+            "null",     "the integer ", "the integer ", "a number with a fraction",
+            "a string", "a boolean",    "an array",     "an object"};
+        return kKinds[jValue.type()] + (isInteger(jValue) ? jValue.asString() : "");
+    }
+
+    static bool isJson(Form form) { return kObject <= form; }
+
+    static bool isInteger(const Json::Value& jValue)
+    {
+        return Json::intValue == jValue.type() || Json::uintValue == jValue.type();
+    }
+
+    static bool hasKind(Form form, const Json::Value& jValue)
+    {
+        if (kInt == form || kLong == form) return isInteger(jValue) && jValue.isInt64();
+        return kAny == form || kForms[form].type == jValue.type();
+    }
+
+    // Whether the value can be stored, or compared with what is stored (szStored is null).
+    static void checkFits(const Member& member, const Json::Value& jValue, const char* szStored)
+    {
+        const bool blLarge = nullptr != szStored && kInt == member.form && !jValue.isInt();
+        const Form form = nullptr == szStored && kInt == member.form ? kLong : member.form;
+        if (!hasKind(form, jValue) || blLarge)
+            refuseMember(member.strName, nullptr == szStored ? "" : szStored, kindOf(jValue),
+                         ", expected ", kForms[form].szExpected);
+        const std::string strFlaw = flawOf(jValue, 1);
+        if (!strFlaw.empty()) refuseMember(member.strName, strFlaw);
+        if (kText == form && std::string::npos != jValue.asString().find('\0'))
+            refuseMember(member.strName, "a string with a NUL byte, expected one without");
+    }
+
+    // Why a text cannot hold the value exactly, or nothing.
+    static std::string flawOf(const Json::Value& jValue, int iLevel)
+    {
+        if (kMaxLevels < iLevel) return "JSON of more than 1000 levels";
+        if (Json::realValue == jValue.type() && !std::isfinite(jValue.asDouble()))
+            return "a number that is not finite";
+        std::string strFlaw =
+            jValue.isString() && !isUtf8(jValue.asString()) ? "a string that is not UTF-8" : "";
+        for (auto it = jValue.begin(); strFlaw.empty() && it != jValue.end(); ++it)
+            strFlaw = jValue.isObject() && !isUtf8(it.name()) ? "a name that is not UTF-8"
+                                                              : flawOf(*it, iLevel + 1);
+        return strFlaw;
+    }
+
+    static bool isUtf8(const std::string& strText)
+    {
+        constexpr std::uint32_t kLeast[] = {0, 0x80, 0x800, 0x10000};
+        const auto byteAt = [&](std::size_t u) { return static_cast<unsigned char>(strText[u]); };
+        for (std::size_t u = 0; u < strText.size();) {
+            const unsigned uLead = byteAt(u++);
+            if (0x80 > uLead) continue;
+            if (0xc0 > uLead || 0xf8 <= uLead) return false;
+            const unsigned uMore = 0xf0 <= uLead ? 3 : 0xe0 <= uLead ? 2 : 1;
+            std::uint32_t c = uLead & (0x3fU >> uMore);
+            for (unsigned i = 0; i < uMore; ++i, ++u) {
+                if (0x80 != (byteAt(u) & 0xc0)) return false;  // so is the NUL at the end
+                c = c << 6 | (byteAt(u) & 0x3fU);
+            }
+            if (kLeast[uMore] > c || 0x10ffff < c || (0xd800 <= c && 0xdfff >= c)) return false;
+        }
+        return true;
+    }
+
+    // Numbers by value and kind; it does not matter whether an integer is held as unsigned.
+    static bool same(const Json::Value& jLeft, const Json::Value& jRight)
+    {
+        if (isInteger(jLeft) && isInteger(jRight) && jLeft.type() != jRight.type())
+            return jLeft.isInt64() && jRight.isInt64() && jLeft.asInt64() == jRight.asInt64();
+        if (jLeft.type() != jRight.type() || jLeft.size() != jRight.size()) return false;
+        if (Json::realValue == jLeft.type() &&
+            std::signbit(jLeft.asDouble()) != std::signbit(jRight.asDouble()))
+            return false;
+        if (jLeft.isArray()) {
+            for (Json::ArrayIndex u = 0; u < jLeft.size(); ++u)
+                if (!same(jLeft[u], jRight[u])) return false;
+            return true;
+        }
+        if (!jLeft.isObject()) return jLeft == jRight;
+        for (auto it = jLeft.begin(); it != jLeft.end(); ++it)
+            if (!jRight.isMember(it.name()) || !same(*it, jRight[it.name()])) return false;
+        return true;
+    }
+
+    // ---- Writing
+
+    // The record without what SQLite makes; everything in it fits.
+    Json::Value checked(const Json::Value& jRecord) const
+    {
+        if (!jRecord.isObject()) refuse("the record is ", kindOf(jRecord), ", expected an object");
+        Json::Value jChecked(Json::objectValue);
+        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
+            const Member& member = declared(it.name());
+            if (!it->isNull()) checkFits(member, *it, "");
+            const bool blMade = blRowidKey_ && it->isNull() && key_[0] == member.strName;
+            if (!blMade) jChecked[member.strName] = *it;
+        }
+        return jChecked;
+    }
+
+    // With its defaults, and with its key unless SQLite makes that.
+    Json::Value filled(Json::Value jRecord)
+    {
+        pApi_->fillDefaultValue(jRecord, false);
+        for (const std::string& strKey : key_) {
+            const bool blMade =
+                blRowidKey_ || (members_.at(strKey).blColumnDefault && identity_ != key_);
+            if (jRecord.isMember(strKey) || !blMade) checkKey(jRecord, strKey);
+        }
+        return jRecord;
+    }
+
+    void checkKey(const Json::Value& jRecord, const std::string& strKey) const
+    {
+        if (jRecord[strKey].isNull())
+            refuseMember(strKey, "missing, expected ", kForms[members_.at(strKey).form].szExpected,
+                         ": it is part of the key");
+    }
+
+    bool hasKey(const Json::Value& jRecord) const
+    {
+        return !key_.empty() && std::all_of(key_.begin(), key_.end(), [&](const auto& strKey) {
+            return jRecord.isMember(strKey);
+        });
+    }
+
+    // (code='x' and lang='en')
+    std::string keyTerm(const Json::Value& jRecord)
+    {
+        Texts parts;
+        for (const std::string& strKey : key_)
+            parts.push_back(equals(members_.at(strKey), jRecord[strKey]));
+        return "(" + join(parts, " and ") + ")";
+    }
+
+    // ('x','en'), or code='x',lang='en'
+    std::string values(const Json::Value& jValues, bool blNames)
+    {
+        Texts parts;
+        for (auto it = jValues.begin(); it != jValues.end(); ++it)
+            parts.push_back((blNames ? it.name() + "=" : "") +
+                            literal(members_.at(it.name()), *it));
+        return blNames ? join(parts, ",") : "(" + join(parts, ",") + ")";
+    }
+
+    // insert into item (id,name) values (1,'x'),(2,'y'). The records have the same members, and
+    // their keys if they are several. Returns the row of the last.
+    Json::Value insert(const Json::Value* pjRecords, std::size_t nRecords)
+    {
+        std::string strSql = "insert into " + strName_;
+        std::map<std::string, const Json::Value*> sent;
+        for (std::size_t u = 0; u < nRecords; ++u) {
+            const std::string strNames = join(pjRecords[u].getMemberNames(), ",");
+            strSql += 0 < u ? "," : strNames.empty() ? "" : " (" + strNames + ") values ";
+            strSql += strNames.empty() ? " default values" : values(pjRecords[u], false);
+            if (hasKey(pjRecords[u])) sent[keyTerm(pjRecords[u])] = pjRecords + u;
+        }
+        if (static_cast<int>(nRecords) != run(strSql))
+            fail(Cause::kChanged,
+                 "nothing was inserted: a trigger or an \"on conflict\" clause "
+                 "ignored the record");
+        // One row was inserted, so the rowid is its own.
+        if (sent.empty())
+            sent[identity_[0] + "=" + std::to_string(sqlite3_last_insert_rowid(pDb_))] = pjRecords;
+        Json::Value jRow;
+        for (const Json::Value& jStored : readBack(sent)) {
+            const auto found = hasKey(*pjRecords) ? sent.find(keyTerm(jStored)) : sent.begin();
+            verify(sent.end() == found ? *pjRecords : *found->second, jStored, true);
+            jRow = jStored;
+        }
+        return jRow;
+    }
+
+    Json::Value readBack(const std::map<std::string, const Json::Value*>& sent)
+    {
+        Texts terms;
+        for (const auto& record : sent) terms.push_back(record.first);
+        Json::Value jRows = rows(join(terms, " or "));
+        if (jRows.size() != terms.size())
+            fail(Cause::kChanged,
+                 "the row is not there after it was written: a trigger moved or deleted it");
+        return jRows;
+    }
+
+    // The database may fill what was left out of an inserted row.
+    void verify(const Json::Value& jSent, const Json::Value& jStored, bool blInserted) const
+    {
+        for (const auto& [strMember, member] : members_) {
+            const bool blMade = member.blColumnDefault || (blRowidKey_ && key_[0] == strMember);
+            if (blInserted && blMade && !jSent.isMember(strMember)) continue;
+            if (!same(jSent[strMember], jStored[strMember]))
+                fail(Cause::kChanged, "member ", quoted(strMember),
+                     ": the row holds another value than the one sent; a trigger may have changed "
+                     "it");
+        }
+    }
+
+    // Records of the same members in one statement if that works, otherwise one by one.
+    void insertAll(const std::vector<Json::Value>& records, Json::ArrayIndex uFirst)
+    {
+        if (1 < records.size() && insertTogether(records)) return;
+        for (const Json::Value& jRecord : records) {
+            uPosition_ = uFirst++;
+            insert(&jRecord, 1);
+        }
+    }
+
+    // False: nothing was written.
+    bool insertTogether(const std::vector<Json::Value>& records)
+    {
+        try {
+            Transaction transaction(*this);
+            insert(records.data(), records.size());
+            transaction.commit();
+            return true;
+        } catch (const Failure& failure) {
+            if (Cause::kLocked == failure.cause || Cause::kLimit == failure.cause) throw;
+            return false;
+        }
+    }
+
+    // update item set name='x' where (id=1)
+    Json::Value change(const Json::Value& jRecord, const Json::Value& jFormer)
+    {
+        Json::Value jValues = jRecord;
+        // A key that is equal under the column's collation may still differ.
+        for (const std::string& strKey : key_)
+            if (same(jRecord[strKey], jFormer[strKey])) jValues.removeMember(strKey);
+        if (jValues.empty()) return jFormer;
+        const std::string strTerm = keyTerm(jRecord);
+        if (1 != run("update " + strName_ + " set " + values(jValues, true) + " where " + strTerm))
+            fail(Cause::kChanged, "nothing was updated: a trigger ignored the record");
+        Json::Value jExpected = jFormer;
+        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) jExpected[it.name()] = *it;
+        Json::Value jStored = readBack({{strTerm, nullptr}})[0];
+        verify(jExpected, jStored, false);
+        return jStored;
+    }
+
+    long long updateWhere(const std::string& strWhere, const Json::Value& jValues)
+    {
+        const Json::Value jChecked = checked(jValues);
+        if (jChecked.empty()) refuse("there are no values to set");
+        Texts columns;
+        for (const std::string& strColumn : identity_)
+            columns.push_back(jChecked.isMember(strColumn)
+                                  ? "quote(" +
+                                        literal(members_.at(strColumn), jChecked[strColumn]) + ")"
+                                  : "quote(" + strColumn + ")");
+        Transaction transaction(*this);
+        lockForReading();
+        // The rows as they will be identified.
+        const std::vector<Texts> rowsToChange =
+            select("select " + join(columns, ",") + " from " + strName_ + " where " + strWhere);
+        const auto nRows = static_cast<int>(rowsToChange.size());
+        if (nRows !=
+            run("update " + strName_ + " set " + values(jChecked, true) + " where " + strWhere))
+            fail(Cause::kChanged,
+                 "not every record was updated: a trigger or an \"on conflict\" "
+                 "clause ignored some");
+        std::map<std::string, const Json::Value*> terms;
+        for (std::size_t u = 0; u < rowsToChange.size(); ++u) {
+            Texts parts;
+            for (std::size_t v = 0; v < identity_.size(); ++v)
+                parts.push_back(identity_[v] + "=" + rowsToChange[u][v]);
+            terms["(" + join(parts, " and ") + ")"] = nullptr;
+            if (kBatch > terms.size() && u + 1 < rowsToChange.size()) continue;
+            verifyValues(readBack(terms), jChecked);
+            terms.clear();
+        }
+        transaction.commit();
+        return nRows;
+    }
+
+    void verifyValues(const Json::Value& jRows, const Json::Value& jValues) const
+    {
+        for (const Json::Value& jRow : jRows) {
+            Json::Value jExpected = jRow;
+            for (auto it = jValues.begin(); it != jValues.end(); ++it) jExpected[it.name()] = *it;
+            verify(jExpected, jRow, false);
+        }
+    }
+
+    long long removeWhere(const std::string& strWhere)
+    {
+        Transaction transaction(*this);
+        const int iRemoved = run("delete from " + strName_ + " where " + strWhere);
+        transaction.commit();
+        return iRemoved;
+    }
+
+    // ---- Conditions
+
+    // The SQL of a condition; 1 for an empty one.
+    std::string condition(const Json::Value& jCondition, const char* szIfEmpty = nullptr)
+    {
+        int nTerms = 0;
+        const bool blEmpty = jCondition.isNull() || (jCondition.isObject() && jCondition.empty());
+        if (blEmpty && nullptr != szIfEmpty) refuse("the condition is empty; ", szIfEmpty);
+        return blEmpty ? "1" : "(" + terms(jCondition, 0, nTerms) + ")";
+    }
+
+    std::string terms(const Json::Value& jCondition, int iNesting, int& nTerms)
+    {
+        if (!jCondition.isObject())
+            refuse("the condition is ", kindOf(jCondition), ", expected an object");
+        if (jCondition.empty()) refuse("a condition in a list is empty");
+        Texts parts;
+        for (auto it = jCondition.begin(); it != jCondition.end(); ++it) {
+            const std::string strKey = it.name();
+            if ("$and" == strKey || "$or" == strKey)
+                parts.push_back(group(strKey, *it, iNesting + 1, nTerms));
+            else if ('$' == strKey[0])
+                refuse("operator ", quoted(strKey), ": expected \"$and\", \"$or\" or a member");
+            else
+                parts.push_back(memberTerms(declared(strKey), *it, nTerms));
+        }
+        return join(parts, " and ");
+    }
+
+    // ((a=1 and b=2) or (c=3))
+    std::string group(const std::string& strOperator, const Json::Value& jList, int iNesting,
+                      int& nTerms)
+    {
+        if (kMaxNesting < iNesting)
+            refuse("operator ", quoted(strOperator), ": nested deeper than 10 levels");
+        if (!jList.isArray() || jList.empty())
+            refuse("operator ", quoted(strOperator), ": ",
+                   jList.isArray() ? "empty" : kindOf(jList), ", expected an array of conditions");
+        Texts parts;
+        for (const Json::Value& jCondition : jList)
+            parts.push_back("(" + terms(jCondition, iNesting, nTerms) + ")");
+        return "(" + join(parts, "$or" == strOperator ? " or " : " and ") + ")";
+    }
+
+    // A JSON member may equal an object: only names that begin with "$" are operators.
+    std::string memberTerms(const Member& member, const Json::Value& jValue, int& nTerms)
+    {
+        const Texts names = jValue.isObject() ? jValue.getMemberNames() : Texts();
+        const bool blValue =
+            isJson(member.form)
+                ? std::none_of(names.begin(), names.end(),
+                               [](const auto& strName) { return '$' == strName[0]; })
+                : !jValue.isObject();
+        Texts parts;
+        if (blValue) parts.push_back(term(member, "$eq", jValue));
+        for (auto it = jValue.begin(); !blValue && it != jValue.end(); ++it)
+            parts.push_back(term(member, it.name(), *it));
+        if (parts.empty()) refuseMember(member.strName, "an empty object, expected operators");
+        if (kMaxTerms < (nTerms += static_cast<int>(parts.size())))
+            refuse("the condition has more than ", std::to_string(kMaxTerms), " terms");
+        return join(parts, " and ");
+    }
+
+    std::string term(const Member& member, const std::string& strOperator,
+                     const Json::Value& jValue)
+    {
+        if ("$in" == strOperator || "$nin" == strOperator)
+            return listTerm(member, strOperator, jValue);
+        const bool blEqual = "$eq" == strOperator;
+        const bool blLike = "$like" == strOperator;
+        if (blEqual || "$ne" == strOperator) {
+            if (!jValue.isNull()) checkFits(member, jValue, nullptr);
+            if (blEqual) return equals(member, jValue);
+            return member.strName +
+                   (jValue.isNull() ? " is not null" : " is not " + literal(member, jValue));
+        }
+        static const std::map<std::string, const char*> orders = {
+            {"$gt", ">"}, {"$gte", ">="}, {"$lt", "<"}, {"$lte", "<="}, {"$like", " like "}};
+        const auto found = orders.find(strOperator);
+        if (orders.end() == found)
+            refuseMember(member.strName, "operator ", quoted(strOperator),
+                         ": unknown, expected \"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", "
+                         "\"$lte\", \"$in\", \"$nin\" or \"$like\"");
+        if (blLike ? kText != member.form : kLong < member.form)
+            refuseMember(member.strName, "operator ", quoted(strOperator), ": type word \"",
+                         kForms[member.form].szWord, "\", expected \"string\"",
+                         blLike ? "" : ", \"int\" or \"long long\"");
+        checkFits(member, jValue, nullptr);
+        if (blLike) checkPattern(member, jValue.asString());
+        return member.strName + found->second + literal(member, jValue) +
+               (blLike ? " escape '\\'" : "");
+    }
+
+    static void checkPattern(const Member& member, const std::string& strPattern)
+    {
+        const std::size_t nOthers = strPattern.find_last_not_of('\\') + 1;
+        if (0 != (strPattern.size() - nOthers) % 2)
+            refuseMember(member.strName,
+                         "operator \"$like\": the pattern ends in a backslash that "
+                         "escapes nothing");
+    }
+
+    // A record without the member is in no list, unless null is in the list.
+    std::string listTerm(const Member& member, const std::string& strOperator,
+                         const Json::Value& jList)
+    {
+        if (!jList.isArray())
+            refuseMember(member.strName, "operator ", quoted(strOperator), ": ", kindOf(jList),
+                         ", expected an array");
+        Texts items;
+        for (const Json::Value& jValue : jList) {
+            if (jValue.isNull()) continue;
+            checkFits(member, jValue, nullptr);
+            items.push_back(literal(member, jValue));
+        }
+        const bool blNull = items.size() < jList.size();
+        const std::string& strName = member.strName;
+        const std::string strIn = "(" + strName + " in (" + join(items, ",") + ")";
+        if ("$in" == strOperator) return strIn + (blNull ? " or " + strName + " is null)" : ")");
+        return "(not " + strIn + ")" +
+               (blNull ? " and " + strName + " is not null)" : " or " + strName + " is null)");
+    }
+
+    // ---- Sorting and pages
+
+    static long long number(const Json::Value& jOptions, const char* szOption, long long iDefault)
+    {
+        if (!jOptions.isMember(szOption)) return iDefault;
+        const Json::Value& jValue = jOptions[szOption];
+        if (!hasKind(kLong, jValue) || 0 > jValue.asInt64())
+            refuse("option \"", szOption, "\": ", kindOf(jValue), ", expected an integer from 0");
+        return jValue.asInt64();
+    }
+
+    // The members of "sort" and then the key, so that no two records are equal.
+    std::vector<SortKey> sortKeys(const Json::Value& jSort) const
+    {
+        if (!jSort.isNull() && !jSort.isArray())
+            refuse("option \"sort\": ", kindOf(jSort), ", expected an array of names");
+        std::vector<SortKey> keys;
+        const auto isSorted = [&](const Member& member) {
+            return std::any_of(keys.begin(), keys.end(),
+                               [&](const SortKey& key) { return &member == key.pMember; });
+        };
+        for (const Json::Value& jKey : jSort) {
+            if (!jKey.isString())
+                refuse("option \"sort\": ", kindOf(jKey), ", expected the name of a member");
+            const std::string strKey = jKey.asString();
+            const bool blDescending = '-' == strKey[0];
+            const Member& member = declared(strKey.substr(blDescending ? 1 : 0));
+            if (isJson(member.form) || isSorted(member))
+                refuse("option \"sort\": member ", quoted(member.strName),
+                       isJson(member.form) ? " is JSON, which has no order" : " is there twice");
+            keys.push_back({&member, blDescending});
+        }
+        const bool blDescending = !keys.empty() && keys.back().blDescending;
+        for (const std::string& strKey : key_)
+            if (!isSorted(members_.at(strKey)))
+                keys.push_back({&members_.at(strKey), blDescending});
+        if (key_.empty()) keys.push_back({nullptr, blDescending});
+        return keys;
+    }
+
+    Query query(const Json::Value& jOptions)
+    {
+        if (!jOptions.isNull() && !jOptions.isObject())
+            refuse("the options are ", kindOf(jOptions), ", expected an object");
+        for (const std::string& strOption : jOptions.getMemberNames())
+            if ("sort" != strOption && "limit" != strOption && "offset" != strOption &&
+                "after" != strOption)
+                refuse("option ", quoted(strOption),
+                       ": unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
+        Query query;
+        const std::vector<SortKey> keys = sortKeys(jOptions["sort"]);
+        Texts order;
+        for (const SortKey& key : keys)
+            order.push_back((nullptr == key.pMember ? identity_[0] : key.pMember->strName) +
+                            (key.blDescending ? " desc" : ""));
+        query.strOrder = join(order, ",");
+        query.iLimit = number(jOptions, "limit", -1);
+        query.iOffset = number(jOptions, "offset", 0);
+        if (jOptions.isMember("after")) query.ranges = rangesAfter(keys, jOptions["after"]);
+        // Rows are skipped in all parts together, so they become one.
+        if (0 < query.iOffset) query.ranges = {"(" + join(query.ranges, " or ") + ")"};
+        return query;
+    }
+
+    // What follows the last record, in parts that an index can find: first the rows that differ
+    // from it in the last key only, then those that differ in the one before, and so on.
+    Texts rangesAfter(const std::vector<SortKey>& keys, const Json::Value& jLast)
+    {
+        if (!jLast.isObject()) refuse("option \"after\": ", kindOf(jLast), ", expected a record");
+        if (key_.empty())
+            refuse("option \"after\": the table ", quoted(strName_), " has no primary key");
+        for (const std::string& strKey : key_) checkKey(jLast, strKey);
+        const Json::Value jChecked = checked(jLast);
+        std::string strEqual;
+        Texts ranges;
+        for (const SortKey& key : keys) {
+            const Member& member = *key.pMember;
+            const Json::Value& jValue = jChecked[member.strName];
+            const std::string strRange = strEqual + member.strName;
+            // In reverse: NULL comes first, and last in a descending order.
+            if (!jValue.isNull() && key.blDescending && member.blNullable)
+                ranges.push_back(strRange + " is null");
+            if (!jValue.isNull())
+                ranges.push_back(strRange + (key.blDescending ? "<" : ">") +
+                                 literal(member, jValue));
+            else if (!key.blDescending)
+                ranges.push_back(strRange + " is not null");
+            strEqual += equals(member, jValue) + " and ";
+        }
+        std::reverse(ranges.begin(), ranges.end());
+        return ranges;
+    }
+
+    // The rows of a list. The raw filter carries the order, the limit and the offset.
+    Json::Value page(const std::string& strWhere, const Json::Value& jOptions)
+    {
+        const Query wanted = query(jOptions);
+        const auto nMost = static_cast<long long>(limits_.nAnswerRows);
+        // One more than allowed shows that there are too many.
+        const bool blMost = 0 < nMost && (0 > wanted.iLimit || nMost < wanted.iLimit);
+        long long iLeft = blMost ? nMost + 1 : wanted.iLimit;
+        Transaction transaction(*this, "begin");
+        lockForReading();
+        Json::Value jRecords(Json::arrayValue);
+        std::size_t nBytes = 0;
+        for (const std::string& strRange : wanted.ranges) {
+            const std::string strFilter = strWhere + " and " + strRange + ") order by " +
+                                          wanted.strOrder + " limit " + std::to_string(iLeft) +
+                                          " offset (" + std::to_string(wanted.iOffset);
+            checkBytes(strFilter, nBytes);
+            Json::Value jPart = rows(strFilter);
+            if (0 < iLeft) iLeft -= jPart.size();
+            if (jRecords.empty())
+                jRecords.swap(jPart);
+            else
+                for (Json::Value& jRecord : jPart) jRecords.append(std::move(jRecord));
+            if (0 == iLeft) break;
+        }
+        transaction.commit();
+        if (blMost && nMost < static_cast<long long>(jRecords.size()))
+            fail(Cause::kLimit, "the answer has more than ", std::to_string(nMost),
+                 " records; use the option \"limit\"");
+        return jRecords;
+    }
+
+    // Before the rows take memory.
+    void checkBytes(const std::string& strFilter, std::size_t& nBytes) const
+    {
+        if (0 == limits_.nAnswerBytes) return;
+        Texts lengths;
+        for (const auto& item : members_)
+            lengths.push_back("ifnull(length(cast(" + item.first + " as blob)),0)");
+        const auto sum =
+            select("select cast(total(n) as integer) from (select " + join(lengths, "+") +
+                   " as n from " + strName_ + " where (" + strFilter + "))");
+        nBytes += std::stoull(sum[0][0]);
+        if (limits_.nAnswerBytes < nBytes)
+            fail(Cause::kLimit, "the answer has more than ", std::to_string(limits_.nAnswerBytes),
+                 " bytes");
+    }
+
+    sqlite3* const pDb_;
+    std::string strName_;
+    std::unique_ptr<VornJsonDbApi> pApi_;
+    std::map<std::string, Member> members_;
+    Texts key_;
+    bool blRowidKey_ = false;  // the key is the integer primary key
+    Texts identity_;           // columns that no two rows share and that are never NULL
+    Limits limits_{0, 0, 0, 0, 0};
+    std::string strRefused_;  // why the construction was refused
+    Cause cause_ = Cause::kNone;
+    std::string strReason_;
+    Texts columns_;
+    Json::ArrayIndex uPosition_ = 0;
+    long long nStepsLeft_ = 0;
+    bool blStepsSpent_ = false;
+};
+
+inline VornJsonTable::VornJsonTable(sqlite3* pDb, std::string strName, Json::Value jDefinition,
+                                    std::string strCreate)
+    : pDb_(pDb), strName_(std::move(strName))
+{
+    call({}, [&] {
+        open(jDefinition, strCreate);
+        return 0;
+    });
+    strRefused_ = strReason_;
+}
+
+inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStored)
+{
+    return static_cast<int>(call({&jRecord}, [&] {
+        const Json::Value jFilled = filled(checked(jRecord));
+        Transaction transaction(*this);
+        Json::Value jRow = insert(&jFilled, 1);
+        transaction.commit();
+        jStored.swap(jRow);
+        return 0;
+    }));
+}
+
+inline long long VornJsonTable::createMany(const Json::Value& jRecords)
+{
+    return call({&jRecords}, [&] {
+        if (!jRecords.isArray())
+            refuse("the records are ", kindOf(jRecords), ", expected an array");
+        Transaction transaction(*this);
+        std::vector<Json::Value> batch;
+        std::string strNames;
+        std::size_t nBytes = 0;
+        Json::ArrayIndex uFirst = 0;
+        const auto flush = [&] {
+            insertAll(batch, uFirst);
+            uFirst += static_cast<Json::ArrayIndex>(batch.size());
+            batch.clear();
+            nBytes = 0;
+        };
+        for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
+            uPosition_ = u;
+            Json::Value jRecord = filled(checked(jRecords[u]));
+            const bool blSame = !batch.empty() && hasKey(jRecord) &&
+                                batch[0].getMemberNames() == jRecord.getMemberNames();
+            if (!batch.empty() && (!blSame || kBatch == batch.size() || kBatchBytes < nBytes))
+                flush();
+            std::size_t nMembers = 0;
+            measure(jRecord, nMembers, nBytes, 1);
+            batch.push_back(std::move(jRecord));
+        }
+        flush();
+        transaction.commit();
+        return jRecords.size();
+    });
+}
+
+inline int VornJsonTable::save(const Json::Value& jRecord, Json::Value& jStored)
+{
+    return static_cast<int>(call({&jRecord}, [&] {
+        const Json::Value jChecked = checked(jRecord);
+        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key to save by");
+        for (const std::string& strKey : key_) checkKey(jChecked, strKey);
+        Transaction transaction(*this);
+        const Json::Value jRows = rows(keyTerm(jChecked));
+        Json::Value jRow;
+        if (jRows.empty()) {
+            const Json::Value jFilled = filled(jChecked);
+            jRow = insert(&jFilled, 1);
+        } else {
+            jRow = change(jChecked, jRows[0]);
+        }
+        transaction.commit();
+        jStored.swap(jRow);
+        return 0;
+    }));
+}
+
+inline long long VornJsonTable::list(const Json::Value& jCondition, const Json::Value& jOptions,
+                                     Json::Value& jRecords)
+{
+    return call({&jCondition, &jOptions}, [&] {
+        Json::Value jPage = page(condition(jCondition), jOptions);
+        jRecords.swap(jPage);
+        return jRecords.size();
+    });
+}
+
+inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::Value& jOptions,
+                                     const RowCallback& callback)
+{
+    std::string strWhere;
+    Json::Value jNext;
+    long long iLeft = -1;
+    long long nRecords = call({&jCondition, &jOptions}, [&] {
+        strWhere = condition(jCondition);
+        iLeft = query(jOptions).iLimit;
+        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key, so no pages");
+        jNext = jOptions;
+        return 0;
+    });
+    for (bool blMore = 0 <= nRecords && 0 != iLeft; blMore;) {
+        const long long iPage = 0 > iLeft ? kPage : std::min(iLeft, kPage);
+        Json::Value jPage;
+        // One call each, since the callback may make calls of its own.
+        if (0 > call({}, [&] {
+                jNext["limit"] = Json::Int64(iPage);
+                jPage = page(strWhere, jNext);
+                return 0;
+            }))
+            return -1;
+        for (const Json::Value& jRecord : jPage) {
+            ++nRecords;
+            const long long iMore = call({}, [&] { return callback(jRecord) ? 1 : 0; });
+            if (1 != iMore) return 0 > iMore ? iMore : nRecords;
+        }
+        iLeft -= 0 < iLeft ? iPage : 0;
+        blMore = 0 != iLeft && iPage == static_cast<long long>(jPage.size());
+        if (blMore) jNext["after"] = jPage[jPage.size() - 1];
+        jNext.removeMember("offset");
+    }
+    return nRecords;
+}
+
+inline int VornJsonTable::get(const Json::Value& jCondition, Json::Value& jRecord)
+{
+    return static_cast<int>(call({&jCondition}, [&] {
+        Json::Value jOptions;
+        jOptions["limit"] = 1;
+        Json::Value jPage = page(condition(jCondition), jOptions);
+        if (!jPage.empty()) jRecord.swap(jPage[0]);
+        return jPage.empty() ? 0 : 1;
+    }));
+}
+
+inline long long VornJsonTable::count(const Json::Value& jCondition)
+{
+    return call({&jCondition}, [&] {
+        const std::string strWhere = condition(jCondition);
+        Transaction transaction(*this, "begin");
+        lockForReading();
+        const auto sum = select("select count(*) from " + strName_ + " where " + strWhere);
+        transaction.commit();
+        return std::stoll(sum[0][0]);
+    });
+}
+
+inline long long VornJsonTable::update(const Json::Value& jCondition, const Json::Value& jValues)
+{
+    return call({&jCondition, &jValues}, [&] {
+        return updateWhere(condition(jCondition, "updateAll() updates every record"), jValues);
+    });
+}
+
+inline long long VornJsonTable::updateAll(const Json::Value& jValues)
+{
+    return call({&jValues}, [&] { return updateWhere("1", jValues); });
+}
+
+inline long long VornJsonTable::remove(const Json::Value& jCondition)
+{
+    return call({&jCondition}, [&] {
+        return removeWhere(condition(jCondition, "removeAll() deletes every record"));
+    });
+}
+
+inline long long VornJsonTable::removeAll()
+{
+    return call({}, [&] { return removeWhere("1"); });
+}
+
+#endif
