@@ -1,0 +1,193 @@
+// SPDX-License-Identifier: MIT
+// What the construction refuses, and with which words.
+#include "front/front.h"
+
+namespace {
+
+struct Case {
+    const char* szMembers;
+    const char* szColumns;
+    const char* szReason;  // "@" is the name of the table; "" if the table is taken
+};
+
+constexpr char kLongLong[] = ": not every number is written and read; use \"long long\"";
+constexpr char kFraction[] =
+    ": fractions are not kept exactly; use \"long long\" over an integer column for a number of "
+    "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
+constexpr char kTextAsNumber[] =
+    ": text like 007 becomes a number; make the column text";
+constexpr char kNumberAsText[] = ": numbers compare as text; make the column integer";
+constexpr char kKeyBits[] = "an integer primary key holds 64 bits; use \"long long\"";
+
+std::string word(const char* szWord)
+{
+    return std::string(R"({"m": {"cpptype": ")") + szWord + R"("}})";
+}
+
+class Construction : public FrontTest {
+protected:
+    void expectReason(const std::string& strReason, const std::string& strMembers,
+                      const std::string& strColumns)
+    {
+        SCOPED_TRACE(strMembers + " over " + strColumns);
+        Front front(database_, strMembers, strColumns);
+        EXPECT_EQ(front.named(strReason), front.table->reason());
+        const bool blRefused = !strReason.empty();
+        EXPECT_EQ(blRefused ? VornJsonTable::Cause::kRefused : VornJsonTable::Cause::kNone,
+                  front.table->cause());
+        EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
+        // Every operation says so again.
+        const std::string strOutcome = front.outcome([&] { return front.table->count({}); });
+        EXPECT_EQ(blRefused ? "refused: " + front.named(strReason) : "0", strOutcome);
+    }
+};
+
+TEST_F(Construction, TakesTheTypeWordsThatAreExact)
+{
+    for (const char* szColumn : {"m text", "m varchar(9)", "m clob", "m", "m blob"})
+        for (const char* szWord :
+             {"string", "Json::objectValue", "Json::arrayValue", "Json::Value"})
+            expectReason("", word(szWord), szColumn);
+    for (const char* szColumn : {"m integer", "m int", "m bigint", "m numeric", "m boolean", "m"})
+        for (const char* szWord : {"int", "long long", "bool"})
+            expectReason("", word(szWord), szColumn);
+    expectReason("", word("long long"), "m integer primary key");
+    expectReason("", word("int"), "m int primary key");
+}
+
+TEST_F(Construction, RefusesTypeWordsThatAreNotExact)
+{
+    for (const char* szWord : {"unsigned int", "unsigned", "long", "unsigned long",
+                               "unsigned long long", "uid_t", "time_t"})
+        expectReason(std::string("member \"m\": type word \"") + szWord + "\"" + kLongLong,
+                     word(szWord), "m integer");
+    for (const char* szWord : {"float", "double"})
+        expectReason(std::string("member \"m\": type word \"") + szWord + "\"" + kFraction,
+                     word(szWord), "m real");
+    expectReason("member \"m\": type word \"text\": unknown; use \"string\", \"int\", "
+                 "\"long long\", \"bool\", \"Json::objectValue\", \"Json::arrayValue\" or "
+                 "\"Json::Value\"",
+                 word("text"), "m text");
+    for (const char* szMember : {R"({"m": {}})", R"({"m": 1})", R"({"m": {"cpptype": 1}})"})
+        expectReason("member \"m\": no type word, expected one such as \"string\"", szMember, "m");
+}
+
+TEST_F(Construction, RefusesColumnsThatChangeAValueOrItsOrder)
+{
+    for (const char* szType : {"INT", "INTEGER", "NUMERIC", "DATETIME", "decimal(5,2)", "charint"})
+        for (const char* szWord : {"string", "Json::objectValue", "Json::Value"})
+            expectReason(std::string("member \"m\": column type \"") + szType + "\"" +
+                             kTextAsNumber,
+                         word(szWord), std::string("m ") + szType);
+    for (const char* szType : {"TEXT", "varchar(5)"})
+        for (const char* szWord : {"int", "long long", "bool"})
+            expectReason(std::string("member \"m\": column type \"") + szType + "\"" +
+                             kNumberAsText,
+                         word(szWord), std::string("m ") + szType);
+    for (const char* szType : {"REAL", "DOUBLE", "FLOAT"})
+        for (const char* szWord : {"int", "string", "Json::Value"})
+            expectReason(std::string("member \"m\": column type \"") + szType + "\"" + kFraction,
+                         word(szWord), std::string("m ") + szType);
+    for (const char* szWord : {"int", "bool"})
+        expectReason(std::string("member \"m\": ") + kKeyBits, word(szWord),
+                     "m integer primary key");
+}
+
+TEST_F(Construction, RefusesTablesThatDifferFromTheDefinition)
+{
+    const Case cases[] = {
+        {R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})", "a int",
+         "member \"b\": the table has no such column"},
+        {R"({"a":{"cpptype":"int"}})", "a int, b int",
+         "column \"b\": not in the definition; declare it"},
+        {R"({"a":{"cpptype":"int"}})", "A int",
+         "member \"a\": the column is called \"A\"; use that name"},
+        {R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})", "a int, b int as (a + 1)",
+         "member \"b\": the column is generated"},
+        {R"({})", "a int", "the definition has no members for the table \"@\""},
+        {R"([])", "a int", "the definition has no members for the table \"@\""},
+    };
+    for (const Case& one : cases) expectReason(one.szReason, one.szMembers, one.szColumns);
+}
+
+TEST_F(Construction, RefusesDefaultsOfAnotherKind)
+{
+    const Case cases[] = {
+        {R"({"a":{"cpptype":"int","cppDefaultValue":"x"}})", "a int",
+         "member \"a\": the default is a string, expected an integer from -2147483648 to "
+         "2147483647"},
+        {R"({"a":{"cpptype":"int","cppDefaultValue":2147483648}})", "a int",
+         "member \"a\": the default is the integer 2147483648, expected an integer from "
+         "-2147483648 to 2147483647"},
+        {R"({"a":{"cpptype":"bool","cppDefaultValue":0}})", "a int",
+         "member \"a\": the default is the integer 0, expected a boolean"},
+        {R"({"a":{"cpptype":"string","cppDefaultValue":null}})", "a text", ""},
+    };
+    for (const Case& one : cases) expectReason(one.szReason, one.szMembers, one.szColumns);
+}
+
+TEST_F(Construction, RefusesNamesThatNeedQuotes)
+{
+    for (const char* szName : {"order", "group", "select", "current_time", "not", "null"}) {
+        const std::string strMember = std::string("{\"") + szName + R"(":{"cpptype":"string"}})";
+        expectReason(std::string("member \"") + szName +
+                         "\": SQLite does not take the name without quotes; use another one",
+                     strMember, std::string("\"") + szName + "\" text");
+    }
+    for (const char* szName : {"a b", "1a", "", "a-b", "a.b", "a;", "\u00e4", "a'"})
+        expectReason(std::string("member ") + Json::valueToQuotedString(szName) +
+                         ": expected a name of letters, digits and \"_\" that begins with no digit",
+                     std::string("{\"") + szName + R"(":{"cpptype":"string"}})", "a text");
+    for (const char* szName : {"key", "desc", "first", "plan", "query", "action", "_", "A9"})
+        expectReason("", std::string("{\"") + szName + R"(":{"cpptype":"string"}})",
+                     std::string(szName) + " text");
+}
+
+TEST_F(Construction, RefusesNamesOfTables)
+{
+    const std::string strNeedsQuotes =
+        "table \"order\": SQLite does not take the name without quotes; use another one";
+    EXPECT_EQ(strNeedsQuotes, Front(database_, "order", word("int"), "m int").table->reason());
+    EXPECT_EQ("table \"a b\": expected a name of letters, digits and \"_\" that begins with no "
+              "digit",
+              Front(database_, "a b", word("int"), "m int").table->reason());
+}
+
+TEST_F(Construction, RefusesTypesThatTheProcessHoldsDifferently)
+{
+    const std::string strName = freshName();
+    const auto reasonOf = [&](const char* szMembers, const char* szColumns) {
+        Database database;
+        return Front(database, strName, szMembers, szColumns).table->reason();
+    };
+    const std::string strHeld = "member \"a\": the process already holds the table \"" + strName +
+                                "\" with other types; use the same definition or another name";
+    // A refused table leaves no types behind.
+    EXPECT_NE("", reasonOf(R"({"a":{"cpptype":"string"}})", "a int"));
+    EXPECT_EQ("", reasonOf(R"({"a":{"cpptype":"int"}})", "a int"));
+    EXPECT_EQ("", reasonOf(R"({"a":{"cpptype":"int"}})", "a int"));
+    EXPECT_EQ(strHeld, reasonOf(R"({"a":{"cpptype":"long long"}})", "a int"));
+    EXPECT_EQ(strHeld, reasonOf(R"({"a":{"cpptype":"int","cppDefaultValue":1}})", "a int"));
+    EXPECT_EQ(strHeld,
+              reasonOf(R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})", "a int, b int"));
+}
+
+TEST_F(Construction, RefusesWhatItCannotOpen)
+{
+    const Json::Value jNone;
+    EXPECT_EQ("the connection is null", VornJsonTable(nullptr, "x", jNone, "select 1").reason());
+    EXPECT_EQ("the CREATE statement is empty",
+              VornJsonTable(database_.get(), "x", jNone, "").reason());
+    Json::Value jDefinition;
+    jDefinition["front_none"]["member"]["a"]["cpptype"] = "int";
+    EXPECT_EQ("near \"crate\": syntax error",
+              VornJsonTable(database_.get(), "front_none", jDefinition, "crate table").reason());
+    EXPECT_EQ("no such table: front_none",
+              VornJsonTable(database_.get(), "front_none", jDefinition, "select 1").reason());
+    EXPECT_EQ("table \"front_none\": cannot modify front_none because it is a view",
+              VornJsonTable(database_.get(), "front_none", jDefinition,
+                            "create view if not exists front_none as select 1 as a")
+                  .reason());
+}
+
+}  // namespace

@@ -1,0 +1,210 @@
+// SPDX-License-Identifier: MIT
+// Creating many, saving, updating and deleting, in and out of a transaction of the host's.
+#include "front/front.h"
+
+namespace {
+
+constexpr char kMembers[] = R"({
+    "id":   {"cpptype": "long long"},
+    "name": {"cpptype": "string"},
+    "note": {"cpptype": "string", "cppDefaultValue": "none"},
+    "tags": {"cpptype": "Json::arrayValue"}})";
+constexpr char kColumns[] = "id integer primary key, name text unique, note text not null, tags text";
+
+constexpr char kMissingKey[] =
+    "refused: member \"id\": missing, expected an integer from -9223372036854775808 to "
+    "9223372036854775807: it is part of the key";
+constexpr char kOtherValue[] =
+    ": the row holds another value than the one sent; a trigger may have changed it";
+
+class Write : public FrontTest {
+protected:
+    Json::Value all()
+    {
+        EXPECT_NE("", front_.list({}));
+        return front_.jStored;
+    }
+    void expectUnchanged(const std::string& strOutcome, const std::string& strActual)
+    {
+        EXPECT_EQ(strOutcome, strActual);
+        EXPECT_EQ(before_, all());
+    }
+    void begin(const char* szRecords)
+    {
+        EXPECT_EQ(std::to_string(json(szRecords).size()), front_.createMany(json(szRecords)));
+        before_ = all();
+    }
+
+    Front front_{database_, kMembers, kColumns};
+    Json::Value before_;
+};
+
+constexpr char kTwo[] = R"([{"id":1,"name":"a"},{"id":2,"name":"b","tags":[1]}])";
+
+TEST_F(Write, CreatesManyInOneStatement)
+{
+    Json::Value jRecords(Json::arrayValue);
+    for (int i = 0; i < 250; ++i) {
+        jRecords[i]["id"] = i;
+        jRecords[i]["name"] = "%d '" + std::to_string(i);
+    }
+    front_.table->count({});
+    doubles::state().statements.clear();
+    EXPECT_EQ("250", front_.createMany(jRecords));
+    int nInserts = 0;
+    for (const std::string& strSql : doubles::state().statements)
+        nInserts += 0 == strSql.find("insert") ? 1 : 0;
+    EXPECT_EQ(3, nInserts);
+    const Json::Value jStored = all();
+    for (int i = 0; i < 250; ++i) EXPECT_EQ(jRecords[i]["name"], jStored[i]["name"]);
+}
+
+TEST_F(Write, CreatesManyOrNone)
+{
+    begin(kTwo);
+    const struct {
+        const char* szRecords;
+        const char* szOutcome;
+        unsigned uPosition;
+    } cases[] = {
+        {R"([{"id":3,"name":"c"},{"id":4,"name":"a"},{"id":5,"name":"d"}])",
+         "duplicate: duplicate: UNIQUE constraint failed: @.name", 1},
+        {R"([{"id":3,"name":"c"},{"id":3,"name":"d"}])",
+         "duplicate: duplicate: UNIQUE constraint failed: @.id", 1},
+        {R"([{"name":"c"},{"id":3},{"id":4,"nam":"a"}])",
+         "refused: member \"nam\": not declared for the table \"@\"", 2},
+        {R"([{"id":3},{"id":4},7])", "refused: the record is the integer 7, expected an object", 2},
+        {R"({"id":3})", "refused: the records are an object, expected an array", 0},
+    };
+    for (const auto& one : cases) {
+        SCOPED_TRACE(one.szRecords);
+        expectUnchanged(front_.named(one.szOutcome), front_.createMany(json(one.szRecords)));
+    }
+    for (const auto& one : cases) {
+        front_.createMany(json(one.szRecords));
+        EXPECT_EQ(one.uPosition, front_.table->position()) << one.szRecords;
+    }
+    EXPECT_EQ("0", front_.createMany(json("[]")));
+    EXPECT_EQ("4", front_.createMany(json(
+                       R"([{"id":3},{"name":"x"},{"note":"y"},{"id":9,"name":null,"tags":[]}])")));
+}
+
+TEST_F(Write, SavesByTheKey)
+{
+    begin(kTwo);
+    EXPECT_EQ("0", front_.save(json(R"({"id":1,"tags":["%"]})")));
+    EXPECT_EQ(json(R"({"id":1,"name":"a","note":"none","tags":["%"]})"), front_.jStored);
+    EXPECT_EQ("0", front_.save(json(R"({"id":2,"name":null,"tags":null})")));
+    EXPECT_EQ(json(R"({"id":2,"note":"none"})"), front_.jStored);
+    EXPECT_EQ("0", front_.save(json(R"({"id":2})")));
+    EXPECT_EQ("0", front_.save(json(R"({"id":3,"name":"c"})")));
+    EXPECT_EQ(json(R"({"id":3,"name":"c","note":"none"})"), front_.jStored);
+    before_ = all();
+    expectUnchanged(front_.named("duplicate: duplicate: UNIQUE constraint failed: @.name"),
+                    front_.save(json(R"({"id":2,"name":"a"})")));
+    EXPECT_EQ(std::vector<std::string>{"name"}, front_.table->columns());
+    expectUnchanged(front_.named("duplicate: duplicate: UNIQUE constraint failed: @.name"),
+                    front_.save(json(R"({"id":9,"name":"a"})")));
+    expectUnchanged(front_.named("failed: NOT NULL constraint failed: @.note"),
+                    front_.save(json(R"({"id":2,"note":null})")));
+    expectUnchanged(kMissingKey, front_.save(json(R"({"name":"x"})")));
+    expectUnchanged(kMissingKey, front_.save(json(R"({"id":null,"name":"x"})")));
+}
+
+TEST_F(Write, SavesAKeyThatOnlyTheCollationFindsEqual)
+{
+    Front front(database_, R"({"code":{"cpptype":"string"},"n":{"cpptype":"int"}})",
+                "code text collate nocase primary key, n integer");
+    EXPECT_EQ("0", front.create(json(R"({"code":"abc","n":1})")));
+    EXPECT_EQ("0", front.save(json(R"({"code":"ABC"})")));
+    EXPECT_EQ(json(R"({"code":"ABC","n":1})"), front.jStored);
+    EXPECT_EQ("duplicate: duplicate: UNIQUE constraint failed: " + front.strName + ".code",
+              front.create(json(R"({"code":"aBc"})")));
+    Front keyless(database_, R"({"n":{"cpptype":"int"}})", "n integer");
+    EXPECT_EQ("refused: table \"" + keyless.strName + "\": no primary key to save by",
+              keyless.save(json(R"({"n":1})")));
+}
+
+TEST_F(Write, UpdatesAndRemovesByACondition)
+{
+    begin(R"([{"id":1,"name":"a"},{"id":2,"name":"b"},{"id":3,"name":"c"}])");
+    EXPECT_EQ("2", front_.update(json(R"({"id":{"$gte":2}})"), json(R"({"tags":["%s",[1]]})")));
+    EXPECT_EQ("2", front_.outcome([&] {
+        return front_.table->count(json(R"({"tags":["%s",[1]]})"));
+    }));
+    EXPECT_EQ("0", front_.update(json(R"({"id":7})"), json(R"({"note":"x"})")));
+    EXPECT_EQ("1", front_.update(json(R"({"id":3})"), json(R"({"id":30,"name":null})")));
+    before_ = all();
+    const std::string strDuplicate = "duplicate: duplicate: UNIQUE constraint failed: ";
+    expectUnchanged(strDuplicate + front_.strName + ".name",
+                    front_.update(json(R"({"id":{"$lt":9}})"), json(R"({"name":"z"})")));
+    expectUnchanged("refused: there are no values to set",
+                    front_.update(json(R"({"id":1})"), json("{}")));
+    expectUnchanged("refused: the condition is empty; updateAll() updates every record",
+                    front_.update({}, json(R"({"note":"x"})")));
+    expectUnchanged("refused: the condition is empty; removeAll() deletes every record",
+                    front_.remove(json("{}")));
+    EXPECT_EQ("1", front_.remove(json(R"({"name":{"$in":["b","x"]}})")));
+    EXPECT_EQ("2", front_.outcome([&] { return front_.table->updateAll(json(R"({"note":"y"})")); }));
+    EXPECT_EQ(json(R"([{"id":1,"name":"a","note":"y"},{"id":30,"note":"y","tags":["%s",[1]]}])"),
+              all());
+    EXPECT_EQ("2", front_.outcome([&] { return front_.table->removeAll(); }));
+    EXPECT_EQ("0", front_.outcome([&] { return front_.table->count({}); }));
+}
+
+TEST_F(Write, UndoesAnUpdateThatATriggerChanged)
+{
+    begin(kTwo);
+    const struct {
+        const char* szTrigger;
+        std::string strOutcome;
+    } cases[] = {
+        {"before update on @ begin select raise(ignore); end", "changed: "},
+        {"after update on @ when new.note = 'x' begin update @ set note = 'y'; end",
+         std::string("changed: member \"note\"") + kOtherValue},
+        {"after update on @ begin delete from @ where id = new.id; end",
+         "changed: the row is not there after it was written: a trigger moved or deleted it"},
+    };
+    for (const auto& one : cases) {
+        SCOPED_TRACE(one.szTrigger);
+        front_.run(std::string("create trigger @_t ") + one.szTrigger);
+        const Json::Value jNote = json(R"({"note":"x"})");
+        EXPECT_EQ(0U, front_.update(json(R"({"id":1})"), jNote).find(one.strOutcome));
+        EXPECT_EQ(before_, all());
+        EXPECT_EQ(0U, front_.save(json(R"({"id":1,"note":"x"})")).find(one.strOutcome));
+        EXPECT_EQ(before_, all());
+        front_.run("drop trigger @_t");
+    }
+    // A trigger that writes elsewhere changes nothing.
+    front_.run("create table @_log (a); create trigger @_t after update on @ "
+               "begin insert into @_log values (1); end");
+    EXPECT_EQ("1", front_.update(json(R"({"id":1})"), json(R"({"note":"x"})")));
+}
+
+TEST_F(Write, WorksInsideTheHostsTransaction)
+{
+    database_.run("begin");
+    EXPECT_EQ("0", front_.create(json(R"({"id":1,"name":"a"})")));
+    EXPECT_EQ(front_.named("duplicate: duplicate: UNIQUE constraint failed: @.name"),
+              front_.create(json(R"({"id":2,"name":"a"})")));
+    EXPECT_EQ("1", front_.update(json(R"({"id":1})"), json(R"({"note":"x"})")));
+    EXPECT_EQ("1", front_.list({}));
+    database_.run("rollback");
+    EXPECT_EQ("0", front_.list({}));
+}
+
+TEST_F(Write, SaysWhenTheHostsTransactionIsLost)
+{
+    Front front(database_, R"({"id":{"cpptype":"long long"}})",
+                "id integer primary key on conflict rollback");
+    EXPECT_EQ("0", front.create(json(R"({"id":1})")));
+    database_.run("begin");
+    Json::Value jStored;
+    EXPECT_EQ(-1, front.table->create(json(R"({"id":1})"), jStored));
+    EXPECT_EQ("duplicate: UNIQUE constraint failed: " + front.strName +
+                  ".id; SQLite has rolled back the host's transaction",
+              front.table->reason());
+    EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
+}
+
+}  // namespace
