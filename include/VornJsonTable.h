@@ -1332,6 +1332,7 @@ inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStore
 inline long long VornJsonTable::createMany(const Json::Value& jRecords)
 {
     return call({&jRecords}, [&] {
+        uPosition_ = 0;
         if (!jRecords.isArray())
             refuse("the records are ", kindOf(jRecords), ", expected an array");
         Transaction transaction(*this);

@@ -1,0 +1,121 @@
+// SPDX-License-Identifier: MIT
+// docs/front.md: every row of every table is run on the records of the page.
+#include "front/front.h"
+#include "support/markdown.h"
+
+namespace {
+
+class FrontPage : public FrontTest {
+protected:
+    FrontPage()
+    {
+        EXPECT_EQ("", table_.reason());
+        EXPECT_EQ(static_cast<long long>(jRecords_.size()), table_.createMany(jRecords_));
+    }
+
+    // The outcome: the ids of the records in their order, or the reason.
+    std::string listed(const std::string& strCondition, const std::string& strOptions)
+    {
+        takeStatements();
+        Json::Value jFound;
+        const long long iResult = table_.list(json(strCondition), json(strOptions), jFound);
+        if (0 > iResult) return table_.reason();
+        std::string strIds;
+        for (const Json::Value& jRecord : jFound)
+            strIds += (strIds.empty() ? "" : ", ") + jRecord["id"].asString();
+        return strIds.empty() ? "none" : strIds;
+    }
+
+    // What comes between these words in the list's statement.
+    std::string written(const std::string& strBefore, const std::string& strAfter)
+    {
+        for (const std::string& strSql : takeStatements()) {
+            const std::size_t uBegin = strSql.find(strBefore);
+            if (std::string::npos == uBegin) continue;
+            const std::size_t uAt = uBegin + strBefore.size();
+            return strSql.substr(uAt, strSql.find(strAfter, uAt) - uAt);
+        }
+        return "not run";
+    }
+
+    // Whether a condition selects a new record that has nothing but an id.
+    std::string selectsAbsent(const std::string& strCondition)
+    {
+        database_.run("savepoint absent; insert into front_book (id) values (99)");
+        Json::Value jBoth;
+        jBoth["$and"][0] = json(strCondition);
+        jBoth["$and"][1]["id"] = 99;
+        if (jBoth["$and"][0].empty()) jBoth["$and"][0]["id"] = 99;
+        const long long nFound = table_.count(jBoth);
+        database_.run("rollback to absent; release absent");
+        return 1 == nFound ? "yes" : "no";
+    }
+
+    const MarkdownPage page_ = readPage("front.md");
+    const Json::Value jRecords_ = json(page_.blocks.at(3).strText);
+    VornJsonTable table_{database_.get(), "front_book", json(page_.blocks.at(1).strText),
+                         page_.blocks.at(2).strText};
+};
+
+TEST_F(FrontPage, ShowsEachOperator)
+{
+    for (const auto& row : table(page_, "Operators", 35).rows) {
+        SCOPED_TRACE(row[1]);
+        EXPECT_EQ(row[3], listed(row[1], "null"));
+        EXPECT_EQ(row[2], written("WHERE  ( ", " and 1) order by "));
+        // A record has always got its key.
+        if (std::string::npos == row[1].find("\"id\"")) {
+            EXPECT_EQ(row[4], selectsAbsent(row[1]));
+        }
+    }
+}
+
+TEST_F(FrontPage, ShowsWhatIsRefused)
+{
+    for (const auto& row : table(page_, "What a condition refuses", 25).rows) {
+        EXPECT_EQ(row[1], listed(row[0], "null")) << row[0];
+        EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
+        EXPECT_EQ(std::vector<std::string>(), takeStatements());
+    }
+    for (const auto& row : table(page_, "What the options refuse", 14).rows) {
+        EXPECT_EQ(row[1], listed("null", row[0])) << row[0];
+        EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
+        EXPECT_EQ(std::vector<std::string>(), takeStatements());
+    }
+}
+
+TEST_F(FrontPage, ShowsEachOrder)
+{
+    for (const auto& row : table(page_, "Sorting and pages", 15).rows) {
+        SCOPED_TRACE(row[0]);
+        EXPECT_EQ(row[2], listed("null", row[0]));
+        EXPECT_EQ(row[1], written(" order by ", " limit "));
+    }
+}
+
+// As many terms and levels as are taken are not too many for SQLite, and one more is refused.
+TEST_F(FrontPage, TakesThreeHundredTermsAndTenLevels)
+{
+    Json::Value jWide;
+    for (Json::ArrayIndex u = 0; u < 300; ++u) jWide["$or"][u]["id"] = u;
+    EXPECT_EQ(5, table_.count(jWide)) << table_.reason();
+    jWide["$or"][300]["id"] = 300;
+    EXPECT_EQ(-1, table_.count(jWide));
+    EXPECT_EQ("the condition has more than 300 terms", table_.reason());
+
+    Json::Value jDeep;
+    jDeep["id"] = 1;
+    for (int i = 0; i < 10; ++i) {
+        Json::Value jOuter;
+        jOuter[0 == i % 2 ? "$or" : "$and"][0]["id"]["$ne"] = 7;
+        jOuter[0 == i % 2 ? "$or" : "$and"][1].swap(jDeep);
+        jDeep.swap(jOuter);
+    }
+    EXPECT_LE(0, table_.count(jDeep)) << table_.reason();
+    Json::Value jDeeper;
+    jDeeper["$or"][0] = jDeep;
+    EXPECT_EQ(-1, table_.count(jDeeper));
+    EXPECT_EQ("operator \"$or\": nested deeper than 10 levels", table_.reason());
+}
+
+}  // namespace
