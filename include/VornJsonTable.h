@@ -398,6 +398,8 @@ private:
             throw;
         } catch (const std::exception& error) {
             end = {Cause::kFailed, error.what()};
+        } catch (...) {
+            end = {Cause::kFailed, "the callback threw"};
         }
         if (0 > iResult && blHosts && 0 != sqlite3_get_autocommit(pDb_))
             end.strReason += "; SQLite has rolled back the host's transaction";

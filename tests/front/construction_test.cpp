@@ -14,8 +14,7 @@ constexpr char kLongLong[] = ": not every number is written and read; use \"long
 constexpr char kFraction[] =
     ": fractions are not kept exactly; use \"long long\" over an integer column for a number of "
     "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
-constexpr char kTextAsNumber[] =
-    ": text like 007 becomes a number; make the column text";
+constexpr char kTextAsNumber[] = ": text like 007 becomes a number; make the column text";
 constexpr char kNumberAsText[] = ": numbers compare as text; make the column integer";
 constexpr char kKeyBits[] = "an integer primary key holds 64 bits; use \"long long\"";
 
@@ -64,10 +63,11 @@ TEST_F(Construction, RefusesTypeWordsThatAreNotExact)
     for (const char* szWord : {"float", "double"})
         expectReason(std::string("member \"m\": type word \"") + szWord + "\"" + kFraction,
                      word(szWord), "m real");
-    expectReason("member \"m\": type word \"text\": unknown; use \"string\", \"int\", "
-                 "\"long long\", \"bool\", \"Json::objectValue\", \"Json::arrayValue\" or "
-                 "\"Json::Value\"",
-                 word("text"), "m text");
+    expectReason(
+        "member \"m\": type word \"text\": unknown; use \"string\", \"int\", "
+        "\"long long\", \"bool\", \"Json::objectValue\", \"Json::arrayValue\" or "
+        "\"Json::Value\"",
+        word("text"), "m text");
     for (const char* szMember : {R"({"m": {}})", R"({"m": 1})", R"({"m": {"cpptype": 1}})"})
         expectReason("member \"m\": no type word, expected one such as \"string\"", szMember, "m");
 }
@@ -76,14 +76,14 @@ TEST_F(Construction, RefusesColumnsThatChangeAValueOrItsOrder)
 {
     for (const char* szType : {"INT", "INTEGER", "NUMERIC", "DATETIME", "decimal(5,2)", "charint"})
         for (const char* szWord : {"string", "Json::objectValue", "Json::Value"})
-            expectReason(std::string("member \"m\": column type \"") + szType + "\"" +
-                             kTextAsNumber,
-                         word(szWord), std::string("m ") + szType);
+            expectReason(
+                std::string("member \"m\": column type \"") + szType + "\"" + kTextAsNumber,
+                word(szWord), std::string("m ") + szType);
     for (const char* szType : {"TEXT", "varchar(5)"})
         for (const char* szWord : {"int", "long long", "bool"})
-            expectReason(std::string("member \"m\": column type \"") + szType + "\"" +
-                             kNumberAsText,
-                         word(szWord), std::string("m ") + szType);
+            expectReason(
+                std::string("member \"m\": column type \"") + szType + "\"" + kNumberAsText,
+                word(szWord), std::string("m ") + szType);
     for (const char* szType : {"REAL", "DOUBLE", "FLOAT"})
         for (const char* szWord : {"int", "string", "Json::Value"})
             expectReason(std::string("member \"m\": column type \"") + szType + "\"" + kFraction,
@@ -148,9 +148,10 @@ TEST_F(Construction, RefusesNamesOfTables)
     const std::string strNeedsQuotes =
         "table \"order\": SQLite does not take the name without quotes; use another one";
     EXPECT_EQ(strNeedsQuotes, Front(database_, "order", word("int"), "m int").table->reason());
-    EXPECT_EQ("table \"a b\": expected a name of letters, digits and \"_\" that begins with no "
-              "digit",
-              Front(database_, "a b", word("int"), "m int").table->reason());
+    EXPECT_EQ(
+        "table \"a b\": expected a name of letters, digits and \"_\" that begins with no "
+        "digit",
+        Front(database_, "a b", word("int"), "m int").table->reason());
 }
 
 TEST_F(Construction, RefusesTypesThatTheProcessHoldsDifferently)

@@ -70,12 +70,15 @@ TEST_F(Create, RefusesWhatCannotBeStoredExactly)
         {R"({"nam":"x"})", "refused: member \"nam\": not declared for the table \"@\""},
         {R"({"name":7})", "refused: member \"name\": the integer 7, expected a string"},
         {R"({"name":["x"]})", "refused: member \"name\": an array, expected a string"},
-        {R"({"qty":"7"})", "refused: member \"qty\": a string, expected an integer from "
-                           "-2147483648 to 2147483647"},
-        {R"({"qty":1.0})", "refused: member \"qty\": a number with a fraction, expected an integer "
-                           "from -2147483648 to 2147483647"},
-        {R"({"qty":2147483648})", "refused: member \"qty\": the integer 2147483648, expected an "
-                                  "integer from -2147483648 to 2147483647"},
+        {R"({"qty":"7"})",
+         "refused: member \"qty\": a string, expected an integer from "
+         "-2147483648 to 2147483647"},
+        {R"({"qty":1.0})",
+         "refused: member \"qty\": a number with a fraction, expected an integer "
+         "from -2147483648 to 2147483647"},
+        {R"({"qty":2147483648})",
+         "refused: member \"qty\": the integer 2147483648, expected an "
+         "integer from -2147483648 to 2147483647"},
         {R"({"id":9223372036854775808})",
          "refused: member \"id\": the integer 9223372036854775808, expected an integer from "
          "-9223372036854775808 to 9223372036854775807"},
@@ -85,8 +88,7 @@ TEST_F(Create, RefusesWhatCannotBeStoredExactly)
         {R"({"name":"a\u0000b"})",
          "refused: member \"name\": a string with a NUL byte, expected one without"},
     };
-    for (const Case& one : cases)
-        expectRefused(front_.named(one.szOutcome), json(one.szRecord));
+    for (const Case& one : cases) expectRefused(front_.named(one.szOutcome), json(one.szRecord));
 
     Json::Value jRecord;
     jRecord["name"] = "\xff";
@@ -155,7 +157,8 @@ TEST_F(Create, UndoesWhatATriggerChanged)
 {
     const Case cases[] = {
         {"before insert on @ begin select raise(ignore); end",
-         "changed: nothing was inserted: a trigger or an \"on conflict\" clause ignored the record"},
+         "changed: nothing was inserted: a trigger or an \"on conflict\" clause ignored the "
+         "record"},
         {"after insert on @ begin update @ set name = 'x' where id = new.id; end",
          "changed: member \"name\": the row holds another value than the one sent; a trigger may "
          "have changed it"},

@@ -43,10 +43,7 @@ public:
         expectIdle();
     }
 
-    std::string named(const std::string& strText) const
-    {
-        return replaced(strText, '@', strName);
-    }
+    std::string named(const std::string& strText) const { return replaced(strText, '@', strName); }
     void run(const std::string& strSql) { database_.run(named(strSql)); }
     Rows rows(const std::string& strSql) { return database_.rows(named(strSql)); }
 

@@ -9,7 +9,8 @@ constexpr char kMembers[] = R"({
     "name": {"cpptype": "string"},
     "note": {"cpptype": "string", "cppDefaultValue": "none"},
     "tags": {"cpptype": "Json::arrayValue"}})";
-constexpr char kColumns[] = "id integer primary key, name text unique, note text not null, tags text";
+constexpr char kColumns[] =
+    "id integer primary key, name text unique, note text not null, tags text";
 
 constexpr char kMissingKey[] =
     "refused: member \"id\": missing, expected an integer from -9223372036854775808 to "
@@ -128,9 +129,8 @@ TEST_F(Write, UpdatesAndRemovesByACondition)
 {
     begin(R"([{"id":1,"name":"a"},{"id":2,"name":"b"},{"id":3,"name":"c"}])");
     EXPECT_EQ("2", front_.update(json(R"({"id":{"$gte":2}})"), json(R"({"tags":["%s",[1]]})")));
-    EXPECT_EQ("2", front_.outcome([&] {
-        return front_.table->count(json(R"({"tags":["%s",[1]]})"));
-    }));
+    EXPECT_EQ("2",
+              front_.outcome([&] { return front_.table->count(json(R"({"tags":["%s",[1]]})")); }));
     EXPECT_EQ("0", front_.update(json(R"({"id":7})"), json(R"({"note":"x"})")));
     EXPECT_EQ("1", front_.update(json(R"({"id":3})"), json(R"({"id":30,"name":null})")));
     before_ = all();
@@ -144,7 +144,8 @@ TEST_F(Write, UpdatesAndRemovesByACondition)
     expectUnchanged("refused: the condition is empty; removeAll() deletes every record",
                     front_.remove(json("{}")));
     EXPECT_EQ("1", front_.remove(json(R"({"name":{"$in":["b","x"]}})")));
-    EXPECT_EQ("2", front_.outcome([&] { return front_.table->updateAll(json(R"({"note":"y"})")); }));
+    EXPECT_EQ("2",
+              front_.outcome([&] { return front_.table->updateAll(json(R"({"note":"y"})")); }));
     EXPECT_EQ(json(R"([{"id":1,"name":"a","note":"y"},{"id":30,"note":"y","tags":["%s",[1]]}])"),
               all());
     EXPECT_EQ("2", front_.outcome([&] { return front_.table->removeAll(); }));
@@ -175,8 +176,9 @@ TEST_F(Write, UndoesAnUpdateThatATriggerChanged)
         front_.run("drop trigger @_t");
     }
     // A trigger that writes elsewhere changes nothing.
-    front_.run("create table @_log (a); create trigger @_t after update on @ "
-               "begin insert into @_log values (1); end");
+    front_.run(
+        "create table @_log (a); create trigger @_t after update on @ "
+        "begin insert into @_log values (1); end");
     EXPECT_EQ("1", front_.update(json(R"({"id":1})"), json(R"({"note":"x"})")));
 }
 

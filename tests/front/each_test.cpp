@@ -1,0 +1,203 @@
+// SPDX-License-Identifier: MIT
+// Records handed out one by one, callbacks that throw, and limits.
+#include "front/front.h"
+
+#include <stdexcept>
+
+namespace {
+
+constexpr char kMembers[] = R"({
+    "id":   {"cpptype": "long long"},
+    "rank": {"cpptype": "int"},
+    "text": {"cpptype": "string"}})";
+constexpr char kColumns[] = "id integer primary key, rank integer, text text";
+constexpr int kRecords = 1005;
+
+class Each : public FrontTest {
+protected:
+    Each()
+    {
+        database_.run("pragma journal_mode=memory");
+        Json::Value jRecords(Json::arrayValue);
+        for (int i = 0; i < kRecords; ++i) {
+            jRecords[i]["id"] = i;
+            if (0 != i % 3) jRecords[i]["rank"] = i % 7;
+        }
+        EXPECT_EQ(std::to_string(kRecords), front_.createMany(jRecords));
+    }
+
+    // The ids in the order of the calls.
+    std::string each(const char* szCondition, const char* szOptions, int iMost = -1)
+    {
+        jIds_ = Json::Value(Json::arrayValue);
+        return front_.outcome([&] {
+            return front_.table->each(json(szCondition), json(szOptions),
+                                      [&](const Json::Value& jRecord) {
+                                          jIds_.append(jRecord["id"]);
+                                          return static_cast<int>(jIds_.size()) != iMost;
+                                      });
+        });
+    }
+
+    void expectAsListed(const char* szCondition, const char* szOptions)
+    {
+        SCOPED_TRACE(szOptions);
+        EXPECT_EQ(front_.list(json(szCondition), json(szOptions)), each(szCondition, szOptions));
+        front_.list(json(szCondition), json(szOptions));
+        Json::Value jExpected(Json::arrayValue);
+        for (const Json::Value& jRecord : front_.jStored) jExpected.append(jRecord["id"]);
+        EXPECT_EQ(jExpected, jIds_);
+    }
+
+    Front front_{database_, kMembers, kColumns};
+    Json::Value jIds_;
+};
+
+TEST_F(Each, HandsOutWhatAListHolds)
+{
+    for (const char* szOptions :
+         {"null", R"({"sort":["rank"]})", R"({"sort":["-rank"]})", R"({"sort":["-rank","id"]})",
+          R"({"sort":["rank","-id"]})", R"({"limit":200})", R"({"limit":401,"offset":3})",
+          R"({"offset":250,"sort":["-rank"]})", R"({"limit":0})", R"({"limit":5000})",
+          R"({"after":{"id":500}})", R"({"after":{"id":500,"rank":3},"offset":9,"limit":300,
+             "sort":["rank"]})"})
+        for (const char* szCondition : {"{}", R"({"rank":{"$in":[2,null]}})"})
+            expectAsListed(szCondition, szOptions);
+}
+
+TEST_F(Each, StopsWhenTheCallbackSaysSo)
+{
+    for (const int iMost : {1, 199, 200, 201, 400})
+        EXPECT_EQ(std::to_string(iMost), each("{}", "{}", iMost));
+}
+
+TEST_F(Each, ReadsPagesOfTwoHundred)
+{
+    takeStatements();
+    each("{}", "{}");
+    int nLists = 0;
+    for (const std::string& strSql : takeStatements()) nLists += 0 == strSql.find("SELECT ");
+    EXPECT_EQ(6, nLists);
+}
+
+TEST_F(Each, CatchesWhatTheCallbackThrows)
+{
+    const auto outcome = [&](auto thrown) {
+        return front_.outcome([&] {
+            return front_.table->each({}, {}, [&](const Json::Value&) -> bool { throw thrown; });
+        });
+    };
+    EXPECT_EQ("failed: no more", outcome(std::runtime_error("no more")));
+    EXPECT_EQ("failed: the callback threw", outcome(7));
+    EXPECT_THROW(outcome(std::bad_alloc()), std::bad_alloc);
+    EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
+}
+
+TEST_F(Each, LetsTheCallbackUseTheTable)
+{
+    int nRemoved = 0;
+    const long long nRecords = front_.table->each({}, {}, [&](const Json::Value& jRecord) {
+        Json::Value jCondition;
+        jCondition["id"] = jRecord["id"];
+        Json::Value jStored;
+        EXPECT_EQ(-1, front_.table->create(jRecord, jStored));
+        nRemoved += static_cast<int>(front_.table->remove(jCondition));
+        return true;
+    });
+    EXPECT_EQ(kRecords, nRecords);
+    EXPECT_EQ(kRecords, nRemoved);
+    EXPECT_EQ("", front_.table->reason());
+    EXPECT_EQ("0", front_.list({}));
+}
+
+TEST_F(Each, NeedsAKey)
+{
+    Front keyless(database_, R"({"a":{"cpptype":"int"}})", "a integer");
+    EXPECT_EQ("0", keyless.create(json(R"({"a":2})")));
+    EXPECT_EQ("0", keyless.create(json(R"({"a":1})")));
+    EXPECT_EQ("2", keyless.list({}, json(R"({"sort":["a"]})")));
+    EXPECT_EQ(json(R"([{"a":1},{"a":2}])"), keyless.jStored);
+    EXPECT_EQ("1", keyless.update(json(R"({"a":2})"), json(R"({"a":3})")));
+    EXPECT_EQ("refused: table \"" + keyless.strName + "\": no primary key, so no pages",
+              keyless.outcome([&] {
+                  return keyless.table->each({}, {}, [](const Json::Value&) { return true; });
+              }));
+    EXPECT_EQ("refused: option \"after\": the table \"" + keyless.strName + "\" has no primary key",
+              keyless.list({}, json(R"({"after":{"a":1}})")));
+}
+
+class FrontLimits : public Each {
+protected:
+    void limit(std::size_t VornJsonTable::Limits::*pLimit, std::size_t nMost)
+    {
+        VornJsonTable::Limits limits{0, 0, 0, 0, 0};
+        limits.*pLimit = nMost;
+        front_.table->setLimits(limits);
+    }
+};
+
+using Limits = VornJsonTable::Limits;
+
+TEST_F(FrontLimits, EndACallWithAReason)
+{
+    limit(&Limits::nRequestMembers, 3);
+    EXPECT_EQ("0", front_.list(json(R"({"id":{"$in":[-1]}})")));
+    const std::string strMembers = "limit: the request has more than 3 members";
+    EXPECT_EQ(strMembers, front_.list(json(R"({"id":{"$in":[-1,-2]}})")));
+    EXPECT_EQ(strMembers, front_.list(json(R"({"id":-1})"), json(R"({"sort":["id","rank"]})")));
+    EXPECT_EQ(strMembers, front_.createMany(json(R"([{"id":-1},{"id":-2}])")));
+    limit(&Limits::nRequestBytes, 8);
+    EXPECT_EQ("0", front_.create(json(R"({"text":"1234"})")));
+    EXPECT_EQ("limit: the request has more than 8 bytes",
+              front_.create(json(R"({"text":"12345"})")));
+    limit(&Limits::nAnswerRows, 5);
+    EXPECT_EQ("5", front_.list({}, json(R"({"limit":5})")));
+    EXPECT_EQ("5", front_.list(json(R"({"id":{"$lt":5}})")));
+    const std::string strRows =
+        "limit: the answer has more than 5 records; use the option \"limit\"";
+    EXPECT_EQ(strRows, front_.list({}));
+    EXPECT_EQ(strRows, front_.list({}, json(R"({"limit":6,"sort":["rank"]})")));
+    EXPECT_EQ("1", front_.get({}));
+    limit(&Limits::nAnswerBytes, 12);
+    EXPECT_EQ("5", front_.list(json(R"({"id":{"$lt":5}})"), {}));
+    EXPECT_EQ("limit: the answer has more than 12 bytes", front_.list({}));
+}
+
+TEST_F(FrontLimits, HaveDefaultsForStrangers)
+{
+    front_.table->setLimits({});
+    EXPECT_EQ("limit: the answer has more than 1000 records; use the option \"limit\"",
+              front_.list({}));
+    Json::Value jMany;
+    for (int i = 0; i < 1000; ++i) jMany["id"]["$in"][i] = i;
+    EXPECT_EQ("limit: the request has more than 1000 members", front_.list(jMany));
+}
+
+TEST_F(FrontLimits, StopStatementsThatTakeTooManySteps)
+{
+    VornJsonTable::Limits limits{0, 0, 0, 0, 5000};
+    front_.table->setLimits(limits);
+    const std::string strSteps = "limit: the call takes more than 5000 steps";
+    for (int i = 0; i < 3; ++i) {
+        errno = EAGAIN;
+        EXPECT_EQ(strSteps, front_.list({}, json(R"({"sort":["-text"]})")));
+        EXPECT_EQ(strSteps,
+                  front_.outcome([&] { return front_.table->updateAll(json(R"({"text":"x"})")); }));
+        EXPECT_EQ("1", front_.get(json(R"({"id":7})")));
+    }
+    EXPECT_TRUE(doubles::state().sleeps.empty());
+    limits.nSteps = 1;
+    front_.table->setLimits(limits);
+    EXPECT_EQ("limit: the call takes more than 1 steps", front_.get(json(R"({"id":7})")));
+    database_.run("begin");
+    Json::Value jStored;
+    limits.nSteps = 5000;
+    front_.table->setLimits(limits);
+    EXPECT_EQ(-1, front_.table->updateAll(json(R"({"text":"x"})")));
+    EXPECT_EQ(0U, front_.table->reason().find("the call takes more than 5000 steps"));
+    if (0 == sqlite3_get_autocommit(database_.get())) database_.run("rollback");
+    front_.table->setLimits({0, 0, 0, 0, 0});
+    EXPECT_EQ("0", front_.outcome([&] { return front_.table->count(json(R"({"text":"x"})")); }));
+}
+
+}  // namespace
