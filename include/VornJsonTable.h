@@ -98,6 +98,7 @@
 #include <map>
 #include <memory>
 #include <new>
+#include <sstream>
 #include <string>
 #include <utility>
 #include <vector>
@@ -271,6 +272,13 @@ private:
 
     using Texts = std::vector<std::string>;
 
+    static constexpr char kFraction[] =
+        "fractions are not kept exactly; use \"long long\" over an integer column for a number of "
+        "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
+    static constexpr char kLongLong[] = "not every number is written and read; use \"long long\"";
+    static constexpr char kUnknown[] =
+        "unknown; use \"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", "
+        "\"Json::arrayValue\" or \"Json::Value\"";
     static constexpr FormRow kForms[] = {
         {"string", Json::stringValue, "a string"},
         {"int", Json::intValue, "an integer from -2147483648 to 2147483647"},
@@ -279,10 +287,18 @@ private:
         {"bool", Json::booleanValue, "a boolean"},
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
-        {"Json::Value", Json::nullValue, "a JSON value"}};
-    static constexpr char kFraction[] =
-        "fractions are not kept exactly; use \"long long\" over an integer column for a number of "
-        "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
+        {"Json::Value", Json::nullValue, "a JSON value"},
+        // Refused, with what to use instead.
+        {"float", Json::nullValue, kFraction},
+        {"double", Json::nullValue, kFraction},
+        {"unsigned int", Json::nullValue, kLongLong},
+        {"unsigned", Json::nullValue, kLongLong},
+        {"long", Json::nullValue, kLongLong},
+        {"unsigned long", Json::nullValue, kLongLong},
+        {"unsigned long long", Json::nullValue, kLongLong},
+        {"uid_t", Json::nullValue, kLongLong},
+        {"time_t", Json::nullValue, kLongLong}};
+    static constexpr int kRefusedWords = 9;
     static constexpr int kMaxLevels = 1000;     // of JSON, as the library reads it
     static constexpr int kMaxTerms = 300;       // of a condition
     static constexpr int kMaxNesting = 10;      // of "$and" and "$or"
@@ -327,9 +343,10 @@ private:
         {
             const char* szUndo =
                 blHosts_ ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
-            table_.nStepsLeft_ = 0;
+            const long long nStepsLeft = std::exchange(table_.nStepsLeft_, 0);
             for (int i = 0; i < 2 && blOpen_ && 0 == sqlite3_get_autocommit(table_.pDb_); ++i)
                 blOpen_ = SQLITE_OK != sqlite3_exec(table_.pDb_, szUndo, nullptr, nullptr, nullptr);
+            table_.nStepsLeft_ = nStepsLeft;
         }
         Transaction(const Transaction&) = delete;
         Transaction& operator=(const Transaction&) = delete;
@@ -345,40 +362,26 @@ private:
         bool blOpen_ = false;
     };
 
-    // Counts the steps of a call, if there is a limit to them.
-    class Steps {
-    public:
-        explicit Steps(VornJsonTable& table) : table_(table)
-        {
-            table_.nStepsLeft_ = table_.limits_.nSteps;
-            table_.blStepsSpent_ = false;
-            const long long nPeriod = std::min<long long>(kPeriod, table_.nStepsLeft_);
-            if (0 < nPeriod)
-                sqlite3_progress_handler(table_.pDb_, static_cast<int>(nPeriod), count, &table_);
-        }
-        ~Steps()
-        {
-            if (0 < table_.limits_.nSteps)
-                sqlite3_progress_handler(table_.pDb_, 0, nullptr, nullptr);
-        }
-        Steps(const Steps&) = delete;
-        Steps& operator=(const Steps&) = delete;
+    // Stops a statement that is out of steps. With EAGAIN in errno, the library would try it again.
+    static int countSteps(void* pTable)
+    {
+        auto& table = *static_cast<VornJsonTable*>(pTable);
+        if (0 >= table.nStepsLeft_) return 0;  // rolling back
+        table.blStepsSpent_ = 0 >= (table.nStepsLeft_ -= kPeriod);
+        if (table.blStepsSpent_) errno = 0;
+        return table.blStepsSpent_ ? 1 : 0;
+    }
 
-    private:
-        // Stops a statement. With EAGAIN in errno, the library would try it again.
-        static int count(void* pTable)
-        {
-            auto& table = *static_cast<VornJsonTable*>(pTable);
-            if (0 >= table.nStepsLeft_) return 0;  // rolling back
-            table.nStepsLeft_ -= kPeriod;
-            if (0 < table.nStepsLeft_) return 0;
-            table.blStepsSpent_ = true;
-            errno = 0;
-            return 1;
-        }
-
-        VornJsonTable& table_;
-    };
+    // Has the steps of the call counted, if there is a limit to them, until it is destroyed.
+    std::unique_ptr<sqlite3, void (*)(sqlite3*)> countedSteps()
+    {
+        nStepsLeft_ = limits_.nSteps;
+        blStepsSpent_ = false;
+        const auto iPeriod = static_cast<int>(std::min<long long>(kPeriod, nStepsLeft_));
+        if (0 < iPeriod) sqlite3_progress_handler(pDb_, iPeriod, countSteps, this);
+        return {0 < iPeriod ? pDb_ : nullptr,
+                [](sqlite3* pDb) { sqlite3_progress_handler(pDb, 0, nullptr, nullptr); }};
+    }
 
     // Every operation goes through here: what is thrown inside becomes -1 and a reason.
     template <typename Work>
@@ -390,7 +393,7 @@ private:
         try {
             if (!strRefused_.empty()) refuse(strRefused_);
             checkSize(arguments);
-            const Steps steps(*this);
+            const auto steps = countedSteps();
             iResult = work();
         } catch (const Failure& failure) {
             end = failure;
@@ -409,18 +412,20 @@ private:
         return iResult;
     }
 
+    static void checkLimit(const char* szWhat, std::size_t nMost, std::size_t n, const char* szUnit)
+    {
+        if (0 < nMost && nMost < n)
+            fail(Cause::kLimit, "the ", szWhat, " has more than ", std::to_string(nMost), szUnit);
+    }
+
     void checkSize(std::initializer_list<const Json::Value*> arguments) const
     {
         if (0 == limits_.nRequestMembers && 0 == limits_.nRequestBytes) return;
         std::size_t nMembers = 0;
         std::size_t nBytes = 0;
         for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes, 1);
-        if (0 < limits_.nRequestMembers && limits_.nRequestMembers < nMembers)
-            fail(Cause::kLimit, "the request has more than ",
-                 std::to_string(limits_.nRequestMembers), " members");
-        if (0 < limits_.nRequestBytes && limits_.nRequestBytes < nBytes)
-            fail(Cause::kLimit, "the request has more than ", std::to_string(limits_.nRequestBytes),
-                 " bytes");
+        checkLimit("request", limits_.nRequestMembers, nMembers, " members");
+        checkLimit("request", limits_.nRequestBytes, nBytes, " bytes");
     }
 
     // What is deeper than this is refused by name.
@@ -458,19 +463,13 @@ private:
     // UNIQUE constraint failed: item.name, item.lang
     void readDuplicate(Failure& failure) const
     {
-        const std::string strError = failure.strReason + ", ";
-        std::size_t uAt = strError.find(": ");
-        while (std::string::npos != uAt && strError.size() > uAt + 2) {
-            uAt += 2;
-            const std::size_t uEnd = strError.find(", ", uAt);
-            const std::size_t uDot = strError.find('.', uAt);
-            if (uDot < uEnd) {
-                const std::string strTable = strError.substr(uAt, uDot - uAt);
-                // A trigger may have written to another table.
-                if (0 != sqlite3_stricmp(strTable.c_str(), strName_.c_str())) return;
-                failure.columns.push_back(strError.substr(uDot + 1, uEnd - uDot - 1));
-            }
-            uAt = uEnd;
+        std::istringstream words(failure.strReason + ",");
+        for (std::string strWord; words >> strWord;) {
+            const std::size_t uDot = strWord.find('.');
+            if (std::string::npos == uDot || '\'' == strWord[0]) continue;
+            // A trigger may have written to another table.
+            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str())) return;
+            failure.columns.push_back(strWord.substr(uDot + 1, strWord.size() - uDot - 2));
         }
         failure.cause = Cause::kDuplicate;
         failure.strReason = "duplicate: " + failure.strReason;
@@ -587,17 +586,17 @@ private:
     // "current_time" is the time even so.
     void checkName(const char* szWhat, const std::string& strName) const
     {
-        const bool blPlain =
-            !strName.empty() && !std::isdigit(static_cast<unsigned char>(strName[0])) &&
-            std::all_of(strName.begin(), strName.end(),
-                        [](unsigned char c) { return '_' == c || (0x80 > c && std::isalnum(c)); });
-        if (!blPlain)
+        const std::string strDigits = "0123456789";
+        const std::string strLetters = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_";
+        if (strName.empty() || std::string::npos != strDigits.find(strName[0]) ||
+            std::string::npos != strName.find_first_not_of(strLetters + strDigits))
             refuse(szWhat, quoted(strName),
                    ": expected a name of letters, digits and \"_\" that begins with no digit");
         const std::string strSql = "with " + strName + " as (select 7 as \"" + strName +
                                    "\") select " + strName + "," + strName + " from " + strName +
                                    " where (" + strName + "=7) order by " + strName + " desc";
-        if (!prepare(strSql) || std::vector<Texts>{{"7", "7"}} != select(strSql))
+        const bool blRowid = 0 == sqlite3_stricmp(strName.c_str(), "_rowid_");
+        if (blRowid || !prepare(strSql) || std::vector<Texts>{{"7", "7"}} != select(strSql))
             refuse(szWhat, quoted(strName),
                    ": SQLite does not take the name without quotes; use another one");
     }
@@ -608,19 +607,11 @@ private:
         const bool blWord = jMember.isObject() && jMember["cpptype"].isString();
         if (!blWord) refuseMember(strMember, "no type word, expected one such as \"string\"");
         const std::string strWord = jMember["cpptype"].asString();
-        if ("float" == strWord || "double" == strWord)
-            refuseMember(strMember, "type word ", quoted(strWord), ": ", kFraction);
-        for (const char* szWord : {"unsigned int", "unsigned", "long", "unsigned long",
-                                   "unsigned long long", "uid_t", "time_t"})
-            if (szWord == strWord)
-                refuseMember(strMember, "type word ", quoted(strWord),
-                             ": not every number is written and read; use \"long long\"");
         const auto found = std::find_if(std::begin(kForms), std::end(kForms),
                                         [&](const auto& row) { return row.szWord == strWord; });
-        if (std::end(kForms) == found)
-            refuseMember(strMember, "type word ", quoted(strWord),
-                         ": unknown; use \"string\", \"int\", \"long long\", \"bool\", "
-                         "\"Json::objectValue\", \"Json::arrayValue\" or \"Json::Value\"");
+        if (std::end(kForms) - found <= kRefusedWords)
+            refuseMember(strMember, "type word ", quoted(strWord), ": ",
+                         std::end(kForms) == found ? kUnknown : found->szExpected);
         const Member member{strMember, static_cast<Form>(found - std::begin(kForms))};
         const Json::Value& jDefault = jMember["cppDefaultValue"];
         if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
@@ -630,14 +621,7 @@ private:
     // The columns of the pragma: cid, name, type, notnull, dflt_value, pk, hidden.
     void readColumns()
     {
-        std::string strRowid;
-        for (const char* szName : {"oid", "_rowid_", "rowid"}) {
-            const bool blTaken = std::any_of(members_.begin(), members_.end(), [&](auto& item) {
-                return 0 == sqlite3_stricmp(item.first.c_str(), szName);
-            });
-            if (!blTaken && prepare(std::string("select ") + szName + " from " + strName_))
-                strRowid = szName;
-        }
+        const bool blRowid = nullptr != prepare("select _rowid_ from " + strName_);
         std::map<int, std::string> keys;
         bool blInteger = false;
         for (const Texts& row : select("pragma table_xinfo(" + strName_ + ")")) {
@@ -655,9 +639,9 @@ private:
         for (const auto& item : members_)
             if (!item.second.blColumn) refuseMember(item.first, "the table has no such column");
         for (const auto& key : keys) key_.push_back(key.second);
-        identity_ = strRowid.empty() ? key_ : Texts{strRowid};
+        identity_ = blRowid ? Texts{"_rowid_"} : key_;
         if (identity_.empty()) refuse("table ", quoted(strName_), ": no key and no rowid");
-        blRowidKey_ = !strRowid.empty() && blInteger && 1 == key_.size();
+        blRowidKey_ = blRowid && blInteger && 1 == key_.size();
         if (!blRowidKey_) return;
         identity_ = key_;
         Member& key = members_.at(key_[0]);
@@ -684,13 +668,18 @@ private:
         const auto has = [&](const char* szPart) {
             return std::string::npos != strUpper.find(szPart);
         };
-        const bool blInteger = has("INT");
-        const bool blText = !blInteger && (has("CHAR") || has("CLOB") || has("TEXT"));
-        const bool blNone = strType.empty() || (!blInteger && !blText && has("BLOB"));
-        const bool blReal =
-            !blInteger && !blText && !blNone && (has("REAL") || has("FLOA") || has("DOUB"));
+        char cAffinity = 'n';
+        if (has("INT"))
+            cAffinity = 'i';
+        else if (has("CHAR") || has("CLOB") || has("TEXT"))
+            cAffinity = 't';
+        else if (strType.empty() || has("BLOB"))
+            return;
+        else if (has("REAL") || has("FLOA") || has("DOUB"))
+            cAffinity = 'r';
+        const bool blReal = 'r' == cAffinity;
         const bool blTextWord = kText == member.form || isJson(member.form);
-        if (blNone || (blTextWord ? blText : !blText && !blReal)) return;
+        if (!blReal && blTextWord == ('t' == cAffinity)) return;
         refuseMember(member.strName, "column type ", quoted(strType), ": ",
                      blReal       ? kFraction
                      : blTextWord ? "text like 007 becomes a number; make the column text"
@@ -701,16 +690,14 @@ private:
     void checkTypes(Json::Value& jDefinition, const Json::Value& jMembers) const
     {
         std::string strName = strName_;
-        const Json::Value& jHeld = VORN_JSON_DB::recType(jDefinition, strName);
-        bool blSame = jHeld.isObject() && jHeld.size() == members_.size();
-        for (const auto& item : members_) {
-            const Json::Value& jType = blSame ? jHeld[item.first] : Json::Value::nullSingleton();
+        Json::Value jExpected;
+        for (const auto& item : members_)
             for (const char* szKey : {"cpptype", "cppDefaultValue"})
-                if (!jType.isObject() || !same(jType[szKey], jMembers[item.first][szKey]))
-                    refuseMember(item.first, "the process already holds the table ",
-                                 quoted(strName_),
-                                 " with other types; use the same definition or another name");
-        }
+                if (jMembers[item.first].isMember(szKey))
+                    jExpected[item.first][szKey] = jMembers[item.first][szKey];
+        if (!same(VORN_JSON_DB::recType(jDefinition, strName), jExpected))
+            refuse("the process already holds the table ", quoted(strName_),
+                   " with other types; use the same definition or another name");
     }
 
     // ---- Values
@@ -840,10 +827,13 @@ private:
     Json::Value filled(Json::Value jRecord)
     {
         pApi_->fillDefaultValue(jRecord, false);
-        for (const std::string& strKey : key_) {
-            const bool blMade =
-                blRowidKey_ || (members_.at(strKey).blColumnDefault && identity_ != key_);
-            if (jRecord.isMember(strKey) || !blMade) checkKey(jRecord, strKey);
+        for (const auto& [strMember, member] : members_) {
+            const bool blKey = key_.end() != std::find(key_.begin(), key_.end(), strMember);
+            const bool blMade = blKey ? blRowidKey_ || (member.blColumnDefault && identity_ != key_)
+                                      : member.blColumnDefault;
+            if (blMade && !jRecord.isMember(strMember)) continue;
+            if (blKey) checkKey(jRecord, strMember);
+            jRecord[strMember];  // null unless it is there
         }
         return jRecord;
     }
@@ -933,19 +923,13 @@ private:
         }
     }
 
-    // Records of the same members in one statement if that works, otherwise one by one.
-    void insertAll(const std::vector<Json::Value>& records, Json::ArrayIndex uFirst)
-    {
-        if (1 < records.size() && insertTogether(records)) return;
-        for (const Json::Value& jRecord : records) {
-            uPosition_ = uFirst++;
-            insert(&jRecord, 1);
-        }
-    }
-
-    // False: nothing was written.
+    // The records in one statement if they have the same members and it works; false: nothing was
+    // written.
     bool insertTogether(const std::vector<Json::Value>& records)
     {
+        const Texts names = records[0].getMemberNames();
+        for (const Json::Value& jRecord : records)
+            if (!hasKey(jRecord) || names != jRecord.getMemberNames()) return false;
         try {
             Transaction transaction(*this);
             insert(records.data(), records.size());
@@ -1269,9 +1253,8 @@ private:
             if (0 == iLeft) break;
         }
         transaction.commit();
-        if (blMost && nMost < static_cast<long long>(jRecords.size()))
-            fail(Cause::kLimit, "the answer has more than ", std::to_string(nMost),
-                 " records; use the option \"limit\"");
+        checkLimit("answer", limits_.nAnswerRows, jRecords.size(),
+                   " records; use the option \"limit\"");
         return jRecords;
     }
 
@@ -1286,9 +1269,7 @@ private:
             select("select cast(total(n) as integer) from (select " + join(lengths, "+") +
                    " as n from " + strName_ + " where (" + strFilter + "))");
         nBytes += std::stoull(sum[0][0]);
-        if (limits_.nAnswerBytes < nBytes)
-            fail(Cause::kLimit, "the answer has more than ", std::to_string(limits_.nAnswerBytes),
-                 " bytes");
+        checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
     }
 
     sqlite3* const pDb_;
@@ -1339,27 +1320,21 @@ inline long long VornJsonTable::createMany(const Json::Value& jRecords)
             refuse("the records are ", kindOf(jRecords), ", expected an array");
         Transaction transaction(*this);
         std::vector<Json::Value> batch;
-        std::string strNames;
+        std::size_t nMembers = 0;
         std::size_t nBytes = 0;
-        Json::ArrayIndex uFirst = 0;
-        const auto flush = [&] {
-            insertAll(batch, uFirst);
-            uFirst += static_cast<Json::ArrayIndex>(batch.size());
-            batch.clear();
-            nBytes = 0;
-        };
         for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
             uPosition_ = u;
-            Json::Value jRecord = filled(checked(jRecords[u]));
-            const bool blSame = !batch.empty() && hasKey(jRecord) &&
-                                batch[0].getMemberNames() == jRecord.getMemberNames();
-            if (!batch.empty() && (!blSame || kBatch == batch.size() || kBatchBytes < nBytes))
-                flush();
-            std::size_t nMembers = 0;
-            measure(jRecord, nMembers, nBytes, 1);
-            batch.push_back(std::move(jRecord));
+            batch.push_back(filled(checked(jRecords[u])));
+            measure(batch.back(), nMembers, nBytes, 1);
+            const bool blFull = kBatch == batch.size() || kBatchBytes < nBytes;
+            if (!blFull && u + 1 < jRecords.size()) continue;
+            uPosition_ = u + 1 - static_cast<Json::ArrayIndex>(batch.size());
+            const bool blTogether = 1 < batch.size() && insertTogether(batch);
+            for (auto it = batch.begin(); !blTogether && it != batch.end(); ++it, ++uPosition_)
+                insert(&*it, 1);
+            batch.clear();
+            nBytes = 0;
         }
-        flush();
         transaction.commit();
         return jRecords.size();
     });

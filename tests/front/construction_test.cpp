@@ -161,7 +161,7 @@ TEST_F(Construction, RefusesTypesThatTheProcessHoldsDifferently)
         Database database;
         return Front(database, strName, szMembers, szColumns).table->reason();
     };
-    const std::string strHeld = "member \"a\": the process already holds the table \"" + strName +
+    const std::string strHeld = "the process already holds the table \"" + strName +
                                 "\" with other types; use the same definition or another name";
     // A refused table leaves no types behind.
     EXPECT_NE("", reasonOf(R"({"a":{"cpptype":"string"}})", "a int"));
