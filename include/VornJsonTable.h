@@ -219,8 +219,9 @@ public:
     long long count(const Json::Value& jCondition);
 
     /// Sets the members of the object @p jValues, arrays too, in every record that the condition
-    /// selects, and compares the rows with them. It keeps the keys of these records in memory.
-    /// Refused are empty conditions and empty values. Returns the number of records, or -1.
+    /// selects, and compares the rows with them; a trigger may set other members. It keeps the keys
+    /// of these records in memory. Refused are empty conditions and empty values. Returns the
+    /// number of records, or -1.
     long long update(const Json::Value& jCondition, const Json::Value& jValues);
 
     /// The same for every record of the table.

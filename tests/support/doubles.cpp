@@ -116,7 +116,9 @@ int sqlite3_exec(sqlite3* pDb, const char* szSql, int (*callback)(void*, int, ch
                  void* arg, char** errText)
 {
     if (0 < iExecDepth) return doubles::realExec(pDb, szSql, callback, arg, errText);
+    const int iFailNew = std::exchange(state().iFailNew, 0);  // not for the double's own memory
     state().statements.emplace_back(szSql);
+    state().iFailNew = iFailNew;
     if (!state().exec) return doubles::realExec(pDb, szSql, callback, arg, errText);
     return state().exec(pDb, szSql, callback, arg, errText);
 }
