@@ -1105,8 +1105,12 @@ private:
                (blLike ? " escape '\\'" : "");
     }
 
-    static void checkPattern(const Member& member, const std::string& strPattern)
+    void checkPattern(const Member& member, const std::string& strPattern) const
     {
+        const int nMost = sqlite3_limit(pDb_, SQLITE_LIMIT_LIKE_PATTERN_LENGTH, -1);
+        if (strPattern.size() > static_cast<std::size_t>(nMost))
+            refuseMember(member.strName, "operator \"$like\": a pattern of more than ",
+                         std::to_string(nMost), " bytes");
         const std::size_t nOthers = strPattern.find_last_not_of('\\') + 1;
         if (0 != (strPattern.size() - nOthers) % 2)
             refuseMember(member.strName,
