@@ -173,6 +173,19 @@ TEST_F(FrontLimits, HaveDefaultsForStrangers)
     EXPECT_EQ("limit: the request has more than 1000 members", front_.list(jMany));
 }
 
+// EAGAIN in errno looks like a lock to the library.
+TEST_F(FrontLimits, StopStatementsOnce)
+{
+    const auto again = [](sqlite3_context*, int, sqlite3_value**) { errno = EAGAIN; };
+    sqlite3_create_function(database_.get(), "again", 0, SQLITE_UTF8, nullptr, again, nullptr,
+                            nullptr);
+    front_.run("create trigger @_t before update on @ begin select again(); end");
+    front_.table->setLimits({0, 0, 0, 0, 5000});
+    EXPECT_EQ("limit: the call takes more than 5000 steps",
+              front_.outcome([&] { return front_.table->updateAll(json(R"({"text":"x"})")); }));
+    EXPECT_TRUE(doubles::state().sleeps.empty());
+}
+
 TEST_F(FrontLimits, StopStatementsThatTakeTooManySteps)
 {
     VornJsonTable::Limits limits{0, 0, 0, 0, 5000};

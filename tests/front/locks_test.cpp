@@ -113,6 +113,7 @@ TEST_F(FrontLocks, SayLockedInTheHostsTransaction)
     other_.run("begin immediate");
     database_.run("begin");
     expectLocked([&] { return front_->create(json(R"({"id":2})")); });
+    expectLocked([&] { return front_->createMany(json(R"([{"id":2},{"id":3}])")); });
     EXPECT_EQ(0, sqlite3_get_autocommit(database_.get()));
     other_.run("rollback");
     EXPECT_EQ("0", front_->create(json(R"({"id":2})")));

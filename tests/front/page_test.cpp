@@ -9,6 +9,7 @@ class FrontPage : public FrontTest {
 protected:
     FrontPage()
     {
+        EXPECT_EQ(3U, page_.blocks.size());
         EXPECT_EQ("", table_.reason());
         EXPECT_EQ(static_cast<long long>(jRecords_.size()), table_.createMany(jRecords_));
     }
@@ -52,9 +53,9 @@ protected:
     }
 
     const MarkdownPage page_ = readPage("front.md");
-    const Json::Value jRecords_ = json(page_.blocks.at(3).strText);
-    VornJsonTable table_{database_.get(), "front_book", json(page_.blocks.at(1).strText),
-                         page_.blocks.at(2).strText};
+    const Json::Value jRecords_ = json(page_.blocks.at(2).strText);
+    VornJsonTable table_{database_.get(), "front_book", json(page_.blocks.at(0).strText),
+                         page_.blocks.at(1).strText};
 };
 
 TEST_F(FrontPage, ShowsEachOperator)

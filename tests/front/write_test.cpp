@@ -60,6 +60,19 @@ TEST_F(Write, CreatesManyInOneStatement)
     for (int i = 0; i < 250; ++i) EXPECT_EQ(jRecords[i]["name"], jStored[i]["name"]);
 }
 
+TEST_F(Write, RunsACallForEachStatement)
+{
+    takeStatements();
+    EXPECT_EQ("0", front_.create(json(R"({"id":1,"name":"it's"})")));
+    const std::vector<std::string> statements = {
+        "begin immediate",
+        front_.named("insert into @ (id,name,note,tags) values (1,'it''s','none',null)"),
+        front_.named("SELECT id,name,note,tags FROM @  WHERE  ( (id=1)  );"), "commit"};
+    EXPECT_EQ(statements, takeStatements());
+    EXPECT_EQ("1", front_.list(json(R"({"id":1})")));
+    EXPECT_EQ("begin", takeStatements().at(0));
+}
+
 TEST_F(Write, CreatesManyOrNone)
 {
     begin(kTwo);
