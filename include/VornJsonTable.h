@@ -277,6 +277,9 @@ private:
         "fractions are not kept exactly; use \"long long\" over an integer column for a number of "
         "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
     static constexpr char kLongLong[] = "not every number is written and read; use \"long long\"";
+    static constexpr char kFractions[] = "|float|double|";
+    static constexpr char kIntegers[] =
+        "|unsigned int|unsigned|long|unsigned long|unsigned long long|uid_t|time_t|";
     static constexpr char kUnknown[] =
         "unknown; use \"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", "
         "\"Json::arrayValue\" or \"Json::Value\"";
@@ -288,18 +291,7 @@ private:
         {"bool", Json::booleanValue, "a boolean"},
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
-        {"Json::Value", Json::nullValue, "a JSON value"},
-        // Refused, with what to use instead.
-        {"float", Json::nullValue, kFraction},
-        {"double", Json::nullValue, kFraction},
-        {"unsigned int", Json::nullValue, kLongLong},
-        {"unsigned", Json::nullValue, kLongLong},
-        {"long", Json::nullValue, kLongLong},
-        {"unsigned long", Json::nullValue, kLongLong},
-        {"unsigned long long", Json::nullValue, kLongLong},
-        {"uid_t", Json::nullValue, kLongLong},
-        {"time_t", Json::nullValue, kLongLong}};
-    static constexpr int kRefusedWords = 9;
+        {"Json::Value", Json::nullValue, "a JSON value"}};
     static constexpr int kMaxLevels = 1000;     // of JSON, as the library reads it
     static constexpr int kMaxTerms = 300;       // of a condition
     static constexpr int kMaxNesting = 10;      // of "$and" and "$or"
@@ -610,9 +602,14 @@ private:
         const std::string strWord = jMember["cpptype"].asString();
         const auto found = std::find_if(std::begin(kForms), std::end(kForms),
                                         [&](const auto& row) { return row.szWord == strWord; });
-        if (std::end(kForms) - found <= kRefusedWords)
+        const auto isIn = [&](const char* szWords) {
+            return nullptr != std::strstr(szWords, ("|" + strWord + "|").c_str());
+        };
+        if (std::end(kForms) == found)
             refuseMember(strMember, "type word ", quoted(strWord), ": ",
-                         std::end(kForms) == found ? kUnknown : found->szExpected);
+                         isIn(kFractions)  ? kFraction
+                         : isIn(kIntegers) ? kLongLong
+                                           : kUnknown);
         const Member member{strMember, static_cast<Form>(found - std::begin(kForms))};
         const Json::Value& jDefault = jMember["cppDefaultValue"];
         if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
@@ -669,18 +666,13 @@ private:
         const auto has = [&](const char* szPart) {
             return std::string::npos != strUpper.find(szPart);
         };
-        char cAffinity = 'n';
-        if (has("INT"))
-            cAffinity = 'i';
-        else if (has("CHAR") || has("CLOB") || has("TEXT"))
-            cAffinity = 't';
-        else if (strType.empty() || has("BLOB"))
-            return;
-        else if (has("REAL") || has("FLOA") || has("DOUB"))
-            cAffinity = 'r';
-        const bool blReal = 'r' == cAffinity;
+        // SQLite's own rules, in their order.
+        const bool blInteger = has("INT");
+        const bool blText = !blInteger && (has("CHAR") || has("CLOB") || has("TEXT"));
+        if (strType.empty() || (!blInteger && !blText && has("BLOB"))) return;
+        const bool blReal = !blInteger && !blText && (has("REAL") || has("FLOA") || has("DOUB"));
         const bool blTextWord = kText == member.form || isJson(member.form);
-        if (!blReal && blTextWord == ('t' == cAffinity)) return;
+        if (!blReal && blTextWord == blText) return;
         refuseMember(member.strName, "column type ", quoted(strType), ": ",
                      blReal       ? kFraction
                      : blTextWord ? "text like 007 becomes a number; make the column text"
@@ -894,7 +886,7 @@ private:
         Json::Value jRow;
         for (const Json::Value& jStored : readBack(sent)) {
             const auto found = hasKey(*pjRecords) ? sent.find(keyTerm(jStored)) : sent.begin();
-            verify(sent.end() == found ? *pjRecords : *found->second, jStored, true);
+            verify(sent.end() == found ? *pjRecords : *found->second, jStored, false);
             jRow = jStored;
         }
         return jRow;
@@ -911,14 +903,13 @@ private:
         return jRows;
     }
 
-    // The database may fill what was left out of an inserted row.
-    void verify(const Json::Value& jSent, const Json::Value& jStored, bool blInserted) const
+    // Every member, or only those that were sent: the database, or a trigger, may set the others.
+    void verify(const Json::Value& jSent, const Json::Value& jStored, bool blEvery) const
     {
-        for (const auto& [strMember, member] : members_) {
-            const bool blMade = member.blColumnDefault || (blRowidKey_ && key_[0] == strMember);
-            if (blInserted && blMade && !jSent.isMember(strMember)) continue;
-            if (!same(jSent[strMember], jStored[strMember]))
-                fail(Cause::kChanged, "member ", quoted(strMember),
+        for (const auto& item : members_) {
+            if (!blEvery && !jSent.isMember(item.first)) continue;
+            if (!same(jSent[item.first], jStored[item.first]))
+                fail(Cause::kChanged, "member ", quoted(item.first),
                      ": the row holds another value than the one sent; a trigger may have changed "
                      "it");
         }
@@ -956,7 +947,7 @@ private:
         Json::Value jExpected = jFormer;
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) jExpected[it.name()] = *it;
         Json::Value jStored = readBack({{strTerm, nullptr}})[0];
-        verify(jExpected, jStored, false);
+        verify(jExpected, jStored, true);
         return jStored;
     }
 
@@ -966,10 +957,11 @@ private:
         if (jChecked.empty()) refuse("there are no values to set");
         Texts columns;
         for (const std::string& strColumn : identity_)
-            columns.push_back(jChecked.isMember(strColumn)
-                                  ? "quote(" +
-                                        literal(members_.at(strColumn), jChecked[strColumn]) + ")"
-                                  : "quote(" + strColumn + ")");
+            columns.push_back("quote(" +
+                              (jChecked.isMember(strColumn)
+                                   ? literal(members_.at(strColumn), jChecked[strColumn])
+                                   : strColumn) +
+                              ")");
         Transaction transaction(*this);
         lockForReading();
         // The rows as they will be identified.
@@ -988,20 +980,11 @@ private:
                 parts.push_back(identity_[v] + "=" + rowsToChange[u][v]);
             terms["(" + join(parts, " and ") + ")"] = nullptr;
             if (kBatch > terms.size() && u + 1 < rowsToChange.size()) continue;
-            verifyValues(readBack(terms), jChecked);
+            for (const Json::Value& jRow : readBack(terms)) verify(jChecked, jRow, false);
             terms.clear();
         }
         transaction.commit();
         return nRows;
-    }
-
-    void verifyValues(const Json::Value& jRows, const Json::Value& jValues) const
-    {
-        for (const Json::Value& jRow : jRows) {
-            Json::Value jExpected = jRow;
-            for (auto it = jValues.begin(); it != jValues.end(); ++it) jExpected[it.name()] = *it;
-            verify(jExpected, jRow, false);
-        }
     }
 
     long long removeWhere(const std::string& strWhere)
