@@ -119,10 +119,10 @@ public:
 
     /// Limits for requests of strangers. 0 means no limit. The defaults suit a small service.
     struct Limits {
-        std::size_t nRequestMembers = 1000;           ///< values in the arguments of a call
-        std::size_t nRequestBytes = 1024 * 1024;      ///< bytes of their names and texts
-        std::size_t nAnswerRows = 1000;               ///< records of a list, or of a page
-        std::size_t nAnswerBytes = 16 * 1024 * 1024;  ///< bytes of their values
+        std::size_t nRequestMembers = 1000;   ///< values in the arguments of a call
+        std::size_t nRequestBytes = 1048576;  ///< bytes of their names and texts
+        std::size_t nAnswerRows = 1000;       ///< records of a list, or of a page
+        std::size_t nAnswerBytes = 16777216;  ///< bytes of their values
         /// Steps of SQLite's virtual machine in a call. Counting them takes the connection's one
         /// progress handler during each call and leaves the connection without one. A call that
         /// runs out of them rolls back the host's transaction.
@@ -296,7 +296,7 @@ private:
     static constexpr int kMaxTerms = 300;       // of a condition
     static constexpr int kMaxNesting = 10;      // of "$and" and "$or"
     static constexpr std::size_t kBatch = 100;  // rows of a statement
-    static constexpr std::size_t kBatchBytes = 1024 * 1024;
+    static constexpr std::size_t kBatchBytes = 1048576;
     static constexpr long long kPage = 200;  // rows of a page of each()
     static constexpr int kPeriod = 1000;     // steps between two looks at their number
 
@@ -305,9 +305,9 @@ private:
     template <typename... Parts>
     [[noreturn]] static void fail(Cause cause, const Parts&... parts)
     {
-        Failure failure{cause, ""};
-        ((failure.strReason += parts), ...);
-        throw failure;
+        std::string strReason;
+        ((strReason += parts), ...);
+        throw Failure{cause, strReason};
     }
 
     template <typename... Parts>
@@ -446,26 +446,26 @@ private:
                  " steps");
         if (SQLITE_BUSY == (iCode & 0xff) || SQLITE_LOCKED == (iCode & 0xff))
             fail(Cause::kLocked, "locked: ", strError);
-        Failure failure{Cause::kFailed, strError};
-        if (SQLITE_CONSTRAINT_UNIQUE == iCode || SQLITE_CONSTRAINT_PRIMARYKEY == iCode ||
-            SQLITE_CONSTRAINT_ROWID == iCode)
-            readDuplicate(failure);
-        throw failure;
+        const bool blUnique = SQLITE_CONSTRAINT_UNIQUE == iCode ||
+                              SQLITE_CONSTRAINT_PRIMARYKEY == iCode ||
+                              SQLITE_CONSTRAINT_ROWID == iCode;
+        throw blUnique ? duplicateOf(strError) : Failure{Cause::kFailed, strError};
     }
 
     // UNIQUE constraint failed: item.name, item.lang
-    void readDuplicate(Failure& failure) const
+    Failure duplicateOf(const std::string& strError) const
     {
-        std::istringstream words(failure.strReason + ",");
+        Failure failure{Cause::kDuplicate, "duplicate: " + strError};
+        std::istringstream words(strError + ",");
         for (std::string strWord; words >> strWord;) {
             const std::size_t uDot = strWord.find('.');
             if (std::string::npos == uDot || '\'' == strWord[0]) continue;
             // A trigger may have written to another table.
-            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str())) return;
+            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str()))
+                return {Cause::kFailed, strError};
             failure.columns.push_back(strWord.substr(uDot + 1, strWord.size() - uDot - 2));
         }
-        failure.cause = Cause::kDuplicate;
-        failure.strReason = "duplicate: " + failure.strReason;
+        return failure;
     }
 
     // Runs one statement that gives no rows and returns the number of rows changed.
@@ -1228,9 +1228,10 @@ private:
         Json::Value jRecords(Json::arrayValue);
         std::size_t nBytes = 0;
         for (const std::string& strRange : wanted.ranges) {
-            const std::string strFilter = strWhere + " and " + strRange + ") order by " +
-                                          wanted.strOrder + " limit " + std::to_string(iLeft) +
-                                          " offset (" + std::to_string(wanted.iOffset);
+            std::string strFilter = strWhere;
+            strFilter.append(" and ").append(strRange).append(") order by ");
+            strFilter.append(wanted.strOrder).append(" limit ").append(std::to_string(iLeft));
+            strFilter.append(" offset (").append(std::to_string(wanted.iOffset));
             checkBytes(strFilter, nBytes);
             Json::Value jPart = rows(strFilter);
             if (0 < iLeft) iLeft -= jPart.size();
