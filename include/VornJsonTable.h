@@ -138,7 +138,8 @@ public:
     ///
     /// If the table cannot be handled exactly, cause() is kRefused after the construction, reason()
     /// names the member or column and what to use instead, and every operation returns -1 with that
-    /// reason. Refused are
+    /// reason. If SQLite fails, the cause is kFailed or kLocked: make another object to try again.
+    /// Refused are
     ///
     /// - type words other than "string", "int", "long long", "bool", "Json::objectValue",
     ///   "Json::arrayValue" and "Json::Value", and defaults of another kind than the type word;
