@@ -88,7 +88,6 @@
 #include <VornJsonDbApi.h>
 
 #include <algorithm>
-#include <cctype>
 #include <cerrno>
 #include <cmath>
 #include <cstdint>
@@ -248,9 +247,6 @@ private:
     struct Member {
         std::string strName;
         Form form;
-        bool blColumn = false;         // the table has the column
-        bool blNullable = true;        // which may hold NULL
-        bool blColumnDefault = false;  // and has a value of its own if the member is left out
     };
 
     // Thrown and caught inside.
@@ -274,16 +270,11 @@ private:
 
     using Texts = std::vector<std::string>;
 
-    static constexpr char kFraction[] =
-        "fractions are not kept exactly; use \"long long\" over an integer column for a number of "
-        "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
-    static constexpr char kLongLong[] = "not every number is written and read; use \"long long\"";
-    static constexpr char kFractions[] = "|float|double|";
-    static constexpr char kIntegers[] =
-        "|unsigned int|unsigned|long|unsigned long|unsigned long long|uid_t|time_t|";
-    static constexpr char kUnknown[] =
-        "unknown; use \"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", "
-        "\"Json::arrayValue\" or \"Json::Value\"";
+    static constexpr char kWords[] =
+        "\"string\", \"long long\" or \"int\" for integers, \"bool\", \"Json::objectValue\", "
+        "\"Json::arrayValue\" or \"Json::Value\"; a fraction is exact as an integer of its "
+        "smallest "
+        "unit, as text, or inside a JSON member";
     static constexpr FormRow kForms[] = {
         {"string", Json::stringValue, "a string"},
         {"int", Json::intValue, "an integer from -2147483648 to 2147483647"},
@@ -487,22 +478,20 @@ private:
         return {pStatement, sqlite3_finalize};
     }
 
-    // The rows of a statement of the table's own, NULL as an empty text.
-    std::vector<Texts> select(const std::string& strSql) const
+    // The cells of a statement of the table's own, row by row; NULL as an empty text.
+    Texts select(const std::string& strSql) const
     {
         const auto pStatement = prepare(strSql);
         if (nullptr == pStatement) failSql();
-        std::vector<Texts> rows;
+        Texts cells;
         int iStatus = sqlite3_step(pStatement.get());
-        for (; SQLITE_ROW == iStatus; iStatus = sqlite3_step(pStatement.get())) {
-            rows.emplace_back();
+        for (; SQLITE_ROW == iStatus; iStatus = sqlite3_step(pStatement.get()))
             for (int i = 0; i < sqlite3_column_count(pStatement.get()); ++i) {
                 const auto* szText = sqlite3_column_text(pStatement.get(), i);
-                rows.back().emplace_back(szText ? reinterpret_cast<const char*>(szText) : "");
+                cells.emplace_back(szText ? reinterpret_cast<const char*>(szText) : "");
             }
-        }
         if (SQLITE_DONE != iStatus) failSql();
-        return rows;
+        return cells;
     }
 
     // The records that the raw filter selects, as the library decodes them.
@@ -555,9 +544,8 @@ private:
         if (nullptr == pDb_) refuse("the connection is null");
         if (strCreate.empty()) refuse("the CREATE statement is empty");
         checkName("table ", strName_);
-        const Json::Value& jConst = jDefinition;
-        const bool blTable = jConst.isObject() && jConst[strName_].isObject();
-        const Json::Value jMembers = blTable ? jConst[strName_]["member"] : Json::Value();
+        const Json::Value jMembers =
+            Json::Path("." + strName_ + ".member").resolve(std::as_const(jDefinition));
         if (!jMembers.isObject() || jMembers.empty())
             refuse("the definition has no members for the table ", quoted(strName_));
         for (auto it = jMembers.begin(); it != jMembers.end(); ++it) declare(it.name(), *it);
@@ -568,9 +556,7 @@ private:
         Transaction transaction(*this, "begin");
         lockForReading();
         readColumns();
-        const std::string& strFirst = members_.begin()->first;
-        if (!prepare("insert into " + strName_ + " (" + strFirst + ") values (null)") ||
-            !prepare("update " + strName_ + " set " + strFirst + "=null"))
+        if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
             refuse("table ", quoted(strName_), ": ", sqlite3_errmsg(pDb_));
         checkTypes(jDefinition, jMembers);
         transaction.commit();
@@ -580,116 +566,86 @@ private:
     // "current_time" is the time even so.
     void checkName(const char* szWhat, const std::string& strName) const
     {
-        const std::string strDigits = "0123456789";
         const std::string strLetters = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_";
-        if (strName.empty() || std::string::npos != strDigits.find(strName[0]) ||
-            std::string::npos != strName.find_first_not_of(strLetters + strDigits))
-            refuse(szWhat, quoted(strName),
-                   ": expected a name of letters, digits and \"_\" that begins with no digit");
+        const bool blPlain =
+            std::string::npos != strLetters.find(strName[0]) &&
+            std::string::npos == strName.find_first_not_of(strLetters + "0123456789") &&
+            0 != sqlite3_stricmp(strName.c_str(), "_rowid_");
         const std::string strSql = "with " + strName + " as (select 7 as \"" + strName +
-                                   "\") select " + strName + "," + strName + " from " + strName +
+                                   "\") select " + strName + "||" + strName + " from " + strName +
                                    " where (" + strName + "=7) order by " + strName + " desc";
-        const bool blRowid = 0 == sqlite3_stricmp(strName.c_str(), "_rowid_");
-        if (blRowid || !prepare(strSql) || std::vector<Texts>{{"7", "7"}} != select(strSql))
-            refuse(szWhat, quoted(strName),
-                   ": SQLite does not take the name without quotes; use another one");
+        if (!blPlain || !prepare(strSql) || Texts{"77"} != select(strSql))
+            refuse(
+                szWhat, quoted(strName),
+                ": expected a name of letters, digits and \"_\" that SQLite takes without quotes");
     }
 
     void declare(const std::string& strMember, const Json::Value& jMember)
     {
         checkName("member ", strMember);
         const bool blWord = jMember.isObject() && jMember["cpptype"].isString();
-        if (!blWord) refuseMember(strMember, "no type word, expected one such as \"string\"");
-        const std::string strWord = jMember["cpptype"].asString();
+        const std::string strWord = blWord ? jMember["cpptype"].asString() : "";
         const auto found = std::find_if(std::begin(kForms), std::end(kForms),
                                         [&](const auto& row) { return row.szWord == strWord; });
-        const auto isIn = [&](const char* szWords) {
-            return nullptr != std::strstr(szWords, ("|" + strWord + "|").c_str());
-        };
         if (std::end(kForms) == found)
-            refuseMember(strMember, "type word ", quoted(strWord), ": ",
-                         isIn(kFractions)  ? kFraction
-                         : isIn(kIntegers) ? kLongLong
-                                           : kUnknown);
+            refuseMember(strMember, "type word ", quoted(strWord), ", expected ", kWords);
         const Member member{strMember, static_cast<Form>(found - std::begin(kForms))};
         const Json::Value& jDefault = jMember["cppDefaultValue"];
         if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
         members_.emplace(strMember, member);
+        names_.push_back(strMember);
     }
 
-    // The columns of the pragma: cid, name, type, notnull, dflt_value, pk, hidden.
     void readColumns()
     {
+        const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
+        key_ = select("select name " + strColumns + "pk order by pk");
+        // An integer primary key is the rowid itself and has no index.
+        const std::string strIndex = "from pragma_index_list('" + strName_ + "')";
+        blRowidKey_ =
+            !key_.empty() && select("select 1 " + strIndex + " where origin='pk'").empty();
         const bool blRowid = nullptr != prepare("select _rowid_ from " + strName_);
-        std::map<int, std::string> keys;
-        bool blInteger = false;
-        for (const Texts& row : select("pragma table_xinfo(" + strName_ + ")")) {
-            if ("1" == row[6]) continue;  // hidden in a virtual table
-            Member& member = memberOf(row[1]);
-            if ("0" != row[6]) refuseMember(row[1], "the column is generated");
-            member.blColumn = true;
-            checkAffinity(member, row[2]);
-            member.blNullable = "0" == row[3];
-            member.blColumnDefault = !row[4].empty();
-            if ("0" == row[5]) continue;
-            keys[std::stoi(row[5])] = row[1];
-            blInteger = 0 == sqlite3_stricmp(row[2].c_str(), "integer");
-        }
-        for (const auto& item : members_)
-            if (!item.second.blColumn) refuseMember(item.first, "the table has no such column");
-        for (const auto& key : keys) key_.push_back(key.second);
-        identity_ = blRowid ? Texts{"_rowid_"} : key_;
+        identity_ = blRowid && !blRowidKey_ ? Texts{"_rowid_"} : key_;
         if (identity_.empty()) refuse("table ", quoted(strName_), ": no key and no rowid");
-        blRowidKey_ = blRowid && blInteger && 1 == key_.size();
-        if (!blRowidKey_) return;
-        identity_ = key_;
-        Member& key = members_.at(key_[0]);
-        key.blNullable = false;
-        if (kLong != key.form)
-            refuseMember(key_[0], "an integer primary key holds 64 bits; use \"long long\"");
+        for (const auto& item : members_) {
+            const Texts column = select("select type, dflt_value is null, pk " + strColumns +
+                                        "name='" + item.first + "'");
+            if (column.empty()) refuseMember(item.first, "the table has no column of this name");
+            checkColumn(item.second, column[0]);
+            const bool blKey = "0" != column[2];
+            const bool blDefault = "0" == column[1];
+            const bool blMade = blKey ? blRowidKey_ || (blDefault && blRowid) : blDefault;
+            if (!blMade) jAbsent_[item.first];
+        }
+        const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
+                                    join(names_, "','") + "')");
+        if (!others.empty())
+            refuse("column ", quoted(others[0]), ": not in the definition; declare it");
     }
 
-    Member& memberOf(const std::string& strColumn)
+    // Another affinity changes a value or its order.
+    void checkColumn(const Member& member, const std::string& strType) const
     {
-        const auto found = members_.find(strColumn);
-        if (members_.end() != found) return found->second;
-        for (const auto& item : members_)
-            if (0 == sqlite3_stricmp(item.first.c_str(), strColumn.c_str()))
-                refuseMember(item.first, "the column is called ", quoted(strColumn),
-                             "; use that name");
-        refuse("column ", quoted(strColumn), ": not in the definition; declare it");
-    }
-
-    static void checkAffinity(const Member& member, const std::string& strType)
-    {
-        std::string strUpper = strType;
-        for (char& c : strUpper) c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-        const auto has = [&](const char* szPart) {
-            return std::string::npos != strUpper.find(szPart);
-        };
-        // SQLite's own rules, in their order.
-        const bool blInteger = has("INT");
-        const bool blText = !blInteger && (has("CHAR") || has("CLOB") || has("TEXT"));
-        if (strType.empty() || (!blInteger && !blText && has("BLOB"))) return;
-        const bool blReal = !blInteger && !blText && (has("REAL") || has("FLOA") || has("DOUB"));
-        const bool blTextWord = kText == member.form || isJson(member.form);
-        if (!blReal && blTextWord == blText) return;
-        refuseMember(member.strName, "column type ", quoted(strType), ": ",
-                     blReal       ? kFraction
-                     : blTextWord ? "text like 007 becomes a number; make the column text"
-                                  : "numbers compare as text; make the column integer");
+        const bool blText = kText == member.form || isJson(member.form);
+        const std::string strKind = select("select typeof(cast('7' as " + strType + "))")[0];
+        if (!strType.empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
+            refuseMember(member.strName, "column type ", quoted(strType), ", expected ",
+                         blText ? "a text column" : "an integer column");
+        if (blRowidKey_ && key_[0] == member.strName && kLong != member.form)
+            refuseMember(member.strName, "type word ", quoted(kForms[member.form].szWord),
+                         " over an integer primary key, expected \"long long\"");
     }
 
     // Member types are kept by table name for the life of the process.
-    void checkTypes(Json::Value& jDefinition, const Json::Value& jMembers) const
+    void checkTypes(Json::Value& jDefinition, const Json::Value& jMembers)
     {
-        std::string strName = strName_;
-        Json::Value jExpected;
-        for (const auto& item : members_)
+        Json::Value jTypes;
+        for (const std::string& strMember : names_)
             for (const char* szKey : {"cpptype", "cppDefaultValue"})
-                if (jMembers[item.first].isMember(szKey))
-                    jExpected[item.first][szKey] = jMembers[item.first][szKey];
-        if (!same(VORN_JSON_DB::recType(jDefinition, strName), jExpected))
+                if (jMembers[strMember].isMember(szKey))
+                    jTypes[strMember][szKey] = jMembers[strMember][szKey];
+        if (VORN_JSON_DB::recType(jDefinition, strName_).toStyledString() !=
+            jTypes.toStyledString())
             refuse("the process already holds the table ", quoted(strName_),
                    " with other types; use the same definition or another name");
     }
@@ -817,18 +773,13 @@ private:
         return jChecked;
     }
 
-    // With its defaults, and with its key unless SQLite makes that.
+    // With its defaults, and null for what nobody fills in.
     Json::Value filled(Json::Value jRecord)
     {
         pApi_->fillDefaultValue(jRecord, false);
-        for (const auto& [strMember, member] : members_) {
-            const bool blKey = key_.end() != std::find(key_.begin(), key_.end(), strMember);
-            const bool blMade = blKey ? blRowidKey_ || (member.blColumnDefault && identity_ != key_)
-                                      : member.blColumnDefault;
-            if (blMade && !jRecord.isMember(strMember)) continue;
-            if (blKey) checkKey(jRecord, strMember);
-            jRecord[strMember];  // null unless it is there
-        }
+        VORN_JSON_DB::jsonCopyMember(jRecord, jAbsent_, false);
+        for (const std::string& strKey : key_)
+            if (jRecord.isMember(strKey)) checkKey(jRecord, strKey);
         return jRecord;
     }
 
@@ -956,31 +907,28 @@ private:
     {
         const Json::Value jChecked = checked(jValues);
         if (jChecked.empty()) refuse("there are no values to set");
-        Texts columns;
+        // The rows as they will be identified: quote() gives the SQL of a value.
+        Texts parts;
         for (const std::string& strColumn : identity_)
-            columns.push_back("quote(" +
-                              (jChecked.isMember(strColumn)
-                                   ? literal(members_.at(strColumn), jChecked[strColumn])
-                                   : strColumn) +
-                              ")");
+            parts.push_back("'" + strColumn + "='||quote(" +
+                            (jChecked.isMember(strColumn)
+                                 ? literal(members_.at(strColumn), jChecked[strColumn])
+                                 : strColumn) +
+                            ")");
         Transaction transaction(*this);
         lockForReading();
-        // The rows as they will be identified.
-        const std::vector<Texts> rowsToChange =
-            select("select " + join(columns, ",") + " from " + strName_ + " where " + strWhere);
-        const auto nRows = static_cast<int>(rowsToChange.size());
+        const Texts changed = select("select " + join(parts, "||' and '||") + " from " + strName_ +
+                                     " where " + strWhere);
+        const auto nRows = static_cast<int>(changed.size());
         if (nRows !=
             run("update " + strName_ + " set " + values(jChecked, true) + " where " + strWhere))
             fail(Cause::kChanged,
                  "not every record was updated: a trigger or an \"on conflict\" "
                  "clause ignored some");
         std::map<std::string, const Json::Value*> terms;
-        for (std::size_t u = 0; u < rowsToChange.size(); ++u) {
-            Texts parts;
-            for (std::size_t v = 0; v < identity_.size(); ++v)
-                parts.push_back(identity_[v] + "=" + rowsToChange[u][v]);
-            terms["(" + join(parts, " and ") + ")"] = nullptr;
-            if (kBatch > terms.size() && u + 1 < rowsToChange.size()) continue;
+        for (const std::string& strTerm : changed) {
+            terms[strTerm] = nullptr;
+            if (kBatch > terms.size() && &strTerm != &changed.back()) continue;
             for (const Json::Value& jRow : readBack(terms)) verify(jChecked, jRow, false);
             terms.clear();
         }
@@ -1203,8 +1151,7 @@ private:
             const Json::Value& jValue = jChecked[member.strName];
             const std::string strRange = strEqual + member.strName;
             // In reverse: NULL comes first, and last in a descending order.
-            if (!jValue.isNull() && key.blDescending && member.blNullable)
-                ranges.push_back(strRange + " is null");
+            if (!jValue.isNull() && key.blDescending) ranges.push_back(strRange + " is null");
             if (!jValue.isNull())
                 ranges.push_back(strRange + (key.blDescending ? "<" : ">") +
                                  literal(member, jValue));
@@ -1258,7 +1205,7 @@ private:
         const auto sum =
             select("select cast(total(n) as integer) from (select " + join(lengths, "+") +
                    " as n from " + strName_ + " where (" + strFilter + "))");
-        nBytes += std::stoull(sum[0][0]);
+        nBytes += std::stoull(sum[0]);
         checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
     }
 
@@ -1266,6 +1213,8 @@ private:
     std::string strName_;
     std::unique_ptr<VornJsonDbApi> pApi_;
     std::map<std::string, Member> members_;
+    Texts names_;          // of the members
+    Json::Value jAbsent_;  // null for each member that neither SQLite nor its column fills in
     Texts key_;
     bool blRowidKey_ = false;  // the key is the integer primary key
     Texts identity_;           // columns that no two rows share and that are never NULL
@@ -1416,7 +1365,7 @@ inline long long VornJsonTable::count(const Json::Value& jCondition)
         lockForReading();
         const auto sum = select("select count(*) from " + strName_ + " where " + strWhere);
         transaction.commit();
-        return std::stoll(sum[0][0]);
+        return std::stoll(sum[0]);
     });
 }
 

@@ -10,13 +10,12 @@ struct Case {
     const char* szReason;  // "@" is the name of the table; "" if the table is taken
 };
 
-constexpr char kLongLong[] = ": not every number is written and read; use \"long long\"";
-constexpr char kFraction[] =
-    ": fractions are not kept exactly; use \"long long\" over an integer column for a number of "
-    "the smallest unit, \"string\" over a text column, or a member of a \"Json::objectValue\"";
-constexpr char kTextAsNumber[] = ": text like 007 becomes a number; make the column text";
-constexpr char kNumberAsText[] = ": numbers compare as text; make the column integer";
-constexpr char kKeyBits[] = "an integer primary key holds 64 bits; use \"long long\"";
+constexpr char kWords[] =
+    ", expected \"string\", \"long long\" or \"int\" for integers, \"bool\", "
+    "\"Json::objectValue\", \"Json::arrayValue\" or \"Json::Value\"; a fraction is exact as an "
+    "integer of its smallest unit, as text, or inside a JSON member";
+constexpr char kNeedsQuotes[] =
+    ": expected a name of letters, digits and \"_\" that SQLite takes without quotes";
 
 std::string word(const char* szWord)
 {
@@ -57,53 +56,47 @@ TEST_F(Construction, TakesTheTypeWordsThatAreExact)
 TEST_F(Construction, RefusesTypeWordsThatAreNotExact)
 {
     for (const char* szWord : {"unsigned int", "unsigned", "long", "unsigned long",
-                               "unsigned long long", "uid_t", "time_t"})
-        expectReason(std::string("member \"m\": type word \"") + szWord + "\"" + kLongLong,
-                     word(szWord), "m integer");
-    for (const char* szWord : {"float", "double"})
-        expectReason(std::string("member \"m\": type word \"") + szWord + "\"" + kFraction,
-                     word(szWord), "m real");
-    expectReason(
-        "member \"m\": type word \"text\": unknown; use \"string\", \"int\", "
-        "\"long long\", \"bool\", \"Json::objectValue\", \"Json::arrayValue\" or "
-        "\"Json::Value\"",
-        word("text"), "m text");
+                               "unsigned long long", "uid_t", "time_t", "float", "double", "text"})
+        for (const char* szColumn : {"m integer", "m real", "m text"})
+            expectReason(std::string("member \"m\": type word \"") + szWord + "\"" + kWords,
+                         word(szWord), szColumn);
     for (const char* szMember : {R"({"m": {}})", R"({"m": 1})", R"({"m": {"cpptype": 1}})"})
-        expectReason("member \"m\": no type word, expected one such as \"string\"", szMember, "m");
+        expectReason(std::string("member \"m\": type word \"\"") + kWords, szMember, "m");
 }
 
 TEST_F(Construction, RefusesColumnsThatChangeAValueOrItsOrder)
 {
-    for (const char* szType : {"INT", "INTEGER", "NUMERIC", "DATETIME", "decimal(5,2)", "charint"})
+    const auto expectType = [&](const char* szWord, const char* szType, const char* szExpected) {
+        expectReason(
+            std::string("member \"m\": column type \"") + szType + "\", expected " + szExpected,
+            word(szWord), std::string("m ") + szType);
+    };
+    for (const char* szType :
+         {"INT", "INTEGER", "NUMERIC", "DATETIME", "decimal(5,2)", "charint", "REAL", "FLOAT"})
         for (const char* szWord : {"string", "Json::objectValue", "Json::Value"})
-            expectReason(
-                std::string("member \"m\": column type \"") + szType + "\"" + kTextAsNumber,
-                word(szWord), std::string("m ") + szType);
-    for (const char* szType : {"TEXT", "varchar(5)"})
+            expectType(szWord, szType, "a text column");
+    for (const char* szType : {"TEXT", "varchar(5)", "REAL", "DOUBLE", "FLOAT"})
         for (const char* szWord : {"int", "long long", "bool"})
-            expectReason(
-                std::string("member \"m\": column type \"") + szType + "\"" + kNumberAsText,
-                word(szWord), std::string("m ") + szType);
-    for (const char* szType : {"REAL", "DOUBLE", "FLOAT"})
-        for (const char* szWord : {"int", "string", "Json::Value"})
-            expectReason(std::string("member \"m\": column type \"") + szType + "\"" + kFraction,
-                         word(szWord), std::string("m ") + szType);
+            expectType(szWord, szType, "an integer column");
     for (const char* szWord : {"int", "bool"})
-        expectReason(std::string("member \"m\": ") + kKeyBits, word(szWord),
-                     "m integer primary key");
+        expectReason(std::string("member \"m\": type word \"") + szWord +
+                         "\" over an integer primary key, expected \"long long\"",
+                     word(szWord), "m integer primary key");
+    // This one is not the rowid.
+    expectReason("", word("int"), "m integer primary key desc");
 }
 
 TEST_F(Construction, RefusesTablesThatDifferFromTheDefinition)
 {
     const Case cases[] = {
         {R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})", "a int",
-         "member \"b\": the table has no such column"},
+         "member \"b\": the table has no column of this name"},
         {R"({"a":{"cpptype":"int"}})", "a int, b int",
          "column \"b\": not in the definition; declare it"},
         {R"({"a":{"cpptype":"int"}})", "A int",
-         "member \"a\": the column is called \"A\"; use that name"},
+         "member \"a\": the table has no column of this name"},
         {R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})", "a int, b int as (a + 1)",
-         "member \"b\": the column is generated"},
+         "table \"@\": cannot UPDATE generated column \"b\""},
         {R"({})", "a int", "the definition has no members for the table \"@\""},
         {R"([])", "a int", "the definition has no members for the table \"@\""},
     };
@@ -128,15 +121,14 @@ TEST_F(Construction, RefusesDefaultsOfAnotherKind)
 
 TEST_F(Construction, RefusesNamesThatNeedQuotes)
 {
-    for (const char* szName : {"order", "group", "select", "current_time", "not", "null"}) {
+    for (const char* szName :
+         {"order", "group", "select", "current_time", "not", "null", "_rowid_"}) {
         const std::string strMember = std::string("{\"") + szName + R"(":{"cpptype":"string"}})";
-        expectReason(std::string("member \"") + szName +
-                         "\": SQLite does not take the name without quotes; use another one",
-                     strMember, std::string("\"") + szName + "\" text");
+        expectReason(std::string("member \"") + szName + "\"" + kNeedsQuotes, strMember,
+                     std::string("\"") + szName + "\" text");
     }
     for (const char* szName : {"a b", "1a", "", "a-b", "a.b", "a;", "\u00e4", "a'"})
-        expectReason(std::string("member ") + Json::valueToQuotedString(szName) +
-                         ": expected a name of letters, digits and \"_\" that begins with no digit",
+        expectReason("member " + Json::valueToQuotedString(szName) + kNeedsQuotes,
                      std::string("{\"") + szName + R"(":{"cpptype":"string"}})", "a text");
     for (const char* szName : {"key", "desc", "first", "plan", "query", "action", "_", "A9"})
         expectReason("", std::string("{\"") + szName + R"(":{"cpptype":"string"}})",
@@ -145,13 +137,9 @@ TEST_F(Construction, RefusesNamesThatNeedQuotes)
 
 TEST_F(Construction, RefusesNamesOfTables)
 {
-    const std::string strNeedsQuotes =
-        "table \"order\": SQLite does not take the name without quotes; use another one";
-    EXPECT_EQ(strNeedsQuotes, Front(database_, "order", word("int"), "m int").table->reason());
-    EXPECT_EQ(
-        "table \"a b\": expected a name of letters, digits and \"_\" that begins with no "
-        "digit",
-        Front(database_, "a b", word("int"), "m int").table->reason());
+    for (const char* szName : {"order", "a b"})
+        EXPECT_EQ(std::string("table \"") + szName + "\"" + kNeedsQuotes,
+                  Front(database_, szName, word("int"), "m int").table->reason());
 }
 
 TEST_F(Construction, RefusesTypesThatTheProcessHoldsDifferently)
