@@ -94,6 +94,7 @@
 #include <cstring>
 #include <functional>
 #include <iterator>
+#include <limits>
 #include <map>
 #include <memory>
 #include <new>
@@ -162,9 +163,6 @@ public:
     /// expressions.
     const std::vector<std::string>& columns() const { return columns_; }
 
-    /// After a failed createMany(): which record failed, counted from 0.
-    Json::ArrayIndex position() const { return uPosition_; }
-
     /// The members of the primary key, in its order; empty if there is none.
     const std::vector<std::string>& key() const { return key_; }
 
@@ -186,13 +184,14 @@ public:
     int create(const Json::Value& jRecord, Json::Value& jStored);
 
     /// Inserts every record of the array @p jRecords as create() does, all of them or none.
-    /// Records of the same members go into one statement. Returns their number, or -1.
+    /// Records of the same members go into one statement. The reason names the record that failed
+    /// by its position, counted from 0. Returns their number, or -1.
     long long createMany(const Json::Value& jRecords);
 
     /// Updates the row that has the key of @p jRecord, or inserts the record as create() does, and
     /// sets @p jStored to the row as it was read back. The record must contain the whole key.
-    /// Members left out keep their value. No other row is touched: a conflict with another
-    /// constraint is a duplicate. Returns 0 or -1.
+    /// Members left out keep their value, unless a trigger sets them. No other row is touched: a
+    /// conflict with another constraint is a duplicate. Returns 0 or -1.
     int save(const Json::Value& jRecord, Json::Value& jStored);
 
     /// Sets @p jRecords to the array of the records that the condition selects. Returns their
@@ -264,7 +263,7 @@ private:
     struct Query {
         std::string strOrder;
         std::vector<std::string> ranges = {"1"};  // what follows "after", part by part
-        long long iLimit = -1;
+        long long iLimit = 0;
         long long iOffset = 0;
     };
 
@@ -284,11 +283,10 @@ private:
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
         {"Json::Value", Json::nullValue, "a JSON value"}};
-    static constexpr int kMaxLevels = 1000;     // of JSON, as the library reads it
-    static constexpr int kMaxTerms = 300;       // of a condition
-    static constexpr int kMaxNesting = 10;      // of "$and" and "$or"
-    static constexpr std::size_t kBatch = 100;  // rows of a statement
-    static constexpr std::size_t kBatchBytes = 1048576;
+    static constexpr int kMaxLevels = 1000;  // of JSON, as the library reads it
+    static constexpr int kMaxTerms = 300;    // of a condition
+    static constexpr int kMaxNesting = 10;   // of "$and" and "$or"
+    static constexpr unsigned kBatch = 100;  // rows of a statement
     static constexpr long long kPage = 200;  // rows of a page of each()
     static constexpr int kPeriod = 1000;     // steps between two looks at their number
 
@@ -314,38 +312,30 @@ private:
         refuse("member ", quoted(strMember), ": ", parts...);
     }
 
-    // A transaction of the call, or a savepoint in the host's; undone unless it is committed.
-    class Transaction {
-    public:
-        explicit Transaction(VornJsonTable& table, const char* szBegin = "begin immediate")
-            : table_(table), blHosts_(0 == sqlite3_get_autocommit(table.pDb_))
-        {
-            table_.run(blHosts_ ? "savepoint vorn_json_table" : szBegin);
-            blOpen_ = true;
+    // Runs the work in a transaction, or in a savepoint of the host's, and undoes it if it throws.
+    template <typename Work>
+    auto transact(const char* szBegin, Work work)
+    {
+        const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
+        run(blHosts ? "savepoint vorn_json_table" : szBegin);
+        try {
+            auto result = work();
+            run(blHosts ? "release vorn_json_table" : "commit");
+            return result;
+        } catch (...) {
+            undo(blHosts ? "rollback to vorn_json_table; release vorn_json_table" : "rollback");
+            throw;
         }
-        // Twice, because the first attempt may lack memory. SQLite may have rolled back by itself.
-        ~Transaction()
-        {
-            const char* szUndo =
-                blHosts_ ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
-            const long long nStepsLeft = std::exchange(table_.nStepsLeft_, 0);
-            for (int i = 0; i < 2 && blOpen_ && 0 == sqlite3_get_autocommit(table_.pDb_); ++i)
-                blOpen_ = SQLITE_OK != sqlite3_exec(table_.pDb_, szUndo, nullptr, nullptr, nullptr);
-            table_.nStepsLeft_ = nStepsLeft;
-        }
-        Transaction(const Transaction&) = delete;
-        Transaction& operator=(const Transaction&) = delete;
-        void commit()
-        {
-            table_.run(blHosts_ ? "release vorn_json_table" : "commit");
-            blOpen_ = false;
-        }
+    }
 
-    private:
-        VornJsonTable& table_;
-        const bool blHosts_;
-        bool blOpen_ = false;
-    };
+    // Twice, because the first attempt may lack memory. SQLite may have rolled back by itself.
+    void undo(const char* szUndo)
+    {
+        const long long nStepsLeft = std::exchange(nStepsLeft_, 0);
+        for (int i = 0; i < 2 && 0 == sqlite3_get_autocommit(pDb_); ++i)
+            if (SQLITE_OK == sqlite3_exec(pDb_, szUndo, nullptr, nullptr, nullptr)) break;
+        nStepsLeft_ = nStepsLeft;
+    }
 
     // Stops a statement that is out of steps. With EAGAIN in errno, the library would try it again.
     static int countSteps(void* pTable)
@@ -382,6 +372,7 @@ private:
             iResult = work();
         } catch (const Failure& failure) {
             end = failure;
+            end.strReason.insert(0, std::exchange(strRecord_, ""));
         } catch (const std::bad_alloc&) {
             throw;
         } catch (const std::exception& error) {
@@ -494,39 +485,29 @@ private:
         return cells;
     }
 
-    // The records that the raw filter selects, as the library decodes them.
-    Json::Value rows(const std::string& strFilter)
+    // Appends the records that the raw filter selects, as the library decodes them.
+    void addRows(const std::string& strFilter, Json::Value& jRows)
     {
         Json::Value jRequest;
         jRequest["vornSqlWhereFilter"] = strFilter;
-        Json::Value jRows(Json::arrayValue);
         if (0 > pApi_->recList(jRequest, jRows)) failSql();
-        return jRows;
     }
 
     // The SQL of a value that fits.
-    std::string literal(const Member& member, const Json::Value& jValue)
+    std::string literal(const std::string& strMember, const Json::Value& jValue)
     {
-        if (jValue.isNull()) return "null";
-        if (kBool == member.form) return jValue.asBool() ? "1" : "0";
-        if (kInt == member.form || kLong == member.form) return std::to_string(jValue.asInt64());
-        if (kText == member.form) {
-            const std::unique_ptr<char, void (*)(void*)> szQuoted(
-                sqlite3_mprintf("%Q", jValue.asCString()), sqlite3_free);
-            if (nullptr == szQuoted) throw std::bad_alloc();
-            return szQuoted.get();
-        }
-        // The library's own text of JSON, after "name=".
-        std::string strField = member.strName;
+        return jValue.isNull() ? "null" : equals(strMember, jValue).substr(strMember.size() + 1);
+    }
+
+    // name='O''Brien', id=5, note is null
+    std::string equals(const std::string& strMember, const Json::Value& jValue)
+    {
+        if (jValue.isNull()) return strMember + " is null";
+        std::string strField = strMember;
         std::string strTerm;
         if (0 > pApi_->SqlMakeByMatchField(strField, const_cast<Json::Value&>(jValue), strTerm))
             throw std::bad_alloc();
-        return strTerm.substr(strField.size() + 1);
-    }
-
-    std::string equals(const Member& member, const Json::Value& jValue)
-    {
-        return member.strName + (jValue.isNull() ? " is null" : "=" + literal(member, jValue));
+        return strTerm;
     }
 
     static std::string join(const Texts& texts, const char* szBetween)
@@ -553,13 +534,14 @@ private:
         pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strCreate);
         // The constructor cannot say whether the statement failed.
         if (0 > pApi_->tableCreate()) failSql();
-        Transaction transaction(*this, "begin");
-        lockForReading();
-        readColumns();
-        if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
-            refuse("table ", quoted(strName_), ": ", sqlite3_errmsg(pDb_));
-        checkTypes(jDefinition, jMembers);
-        transaction.commit();
+        transact("begin", [&] {
+            lockForReading();
+            readColumns();
+            if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
+                refuse("table ", quoted(strName_), ": ", sqlite3_errmsg(pDb_));
+            checkTypes(jDefinition, jMembers);
+            return 0;
+        });
     }
 
     // Names are written without quotes. SQLite takes some of its words as names, but
@@ -737,26 +719,6 @@ private:
         return true;
     }
 
-    // Numbers by value and kind; it does not matter whether an integer is held as unsigned.
-    static bool same(const Json::Value& jLeft, const Json::Value& jRight)
-    {
-        if (isInteger(jLeft) && isInteger(jRight) && jLeft.type() != jRight.type())
-            return jLeft.isInt64() && jRight.isInt64() && jLeft.asInt64() == jRight.asInt64();
-        if (jLeft.type() != jRight.type() || jLeft.size() != jRight.size()) return false;
-        if (Json::realValue == jLeft.type() &&
-            std::signbit(jLeft.asDouble()) != std::signbit(jRight.asDouble()))
-            return false;
-        if (jLeft.isArray()) {
-            for (Json::ArrayIndex u = 0; u < jLeft.size(); ++u)
-                if (!same(jLeft[u], jRight[u])) return false;
-            return true;
-        }
-        if (!jLeft.isObject()) return jLeft == jRight;
-        for (auto it = jLeft.begin(); it != jLeft.end(); ++it)
-            if (!jRight.isMember(it.name()) || !same(*it, jRight[it.name()])) return false;
-        return true;
-    }
-
     // ---- Writing
 
     // The record without what SQLite makes; everything in it fits.
@@ -790,94 +752,110 @@ private:
                          ": it is part of the key");
     }
 
-    bool hasKey(const Json::Value& jRecord) const
+    void checkKeys(const Json::Value& jRecord) const
     {
-        return !key_.empty() && std::all_of(key_.begin(), key_.end(), [&](const auto& strKey) {
-            return jRecord.isMember(strKey);
-        });
+        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
+        for (const std::string& strKey : key_) checkKey(jRecord, strKey);
     }
 
-    // (code='x' and lang='en')
+    bool hasKey(const Json::Value& jRecord) const
+    {
+        const auto isThere = [&](const auto& strKey) { return jRecord.isMember(strKey); };
+        return !key_.empty() && std::all_of(key_.begin(), key_.end(), isThere);
+    }
+
+    // code='x' and lang='en'
     std::string keyTerm(const Json::Value& jRecord)
     {
         Texts parts;
-        for (const std::string& strKey : key_)
-            parts.push_back(equals(members_.at(strKey), jRecord[strKey]));
-        return "(" + join(parts, " and ") + ")";
+        for (const std::string& strKey : key_) parts.push_back(equals(strKey, jRecord[strKey]));
+        return join(parts, " and ");
     }
 
-    // ('x','en'), or code='x',lang='en'
-    std::string values(const Json::Value& jValues, bool blNames)
+    // insert into item (id,name) values (1,'x'),(2,'y')
+    // The records have the same members, and their keys if they are several. Returns the last row.
+    Json::Value insert(const std::vector<Json::Value>& records)
     {
-        Texts parts;
-        for (auto it = jValues.begin(); it != jValues.end(); ++it)
-            parts.push_back((blNames ? it.name() + "=" : "") +
-                            literal(members_.at(it.name()), *it));
-        return blNames ? join(parts, ",") : "(" + join(parts, ",") + ")";
-    }
-
-    // insert into item (id,name) values (1,'x'),(2,'y'). The records have the same members, and
-    // their keys if they are several. Returns the row of the last.
-    Json::Value insert(const Json::Value* pjRecords, std::size_t nRecords)
-    {
-        std::string strSql = "insert into " + strName_;
-        std::map<std::string, const Json::Value*> sent;
-        for (std::size_t u = 0; u < nRecords; ++u) {
-            const std::string strNames = join(pjRecords[u].getMemberNames(), ",");
-            strSql += 0 < u ? "," : strNames.empty() ? "" : " (" + strNames + ") values ";
-            strSql += strNames.empty() ? " default values" : values(pjRecords[u], false);
-            if (hasKey(pjRecords[u])) sent[keyTerm(pjRecords[u])] = pjRecords + u;
+        const Texts names = records[0].getMemberNames();
+        Texts lists;
+        for (const Json::Value& jRecord : records) {
+            Texts values;
+            for (const std::string& strName : names)
+                values.push_back(literal(strName, jRecord[strName]));
+            lists.push_back("(" + join(values, ",") + ")");
         }
-        if (static_cast<int>(nRecords) != run(strSql))
+        const std::string strValues = " (" + join(names, ",") + ") values " + join(lists, ",");
+        const int nInserted =
+            run("insert into " + strName_ + (names.empty() ? " default values" : strValues));
+        if (static_cast<int>(records.size()) != nInserted)
             fail(Cause::kChanged,
                  "nothing was inserted: a trigger or an \"on conflict\" clause "
                  "ignored the record");
-        // One row was inserted, so the rowid is its own.
-        if (sent.empty())
-            sent[identity_[0] + "=" + std::to_string(sqlite3_last_insert_rowid(pDb_))] = pjRecords;
-        Json::Value jRow;
-        for (const Json::Value& jStored : readBack(sent)) {
-            const auto found = hasKey(*pjRecords) ? sent.find(keyTerm(jStored)) : sent.begin();
-            verify(sent.end() == found ? *pjRecords : *found->second, jStored, false);
-            jRow = jStored;
-        }
-        return jRow;
+        return compareInserted(records);
     }
 
-    Json::Value readBack(const std::map<std::string, const Json::Value*>& sent)
+    Json::Value compareInserted(const std::vector<Json::Value>& records)
     {
-        Texts terms;
-        for (const auto& record : sent) terms.push_back(record.first);
-        Json::Value jRows = rows(join(terms, " or "));
+        const bool blKey = hasKey(records[0]);
+        // One row was inserted, so the rowid is its own.
+        Texts terms(1, "_rowid_=" + std::to_string(sqlite3_last_insert_rowid(pDb_)));
+        if (blKey) terms.clear();
+        for (std::size_t u = 0; blKey && u < records.size(); ++u)
+            terms.push_back(keyTerm(records[u]));
+        std::map<std::string, Json::Value> rows;
+        for (Json::Value& jRow : readBack(terms)) rows[blKey ? keyTerm(jRow) : terms[0]].swap(jRow);
+        for (std::size_t u = 0; u < records.size(); ++u) compare(records[u], rows[terms[u]]);
+        return rows[terms.back()];
+    }
+
+    Json::Value readBack(const Texts& terms)
+    {
+        Json::Value jRows;
+        addRows(join(terms, " or "), jRows);
         if (jRows.size() != terms.size())
             fail(Cause::kChanged,
                  "the row is not there after it was written: a trigger moved or deleted it");
         return jRows;
     }
 
-    // Every member, or only those that were sent: the database, or a trigger, may set the others.
-    void verify(const Json::Value& jSent, const Json::Value& jStored, bool blEvery) const
+    // The members that were sent; the database, or a trigger, may set the others. SQL tells numbers
+    // by value and kind.
+    void compare(const Json::Value& jSent, const Json::Value& jStored)
     {
-        for (const auto& item : members_) {
-            if (!blEvery && !jSent.isMember(item.first)) continue;
-            if (!same(jSent[item.first], jStored[item.first]))
-                fail(Cause::kChanged, "member ", quoted(item.first),
+        for (const std::string& strName : jSent.getMemberNames())
+            if (literal(strName, jSent[strName]) != literal(strName, jStored[strName]))
+                fail(Cause::kChanged, "member ", quoted(strName),
                      ": the row holds another value than the one sent; a trigger may have changed "
                      "it");
-        }
     }
 
-    // The records in one statement if they have the same members and it works; false: nothing was
-    // written.
+    // Inserts up to kBatch records, in one statement if that works.
+    void insertSome(const Json::Value& jRecords, Json::ArrayIndex uFirst)
+    {
+        const Json::ArrayIndex uEnd = std::min(jRecords.size(), uFirst + kBatch);
+        std::vector<Json::Value> batch;
+        for (Json::ArrayIndex u = uFirst; u < uEnd; ++u) {
+            strRecord_ = "record " + std::to_string(u) + ": ";
+            batch.push_back(filled(checked(jRecords[u])));
+        }
+        strRecord_.clear();
+        if (insertTogether(batch)) return;
+        for (Json::ArrayIndex u = uFirst; u < uEnd; ++u) {
+            strRecord_ = "record " + std::to_string(u) + ": ";
+            insert({batch[u - uFirst]});
+        }
+        strRecord_.clear();
+    }
+
+    // False: nothing was written.
     bool insertTogether(const std::vector<Json::Value>& records)
     {
         const Texts names = records[0].getMemberNames();
         for (const Json::Value& jRecord : records)
-            if (!hasKey(jRecord) || names != jRecord.getMemberNames()) return false;
+            if (2 > records.size() || !hasKey(jRecord) || names != jRecord.getMemberNames())
+                return false;
         try {
-            Transaction transaction(*this);
-            insert(records.data(), records.size());
-            transaction.commit();
+            transact("", [&] { return insert(records); });
             return true;
         } catch (const Failure& failure) {
             if (Cause::kLocked == failure.cause || Cause::kLimit == failure.cause) throw;
@@ -885,63 +863,48 @@ private:
         }
     }
 
-    // update item set name='x' where (id=1)
-    Json::Value change(const Json::Value& jRecord, const Json::Value& jFormer)
+    // update item set id=1,name='x' where id=1
+    // Returns the number of rows, after comparing them.
+    int change(const std::string& strWhere, const Json::Value& jValues)
     {
-        Json::Value jValues = jRecord;
-        // A key that is equal under the column's collation may still differ.
-        for (const std::string& strKey : key_)
-            if (same(jRecord[strKey], jFormer[strKey])) jValues.removeMember(strKey);
-        if (jValues.empty()) return jFormer;
-        const std::string strTerm = keyTerm(jRecord);
-        if (1 != run("update " + strName_ + " set " + values(jValues, true) + " where " + strTerm))
-            fail(Cause::kChanged, "nothing was updated: a trigger ignored the record");
-        Json::Value jExpected = jFormer;
-        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) jExpected[it.name()] = *it;
-        Json::Value jStored = readBack({{strTerm, nullptr}})[0];
-        verify(jExpected, jStored, true);
-        return jStored;
+        lockForReading();
+        // A term for each row as it will be identified: quote() gives the SQL of a value.
+        Texts columns;
+        for (const std::string& strColumn : identity_) {
+            const bool blSet = jValues.isMember(strColumn);
+            columns.push_back("'" + strColumn + "='||quote(" +
+                              (blSet ? literal(strColumn, jValues[strColumn]) : strColumn) + ")");
+        }
+        const Texts terms = select("select " + join(columns, "||' and '||") + " from " + strName_ +
+                                   " where " + strWhere);
+        Texts values;
+        for (const std::string& strName : jValues.getMemberNames())
+            values.push_back(strName + "=" + literal(strName, jValues[strName]));
+        const int nChanged =
+            run("update " + strName_ + " set " + join(values, ",") + " where " + strWhere);
+        if (static_cast<int>(terms.size()) != nChanged)
+            fail(Cause::kChanged,
+                 "not every record was updated: a trigger or an \"on conflict\" "
+                 "clause ignored some");
+        for (auto it = terms.begin(); it != terms.end();) {
+            const auto end = it + std::min<std::ptrdiff_t>(kBatch, terms.end() - it);
+            for (const Json::Value& jRow : readBack(Texts(it, end))) compare(jValues, jRow);
+            it = end;
+        }
+        return nChanged;
     }
 
     long long updateWhere(const std::string& strWhere, const Json::Value& jValues)
     {
         const Json::Value jChecked = checked(jValues);
         if (jChecked.empty()) refuse("there are no values to set");
-        // The rows as they will be identified: quote() gives the SQL of a value.
-        Texts parts;
-        for (const std::string& strColumn : identity_)
-            parts.push_back("'" + strColumn + "='||quote(" +
-                            (jChecked.isMember(strColumn)
-                                 ? literal(members_.at(strColumn), jChecked[strColumn])
-                                 : strColumn) +
-                            ")");
-        Transaction transaction(*this);
-        lockForReading();
-        const Texts changed = select("select " + join(parts, "||' and '||") + " from " + strName_ +
-                                     " where " + strWhere);
-        const auto nRows = static_cast<int>(changed.size());
-        if (nRows !=
-            run("update " + strName_ + " set " + values(jChecked, true) + " where " + strWhere))
-            fail(Cause::kChanged,
-                 "not every record was updated: a trigger or an \"on conflict\" "
-                 "clause ignored some");
-        std::map<std::string, const Json::Value*> terms;
-        for (const std::string& strTerm : changed) {
-            terms[strTerm] = nullptr;
-            if (kBatch > terms.size() && &strTerm != &changed.back()) continue;
-            for (const Json::Value& jRow : readBack(terms)) verify(jChecked, jRow, false);
-            terms.clear();
-        }
-        transaction.commit();
-        return nRows;
+        return transact("begin immediate", [&] { return change(strWhere, jChecked); });
     }
 
     long long removeWhere(const std::string& strWhere)
     {
-        Transaction transaction(*this);
-        const int iRemoved = run("delete from " + strName_ + " where " + strWhere);
-        transaction.commit();
-        return iRemoved;
+        const std::string strSql = "delete from " + strName_ + " where " + strWhere;
+        return transact("begin immediate", [&] { return run(strSql); });
     }
 
     // ---- Conditions
@@ -1016,9 +979,10 @@ private:
         const bool blLike = "$like" == strOperator;
         if (blEqual || "$ne" == strOperator) {
             if (!jValue.isNull()) checkFits(member, jValue, nullptr);
-            if (blEqual) return equals(member, jValue);
-            return member.strName +
-                   (jValue.isNull() ? " is not null" : " is not " + literal(member, jValue));
+            if (blEqual) return equals(member.strName, jValue);
+            return member.strName + (jValue.isNull()
+                                         ? " is not null"
+                                         : " is not " + literal(member.strName, jValue));
         }
         static const std::map<std::string, const char*> orders = {
             {"$gt", ">"}, {"$gte", ">="}, {"$lt", "<"}, {"$lte", "<="}, {"$like", " like "}};
@@ -1033,7 +997,7 @@ private:
                          blLike ? "" : ", \"int\" or \"long long\"");
         checkFits(member, jValue, nullptr);
         if (blLike) checkPattern(member, jValue.asString());
-        return member.strName + found->second + literal(member, jValue) +
+        return member.strName + found->second + literal(member.strName, jValue) +
                (blLike ? " escape '\\'" : "");
     }
 
@@ -1061,7 +1025,7 @@ private:
         for (const Json::Value& jValue : jList) {
             if (jValue.isNull()) continue;
             checkFits(member, jValue, nullptr);
-            items.push_back(literal(member, jValue));
+            items.push_back(literal(member.strName, jValue));
         }
         const bool blNull = items.size() < jList.size();
         const std::string& strName = member.strName;
@@ -1127,7 +1091,7 @@ private:
             order.push_back((nullptr == key.pMember ? identity_[0] : key.pMember->strName) +
                             (key.blDescending ? " desc" : ""));
         query.strOrder = join(order, ",");
-        query.iLimit = number(jOptions, "limit", -1);
+        query.iLimit = number(jOptions, "limit", std::numeric_limits<long long>::max());
         query.iOffset = number(jOptions, "offset", 0);
         if (jOptions.isMember("after")) query.ranges = rangesAfter(keys, jOptions["after"]);
         // Rows are skipped in all parts together, so they become one.
@@ -1140,9 +1104,7 @@ private:
     Texts rangesAfter(const std::vector<SortKey>& keys, const Json::Value& jLast)
     {
         if (!jLast.isObject()) refuse("option \"after\": ", kindOf(jLast), ", expected a record");
-        if (key_.empty())
-            refuse("option \"after\": the table ", quoted(strName_), " has no primary key");
-        for (const std::string& strKey : key_) checkKey(jLast, strKey);
+        checkKeys(jLast);
         const Json::Value jChecked = checked(jLast);
         std::string strEqual;
         Texts ranges;
@@ -1154,10 +1116,10 @@ private:
             if (!jValue.isNull() && key.blDescending) ranges.push_back(strRange + " is null");
             if (!jValue.isNull())
                 ranges.push_back(strRange + (key.blDescending ? "<" : ">") +
-                                 literal(member, jValue));
+                                 literal(member.strName, jValue));
             else if (!key.blDescending)
                 ranges.push_back(strRange + " is not null");
-            strEqual += equals(member, jValue) + " and ";
+            strEqual += equals(member.strName, jValue) + " and ";
         }
         std::reverse(ranges.begin(), ranges.end());
         return ranges;
@@ -1169,30 +1131,24 @@ private:
         const Query wanted = query(jOptions);
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
-        const bool blMost = 0 < nMost && (0 > wanted.iLimit || nMost < wanted.iLimit);
-        long long iLeft = blMost ? nMost + 1 : wanted.iLimit;
-        Transaction transaction(*this, "begin");
-        lockForReading();
-        Json::Value jRecords(Json::arrayValue);
-        std::size_t nBytes = 0;
-        for (const std::string& strRange : wanted.ranges) {
-            std::string strFilter = strWhere;
-            strFilter.append(" and ").append(strRange).append(") order by ");
-            strFilter.append(wanted.strOrder).append(" limit ").append(std::to_string(iLeft));
-            strFilter.append(" offset (").append(std::to_string(wanted.iOffset));
-            checkBytes(strFilter, nBytes);
-            Json::Value jPart = rows(strFilter);
-            if (0 < iLeft) iLeft -= jPart.size();
-            if (jRecords.empty())
-                jRecords.swap(jPart);
-            else
-                for (Json::Value& jRecord : jPart) jRecords.append(std::move(jRecord));
-            if (0 == iLeft) break;
-        }
-        transaction.commit();
-        checkLimit("answer", limits_.nAnswerRows, jRecords.size(),
-                   " records; use the option \"limit\"");
-        return jRecords;
+        const bool blMost = 0 < nMost && nMost < wanted.iLimit;
+        const long long iLimit = blMost ? nMost + 1 : wanted.iLimit;
+        return transact("begin", [&] {
+            lockForReading();
+            Json::Value jRecords(Json::arrayValue);
+            std::size_t nBytes = 0;
+            for (const std::string& strRange : wanted.ranges) {
+                std::string strFilter = strWhere + " and " + strRange + ") order by ";
+                strFilter += wanted.strOrder + " limit " + std::to_string(iLimit - jRecords.size());
+                strFilter += " offset (" + std::to_string(wanted.iOffset);
+                checkBytes(strFilter, nBytes);
+                addRows(strFilter, jRecords);
+                if (iLimit == jRecords.size()) break;
+            }
+            checkLimit("answer", limits_.nAnswerRows, jRecords.size(),
+                       " records; use the option \"limit\"");
+            return jRecords;
+        });
     }
 
     // Before the rows take memory.
@@ -1223,7 +1179,7 @@ private:
     Cause cause_ = Cause::kNone;
     std::string strReason_;
     Texts columns_;
-    Json::ArrayIndex uPosition_ = 0;
+    std::string strRecord_;  // which one of several is at work, for the reason
     long long nStepsLeft_ = 0;
     bool blStepsSpent_ = false;
 };
@@ -1243,10 +1199,7 @@ inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStore
 {
     return static_cast<int>(call({&jRecord}, [&] {
         const Json::Value jFilled = filled(checked(jRecord));
-        Transaction transaction(*this);
-        Json::Value jRow = insert(&jFilled, 1);
-        transaction.commit();
-        jStored.swap(jRow);
+        jStored = transact("begin immediate", [&] { return insert({jFilled}); });
         return 0;
     }));
 }
@@ -1254,28 +1207,12 @@ inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStore
 inline long long VornJsonTable::createMany(const Json::Value& jRecords)
 {
     return call({&jRecords}, [&] {
-        uPosition_ = 0;
         if (!jRecords.isArray())
             refuse("the records are ", kindOf(jRecords), ", expected an array");
-        Transaction transaction(*this);
-        std::vector<Json::Value> batch;
-        std::size_t nMembers = 0;
-        std::size_t nBytes = 0;
-        for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
-            uPosition_ = u;
-            batch.push_back(filled(checked(jRecords[u])));
-            measure(batch.back(), nMembers, nBytes, 1);
-            const bool blFull = kBatch == batch.size() || kBatchBytes < nBytes;
-            if (!blFull && u + 1 < jRecords.size()) continue;
-            uPosition_ = u + 1 - static_cast<Json::ArrayIndex>(batch.size());
-            const bool blTogether = 1 < batch.size() && insertTogether(batch);
-            for (auto it = batch.begin(); !blTogether && it != batch.end(); ++it, ++uPosition_)
-                insert(&*it, 1);
-            batch.clear();
-            nBytes = 0;
-        }
-        transaction.commit();
-        return jRecords.size();
+        return transact("begin immediate", [&] {
+            for (Json::ArrayIndex u = 0; u < jRecords.size(); u += kBatch) insertSome(jRecords, u);
+            return jRecords.size();
+        });
     });
 }
 
@@ -1283,19 +1220,12 @@ inline int VornJsonTable::save(const Json::Value& jRecord, Json::Value& jStored)
 {
     return static_cast<int>(call({&jRecord}, [&] {
         const Json::Value jChecked = checked(jRecord);
-        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key to save by");
-        for (const std::string& strKey : key_) checkKey(jChecked, strKey);
-        Transaction transaction(*this);
-        const Json::Value jRows = rows(keyTerm(jChecked));
-        Json::Value jRow;
-        if (jRows.empty()) {
-            const Json::Value jFilled = filled(jChecked);
-            jRow = insert(&jFilled, 1);
-        } else {
-            jRow = change(jChecked, jRows[0]);
-        }
-        transaction.commit();
-        jStored.swap(jRow);
+        checkKeys(jChecked);
+        const std::string strKey = keyTerm(jChecked);
+        jStored = transact("begin immediate", [&] {
+            const bool blThere = 0 < change(strKey, jChecked);
+            return blThere ? readBack({strKey})[0] : insert({filled(jChecked)});
+        });
         return 0;
     }));
 }
@@ -1315,20 +1245,19 @@ inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::
 {
     std::string strWhere;
     Json::Value jNext;
-    long long iLeft = -1;
+    long long iLeft = 0;
     long long nRecords = call({&jCondition, &jOptions}, [&] {
         strWhere = condition(jCondition);
         iLeft = query(jOptions).iLimit;
-        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key, so no pages");
+        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
         jNext = jOptions;
         return 0;
     });
-    for (bool blMore = 0 <= nRecords && 0 != iLeft; blMore;) {
-        const long long iPage = 0 > iLeft ? kPage : std::min(iLeft, kPage);
+    for (bool blMore = 0 == nRecords; blMore; iLeft -= kPage) {
         Json::Value jPage;
         // One call each, since the callback may make calls of its own.
         if (0 > call({}, [&] {
-                jNext["limit"] = Json::Int64(iPage);
+                jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
                 jPage = page(strWhere, jNext);
                 return 0;
             }))
@@ -1338,8 +1267,7 @@ inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::
             const long long iMore = call({}, [&] { return callback(jRecord) ? 1 : 0; });
             if (1 != iMore) return 0 > iMore ? iMore : nRecords;
         }
-        iLeft -= 0 < iLeft ? iPage : 0;
-        blMore = 0 != iLeft && iPage == static_cast<long long>(jPage.size());
+        blMore = kPage == static_cast<long long>(jPage.size());
         if (blMore) jNext["after"] = jPage[jPage.size() - 1];
         jNext.removeMember("offset");
     }
@@ -1361,11 +1289,10 @@ inline long long VornJsonTable::count(const Json::Value& jCondition)
 {
     return call({&jCondition}, [&] {
         const std::string strWhere = condition(jCondition);
-        Transaction transaction(*this, "begin");
-        lockForReading();
-        const auto sum = select("select count(*) from " + strName_ + " where " + strWhere);
-        transaction.commit();
-        return std::stoll(sum[0]);
+        return transact("begin", [&] {
+            lockForReading();
+            return std::stoll(select("select count(*) from " + strName_ + " where " + strWhere)[0]);
+        });
     });
 }
 
