@@ -58,11 +58,11 @@
 /// - `{"qty": 5}` and `{"qty": {"$eq": 5}}`: equals; null means that the member is absent;
 /// - `$ne`: differs; a record without the member differs from every value;
 /// - `$gt`, `$gte`, `$lt`, `$lte`: order of "string", "int" and "long long" members;
-/// - `$in`, `$nin`: one of the values of an array, or none of them;
+/// - `$in`: one of the values of an array;
 /// - `$like`: a pattern for a "string" member, with `%`, `_` and a backslash as escape;
-/// - `$and`, `$or`: an array of conditions.
+/// - `$or`: an array of conditions, one of which must hold.
 ///
-/// JSON members know `$eq`, `$ne`, `$in`, `$nin` and null, and compare their stored text. For such
+/// JSON members know `$eq`, `$ne`, `$in` and null, and compare their stored text. For such
 /// a member an object without a key that begins with "$" is a value; write `{"$eq": value}` if the
 /// value comes from outside. docs/front.md shows the SQL for each operator and type word.
 ///
@@ -123,10 +123,10 @@ public:
         std::size_t nRequestBytes = 1048576;  ///< bytes of their names and texts
         std::size_t nAnswerRows = 1000;       ///< records of a list, or of a page
         std::size_t nAnswerBytes = 16777216;  ///< bytes of their values
-        /// Steps of SQLite's virtual machine in a call. Counting them takes the connection's one
-        /// progress handler during each call and leaves the connection without one. A call that
-        /// runs out of them rolls back the host's transaction.
-        long long nSteps = 0;
+        /// Steps of SQLite's virtual machine in a statement. Counting them takes the connection's
+        /// one progress handler during each call and leaves the connection without one. A statement
+        /// that runs out of them rolls back the host's transaction.
+        int nSteps = 0;
     };
 
     /// Gets one record; returns false to stop.
@@ -156,19 +156,23 @@ public:
     VornJsonTable& operator=(const VornJsonTable&) = delete;
 
     /// Why the last call, or the construction, failed; empty and kNone if it did not.
-    const std::string& reason() const { return strReason_; }
-    Cause cause() const { return cause_; }
+    const std::string& reason() const { return end_.strReason; }
+    Cause cause() const { return end_.cause; }
 
     /// After a duplicate: the columns of the constraint, in its order; empty for an index on
     /// expressions.
-    const std::vector<std::string>& columns() const { return columns_; }
+    const std::vector<std::string>& columns() const { return end_.columns; }
 
     /// The members of the primary key, in its order; empty if there is none.
     const std::vector<std::string>& key() const { return key_; }
 
     /// Sets limits for the calls from now on. A new table has none: setLimits({}) sets the defaults
     /// of Limits.
-    void setLimits(const Limits& limits) { limits_ = limits; }
+    void setLimits(const Limits& limits)
+    {
+        limitSteps(0);
+        limits_ = limits;
+    }
 
     /// Inserts the record @p jRecord and sets @p jStored to the row as it was read back.
     ///
@@ -248,15 +252,15 @@ private:
         Form form;
     };
 
-    // Thrown and caught inside.
+    // How a call ended. Thrown and caught inside.
     struct Failure {
-        Cause cause;
-        std::string strReason;
+        Cause cause = Cause::kNone;
+        std::string strReason = {};
         std::vector<std::string> columns = {};
     };
 
     struct SortKey {
-        const Member* pMember;  // null: the rowid
+        std::string strName;
         bool blDescending;
     };
 
@@ -285,10 +289,9 @@ private:
         {"Json::Value", Json::nullValue, "a JSON value"}};
     static constexpr int kMaxLevels = 1000;  // of JSON, as the library reads it
     static constexpr int kMaxTerms = 300;    // of a condition
-    static constexpr int kMaxNesting = 10;   // of "$and" and "$or"
+    static constexpr int kMaxNesting = 10;   // of "$or"
     static constexpr unsigned kBatch = 100;  // rows of a statement
     static constexpr long long kPage = 200;  // rows of a page of each()
-    static constexpr int kPeriod = 1000;     // steps between two looks at their number
 
     // ---- Calls
 
@@ -297,7 +300,7 @@ private:
     {
         std::string strReason;
         ((strReason += parts), ...);
-        throw Failure{cause, strReason};
+        throw Failure{cause, strReason, {}};
     }
 
     template <typename... Parts>
@@ -310,6 +313,13 @@ private:
     [[noreturn]] static void refuseMember(const std::string& strMember, const Parts&... parts)
     {
         refuse("member ", quoted(strMember), ": ", parts...);
+    }
+
+    template <typename What>
+    static void expect(bool blFits, const What& what, const Json::Value& jValue,
+                       const char* szExpected)
+    {
+        if (!blFits) refuse(what, kindOf(jValue), ", expected ", szExpected);
     }
 
     // Runs the work in a transaction, or in a savepoint of the host's, and undoes it if it throws.
@@ -331,31 +341,22 @@ private:
     // Twice, because the first attempt may lack memory. SQLite may have rolled back by itself.
     void undo(const char* szUndo)
     {
-        const long long nStepsLeft = std::exchange(nStepsLeft_, 0);
+        limitSteps(0);
         for (int i = 0; i < 2 && 0 == sqlite3_get_autocommit(pDb_); ++i)
             if (SQLITE_OK == sqlite3_exec(pDb_, szUndo, nullptr, nullptr, nullptr)) break;
-        nStepsLeft_ = nStepsLeft;
+        limitSteps(limits_.nSteps);
     }
 
-    // Stops a statement that is out of steps. With EAGAIN in errno, the library would try it again.
-    static int countSteps(void* pTable)
+    // Has SQLite stop a statement after so many steps; 0: no more. With EAGAIN in errno, the
+    // library would try it again.
+    void limitSteps(int nSteps)
     {
-        auto& table = *static_cast<VornJsonTable*>(pTable);
-        if (0 >= table.nStepsLeft_) return 0;  // rolling back
-        table.blStepsSpent_ = 0 >= (table.nStepsLeft_ -= kPeriod);
-        if (table.blStepsSpent_) errno = 0;
-        return table.blStepsSpent_ ? 1 : 0;
-    }
-
-    // Has the steps of the call counted, if there is a limit to them, until it is destroyed.
-    std::unique_ptr<sqlite3, void (*)(sqlite3*)> countedSteps()
-    {
-        nStepsLeft_ = limits_.nSteps;
-        blStepsSpent_ = false;
-        const auto iPeriod = static_cast<int>(std::min<long long>(kPeriod, nStepsLeft_));
-        if (0 < iPeriod) sqlite3_progress_handler(pDb_, iPeriod, countSteps, this);
-        return {0 < iPeriod ? pDb_ : nullptr,
-                [](sqlite3* pDb) { sqlite3_progress_handler(pDb, 0, nullptr, nullptr); }};
+        const auto stop = [](void*) {
+            errno = 0;
+            return 1;
+        };
+        if (0 < limits_.nSteps && nullptr != pDb_)
+            sqlite3_progress_handler(pDb_, nSteps, stop, nullptr);
     }
 
     // Every operation goes through here: what is thrown inside becomes -1 and a reason.
@@ -363,28 +364,28 @@ private:
     long long call(std::initializer_list<const Json::Value*> arguments, Work work)
     {
         const bool blHosts = nullptr != pDb_ && 0 == sqlite3_get_autocommit(pDb_);
-        Failure end{Cause::kNone, ""};
+        Failure end;
         long long iResult = -1;
         try {
             if (!strRefused_.empty()) refuse(strRefused_);
             checkSize(arguments);
-            const auto steps = countedSteps();
+            limitSteps(limits_.nSteps);
             iResult = work();
         } catch (const Failure& failure) {
             end = failure;
             end.strReason.insert(0, std::exchange(strRecord_, ""));
         } catch (const std::bad_alloc&) {
+            limitSteps(0);
             throw;
         } catch (const std::exception& error) {
-            end = {Cause::kFailed, error.what()};
+            end = {Cause::kFailed, error.what(), {}};
         } catch (...) {
-            end = {Cause::kFailed, "the callback threw"};
+            end = {Cause::kFailed, "the callback threw", {}};
         }
+        limitSteps(0);
         if (0 > iResult && blHosts && 0 != sqlite3_get_autocommit(pDb_))
             end.strReason += "; SQLite has rolled back the host's transaction";
-        std::swap(cause_, end.cause);
-        strReason_.swap(end.strReason);
-        columns_.swap(end.columns);
+        std::swap(end_, end);
         return iResult;
     }
 
@@ -423,32 +424,34 @@ private:
     [[noreturn]] void failSql() const
     {
         const int iCode = sqlite3_extended_errcode(pDb_);
+        const int iPrimary = iCode & 0xff;
         const std::string strError = sqlite3_errmsg(pDb_);
-        if (blStepsSpent_)
-            fail(Cause::kLimit, "the call takes more than ", std::to_string(limits_.nSteps),
+        if (SQLITE_INTERRUPT == iPrimary && 0 < limits_.nSteps)
+            fail(Cause::kLimit, "a statement takes more than ", std::to_string(limits_.nSteps),
                  " steps");
-        if (SQLITE_BUSY == (iCode & 0xff) || SQLITE_LOCKED == (iCode & 0xff))
+        if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
             fail(Cause::kLocked, "locked: ", strError);
-        const bool blUnique = SQLITE_CONSTRAINT_UNIQUE == iCode ||
-                              SQLITE_CONSTRAINT_PRIMARYKEY == iCode ||
-                              SQLITE_CONSTRAINT_ROWID == iCode;
-        throw blUnique ? duplicateOf(strError) : Failure{Cause::kFailed, strError};
+        if (SQLITE_CONSTRAINT_UNIQUE == iCode || SQLITE_CONSTRAINT_PRIMARYKEY == iCode ||
+            SQLITE_CONSTRAINT_ROWID == iCode)
+            failDuplicate(strError);
+        fail(Cause::kFailed, strError);
     }
 
     // UNIQUE constraint failed: item.name, item.lang
-    Failure duplicateOf(const std::string& strError) const
+    [[noreturn]] void failDuplicate(const std::string& strError) const
     {
-        Failure failure{Cause::kDuplicate, "duplicate: " + strError};
-        std::istringstream words(strError + ",");
-        for (std::string strWord; words >> strWord;) {
-            const std::size_t uDot = strWord.find('.');
-            if (std::string::npos == uDot || '\'' == strWord[0]) continue;
+        Failure failure{Cause::kDuplicate, "duplicate: " + strError, {}};
+        const std::string strTable = strName_ + ".";
+        std::istringstream words(strError.substr(strError.find(':') + 1));
+        for (std::string strWord; words >> strWord && "index" != strWord;) {
+            const auto nTable = static_cast<int>(strTable.size());
             // A trigger may have written to another table.
-            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str()))
-                return {Cause::kFailed, strError};
-            failure.columns.push_back(strWord.substr(uDot + 1, strWord.size() - uDot - 2));
+            if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), nTable))
+                fail(Cause::kFailed, strError);
+            strWord.erase(0, strTable.size());
+            failure.columns.push_back(strWord.substr(0, strWord.find(',')));
         }
-        return failure;
+        throw failure;
     }
 
     // Runs one statement that gives no rows and returns the number of rows changed.
@@ -508,6 +511,11 @@ private:
         if (0 > pApi_->SqlMakeByMatchField(strField, const_cast<Json::Value&>(jValue), strTerm))
             throw std::bad_alloc();
         return strTerm;
+    }
+
+    std::size_t nLongestPattern() const
+    {
+        return static_cast<std::size_t>(sqlite3_limit(pDb_, SQLITE_LIMIT_LIKE_PATTERN_LENGTH, -1));
     }
 
     static std::string join(const Texts& texts, const char* szBetween)
@@ -668,22 +676,20 @@ private:
 
     static bool hasKind(Form form, const Json::Value& jValue)
     {
-        if (kInt == form || kLong == form) return isInteger(jValue) && jValue.isInt64();
+        if (kInt == form) return isInteger(jValue) && jValue.isInt();
+        if (kLong == form) return isInteger(jValue) && jValue.isInt64();
         return kAny == form || kForms[form].type == jValue.type();
     }
 
-    // Whether the value can be stored, or compared with what is stored (szStored is null).
-    static void checkFits(const Member& member, const Json::Value& jValue, const char* szStored)
+    static void checkFits(const Member& member, const Json::Value& jValue, const char* szIs = "")
     {
-        const bool blLarge = nullptr != szStored && kInt == member.form && !jValue.isInt();
-        const Form form = nullptr == szStored && kInt == member.form ? kLong : member.form;
-        if (!hasKind(form, jValue) || blLarge)
-            refuseMember(member.strName, nullptr == szStored ? "" : szStored, kindOf(jValue),
-                         ", expected ", kForms[form].szExpected);
+        if (!hasKind(member.form, jValue))
+            refuseMember(member.strName, szIs, kindOf(jValue), ", expected ",
+                         kForms[member.form].szExpected);
         const std::string strFlaw = flawOf(jValue, 1);
-        if (!strFlaw.empty()) refuseMember(member.strName, strFlaw);
-        if (kText == form && std::string::npos != jValue.asString().find('\0'))
-            refuseMember(member.strName, "a string with a NUL byte, expected one without");
+        if (!strFlaw.empty()) refuseMember(member.strName, szIs, strFlaw);
+        if (kText == member.form && std::string::npos != jValue.asString().find('\0'))
+            refuseMember(member.strName, szIs, "a string with a NUL byte, expected one without");
     }
 
     // Why a text cannot hold the value exactly, or nothing.
@@ -724,11 +730,11 @@ private:
     // The record without what SQLite makes; everything in it fits.
     Json::Value checked(const Json::Value& jRecord) const
     {
-        if (!jRecord.isObject()) refuse("the record is ", kindOf(jRecord), ", expected an object");
+        expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         Json::Value jChecked(Json::objectValue);
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
             const Member& member = declared(it.name());
-            if (!it->isNull()) checkFits(member, *it, "");
+            if (!it->isNull()) checkFits(member, *it);
             const bool blMade = blRowidKey_ && it->isNull() && key_[0] == member.strName;
             if (!blMade) jChecked[member.strName] = *it;
         }
@@ -912,173 +918,138 @@ private:
     // The SQL of a condition; 1 for an empty one.
     std::string condition(const Json::Value& jCondition, const char* szIfEmpty = nullptr)
     {
-        int nTerms = 0;
-        const bool blEmpty = jCondition.isNull() || (jCondition.isObject() && jCondition.empty());
+        nTerms_ = 0;
+        const bool blEmpty = jCondition.empty() && !jCondition.isArray();
         if (blEmpty && nullptr != szIfEmpty) refuse("the condition is empty; ", szIfEmpty);
-        return blEmpty ? "1" : "(" + terms(jCondition, 0, nTerms) + ")";
+        return blEmpty ? "1" : "(" + terms(jCondition, 0) + ")";
     }
 
-    std::string terms(const Json::Value& jCondition, int iNesting, int& nTerms)
+    std::string terms(const Json::Value& jCondition, int iNesting)
     {
-        if (!jCondition.isObject())
-            refuse("the condition is ", kindOf(jCondition), ", expected an object");
+        expect(jCondition.isObject(), "the condition is ", jCondition, "an object");
         if (jCondition.empty()) refuse("a condition in a list is empty");
         Texts parts;
-        for (auto it = jCondition.begin(); it != jCondition.end(); ++it) {
-            const std::string strKey = it.name();
-            if ("$and" == strKey || "$or" == strKey)
-                parts.push_back(group(strKey, *it, iNesting + 1, nTerms));
-            else if ('$' == strKey[0])
-                refuse("operator ", quoted(strKey), ": expected \"$and\", \"$or\" or a member");
-            else
-                parts.push_back(memberTerms(declared(strKey), *it, nTerms));
+        for (const std::string& strName : jCondition.getMemberNames()) {
+            const Json::Value& jValue = jCondition[strName];
+            parts.push_back("$or" == strName ? alternatives(jValue, iNesting + 1)
+                                             : memberTerms(declared(strName), jValue));
         }
         return join(parts, " and ");
     }
 
     // ((a=1 and b=2) or (c=3))
-    std::string group(const std::string& strOperator, const Json::Value& jList, int iNesting,
-                      int& nTerms)
+    std::string alternatives(const Json::Value& jList, int iNesting)
     {
-        if (kMaxNesting < iNesting)
-            refuse("operator ", quoted(strOperator), ": nested deeper than 10 levels");
-        if (!jList.isArray() || jList.empty())
-            refuse("operator ", quoted(strOperator), ": ",
-                   jList.isArray() ? "empty" : kindOf(jList), ", expected an array of conditions");
+        if (kMaxNesting < iNesting) refuse("operator \"$or\": nested deeper than 10 levels");
+        expect(jList.isArray() && !jList.empty(), "operator \"$or\": ", jList,
+               "an array of one or more conditions");
         Texts parts;
-        for (const Json::Value& jCondition : jList)
-            parts.push_back("(" + terms(jCondition, iNesting, nTerms) + ")");
-        return "(" + join(parts, "$or" == strOperator ? " or " : " and ") + ")";
+        for (const Json::Value& jCondition : jList) parts.push_back(terms(jCondition, iNesting));
+        return "((" + join(parts, ") or (") + "))";
     }
 
     // A JSON member may equal an object: only names that begin with "$" are operators.
-    std::string memberTerms(const Member& member, const Json::Value& jValue, int& nTerms)
+    std::string memberTerms(const Member& member, const Json::Value& jValue)
     {
         const Texts names = jValue.isObject() ? jValue.getMemberNames() : Texts();
-        const bool blValue =
-            isJson(member.form)
-                ? std::none_of(names.begin(), names.end(),
-                               [](const auto& strName) { return '$' == strName[0]; })
-                : !jValue.isObject();
+        const auto isOperator = [](const std::string& strName) { return '$' == strName[0]; };
+        const bool blOperators = isJson(member.form)
+                                     ? std::any_of(names.begin(), names.end(), isOperator)
+                                     : jValue.isObject();
+        if (!blOperators) return term(member, "$eq", jValue);
+        if (names.empty()) refuseMember(member.strName, "an empty object, expected operators");
         Texts parts;
-        if (blValue) parts.push_back(term(member, "$eq", jValue));
-        for (auto it = jValue.begin(); !blValue && it != jValue.end(); ++it)
-            parts.push_back(term(member, it.name(), *it));
-        if (parts.empty()) refuseMember(member.strName, "an empty object, expected operators");
-        if (kMaxTerms < (nTerms += static_cast<int>(parts.size())))
-            refuse("the condition has more than ", std::to_string(kMaxTerms), " terms");
+        for (const std::string& strName : names)
+            parts.push_back(term(member, strName, jValue[strName]));
         return join(parts, " and ");
     }
 
     std::string term(const Member& member, const std::string& strOperator,
                      const Json::Value& jValue)
     {
-        if ("$in" == strOperator || "$nin" == strOperator)
-            return listTerm(member, strOperator, jValue);
-        const bool blEqual = "$eq" == strOperator;
-        const bool blLike = "$like" == strOperator;
-        if (blEqual || "$ne" == strOperator) {
-            if (!jValue.isNull()) checkFits(member, jValue, nullptr);
-            if (blEqual) return equals(member.strName, jValue);
-            return member.strName + (jValue.isNull()
-                                         ? " is not null"
-                                         : " is not " + literal(member.strName, jValue));
-        }
-        static const std::map<std::string, const char*> orders = {
-            {"$gt", ">"}, {"$gte", ">="}, {"$lt", "<"}, {"$lte", "<="}, {"$like", " like "}};
-        const auto found = orders.find(strOperator);
-        if (orders.end() == found)
+        if (kMaxTerms < ++nTerms_)
+            refuse("the condition has more than ", std::to_string(kMaxTerms), " terms");
+        if ("$in" == strOperator) return listTerm(member, jValue);
+        static const std::map<std::string, const char*> operators = {
+            {"$eq", "="}, {"$ne", " is not "}, {"$gt", ">"},       {"$gte", ">="},
+            {"$lt", "<"}, {"$lte", "<="},      {"$like", " like "}};
+        const auto found = operators.find(strOperator);
+        if (operators.end() == found)
             refuseMember(member.strName, "operator ", quoted(strOperator),
                          ": unknown, expected \"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", "
-                         "\"$lte\", \"$in\", \"$nin\" or \"$like\"");
-        if (blLike ? kText != member.form : kLong < member.form)
+                         "\"$lte\", \"$in\" or \"$like\"");
+        const bool blLike = "$like" == strOperator;
+        const bool blOrder = '<' == *found->second || '>' == *found->second;
+        if ((blLike && kText != member.form) || (blOrder && kLong < member.form))
             refuseMember(member.strName, "operator ", quoted(strOperator), ": type word \"",
                          kForms[member.form].szWord, "\", expected \"string\"",
                          blLike ? "" : ", \"int\" or \"long long\"");
-        checkFits(member, jValue, nullptr);
-        if (blLike) checkPattern(member, jValue.asString());
+        if (blLike || blOrder || !jValue.isNull()) checkFits(member, jValue);
+        if (blLike && nLongestPattern() < jValue.asString().size())
+            refuseMember(member.strName, "operator \"$like\": a string of more than ",
+                         std::to_string(nLongestPattern()), " bytes");
+        if ("$eq" == strOperator) return equals(member.strName, jValue);
         return member.strName + found->second + literal(member.strName, jValue) +
                (blLike ? " escape '\\'" : "");
     }
 
-    void checkPattern(const Member& member, const std::string& strPattern) const
-    {
-        const int nMost = sqlite3_limit(pDb_, SQLITE_LIMIT_LIKE_PATTERN_LENGTH, -1);
-        if (strPattern.size() > static_cast<std::size_t>(nMost))
-            refuseMember(member.strName, "operator \"$like\": a pattern of more than ",
-                         std::to_string(nMost), " bytes");
-        const std::size_t nOthers = strPattern.find_last_not_of('\\') + 1;
-        if (0 != (strPattern.size() - nOthers) % 2)
-            refuseMember(member.strName,
-                         "operator \"$like\": the pattern ends in a backslash that "
-                         "escapes nothing");
-    }
-
     // A record without the member is in no list, unless null is in the list.
-    std::string listTerm(const Member& member, const std::string& strOperator,
-                         const Json::Value& jList)
+    std::string listTerm(const Member& member, const Json::Value& jList)
     {
         if (!jList.isArray())
-            refuseMember(member.strName, "operator ", quoted(strOperator), ": ", kindOf(jList),
+            refuseMember(member.strName, "operator \"$in\": ", kindOf(jList),
                          ", expected an array");
         Texts items;
         for (const Json::Value& jValue : jList) {
             if (jValue.isNull()) continue;
-            checkFits(member, jValue, nullptr);
+            checkFits(member, jValue);
             items.push_back(literal(member.strName, jValue));
         }
-        const bool blNull = items.size() < jList.size();
-        const std::string& strName = member.strName;
-        const std::string strIn = "(" + strName + " in (" + join(items, ",") + ")";
-        if ("$in" == strOperator) return strIn + (blNull ? " or " + strName + " is null)" : ")");
-        return "(not " + strIn + ")" +
-               (blNull ? " and " + strName + " is not null)" : " or " + strName + " is null)");
+        const std::string strNull = " or " + member.strName + " is null";
+        return "(" + member.strName + " in (" + join(items, ",") + ")" +
+               (items.size() < jList.size() ? strNull : "") + ")";
     }
 
     // ---- Sorting and pages
 
-    static long long number(const Json::Value& jOptions, const char* szOption, long long iDefault)
+    static long long number(const Json::Value& jOptions, const std::string& strOption,
+                            long long iDefault)
     {
-        if (!jOptions.isMember(szOption)) return iDefault;
-        const Json::Value& jValue = jOptions[szOption];
-        if (!hasKind(kLong, jValue) || 0 > jValue.asInt64())
-            refuse("option \"", szOption, "\": ", kindOf(jValue), ", expected an integer from 0");
+        if (!jOptions.isMember(strOption)) return iDefault;
+        const Json::Value& jValue = jOptions[strOption];
+        expect(hasKind(kLong, jValue) && 0 <= jValue.asInt64(),
+               "option \"" + strOption + "\": ", jValue, "an integer from 0");
         return jValue.asInt64();
     }
 
     // The members of "sort" and then the key, so that no two records are equal.
     std::vector<SortKey> sortKeys(const Json::Value& jSort) const
     {
-        if (!jSort.isNull() && !jSort.isArray())
-            refuse("option \"sort\": ", kindOf(jSort), ", expected an array of names");
+        expect(jSort.isNull() || jSort.isArray(), "option \"sort\": ", jSort, "an array of names");
         std::vector<SortKey> keys;
-        const auto isSorted = [&](const Member& member) {
-            return std::any_of(keys.begin(), keys.end(),
-                               [&](const SortKey& key) { return &member == key.pMember; });
+        const auto add = [&](const std::string& strName, bool blDescending) {
+            for (const SortKey& key : keys)
+                if (strName == key.strName) return;
+            keys.push_back({strName, blDescending});
         };
         for (const Json::Value& jKey : jSort) {
-            if (!jKey.isString())
-                refuse("option \"sort\": ", kindOf(jKey), ", expected the name of a member");
+            expect(jKey.isString(), "option \"sort\": ", jKey, "the name of a member");
             const std::string strKey = jKey.asString();
             const bool blDescending = '-' == strKey[0];
             const Member& member = declared(strKey.substr(blDescending ? 1 : 0));
-            if (isJson(member.form) || isSorted(member))
+            if (isJson(member.form))
                 refuse("option \"sort\": member ", quoted(member.strName),
-                       isJson(member.form) ? " is JSON, which has no order" : " is there twice");
-            keys.push_back({&member, blDescending});
+                       " is JSON, which has no order");
+            add(member.strName, blDescending);
         }
         const bool blDescending = !keys.empty() && keys.back().blDescending;
-        for (const std::string& strKey : key_)
-            if (!isSorted(members_.at(strKey)))
-                keys.push_back({&members_.at(strKey), blDescending});
-        if (key_.empty()) keys.push_back({nullptr, blDescending});
+        for (const std::string& strKey : key_.empty() ? identity_ : key_) add(strKey, blDescending);
         return keys;
     }
 
     Query query(const Json::Value& jOptions)
     {
-        if (!jOptions.isNull() && !jOptions.isObject())
-            refuse("the options are ", kindOf(jOptions), ", expected an object");
+        expect(jOptions.isNull() || jOptions.isObject(), "the options are ", jOptions, "an object");
         for (const std::string& strOption : jOptions.getMemberNames())
             if ("sort" != strOption && "limit" != strOption && "offset" != strOption &&
                 "after" != strOption)
@@ -1088,8 +1059,7 @@ private:
         const std::vector<SortKey> keys = sortKeys(jOptions["sort"]);
         Texts order;
         for (const SortKey& key : keys)
-            order.push_back((nullptr == key.pMember ? identity_[0] : key.pMember->strName) +
-                            (key.blDescending ? " desc" : ""));
+            order.push_back(key.strName + (key.blDescending ? " desc" : ""));
         query.strOrder = join(order, ",");
         query.iLimit = number(jOptions, "limit", std::numeric_limits<long long>::max());
         query.iOffset = number(jOptions, "offset", 0);
@@ -1103,23 +1073,21 @@ private:
     // from it in the last key only, then those that differ in the one before, and so on.
     Texts rangesAfter(const std::vector<SortKey>& keys, const Json::Value& jLast)
     {
-        if (!jLast.isObject()) refuse("option \"after\": ", kindOf(jLast), ", expected a record");
+        expect(jLast.isObject(), "option \"after\": ", jLast, "a record");
         checkKeys(jLast);
         const Json::Value jChecked = checked(jLast);
         std::string strEqual;
         Texts ranges;
         for (const SortKey& key : keys) {
-            const Member& member = *key.pMember;
-            const Json::Value& jValue = jChecked[member.strName];
-            const std::string strRange = strEqual + member.strName;
+            const Json::Value& jValue = jChecked[key.strName];
+            const std::string strRange = strEqual + key.strName;
+            const std::string strBeyond = key.blDescending ? "<" : ">";
             // In reverse: NULL comes first, and last in a descending order.
-            if (!jValue.isNull() && key.blDescending) ranges.push_back(strRange + " is null");
+            if (jValue.isNull() != key.blDescending)
+                ranges.push_back(strRange + (jValue.isNull() ? " is not null" : " is null"));
             if (!jValue.isNull())
-                ranges.push_back(strRange + (key.blDescending ? "<" : ">") +
-                                 literal(member.strName, jValue));
-            else if (!key.blDescending)
-                ranges.push_back(strRange + " is not null");
-            strEqual += equals(member.strName, jValue) + " and ";
+                ranges.push_back(strRange + strBeyond + literal(key.strName, jValue));
+            strEqual += equals(key.strName, jValue) + " and ";
         }
         std::reverse(ranges.begin(), ranges.end());
         return ranges;
@@ -1131,8 +1099,7 @@ private:
         const Query wanted = query(jOptions);
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
-        const bool blMost = 0 < nMost && nMost < wanted.iLimit;
-        const long long iLimit = blMost ? nMost + 1 : wanted.iLimit;
+        const long long iLimit = 0 < nMost ? std::min(wanted.iLimit, nMost + 1) : wanted.iLimit;
         return transact("begin", [&] {
             lockForReading();
             Json::Value jRecords(Json::arrayValue);
@@ -1176,12 +1143,9 @@ private:
     Texts identity_;           // columns that no two rows share and that are never NULL
     Limits limits_{0, 0, 0, 0, 0};
     std::string strRefused_;  // why the construction was refused
-    Cause cause_ = Cause::kNone;
-    std::string strReason_;
-    Texts columns_;
-    std::string strRecord_;  // which one of several is at work, for the reason
-    long long nStepsLeft_ = 0;
-    bool blStepsSpent_ = false;
+    Failure end_;             // of the last call
+    std::string strRecord_;   // which one of several is at work, for the reason
+    int nTerms_ = 0;          // of the condition that is being translated
 };
 
 inline VornJsonTable::VornJsonTable(sqlite3* pDb, std::string strName, Json::Value jDefinition,
@@ -1192,7 +1156,7 @@ inline VornJsonTable::VornJsonTable(sqlite3* pDb, std::string strName, Json::Val
         open(jDefinition, strCreate);
         return 0;
     });
-    strRefused_ = strReason_;
+    strRefused_ = end_.strReason;
 }
 
 inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStored)
@@ -1207,8 +1171,7 @@ inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStore
 inline long long VornJsonTable::createMany(const Json::Value& jRecords)
 {
     return call({&jRecords}, [&] {
-        if (!jRecords.isArray())
-            refuse("the records are ", kindOf(jRecords), ", expected an array");
+        expect(jRecords.isArray(), "the records are ", jRecords, "an array");
         return transact("begin immediate", [&] {
             for (Json::ArrayIndex u = 0; u < jRecords.size(); u += kBatch) insertSome(jRecords, u);
             return jRecords.size();

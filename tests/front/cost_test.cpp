@@ -9,7 +9,7 @@ constexpr char kMembers[] = R"({
     "created": {"cpptype": "long long"},
     "id":      {"cpptype": "long long"}})";
 constexpr int kRows = 20000;
-constexpr long long kStepsOfAPage = 3000;
+constexpr int kStepsOfAPage = 3000;
 
 struct Case {
     const char* szColumns;
@@ -41,7 +41,7 @@ protected:
         front_.run(GetParam().szIndex);
     }
 
-    std::string pageAfter(const Json::Value& jLast, long long nSteps)
+    std::string pageAfter(const Json::Value& jLast, int nSteps)
     {
         front_.table->setLimits({0, 0, 0, 0, nSteps});
         Json::Value jOptions = json(GetParam().szOptions);
@@ -66,7 +66,7 @@ TEST_P(PageCost, IsTheSameEverywhere)
     Json::Value jOptions = json(GetParam().szOptions);
     jOptions["limit"] = 10;
     jOptions["offset"] = 19989;
-    EXPECT_EQ("limit: the call takes more than 3000 steps", front_.list({}, jOptions));
+    EXPECT_EQ("limit: a statement takes more than 3000 steps", front_.list({}, jOptions));
 }
 
 INSTANTIATE_TEST_SUITE_P(Orders, PageCost, testing::ValuesIn(kCases));

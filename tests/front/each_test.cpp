@@ -180,7 +180,7 @@ TEST_F(FrontLimits, StopStatementsOnce)
                             nullptr);
     front_.run("create trigger @_t before delete on @ begin select again(); end");
     front_.table->setLimits({0, 0, 0, 0, 5000});
-    EXPECT_EQ("limit: the call takes more than 5000 steps",
+    EXPECT_EQ("limit: a statement takes more than 5000 steps",
               front_.outcome([&] { return front_.table->removeAll(); }));
     EXPECT_TRUE(doubles::state().sleeps.empty());
 }
@@ -189,7 +189,7 @@ TEST_F(FrontLimits, StopStatementsThatTakeTooManySteps)
 {
     VornJsonTable::Limits limits{0, 0, 0, 0, 5000};
     front_.table->setLimits(limits);
-    const std::string strSteps = "limit: the call takes more than 5000 steps";
+    const std::string strSteps = "limit: a statement takes more than 5000 steps";
     for (int i = 0; i < 3; ++i) {
         errno = EAGAIN;
         EXPECT_EQ(strSteps, front_.list({}, json(R"({"sort":["-text"]})")));
@@ -200,13 +200,13 @@ TEST_F(FrontLimits, StopStatementsThatTakeTooManySteps)
     EXPECT_TRUE(doubles::state().sleeps.empty());
     limits.nSteps = 1;
     front_.table->setLimits(limits);
-    EXPECT_EQ("limit: the call takes more than 1 steps", front_.get(json(R"({"id":7})")));
+    EXPECT_EQ("limit: a statement takes more than 1 steps", front_.get(json(R"({"id":7})")));
     database_.run("begin");
     Json::Value jStored;
     limits.nSteps = 5000;
     front_.table->setLimits(limits);
     EXPECT_EQ(-1, front_.table->updateAll(json(R"({"text":"x"})")));
-    EXPECT_EQ(0U, front_.table->reason().find("the call takes more than 5000 steps"));
+    EXPECT_EQ(0U, front_.table->reason().find("a statement takes more than 5000 steps"));
     if (0 == sqlite3_get_autocommit(database_.get())) database_.run("rollback");
     front_.table->setLimits({0, 0, 0, 0, 0});
     EXPECT_EQ("0", front_.outcome([&] { return front_.table->count(json(R"({"text":"x"})")); }));

@@ -55,15 +55,14 @@ TEST_F(FrontHostile, FindTextsAsValues)
 {
     for (const std::string& strText : hostileStrings()) {
         SCOPED_TRACE(testing::PrintToString(strText.substr(0, 100)));
-        for (const char* szOperator : {"$eq", "$gt", "$lte", "$like", "$in", "$nin", "$ne"})
+        for (const char* szOperator : {"$eq", "$gt", "$lte", "$like", "$in", "$ne"})
             for (const char* szMember : {"text", "json"}) {
                 Json::Value jCondition;
                 Json::Value& jTerm = jCondition[szMember][szOperator];
-                if ('i' == szOperator[1] || 'n' == szOperator[1])
+                if (std::string("$in") == szOperator)
                     jTerm[0] = strText;
                 else
                     jTerm = strText;
-                if (std::string("$ne") == szOperator) jTerm = strText;
                 const int nFound = found(jCondition);
                 if (std::string("$eq") == szOperator || std::string("$in") == szOperator) {
                     EXPECT_GE(0, nFound);

@@ -126,8 +126,7 @@ protected:
 
     std::string addList(Asked& asked, const std::string& strMember, Json::Value& jTerm)
     {
-        const bool blIn = draws_.once(2);
-        Json::Value& jList = jTerm[blIn ? "$in" : "$nin"];
+        Json::Value& jList = jTerm["$in"];
         jList = Json::Value(Json::arrayValue);
         std::string strSql = "0";
         for (std::size_t n = draws_.below(4); 0 < n; --n) {
@@ -137,7 +136,7 @@ protected:
                                       : " or ifnull(" + strMember + "=" +
                                             bind(asked, bindable(strMember, jValue)) + ",0)";
         }
-        return (blIn ? "(" : "not (") + strSql + ")";
+        return "(" + strSql + ")";
     }
 
     Asked asked(int iLevel = 0)
@@ -150,12 +149,11 @@ protected:
             names.erase(names.begin() + static_cast<std::ptrdiff_t>(u));
         }
         if (2 < iLevel || !draws_.once(3)) return asked;
-        const bool blOr = draws_.once(2);
-        std::string strGroup = blOr ? "0" : "1";
+        std::string strGroup = "0";
         for (std::size_t n = 1 + draws_.below(3); 0 < n; --n) {
             const Asked inner = this->asked(iLevel + 1);
-            asked.jCondition[blOr ? "$or" : "$and"].append(inner.jCondition);
-            strGroup += (blOr ? " or (" : " and (") + inner.strSql + ")";
+            asked.jCondition["$or"].append(inner.jCondition);
+            strGroup += " or (" + inner.strSql + ")";
             asked.bound.insert(asked.bound.end(), inner.bound.begin(), inner.bound.end());
         }
         // The table writes its terms in the order of their names; the sum is the same.

@@ -44,9 +44,8 @@ protected:
     {
         database_.run("savepoint absent; insert into front_book (id) values (99)");
         Json::Value jBoth;
-        jBoth["$and"][0] = json(strCondition);
-        jBoth["$and"][1]["id"] = 99;
-        if (jBoth["$and"][0].empty()) jBoth["$and"][0]["id"] = 99;
+        jBoth["id"] = 99;
+        if (!json(strCondition).empty()) jBoth["$or"][0] = json(strCondition);
         const long long nFound = table_.count(jBoth);
         database_.run("rollback to absent; release absent");
         return 1 == nFound ? "yes" : "no";
@@ -60,7 +59,7 @@ protected:
 
 TEST_F(FrontPage, ShowsEachOperator)
 {
-    for (const auto& row : table(page_, "Operators", 35).rows) {
+    for (const auto& row : table(page_, "Operators", 30).rows) {
         SCOPED_TRACE(row[1]);
         EXPECT_EQ(row[3], listed(row[1], "null"));
         EXPECT_EQ(row[2], written("WHERE  ( ", " and 1) order by "));
@@ -78,7 +77,7 @@ TEST_F(FrontPage, ShowsWhatIsRefused)
         EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
         EXPECT_EQ(std::vector<std::string>(), takeStatements());
     }
-    for (const auto& row : table(page_, "What the options refuse", 14).rows) {
+    for (const auto& row : table(page_, "What the options refuse", 13).rows) {
         EXPECT_EQ(row[1], listed("null", row[0])) << row[0];
         EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
         EXPECT_EQ(std::vector<std::string>(), takeStatements());
@@ -108,8 +107,8 @@ TEST_F(FrontPage, TakesThreeHundredTermsAndTenLevels)
     jDeep["id"] = 1;
     for (int i = 0; i < 10; ++i) {
         Json::Value jOuter;
-        jOuter[0 == i % 2 ? "$or" : "$and"][0]["id"]["$ne"] = 7;
-        jOuter[0 == i % 2 ? "$or" : "$and"][1].swap(jDeep);
+        jOuter["$or"][0]["id"]["$ne"] = 7;
+        jOuter["$or"][1].swap(jDeep);
         jDeep.swap(jOuter);
     }
     EXPECT_LE(0, table_.count(jDeep)) << table_.reason();
