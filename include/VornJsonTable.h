@@ -264,20 +264,11 @@ private:
         bool blDescending;
     };
 
-    struct Query {
-        std::string strOrder;
-        std::vector<std::string> ranges = {"1"};  // what follows "after", part by part
-        long long iLimit = 0;
-        long long iOffset = 0;
-    };
-
     using Texts = std::vector<std::string>;
 
     static constexpr char kWords[] =
-        "\"string\", \"long long\" or \"int\" for integers, \"bool\", \"Json::objectValue\", "
-        "\"Json::arrayValue\" or \"Json::Value\"; a fraction is exact as an integer of its "
-        "smallest "
-        "unit, as text, or inside a JSON member";
+        "\"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", \"Json::arrayValue\" "
+        "or \"Json::Value\"; fractions as integers of the smallest unit, as text or inside JSON";
     static constexpr FormRow kForms[] = {
         {"string", Json::stringValue, "a string"},
         {"int", Json::intValue, "an integer from -2147483648 to 2147483647"},
@@ -292,6 +283,7 @@ private:
     static constexpr int kMaxNesting = 10;   // of "$or"
     static constexpr unsigned kBatch = 100;  // rows of a statement
     static constexpr long long kPage = 200;  // rows of a page of each()
+    static constexpr long long kNoLimit = std::numeric_limits<long long>::max();
 
     // ---- Calls
 
@@ -366,6 +358,7 @@ private:
         const bool blHosts = nullptr != pDb_ && 0 == sqlite3_get_autocommit(pDb_);
         Failure end;
         long long iResult = -1;
+        strRecord_.clear();
         try {
             if (!strRefused_.empty()) refuse(strRefused_);
             checkSize(arguments);
@@ -373,7 +366,7 @@ private:
             iResult = work();
         } catch (const Failure& failure) {
             end = failure;
-            end.strReason.insert(0, std::exchange(strRecord_, ""));
+            end.strReason.insert(0, strRecord_);
         } catch (const std::bad_alloc&) {
             limitSteps(0);
             throw;
@@ -397,24 +390,20 @@ private:
 
     void checkSize(std::initializer_list<const Json::Value*> arguments) const
     {
-        if (0 == limits_.nRequestMembers && 0 == limits_.nRequestBytes) return;
         std::size_t nMembers = 0;
         std::size_t nBytes = 0;
-        for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes, 1);
+        for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes);
         checkLimit("request", limits_.nRequestMembers, nMembers, " members");
         checkLimit("request", limits_.nRequestBytes, nBytes, " bytes");
     }
 
-    // What is deeper than this is refused by name.
-    static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes,
-                        int iLevel)
+    static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes)
     {
-        if (2 * kMaxLevels < iLevel) return;
         if (jValue.isString()) nBytes += jValue.asString().size();
         for (auto it = jValue.begin(); it != jValue.end(); ++it) {
             ++nMembers;
             if (jValue.isObject()) nBytes += it.name().size();
-            measure(*it, nMembers, nBytes, iLevel + 1);
+            measure(*it, nMembers, nBytes);
         }
     }
 
@@ -460,6 +449,13 @@ private:
         const int iChanges = pApi_->runSqlEx(strSql);
         if (0 > iChanges) failSql();
         return iChanges;
+    }
+
+    // Runs a statement that has to change so many rows.
+    void write(const std::string& strSql, std::size_t nRows)
+    {
+        if (static_cast<int>(nRows) != run(strSql))
+            fail(Cause::kChanged, "a trigger or an \"on conflict\" clause ignored a record");
     }
 
     // From here on, no read in the transaction meets a lock.
@@ -513,9 +509,13 @@ private:
         return strTerm;
     }
 
-    std::size_t nLongestPattern() const
+    // ('x','en')
+    std::string values(const Json::Value& jRecord)
     {
-        return static_cast<std::size_t>(sqlite3_limit(pDb_, SQLITE_LIMIT_LIKE_PATTERN_LENGTH, -1));
+        Texts parts;
+        for (auto it = jRecord.begin(); it != jRecord.end(); ++it)
+            parts.push_back(literal(it.name(), *it));
+        return "(" + join(parts, ",") + ")";
     }
 
     static std::string join(const Texts& texts, const char* szBetween)
@@ -528,7 +528,7 @@ private:
 
     // ---- Construction
 
-    void open(Json::Value& jDefinition, std::string& strCreate)
+    int open(Json::Value& jDefinition, std::string& strCreate)
     {
         if (nullptr == pDb_) refuse("the connection is null");
         if (strCreate.empty()) refuse("the CREATE statement is empty");
@@ -537,17 +537,27 @@ private:
             Json::Path("." + strName_ + ".member").resolve(std::as_const(jDefinition));
         if (!jMembers.isObject() || jMembers.empty())
             refuse("the definition has no members for the table ", quoted(strName_));
-        for (auto it = jMembers.begin(); it != jMembers.end(); ++it) declare(it.name(), *it);
-
+        names_ = jMembers.getMemberNames();
+        Json::Value jTypes;
+        for (const std::string& strMember : names_) {
+            declare(strMember, jMembers[strMember]);
+            for (const char* szKey : {"cpptype", "cppDefaultValue"})
+                if (jMembers[strMember].isMember(szKey))
+                    jTypes[strMember][szKey] = jMembers[strMember][szKey];
+        }
         pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strCreate);
         // The constructor cannot say whether the statement failed.
         if (0 > pApi_->tableCreate()) failSql();
-        transact("begin", [&] {
+        return transact("begin", [&] {
             lockForReading();
             readColumns();
             if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
                 refuse("table ", quoted(strName_), ": ", sqlite3_errmsg(pDb_));
-            checkTypes(jDefinition, jMembers);
+            // Types are kept by table name for the life of the process.
+            const Json::Value& jHeld = VORN_JSON_DB::recType(jDefinition, strName_);
+            if (jHeld.toStyledString() != jTypes.toStyledString())
+                refuse("the process already holds the table ", quoted(strName_),
+                       " with other types; use the same definition or another name");
             return 0;
         });
     }
@@ -583,30 +593,27 @@ private:
         const Json::Value& jDefault = jMember["cppDefaultValue"];
         if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
         members_.emplace(strMember, member);
-        names_.push_back(strMember);
     }
 
     void readColumns()
     {
         const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
+        const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
         key_ = select("select name " + strColumns + "pk order by pk");
         // An integer primary key is the rowid itself and has no index.
-        const std::string strIndex = "from pragma_index_list('" + strName_ + "')";
-        blRowidKey_ =
-            !key_.empty() && select("select 1 " + strIndex + " where origin='pk'").empty();
+        blRowidKey_ = !key_.empty() && select("select 1 " + strIndexes + "origin='pk'").empty();
         const bool blRowid = nullptr != prepare("select _rowid_ from " + strName_);
         identity_ = blRowid && !blRowidKey_ ? Texts{"_rowid_"} : key_;
-        if (identity_.empty()) refuse("table ", quoted(strName_), ": no key and no rowid");
         for (const auto& item : members_) {
-            const Texts column = select("select type, dflt_value is null, pk " + strColumns +
-                                        "name='" + item.first + "'");
+            // What identifies a row has to be sent, even if the column has a default.
+            const Texts column =
+                select("select type, dflt_value is null" + std::string(blRowid ? " " : " or pk ") +
+                       strColumns + "name='" + item.first + "'");
             if (column.empty()) refuseMember(item.first, "the table has no column of this name");
             checkColumn(item.second, column[0]);
-            const bool blKey = "0" != column[2];
-            const bool blDefault = "0" == column[1];
-            const bool blMade = blKey ? blRowidKey_ || (blDefault && blRowid) : blDefault;
-            if (!blMade) jAbsent_[item.first];
+            if ("1" == column[1]) jAbsent_[item.first];
         }
+        if (blRowidKey_) jAbsent_.removeMember(key_[0]);
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
                                     join(names_, "','") + "')");
         if (!others.empty())
@@ -626,20 +633,6 @@ private:
                          " over an integer primary key, expected \"long long\"");
     }
 
-    // Member types are kept by table name for the life of the process.
-    void checkTypes(Json::Value& jDefinition, const Json::Value& jMembers)
-    {
-        Json::Value jTypes;
-        for (const std::string& strMember : names_)
-            for (const char* szKey : {"cpptype", "cppDefaultValue"})
-                if (jMembers[strMember].isMember(szKey))
-                    jTypes[strMember][szKey] = jMembers[strMember][szKey];
-        if (VORN_JSON_DB::recType(jDefinition, strName_).toStyledString() !=
-            jTypes.toStyledString())
-            refuse("the process already holds the table ", quoted(strName_),
-                   " with other types; use the same definition or another name");
-    }
-
     // ---- Values
 
     const Member& declared(const std::string& strMember) const
@@ -653,10 +646,7 @@ private:
     // A text from outside in a reason: one line, and not too long.
     static std::string quoted(const std::string& strText)
     {
-        constexpr std::size_t kMost = 60;
-        const std::string strShort = strText.substr(0, kMost);
-        return Json::valueToQuotedString(
-            (strShort + (kMost < strText.size() ? "..." : "")).c_str());
+        return Json::valueToQuotedString(strText.substr(0, 60).c_str());
     }
 
     static std::string kindOf(const Json::Value& jValue)
@@ -686,24 +676,23 @@ private:
         if (!hasKind(member.form, jValue))
             refuseMember(member.strName, szIs, kindOf(jValue), ", expected ",
                          kForms[member.form].szExpected);
-        const std::string strFlaw = flawOf(jValue, 1);
-        if (!strFlaw.empty()) refuseMember(member.strName, szIs, strFlaw);
-        if (kText == member.form && std::string::npos != jValue.asString().find('\0'))
-            refuseMember(member.strName, szIs, "a string with a NUL byte, expected one without");
+        const bool blText = kText == member.form;
+        if (!isExact(jValue, 1) || (blText && std::string::npos != jValue.asString().find('\0')))
+            refuseMember(
+                member.strName, szIs, kindOf(jValue), ", expected UTF-8",
+                blText ? " without NUL bytes" : ", finite numbers and 1000 levels at most");
     }
 
-    // Why a text cannot hold the value exactly, or nothing.
-    static std::string flawOf(const Json::Value& jValue, int iLevel)
+    // Whether a text can hold the value.
+    static bool isExact(const Json::Value& jValue, int iLevel)
     {
-        if (kMaxLevels < iLevel) return "JSON of more than 1000 levels";
-        if (Json::realValue == jValue.type() && !std::isfinite(jValue.asDouble()))
-            return "a number that is not finite";
-        std::string strFlaw =
-            jValue.isString() && !isUtf8(jValue.asString()) ? "a string that is not UTF-8" : "";
-        for (auto it = jValue.begin(); strFlaw.empty() && it != jValue.end(); ++it)
-            strFlaw = jValue.isObject() && !isUtf8(it.name()) ? "a name that is not UTF-8"
-                                                              : flawOf(*it, iLevel + 1);
-        return strFlaw;
+        if (kMaxLevels < iLevel) return false;
+        if (jValue.isString()) return isUtf8(jValue.asString());
+        if (Json::realValue == jValue.type()) return std::isfinite(jValue.asDouble());
+        for (auto it = jValue.begin(); it != jValue.end(); ++it)
+            if (!isExact(*it, iLevel + 1) || (jValue.isObject() && !isUtf8(it.name())))
+                return false;
+        return true;
     }
 
     static bool isUtf8(const std::string& strText)
@@ -747,21 +736,26 @@ private:
         pApi_->fillDefaultValue(jRecord, false);
         VORN_JSON_DB::jsonCopyMember(jRecord, jAbsent_, false);
         for (const std::string& strKey : key_)
-            if (jRecord.isMember(strKey)) checkKey(jRecord, strKey);
+            if (jRecord.isMember(strKey)) checkKeyMember(jRecord, strKey);
         return jRecord;
     }
 
-    void checkKey(const Json::Value& jRecord, const std::string& strKey) const
+    void checkKeyMember(const Json::Value& jRecord, const std::string& strKey) const
     {
         if (jRecord[strKey].isNull())
             refuseMember(strKey, "missing, expected ", kForms[members_.at(strKey).form].szExpected,
                          ": it is part of the key");
     }
 
-    void checkKeys(const Json::Value& jRecord) const
+    void checkKey(const Json::Value& jRecord) const
+    {
+        checkHasKey();
+        for (const std::string& strKey : key_) checkKeyMember(jRecord, strKey);
+    }
+
+    void checkHasKey() const
     {
         if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
-        for (const std::string& strKey : key_) checkKey(jRecord, strKey);
     }
 
     bool hasKey(const Json::Value& jRecord) const
@@ -779,39 +773,27 @@ private:
     }
 
     // insert into item (id,name) values (1,'x'),(2,'y')
-    // The records have the same members, and their keys if they are several. Returns the last row.
+    // The records have the same members, and their keys if they are several. Returns the first row.
     Json::Value insert(const std::vector<Json::Value>& records)
     {
-        const Texts names = records[0].getMemberNames();
         Texts lists;
-        for (const Json::Value& jRecord : records) {
-            Texts values;
-            for (const std::string& strName : names)
-                values.push_back(literal(strName, jRecord[strName]));
-            lists.push_back("(" + join(values, ",") + ")");
-        }
-        const std::string strValues = " (" + join(names, ",") + ") values " + join(lists, ",");
-        const int nInserted =
-            run("insert into " + strName_ + (names.empty() ? " default values" : strValues));
-        if (static_cast<int>(records.size()) != nInserted)
-            fail(Cause::kChanged,
-                 "nothing was inserted: a trigger or an \"on conflict\" clause "
-                 "ignored the record");
-        return compareInserted(records);
-    }
-
-    Json::Value compareInserted(const std::vector<Json::Value>& records)
-    {
+        for (const Json::Value& jRecord : records) lists.push_back(values(jRecord));
+        const std::string strNames = join(records[0].getMemberNames(), ",");
+        write("insert into " + strName_ +
+                  (strNames.empty() ? " default values"
+                                    : " (" + strNames + ") values " + join(lists, ",")),
+              records.size());
+        // If one row was inserted, the rowid is its own.
+        const std::string strRowid = std::to_string(sqlite3_last_insert_rowid(pDb_));
         const bool blKey = hasKey(records[0]);
-        // One row was inserted, so the rowid is its own.
-        Texts terms(1, "_rowid_=" + std::to_string(sqlite3_last_insert_rowid(pDb_)));
-        if (blKey) terms.clear();
-        for (std::size_t u = 0; blKey && u < records.size(); ++u)
-            terms.push_back(keyTerm(records[u]));
+        Texts terms;
+        for (const Json::Value& jRecord : records)
+            terms.push_back(blKey ? keyTerm(jRecord) : "_rowid_=" + strRowid);
         std::map<std::string, Json::Value> rows;
-        for (Json::Value& jRow : readBack(terms)) rows[blKey ? keyTerm(jRow) : terms[0]].swap(jRow);
-        for (std::size_t u = 0; u < records.size(); ++u) compare(records[u], rows[terms[u]]);
-        return rows[terms.back()];
+        for (Json::Value& jRow : readBack(terms)) rows[keyTerm(jRow)].swap(jRow);
+        for (const Json::Value& jRecord : records)
+            compare(jRecord, blKey ? rows[keyTerm(jRecord)] : rows.begin()->second);
+        return rows.begin()->second;
     }
 
     Json::Value readBack(const Texts& terms)
@@ -819,8 +801,7 @@ private:
         Json::Value jRows;
         addRows(join(terms, " or "), jRows);
         if (jRows.size() != terms.size())
-            fail(Cause::kChanged,
-                 "the row is not there after it was written: a trigger moved or deleted it");
+            fail(Cause::kChanged, "a trigger moved or deleted the row that was written");
         return jRows;
     }
 
@@ -831,8 +812,7 @@ private:
         for (const std::string& strName : jSent.getMemberNames())
             if (literal(strName, jSent[strName]) != literal(strName, jStored[strName]))
                 fail(Cause::kChanged, "member ", quoted(strName),
-                     ": the row holds another value than the one sent; a trigger may have changed "
-                     "it");
+                     ": the row holds another value than was sent; a trigger may have set it");
     }
 
     // Inserts up to kBatch records, in one statement if that works.
@@ -840,17 +820,19 @@ private:
     {
         const Json::ArrayIndex uEnd = std::min(jRecords.size(), uFirst + kBatch);
         std::vector<Json::Value> batch;
-        for (Json::ArrayIndex u = uFirst; u < uEnd; ++u) {
-            strRecord_ = "record " + std::to_string(u) + ": ";
-            batch.push_back(filled(checked(jRecords[u])));
-        }
+        for (Json::ArrayIndex u = uFirst; u < uEnd; ++u)
+            batch.push_back(filled(checked(recordAt(jRecords, u))));
         strRecord_.clear();
-        if (insertTogether(batch)) return;
-        for (Json::ArrayIndex u = uFirst; u < uEnd; ++u) {
-            strRecord_ = "record " + std::to_string(u) + ": ";
-            insert({batch[u - uFirst]});
-        }
+        const bool blTogether = insertTogether(batch);
+        for (Json::ArrayIndex u = uFirst; !blTogether && u < uEnd; ++u)
+            insert({filled(checked(recordAt(jRecords, u)))});
         strRecord_.clear();
+    }
+
+    const Json::Value& recordAt(const Json::Value& jRecords, Json::ArrayIndex u)
+    {
+        strRecord_ = "record " + std::to_string(u) + ": ";
+        return jRecords[u];
     }
 
     // False: nothing was written.
@@ -869,9 +851,9 @@ private:
         }
     }
 
-    // update item set id=1,name='x' where id=1
+    // update item set (id,name)=(1,'x') where id=1
     // Returns the number of rows, after comparing them.
-    int change(const std::string& strWhere, const Json::Value& jValues)
+    long long change(const std::string& strWhere, const Json::Value& jValues)
     {
         lockForReading();
         // A term for each row as it will be identified: quote() gives the SQL of a value.
@@ -883,21 +865,15 @@ private:
         }
         const Texts terms = select("select " + join(columns, "||' and '||") + " from " + strName_ +
                                    " where " + strWhere);
-        Texts values;
-        for (const std::string& strName : jValues.getMemberNames())
-            values.push_back(strName + "=" + literal(strName, jValues[strName]));
-        const int nChanged =
-            run("update " + strName_ + " set " + join(values, ",") + " where " + strWhere);
-        if (static_cast<int>(terms.size()) != nChanged)
-            fail(Cause::kChanged,
-                 "not every record was updated: a trigger or an \"on conflict\" "
-                 "clause ignored some");
+        write("update " + strName_ + " set (" + join(jValues.getMemberNames(), ",") +
+                  ")=" + values(jValues) + " where " + strWhere,
+              terms.size());
         for (auto it = terms.begin(); it != terms.end();) {
             const auto end = it + std::min<std::ptrdiff_t>(kBatch, terms.end() - it);
             for (const Json::Value& jRow : readBack(Texts(it, end))) compare(jValues, jRow);
             it = end;
         }
-        return nChanged;
+        return static_cast<long long>(terms.size());
     }
 
     long long updateWhere(const std::string& strWhere, const Json::Value& jValues)
@@ -985,9 +961,10 @@ private:
                          kForms[member.form].szWord, "\", expected \"string\"",
                          blLike ? "" : ", \"int\" or \"long long\"");
         if (blLike || blOrder || !jValue.isNull()) checkFits(member, jValue);
-        if (blLike && nLongestPattern() < jValue.asString().size())
+        const int nMost = sqlite3_limit(pDb_, SQLITE_LIMIT_LIKE_PATTERN_LENGTH, -1);
+        if (blLike && static_cast<std::size_t>(nMost) < jValue.asString().size())
             refuseMember(member.strName, "operator \"$like\": a string of more than ",
-                         std::to_string(nLongestPattern()), " bytes");
+                         std::to_string(nMost), " bytes");
         if ("$eq" == strOperator) return equals(member.strName, jValue);
         return member.strName + found->second + literal(member.strName, jValue) +
                (blLike ? " escape '\\'" : "");
@@ -996,9 +973,8 @@ private:
     // A record without the member is in no list, unless null is in the list.
     std::string listTerm(const Member& member, const Json::Value& jList)
     {
-        if (!jList.isArray())
-            refuseMember(member.strName, "operator \"$in\": ", kindOf(jList),
-                         ", expected an array");
+        expect(jList.isArray(), "member " + quoted(member.strName) + ": operator \"$in\": ", jList,
+               "an array");
         Texts items;
         for (const Json::Value& jValue : jList) {
             if (jValue.isNull()) continue;
@@ -1012,20 +988,27 @@ private:
 
     // ---- Sorting and pages
 
-    static long long number(const Json::Value& jOptions, const std::string& strOption,
-                            long long iDefault)
+    static void checkOptions(const Json::Value& jOptions)
     {
-        if (!jOptions.isMember(strOption)) return iDefault;
-        const Json::Value& jValue = jOptions[strOption];
-        expect(hasKind(kLong, jValue) && 0 <= jValue.asInt64(),
-               "option \"" + strOption + "\": ", jValue, "an integer from 0");
-        return jValue.asInt64();
+        expect(jOptions.isNull() || jOptions.isObject(), "the options are ", jOptions, "an object");
+        for (const std::string& strOption : jOptions.getMemberNames()) {
+            const Json::Value& jValue = jOptions[strOption];
+            const std::string strWhat = "option " + quoted(strOption) + ": ";
+            if ("limit" == strOption || "offset" == strOption)
+                expect(hasKind(kLong, jValue) && 0 <= jValue.asInt64(), strWhat, jValue,
+                       "an integer from 0");
+            else if ("sort" == strOption)
+                expect(jValue.isArray(), strWhat, jValue, "an array of names");
+            else if ("after" == strOption)
+                expect(jValue.isObject(), strWhat, jValue, "a record");
+            else
+                refuse(strWhat, "unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
+        }
     }
 
     // The members of "sort" and then the key, so that no two records are equal.
     std::vector<SortKey> sortKeys(const Json::Value& jSort) const
     {
-        expect(jSort.isNull() || jSort.isArray(), "option \"sort\": ", jSort, "an array of names");
         std::vector<SortKey> keys;
         const auto add = [&](const std::string& strName, bool blDescending) {
             for (const SortKey& key : keys)
@@ -1047,34 +1030,11 @@ private:
         return keys;
     }
 
-    Query query(const Json::Value& jOptions)
-    {
-        expect(jOptions.isNull() || jOptions.isObject(), "the options are ", jOptions, "an object");
-        for (const std::string& strOption : jOptions.getMemberNames())
-            if ("sort" != strOption && "limit" != strOption && "offset" != strOption &&
-                "after" != strOption)
-                refuse("option ", quoted(strOption),
-                       ": unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
-        Query query;
-        const std::vector<SortKey> keys = sortKeys(jOptions["sort"]);
-        Texts order;
-        for (const SortKey& key : keys)
-            order.push_back(key.strName + (key.blDescending ? " desc" : ""));
-        query.strOrder = join(order, ",");
-        query.iLimit = number(jOptions, "limit", std::numeric_limits<long long>::max());
-        query.iOffset = number(jOptions, "offset", 0);
-        if (jOptions.isMember("after")) query.ranges = rangesAfter(keys, jOptions["after"]);
-        // Rows are skipped in all parts together, so they become one.
-        if (0 < query.iOffset) query.ranges = {"(" + join(query.ranges, " or ") + ")"};
-        return query;
-    }
-
     // What follows the last record, in parts that an index can find: first the rows that differ
     // from it in the last key only, then those that differ in the one before, and so on.
     Texts rangesAfter(const std::vector<SortKey>& keys, const Json::Value& jLast)
     {
-        expect(jLast.isObject(), "option \"after\": ", jLast, "a record");
-        checkKeys(jLast);
+        checkKey(jLast);
         const Json::Value jChecked = checked(jLast);
         std::string strEqual;
         Texts ranges;
@@ -1096,19 +1056,31 @@ private:
     // The rows of a list. The raw filter carries the order, the limit and the offset.
     Json::Value page(const std::string& strWhere, const Json::Value& jOptions)
     {
-        const Query wanted = query(jOptions);
+        checkOptions(jOptions);
+        const std::vector<SortKey> keys = sortKeys(jOptions["sort"]);
+        Texts order;
+        for (const SortKey& key : keys)
+            order.push_back(key.strName + (key.blDescending ? " desc" : ""));
+        const long long iOffset = jOptions.get("offset", 0).asInt64();
+        const long long iAsked = jOptions.get("limit", Json::Int64(kNoLimit)).asInt64();
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
-        const long long iLimit = 0 < nMost ? std::min(wanted.iLimit, nMost + 1) : wanted.iLimit;
+        const long long iLimit = 0 < nMost ? std::min(iAsked, nMost + 1) : iAsked;
+        Texts ranges = {"1"};
+        if (jOptions.isMember("after")) ranges = rangesAfter(keys, jOptions["after"]);
+        // Rows are skipped in all parts together, so they become one.
+        if (0 < iOffset) ranges = {"(" + join(ranges, " or ") + ")"};
         return transact("begin", [&] {
             lockForReading();
             Json::Value jRecords(Json::arrayValue);
             std::size_t nBytes = 0;
-            for (const std::string& strRange : wanted.ranges) {
-                std::string strFilter = strWhere + " and " + strRange + ") order by ";
-                strFilter += wanted.strOrder + " limit " + std::to_string(iLimit - jRecords.size());
-                strFilter += " offset (" + std::to_string(wanted.iOffset);
-                checkBytes(strFilter, nBytes);
+            for (const std::string& strRange : ranges) {
+                const std::string strFilter = strWhere + " and " + strRange + ") order by " +
+                                              join(order, ",") + " limit " +
+                                              std::to_string(iLimit - jRecords.size()) +
+                                              " offset (" + std::to_string(iOffset);
+                if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
+                checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
                 if (iLimit == jRecords.size()) break;
             }
@@ -1118,18 +1090,14 @@ private:
         });
     }
 
-    // Before the rows take memory.
-    void checkBytes(const std::string& strFilter, std::size_t& nBytes) const
+    // Known before the rows take memory.
+    std::size_t bytesOf(const std::string& strFilter) const
     {
-        if (0 == limits_.nAnswerBytes) return;
-        Texts lengths;
-        for (const auto& item : members_)
-            lengths.push_back("ifnull(length(cast(" + item.first + " as blob)),0)");
-        const auto sum =
-            select("select cast(total(n) as integer) from (select " + join(lengths, "+") +
-                   " as n from " + strName_ + " where (" + strFilter + "))");
-        nBytes += std::stoull(sum[0]);
-        checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
+        const std::string strBefore = "ifnull(length(cast(";
+        const std::string strAfter = " as blob)),0)";
+        return std::stoull(select("select cast(total(n) as integer) from (select " + strBefore +
+                                  join(names_, (strAfter + "+" + strBefore).c_str()) + strAfter +
+                                  " as n from " + strName_ + " where (" + strFilter + "))")[0]);
     }
 
     sqlite3* const pDb_;
@@ -1152,10 +1120,7 @@ inline VornJsonTable::VornJsonTable(sqlite3* pDb, std::string strName, Json::Val
                                     std::string strCreate)
     : pDb_(pDb), strName_(std::move(strName))
 {
-    call({}, [&] {
-        open(jDefinition, strCreate);
-        return 0;
-    });
+    call({}, [&] { return open(jDefinition, strCreate); });
     strRefused_ = end_.strReason;
 }
 
@@ -1183,7 +1148,7 @@ inline int VornJsonTable::save(const Json::Value& jRecord, Json::Value& jStored)
 {
     return static_cast<int>(call({&jRecord}, [&] {
         const Json::Value jChecked = checked(jRecord);
-        checkKeys(jChecked);
+        checkKey(jChecked);
         const std::string strKey = keyTerm(jChecked);
         jStored = transact("begin immediate", [&] {
             const bool blThere = 0 < change(strKey, jChecked);
@@ -1208,30 +1173,30 @@ inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::
 {
     std::string strWhere;
     Json::Value jNext;
-    long long iLeft = 0;
     long long nRecords = call({&jCondition, &jOptions}, [&] {
         strWhere = condition(jCondition);
-        iLeft = query(jOptions).iLimit;
-        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
+        checkOptions(jOptions);
+        checkHasKey();
         jNext = jOptions;
         return 0;
     });
-    for (bool blMore = 0 == nRecords; blMore; iLeft -= kPage) {
+    if (0 > nRecords) return -1;
+    long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
+    for (long long nRows = kPage; kPage == nRows; iLeft -= kPage) {
         Json::Value jPage;
+        jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
         // One call each, since the callback may make calls of its own.
-        if (0 > call({}, [&] {
-                jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
-                jPage = page(strWhere, jNext);
-                return 0;
-            }))
-            return -1;
+        nRows = call({}, [&] {
+            jPage = page(strWhere, jNext);
+            return jPage.size();
+        });
+        if (0 > nRows) return -1;
         for (const Json::Value& jRecord : jPage) {
             ++nRecords;
             const long long iMore = call({}, [&] { return callback(jRecord) ? 1 : 0; });
-            if (1 != iMore) return 0 > iMore ? iMore : nRecords;
+            if (1 != iMore) return 0 > iMore ? -1 : nRecords;
         }
-        blMore = kPage == static_cast<long long>(jPage.size());
-        if (blMore) jNext["after"] = jPage[jPage.size() - 1];
+        if (0 < nRows) jNext["after"] = jPage[jPage.size() - 1];
         jNext.removeMember("offset");
     }
     return nRecords;

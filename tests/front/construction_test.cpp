@@ -11,9 +11,9 @@ struct Case {
 };
 
 constexpr char kWords[] =
-    ", expected \"string\", \"long long\" or \"int\" for integers, \"bool\", "
-    "\"Json::objectValue\", \"Json::arrayValue\" or \"Json::Value\"; a fraction is exact as an "
-    "integer of its smallest unit, as text, or inside a JSON member";
+    ", expected \"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", "
+    "\"Json::arrayValue\" or \"Json::Value\"; fractions as integers of the smallest unit, as text "
+    "or inside JSON";
 constexpr char kNeedsQuotes[] =
     ": expected a name of letters, digits and \"_\" that SQLite takes without quotes";
 

@@ -16,7 +16,7 @@ constexpr char kMissingKey[] =
     "refused: member \"id\": missing, expected an integer from -9223372036854775808 to "
     "9223372036854775807: it is part of the key";
 constexpr char kOtherValue[] =
-    ": the row holds another value than the one sent; a trigger may have changed it";
+    ": the row holds another value than was sent; a trigger may have set it";
 
 class Write : public FrontTest {
 protected:
@@ -177,7 +177,7 @@ TEST_F(Write, UndoesAnUpdateThatATriggerChanged)
         {"after update on @ when new.note = 'x' begin update @ set note = 'y'; end",
          std::string("changed: member \"note\"") + kOtherValue},
         {"after update on @ begin delete from @ where id = new.id; end",
-         "changed: the row is not there after it was written: a trigger moved or deleted it"},
+         "changed: a trigger moved or deleted the row that was written"},
     };
     for (const auto& one : cases) {
         SCOPED_TRACE(one.szTrigger);
