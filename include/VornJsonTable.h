@@ -91,7 +91,6 @@
 #include <cerrno>
 #include <cmath>
 #include <cstdint>
-#include <cstring>
 #include <functional>
 #include <iterator>
 #include <limits>
@@ -146,6 +145,7 @@ public:
     /// - columns that change a value or its order: text in a column that is not text, integers in
     ///   one that is text or real, JSON in one that is not text; anything but "long long" over an
     ///   integer primary key;
+    /// - tables without a primary key;
     /// - columns that are missing, not in the definition, generated, or spelt in another case;
     /// - names that are not plain identifiers, or that SQLite does not take without quotes;
     /// - another definition of the same table name earlier in the process.
@@ -163,7 +163,7 @@ public:
     /// expressions.
     const std::vector<std::string>& columns() const { return end_.columns; }
 
-    /// The members of the primary key, in its order; empty if there is none.
+    /// The members of the primary key, in its order.
     const std::vector<std::string>& key() const { return key_; }
 
     /// Sets limits for the calls from now on. A new table has none: setLimits({}) sets the defaults
@@ -201,12 +201,18 @@ public:
     /// Sets @p jRecords to the array of the records that the condition selects. Returns their
     /// number, or -1.
     long long list(const Json::Value& jCondition, const Json::Value& jOptions,
-                   Json::Value& jRecords);
+                   Json::Value& jRecords)
+    {
+        return call({&jCondition, &jOptions}, [&] {
+            jRecords = page(condition(jCondition), jOptions);
+            return jRecords.size();
+        });
+    }
 
     /// Calls @p callback with each record that the condition selects, in the order of the options.
-    /// It reads pages of 200 records, so it needs the memory of one page, and a primary key. Each
-    /// page is read as a whole before its records are handed out, and no statement is open
-    /// meanwhile, so the callback may use the table. Open a transaction around the call if all
+    /// It reads pages of 200 records, so it needs the memory of one page. Each page is read as a
+    /// whole before its records are handed out, and no statement is open meanwhile, so the callback
+    /// may use the table. Open a transaction around the call if all
     /// pages have to show the same state.
     ///
     /// Returns the number of calls, also if the callback stopped, or -1. If the callback throws
@@ -216,28 +222,55 @@ public:
 
     /// Sets @p jRecord to the first record, in the order of the key, that the condition selects.
     /// Returns 1, or 0 if there is none, or -1.
-    int get(const Json::Value& jCondition, Json::Value& jRecord);
+    int get(const Json::Value& jCondition, Json::Value& jRecord)
+    {
+        return static_cast<int>(call({&jCondition}, [&] {
+            Json::Value jOptions;
+            jOptions["limit"] = 1;
+            Json::Value jPage = page(condition(jCondition), jOptions);
+            if (!jPage.empty()) jRecord.swap(jPage[0]);
+            return jPage.size();
+        }));
+    }
 
     /// Returns the number of records that the condition selects, or -1.
-    long long count(const Json::Value& jCondition);
+    long long count(const Json::Value& jCondition)
+    {
+        return call({&jCondition}, [&] {
+            const std::string strSql = "select count(*) from " + strName_ + " where ";
+            const std::string strWhere = condition(jCondition);
+            return transact("begin", [&] {
+                lockForReading();
+                return std::stoll(select(strSql + strWhere)[0]);
+            });
+        });
+    }
 
     /// Sets the members of the object @p jValues, arrays too, in every record that the condition
     /// selects, and compares the rows with them; a trigger may set other members. It keeps the keys
     /// of these records in memory. Refused are empty conditions and empty values. Returns the
     /// number of records, or -1.
-    long long update(const Json::Value& jCondition, const Json::Value& jValues);
+    long long update(const Json::Value& jCondition, const Json::Value& jValues)
+    {
+        return updateRows(jCondition, jValues, "updateAll() updates every record");
+    }
 
     /// The same for every record of the table.
-    long long updateAll(const Json::Value& jValues);
+    long long updateAll(const Json::Value& jValues) { return updateRows({}, jValues, nullptr); }
 
     /// Deletes the records that the condition selects. An empty condition is refused. Returns the
     /// number of rows deleted, or -1.
-    long long remove(const Json::Value& jCondition);
+    long long remove(const Json::Value& jCondition)
+    {
+        return removeRows(jCondition, "removeAll() deletes every record");
+    }
 
     /// Deletes every record. Returns the number of rows deleted, or -1.
-    long long removeAll();
+    long long removeAll() { return removeRows({}, nullptr); }
 
 private:
+    using Texts = std::vector<std::string>;
+
     // What a type word means: the rows of kForms.
     enum Form { kText, kInt, kLong, kBool, kObject, kArray, kAny };
 
@@ -256,15 +289,10 @@ private:
     struct Failure {
         Cause cause = Cause::kNone;
         std::string strReason = {};
-        std::vector<std::string> columns = {};
+        Texts columns = {};
     };
 
-    struct SortKey {
-        std::string strName;
-        bool blDescending;
-    };
-
-    using Texts = std::vector<std::string>;
+    using SortKeys = std::vector<std::pair<std::string, bool>>;  // true: descending
 
     static constexpr char kWords[] =
         "\"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", \"Json::arrayValue\" "
@@ -307,36 +335,32 @@ private:
         refuse("member ", quoted(strMember), ": ", parts...);
     }
 
-    template <typename What>
-    static void expect(bool blFits, const What& what, const Json::Value& jValue,
+    static void expect(bool blFits, const std::string& strWhat, const Json::Value& jValue,
                        const char* szExpected)
     {
-        if (!blFits) refuse(what, kindOf(jValue), ", expected ", szExpected);
+        if (!blFits) refuse(strWhat, kindOf(jValue), ", expected ", szExpected);
     }
 
     // Runs the work in a transaction, or in a savepoint of the host's, and undoes it if it throws.
     template <typename Work>
-    auto transact(const char* szBegin, Work work)
+    auto transact(const char* szBegin, Work work) -> decltype(work())
     {
         const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
+        const char* szUndo =
+            blHosts ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
         run(blHosts ? "savepoint vorn_json_table" : szBegin);
         try {
             auto result = work();
             run(blHosts ? "release vorn_json_table" : "commit");
             return result;
         } catch (...) {
-            undo(blHosts ? "rollback to vorn_json_table; release vorn_json_table" : "rollback");
+            limitSteps(0);
+            // Twice, because the first may lack memory. SQLite may have rolled back by itself.
+            for (int i = 0; i < 2 && 0 == sqlite3_get_autocommit(pDb_); ++i)
+                if (SQLITE_OK == sqlite3_exec(pDb_, szUndo, nullptr, nullptr, nullptr)) break;
+            limitSteps(limits_.nSteps);
             throw;
         }
-    }
-
-    // Twice, because the first attempt may lack memory. SQLite may have rolled back by itself.
-    void undo(const char* szUndo)
-    {
-        limitSteps(0);
-        for (int i = 0; i < 2 && 0 == sqlite3_get_autocommit(pDb_); ++i)
-            if (SQLITE_OK == sqlite3_exec(pDb_, szUndo, nullptr, nullptr, nullptr)) break;
-        limitSteps(limits_.nSteps);
     }
 
     // Has SQLite stop a statement after so many steps; 0: no more. With EAGAIN in errno, the
@@ -361,7 +385,11 @@ private:
         strRecord_.clear();
         try {
             if (!strRefused_.empty()) refuse(strRefused_);
-            checkSize(arguments);
+            std::size_t nMembers = 0;
+            std::size_t nBytes = 0;
+            for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes);
+            checkLimit("request", limits_.nRequestMembers, nMembers, " members");
+            checkLimit("request", limits_.nRequestBytes, nBytes, " bytes");
             limitSteps(limits_.nSteps);
             iResult = work();
         } catch (const Failure& failure) {
@@ -388,15 +416,6 @@ private:
             fail(Cause::kLimit, "the ", szWhat, " has more than ", std::to_string(nMost), szUnit);
     }
 
-    void checkSize(std::initializer_list<const Json::Value*> arguments) const
-    {
-        std::size_t nMembers = 0;
-        std::size_t nBytes = 0;
-        for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes);
-        checkLimit("request", limits_.nRequestMembers, nMembers, " members");
-        checkLimit("request", limits_.nRequestBytes, nBytes, " bytes");
-    }
-
     static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes)
     {
         if (jValue.isString()) nBytes += jValue.asString().size();
@@ -420,26 +439,22 @@ private:
                  " steps");
         if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
             fail(Cause::kLocked, "locked: ", strError);
-        if (SQLITE_CONSTRAINT_UNIQUE == iCode || SQLITE_CONSTRAINT_PRIMARYKEY == iCode ||
-            SQLITE_CONSTRAINT_ROWID == iCode)
-            failDuplicate(strError);
-        fail(Cause::kFailed, strError);
-    }
-
-    // UNIQUE constraint failed: item.name, item.lang
-    [[noreturn]] void failDuplicate(const std::string& strError) const
-    {
-        Failure failure{Cause::kDuplicate, "duplicate: " + strError, {}};
-        const std::string strTable = strName_ + ".";
+        Failure failure{Cause::kFailed, strError, {}};
+        if (SQLITE_CONSTRAINT_UNIQUE != iCode && SQLITE_CONSTRAINT_PRIMARYKEY != iCode &&
+            SQLITE_CONSTRAINT_ROWID != iCode)
+            throw failure;
+        // UNIQUE constraint failed: item.name, item.lang
         std::istringstream words(strError.substr(strError.find(':') + 1));
         for (std::string strWord; words >> strWord && "index" != strWord;) {
-            const auto nTable = static_cast<int>(strTable.size());
+            const std::size_t uDot = std::min(strWord.find('.'), strWord.size());
             // A trigger may have written to another table.
-            if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), nTable))
-                fail(Cause::kFailed, strError);
-            strWord.erase(0, strTable.size());
+            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str()))
+                throw Failure{Cause::kFailed, strError, {}};
+            strWord.erase(0, uDot + 1);
             failure.columns.push_back(strWord.substr(0, strWord.find(',')));
         }
+        failure.cause = Cause::kDuplicate;
+        failure.strReason = "duplicate: " + strError;
         throw failure;
     }
 
@@ -569,8 +584,7 @@ private:
         const std::string strLetters = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_";
         const bool blPlain =
             std::string::npos != strLetters.find(strName[0]) &&
-            std::string::npos == strName.find_first_not_of(strLetters + "0123456789") &&
-            0 != sqlite3_stricmp(strName.c_str(), "_rowid_");
+            std::string::npos == strName.find_first_not_of(strLetters + "0123456789");
         const std::string strSql = "with " + strName + " as (select 7 as \"" + strName +
                                    "\") select " + strName + "||" + strName + " from " + strName +
                                    " where (" + strName + "=7) order by " + strName + " desc";
@@ -598,22 +612,18 @@ private:
     void readColumns()
     {
         const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
-        const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
         key_ = select("select name " + strColumns + "pk order by pk");
+        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
         // An integer primary key is the rowid itself and has no index.
-        blRowidKey_ = !key_.empty() && select("select 1 " + strIndexes + "origin='pk'").empty();
-        const bool blRowid = nullptr != prepare("select _rowid_ from " + strName_);
-        identity_ = blRowid && !blRowidKey_ ? Texts{"_rowid_"} : key_;
+        const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
+        blRowidKey_ = select("select 1 " + strIndexes + "origin='pk'").empty();
         for (const auto& item : members_) {
-            // What identifies a row has to be sent, even if the column has a default.
-            const Texts column =
-                select("select type, dflt_value is null" + std::string(blRowid ? " " : " or pk ") +
-                       strColumns + "name='" + item.first + "'");
+            const Texts column = select("select type, dflt_value is null or pk " + strColumns +
+                                        "name='" + item.first + "'");
             if (column.empty()) refuseMember(item.first, "the table has no column of this name");
             checkColumn(item.second, column[0]);
             if ("1" == column[1]) jAbsent_[item.first];
         }
-        if (blRowidKey_) jAbsent_.removeMember(key_[0]);
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
                                     join(names_, "','") + "')");
         if (!others.empty())
@@ -716,52 +726,32 @@ private:
 
     // ---- Writing
 
-    // The record without what SQLite makes; everything in it fits.
-    Json::Value checked(const Json::Value& jRecord) const
+    void check(const Json::Value& jRecord) const
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
-        Json::Value jChecked(Json::objectValue);
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
             const Member& member = declared(it.name());
             if (!it->isNull()) checkFits(member, *it);
-            const bool blMade = blRowidKey_ && it->isNull() && key_[0] == member.strName;
-            if (!blMade) jChecked[member.strName] = *it;
         }
-        return jChecked;
-    }
-
-    // With its defaults, and null for what nobody fills in.
-    Json::Value filled(Json::Value jRecord)
-    {
-        pApi_->fillDefaultValue(jRecord, false);
-        VORN_JSON_DB::jsonCopyMember(jRecord, jAbsent_, false);
-        for (const std::string& strKey : key_)
-            if (jRecord.isMember(strKey)) checkKeyMember(jRecord, strKey);
-        return jRecord;
-    }
-
-    void checkKeyMember(const Json::Value& jRecord, const std::string& strKey) const
-    {
-        if (jRecord[strKey].isNull())
-            refuseMember(strKey, "missing, expected ", kForms[members_.at(strKey).form].szExpected,
-                         ": it is part of the key");
     }
 
     void checkKey(const Json::Value& jRecord) const
     {
-        checkHasKey();
-        for (const std::string& strKey : key_) checkKeyMember(jRecord, strKey);
+        for (const std::string& strKey : key_)
+            if (jRecord[strKey].isNull())
+                refuseMember(strKey, "missing, expected ",
+                             kForms[members_.at(strKey).form].szExpected,
+                             ": it is part of the key");
     }
 
-    void checkHasKey() const
+    // With its defaults, and null for what no column fills in: in an integer key, SQLite does.
+    Json::Value filled(Json::Value jRecord)
     {
-        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
-    }
-
-    bool hasKey(const Json::Value& jRecord) const
-    {
-        const auto isThere = [&](const auto& strKey) { return jRecord.isMember(strKey); };
-        return !key_.empty() && std::all_of(key_.begin(), key_.end(), isThere);
+        check(jRecord);
+        pApi_->fillDefaultValue(jRecord, false);
+        VORN_JSON_DB::jsonCopyMember(jRecord, jAbsent_, false);
+        if (!blRowidKey_) checkKey(jRecord);
+        return jRecord;
     }
 
     // code='x' and lang='en'
@@ -774,26 +764,22 @@ private:
 
     // insert into item (id,name) values (1,'x'),(2,'y')
     // The records have the same members, and their keys if they are several. Returns the first row.
-    Json::Value insert(const std::vector<Json::Value>& records)
+    Json::Value insert(std::vector<Json::Value> records)
     {
         Texts lists;
         for (const Json::Value& jRecord : records) lists.push_back(values(jRecord));
         const std::string strNames = join(records[0].getMemberNames(), ",");
-        write("insert into " + strName_ +
-                  (strNames.empty() ? " default values"
-                                    : " (" + strNames + ") values " + join(lists, ",")),
+        write("insert into " + strName_ + " (" + strNames + ") values " + join(lists, ","),
               records.size());
-        // If one row was inserted, the rowid is its own.
-        const std::string strRowid = std::to_string(sqlite3_last_insert_rowid(pDb_));
-        const bool blKey = hasKey(records[0]);
+        Json::Value& jKey = records[0][key_[0]];
+        // One row was inserted, so the rowid is its own.
+        if (jKey.isNull()) jKey = Json::Int64(sqlite3_last_insert_rowid(pDb_));
         Texts terms;
-        for (const Json::Value& jRecord : records)
-            terms.push_back(blKey ? keyTerm(jRecord) : "_rowid_=" + strRowid);
+        for (const Json::Value& jRecord : records) terms.push_back(keyTerm(jRecord));
         std::map<std::string, Json::Value> rows;
         for (Json::Value& jRow : readBack(terms)) rows[keyTerm(jRow)].swap(jRow);
-        for (const Json::Value& jRecord : records)
-            compare(jRecord, blKey ? rows[keyTerm(jRecord)] : rows.begin()->second);
-        return rows.begin()->second;
+        for (std::size_t u = 0; u < records.size(); ++u) compare(records[u], rows[terms[u]]);
+        return rows[terms[0]];
     }
 
     Json::Value readBack(const Texts& terms)
@@ -815,40 +801,34 @@ private:
                      ": the row holds another value than was sent; a trigger may have set it");
     }
 
-    // Inserts up to kBatch records, in one statement if that works.
-    void insertSome(const Json::Value& jRecords, Json::ArrayIndex uFirst)
+    // All of the records or none, in statements of up to so many.
+    Json::ArrayIndex insertAll(const Json::Value& jRecords, std::size_t nMost)
     {
-        const Json::ArrayIndex uEnd = std::min(jRecords.size(), uFirst + kBatch);
-        std::vector<Json::Value> batch;
-        for (Json::ArrayIndex u = uFirst; u < uEnd; ++u)
-            batch.push_back(filled(checked(recordAt(jRecords, u))));
-        strRecord_.clear();
-        const bool blTogether = insertTogether(batch);
-        for (Json::ArrayIndex u = uFirst; !blTogether && u < uEnd; ++u)
-            insert({filled(checked(recordAt(jRecords, u)))});
-        strRecord_.clear();
+        return transact("begin immediate", [&] {
+            std::vector<Json::Value> batch;
+            for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
+                strRecord_ = "record " + std::to_string(u) + ": ";
+                batch.push_back(filled(jRecords[u]));
+                if (nMost > batch.size() && u + 1 < jRecords.size()) continue;
+                if (1 < nMost) strRecord_.clear();
+                insertBatch(std::move(batch));
+                batch.clear();
+            }
+            strRecord_.clear();
+            return jRecords.size();
+        });
     }
 
-    const Json::Value& recordAt(const Json::Value& jRecords, Json::ArrayIndex u)
+    void insertBatch(std::vector<Json::Value> batch)
     {
-        strRecord_ = "record " + std::to_string(u) + ": ";
-        return jRecords[u];
-    }
-
-    // False: nothing was written.
-    bool insertTogether(const std::vector<Json::Value>& records)
-    {
-        const Texts names = records[0].getMemberNames();
-        for (const Json::Value& jRecord : records)
-            if (2 > records.size() || !hasKey(jRecord) || names != jRecord.getMemberNames())
-                return false;
-        try {
-            transact("", [&] { return insert(records); });
-            return true;
-        } catch (const Failure& failure) {
-            if (Cause::kLocked == failure.cause || Cause::kLimit == failure.cause) throw;
-            return false;
-        }
+        const Texts names = batch[0].getMemberNames();
+        const auto isAlike = [&](const Json::Value& jRecord) {
+            return !jRecord[key_[0]].isNull() && names == jRecord.getMemberNames();
+        };
+        if (std::all_of(batch.begin(), batch.end(), isAlike))
+            insert(std::move(batch));
+        else
+            for (const Json::Value& jRecord : batch) insert({jRecord});
     }
 
     // update item set (id,name)=(1,'x') where id=1
@@ -856,12 +836,12 @@ private:
     long long change(const std::string& strWhere, const Json::Value& jValues)
     {
         lockForReading();
-        // A term for each row as it will be identified: quote() gives the SQL of a value.
+        // The key of each row as it will be: quote() gives the SQL of a value.
         Texts columns;
-        for (const std::string& strColumn : identity_) {
-            const bool blSet = jValues.isMember(strColumn);
-            columns.push_back("'" + strColumn + "='||quote(" +
-                              (blSet ? literal(strColumn, jValues[strColumn]) : strColumn) + ")");
+        for (const std::string& strKey : key_) {
+            const bool blSet = jValues.isMember(strKey);
+            columns.push_back("'" + strKey + "='||quote(" +
+                              (blSet ? literal(strKey, jValues[strKey]) : strKey) + ")");
         }
         const Texts terms = select("select " + join(columns, "||' and '||") + " from " + strName_ +
                                    " where " + strWhere);
@@ -876,17 +856,24 @@ private:
         return static_cast<long long>(terms.size());
     }
 
-    long long updateWhere(const std::string& strWhere, const Json::Value& jValues)
+    long long updateRows(const Json::Value& jCondition, const Json::Value& jValues,
+                         const char* szIfEmpty)
     {
-        const Json::Value jChecked = checked(jValues);
-        if (jChecked.empty()) refuse("there are no values to set");
-        return transact("begin immediate", [&] { return change(strWhere, jChecked); });
+        return call({&jCondition, &jValues}, [&] {
+            const std::string strWhere = condition(jCondition, szIfEmpty);
+            check(jValues);
+            if (jValues.empty()) refuse("there are no values to set");
+            return transact("begin immediate", [&] { return change(strWhere, jValues); });
+        });
     }
 
-    long long removeWhere(const std::string& strWhere)
+    long long removeRows(const Json::Value& jCondition, const char* szIfEmpty)
     {
-        const std::string strSql = "delete from " + strName_ + " where " + strWhere;
-        return transact("begin immediate", [&] { return run(strSql); });
+        return call({&jCondition}, [&] {
+            const std::string strWhere = condition(jCondition, szIfEmpty);
+            const std::string strSql = "delete from " + strName_ + " where " + strWhere;
+            return transact("begin immediate", [&] { return run(strSql); });
+        });
     }
 
     // ---- Conditions
@@ -900,28 +887,26 @@ private:
         return blEmpty ? "1" : "(" + terms(jCondition, 0) + ")";
     }
 
+    // a=1 and ((b=2) or (c=3))
     std::string terms(const Json::Value& jCondition, int iNesting)
     {
         expect(jCondition.isObject(), "the condition is ", jCondition, "an object");
         if (jCondition.empty()) refuse("a condition in a list is empty");
+        if (kMaxNesting < iNesting) refuse("operator \"$or\": nested deeper than 10 levels");
         Texts parts;
         for (const std::string& strName : jCondition.getMemberNames()) {
             const Json::Value& jValue = jCondition[strName];
-            parts.push_back("$or" == strName ? alternatives(jValue, iNesting + 1)
-                                             : memberTerms(declared(strName), jValue));
+            if ("$or" != strName) {
+                parts.push_back(memberTerms(declared(strName), jValue));
+                continue;
+            }
+            expect(jValue.isArray() && !jValue.empty(), "operator \"$or\": ", jValue,
+                   "an array of one or more conditions");
+            Texts either;
+            for (const Json::Value& jEach : jValue) either.push_back(terms(jEach, iNesting + 1));
+            parts.push_back("((" + join(either, ") or (") + "))");
         }
         return join(parts, " and ");
-    }
-
-    // ((a=1 and b=2) or (c=3))
-    std::string alternatives(const Json::Value& jList, int iNesting)
-    {
-        if (kMaxNesting < iNesting) refuse("operator \"$or\": nested deeper than 10 levels");
-        expect(jList.isArray() && !jList.empty(), "operator \"$or\": ", jList,
-               "an array of one or more conditions");
-        Texts parts;
-        for (const Json::Value& jCondition : jList) parts.push_back(terms(jCondition, iNesting));
-        return "((" + join(parts, ") or (") + "))";
     }
 
     // A JSON member may equal an object: only names that begin with "$" are operators.
@@ -1007,47 +992,44 @@ private:
     }
 
     // The members of "sort" and then the key, so that no two records are equal.
-    std::vector<SortKey> sortKeys(const Json::Value& jSort) const
+    SortKeys sortKeys(const Json::Value& jSort) const
     {
-        std::vector<SortKey> keys;
-        const auto add = [&](const std::string& strName, bool blDescending) {
-            for (const SortKey& key : keys)
-                if (strName == key.strName) return;
-            keys.push_back({strName, blDescending});
-        };
+        SortKeys keys;
+        bool blDescending = false;
         for (const Json::Value& jKey : jSort) {
             expect(jKey.isString(), "option \"sort\": ", jKey, "the name of a member");
             const std::string strKey = jKey.asString();
-            const bool blDescending = '-' == strKey[0];
+            blDescending = '-' == strKey[0];
             const Member& member = declared(strKey.substr(blDescending ? 1 : 0));
             if (isJson(member.form))
-                refuse("option \"sort\": member ", quoted(member.strName),
-                       " is JSON, which has no order");
-            add(member.strName, blDescending);
+                refuseMember(member.strName, "JSON in option \"sort\", expected what has an order");
+            keys.emplace_back(member.strName, blDescending);
         }
-        const bool blDescending = !keys.empty() && keys.back().blDescending;
-        for (const std::string& strKey : key_.empty() ? identity_ : key_) add(strKey, blDescending);
+        for (const std::string& strKey : key_) {
+            const auto isKey = [&](const auto& key) { return strKey == key.first; };
+            if (std::none_of(keys.begin(), keys.end(), isKey))
+                keys.emplace_back(strKey, blDescending);
+        }
         return keys;
     }
 
     // What follows the last record, in parts that an index can find: first the rows that differ
     // from it in the last key only, then those that differ in the one before, and so on.
-    Texts rangesAfter(const std::vector<SortKey>& keys, const Json::Value& jLast)
+    Texts rangesAfter(const SortKeys& keys, const Json::Value& jLast)
     {
+        check(jLast);
         checkKey(jLast);
-        const Json::Value jChecked = checked(jLast);
         std::string strEqual;
         Texts ranges;
-        for (const SortKey& key : keys) {
-            const Json::Value& jValue = jChecked[key.strName];
-            const std::string strRange = strEqual + key.strName;
-            const std::string strBeyond = key.blDescending ? "<" : ">";
+        for (const auto& [strName, blDescending] : keys) {
+            const Json::Value& jValue = jLast[strName];
+            const std::string strRange = strEqual + strName;
             // In reverse: NULL comes first, and last in a descending order.
-            if (jValue.isNull() != key.blDescending)
+            if (jValue.isNull() != blDescending)
                 ranges.push_back(strRange + (jValue.isNull() ? " is not null" : " is null"));
             if (!jValue.isNull())
-                ranges.push_back(strRange + strBeyond + literal(key.strName, jValue));
-            strEqual += equals(key.strName, jValue) + " and ";
+                ranges.push_back(strRange + (blDescending ? "<" : ">") + literal(strName, jValue));
+            strEqual += equals(strName, jValue) + " and ";
         }
         std::reverse(ranges.begin(), ranges.end());
         return ranges;
@@ -1057,10 +1039,10 @@ private:
     Json::Value page(const std::string& strWhere, const Json::Value& jOptions)
     {
         checkOptions(jOptions);
-        const std::vector<SortKey> keys = sortKeys(jOptions["sort"]);
+        const SortKeys keys = sortKeys(jOptions["sort"]);
         Texts order;
-        for (const SortKey& key : keys)
-            order.push_back(key.strName + (key.blDescending ? " desc" : ""));
+        for (const auto& [strName, blDescending] : keys)
+            order.push_back(strName + (blDescending ? " desc" : ""));
         const long long iOffset = jOptions.get("offset", 0).asInt64();
         const long long iAsked = jOptions.get("limit", Json::Int64(kNoLimit)).asInt64();
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
@@ -1108,7 +1090,6 @@ private:
     Json::Value jAbsent_;  // null for each member that neither SQLite nor its column fills in
     Texts key_;
     bool blRowidKey_ = false;  // the key is the integer primary key
-    Texts identity_;           // columns that no two rows share and that are never NULL
     Limits limits_{0, 0, 0, 0, 0};
     std::string strRefused_;  // why the construction was refused
     Failure end_;             // of the last call
@@ -1127,7 +1108,7 @@ inline VornJsonTable::VornJsonTable(sqlite3* pDb, std::string strName, Json::Val
 inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStored)
 {
     return static_cast<int>(call({&jRecord}, [&] {
-        const Json::Value jFilled = filled(checked(jRecord));
+        const Json::Value jFilled = filled(jRecord);
         jStored = transact("begin immediate", [&] { return insert({jFilled}); });
         return 0;
     }));
@@ -1137,35 +1118,30 @@ inline long long VornJsonTable::createMany(const Json::Value& jRecords)
 {
     return call({&jRecords}, [&] {
         expect(jRecords.isArray(), "the records are ", jRecords, "an array");
-        return transact("begin immediate", [&] {
-            for (Json::ArrayIndex u = 0; u < jRecords.size(); u += kBatch) insertSome(jRecords, u);
-            return jRecords.size();
-        });
+        try {
+            return insertAll(jRecords, kBatch);
+        } catch (const Failure& failure) {
+            if (Cause::kRefused == failure.cause || Cause::kLocked == failure.cause ||
+                Cause::kLimit == failure.cause)
+                throw;
+        }
+        // One by one, to find the record that failed.
+        return insertAll(jRecords, 1);
     });
 }
 
 inline int VornJsonTable::save(const Json::Value& jRecord, Json::Value& jStored)
 {
     return static_cast<int>(call({&jRecord}, [&] {
-        const Json::Value jChecked = checked(jRecord);
-        checkKey(jChecked);
-        const std::string strKey = keyTerm(jChecked);
+        check(jRecord);
+        checkKey(jRecord);
+        const std::string strKey = keyTerm(jRecord);
         jStored = transact("begin immediate", [&] {
-            const bool blThere = 0 < change(strKey, jChecked);
-            return blThere ? readBack({strKey})[0] : insert({filled(jChecked)});
+            const bool blThere = 0 < change(strKey, jRecord);
+            return blThere ? readBack({strKey})[0] : insert({filled(jRecord)});
         });
         return 0;
     }));
-}
-
-inline long long VornJsonTable::list(const Json::Value& jCondition, const Json::Value& jOptions,
-                                     Json::Value& jRecords)
-{
-    return call({&jCondition, &jOptions}, [&] {
-        Json::Value jPage = page(condition(jCondition), jOptions);
-        jRecords.swap(jPage);
-        return jRecords.size();
-    });
 }
 
 inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::Value& jOptions,
@@ -1176,7 +1152,6 @@ inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::
     long long nRecords = call({&jCondition, &jOptions}, [&] {
         strWhere = condition(jCondition);
         checkOptions(jOptions);
-        checkHasKey();
         jNext = jOptions;
         return 0;
     });
@@ -1200,52 +1175,6 @@ inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::
         jNext.removeMember("offset");
     }
     return nRecords;
-}
-
-inline int VornJsonTable::get(const Json::Value& jCondition, Json::Value& jRecord)
-{
-    return static_cast<int>(call({&jCondition}, [&] {
-        Json::Value jOptions;
-        jOptions["limit"] = 1;
-        Json::Value jPage = page(condition(jCondition), jOptions);
-        if (!jPage.empty()) jRecord.swap(jPage[0]);
-        return jPage.empty() ? 0 : 1;
-    }));
-}
-
-inline long long VornJsonTable::count(const Json::Value& jCondition)
-{
-    return call({&jCondition}, [&] {
-        const std::string strWhere = condition(jCondition);
-        return transact("begin", [&] {
-            lockForReading();
-            return std::stoll(select("select count(*) from " + strName_ + " where " + strWhere)[0]);
-        });
-    });
-}
-
-inline long long VornJsonTable::update(const Json::Value& jCondition, const Json::Value& jValues)
-{
-    return call({&jCondition, &jValues}, [&] {
-        return updateWhere(condition(jCondition, "updateAll() updates every record"), jValues);
-    });
-}
-
-inline long long VornJsonTable::updateAll(const Json::Value& jValues)
-{
-    return call({&jValues}, [&] { return updateWhere("1", jValues); });
-}
-
-inline long long VornJsonTable::remove(const Json::Value& jCondition)
-{
-    return call({&jCondition}, [&] {
-        return removeWhere(condition(jCondition, "removeAll() deletes every record"));
-    });
-}
-
-inline long long VornJsonTable::removeAll()
-{
-    return call({}, [&] { return removeWhere("1"); });
 }
 
 #endif

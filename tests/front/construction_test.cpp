@@ -28,7 +28,12 @@ protected:
                       const std::string& strColumns)
     {
         SCOPED_TRACE(strMembers + " over " + strColumns);
-        Front front(database_, strMembers, strColumns);
+        // Every table has a key.
+        Json::Value jMembers = json(strMembers);
+        const bool blKey = std::string::npos != strColumns.find("primary key") || jMembers.empty();
+        if (!blKey) jMembers["id"]["cpptype"] = "long long";
+        Front front(database_, text(jMembers),
+                    strColumns + (blKey ? "" : ", id integer primary key"));
         EXPECT_EQ(front.named(strReason), front.table->reason());
         const bool blRefused = !strReason.empty();
         EXPECT_EQ(blRefused ? VornJsonTable::Cause::kRefused : VornJsonTable::Cause::kNone,
@@ -121,8 +126,7 @@ TEST_F(Construction, RefusesDefaultsOfAnotherKind)
 
 TEST_F(Construction, RefusesNamesThatNeedQuotes)
 {
-    for (const char* szName :
-         {"order", "group", "select", "current_time", "not", "null", "_rowid_"}) {
+    for (const char* szName : {"order", "group", "select", "current_time", "not", "null"}) {
         const std::string strMember = std::string("{\"") + szName + R"(":{"cpptype":"string"}})";
         expectReason(std::string("member \"") + szName + "\"" + kNeedsQuotes, strMember,
                      std::string("\"") + szName + "\" text");
@@ -152,13 +156,20 @@ TEST_F(Construction, RefusesTypesThatTheProcessHoldsDifferently)
     const std::string strHeld = "the process already holds the table \"" + strName +
                                 "\" with other types; use the same definition or another name";
     // A refused table leaves no types behind.
-    EXPECT_NE("", reasonOf(R"({"a":{"cpptype":"string"}})", "a int"));
-    EXPECT_EQ("", reasonOf(R"({"a":{"cpptype":"int"}})", "a int"));
-    EXPECT_EQ("", reasonOf(R"({"a":{"cpptype":"int"}})", "a int"));
-    EXPECT_EQ(strHeld, reasonOf(R"({"a":{"cpptype":"long long"}})", "a int"));
-    EXPECT_EQ(strHeld, reasonOf(R"({"a":{"cpptype":"int","cppDefaultValue":1}})", "a int"));
+    EXPECT_NE("", reasonOf(R"({"a":{"cpptype":"string"}})", "a int primary key"));
+    EXPECT_EQ("", reasonOf(R"({"a":{"cpptype":"int"}})", "a int primary key"));
+    EXPECT_EQ("", reasonOf(R"({"a":{"cpptype":"int"}})", "a int primary key"));
+    EXPECT_EQ(strHeld, reasonOf(R"({"a":{"cpptype":"long long"}})", "a int primary key"));
     EXPECT_EQ(strHeld,
-              reasonOf(R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})", "a int, b int"));
+              reasonOf(R"({"a":{"cpptype":"int","cppDefaultValue":1}})", "a int primary key"));
+    EXPECT_EQ(strHeld, reasonOf(R"({"a":{"cpptype":"int"},"b":{"cpptype":"int"}})",
+                                "a int primary key, b int"));
+}
+
+TEST_F(Construction, RefusesTablesWithoutAKey)
+{
+    EXPECT_EQ("table \"front_keyless\": no primary key",
+              Front(database_, "front_keyless", word("int"), "m int").table->reason());
 }
 
 TEST_F(Construction, RefusesWhatItCannotOpen)
@@ -173,7 +184,7 @@ TEST_F(Construction, RefusesWhatItCannotOpen)
               VornJsonTable(database_.get(), "front_none", jDefinition, "crate table").reason());
     EXPECT_EQ("no such table: front_none",
               VornJsonTable(database_.get(), "front_none", jDefinition, "select 1").reason());
-    EXPECT_EQ("table \"front_none\": cannot modify front_none because it is a view",
+    EXPECT_EQ("table \"front_none\": no primary key",
               VornJsonTable(database_.get(), "front_none", jDefinition,
                             "create view if not exists front_none as select 1 as a")
                   .reason());

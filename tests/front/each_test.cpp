@@ -110,21 +110,6 @@ TEST_F(Each, LetsTheCallbackUseTheTable)
     EXPECT_EQ("0", front_.list({}));
 }
 
-TEST_F(Each, NeedsAKey)
-{
-    Front keyless(database_, R"({"a":{"cpptype":"int"}})", "a integer");
-    EXPECT_EQ("0", keyless.create(json(R"({"a":2})")));
-    EXPECT_EQ("0", keyless.create(json(R"({"a":1})")));
-    EXPECT_EQ("2", keyless.list({}, json(R"({"sort":["a"]})")));
-    EXPECT_EQ(json(R"([{"a":1},{"a":2}])"), keyless.jStored);
-    EXPECT_EQ("1", keyless.update(json(R"({"a":2})"), json(R"({"a":3})")));
-    EXPECT_EQ("refused: table \"" + keyless.strName + "\": no primary key", keyless.outcome([&] {
-        return keyless.table->each({}, {}, [](const Json::Value&) { return true; });
-    }));
-    EXPECT_EQ("refused: table \"" + keyless.strName + "\": no primary key",
-              keyless.list({}, json(R"({"after":{"a":1}})")));
-}
-
 class FrontLimits : public Each {
 protected:
     void limit(std::size_t VornJsonTable::Limits::*pLimit, std::size_t nMost)

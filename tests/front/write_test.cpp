@@ -134,9 +134,6 @@ TEST_F(Write, SavesAKeyThatOnlyTheCollationFindsEqual)
     EXPECT_EQ(json(R"({"code":"ABC","n":1})"), front.jStored);
     EXPECT_EQ("duplicate: duplicate: UNIQUE constraint failed: " + front.strName + ".code",
               front.create(json(R"({"code":"aBc"})")));
-    Front keyless(database_, R"({"n":{"cpptype":"int"}})", "n integer");
-    EXPECT_EQ("refused: table \"" + keyless.strName + "\": no primary key",
-              keyless.save(json(R"({"n":1})")));
 }
 
 TEST_F(Write, UpdatesAndRemovesByACondition)
