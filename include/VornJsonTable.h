@@ -90,9 +90,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cmath>
-#include <cstdint>
 #include <functional>
-#include <iterator>
 #include <limits>
 #include <map>
 #include <memory>
@@ -306,11 +304,12 @@ private:
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
         {"Json::Value", Json::nullValue, "a JSON value"}};
-    static constexpr int kMaxLevels = 1000;  // of JSON, as the library reads it
-    static constexpr int kMaxTerms = 300;    // of a condition
-    static constexpr int kMaxNesting = 10;   // of "$or"
-    static constexpr unsigned kBatch = 100;  // rows of a statement
-    static constexpr long long kPage = 200;  // rows of a page of each()
+    static constexpr int kMaxLevels = 1000;           // of JSON, as the library reads it
+    static constexpr int kMaxTerms = 300;             // of a condition
+    static constexpr int kMaxNesting = 10;            // of "$or"
+    static constexpr std::size_t kMaxPattern = 1000;  // bytes
+    static constexpr unsigned kBatch = 100;           // rows of a statement
+    static constexpr long long kPage = 200;           // rows of a page of each()
     static constexpr long long kNoLimit = std::numeric_limits<long long>::max();
 
     // ---- Calls
@@ -621,9 +620,11 @@ private:
             const Texts column = select("select type, dflt_value is null or pk " + strColumns +
                                         "name='" + item.first + "'");
             if (column.empty()) refuseMember(item.first, "the table has no column of this name");
-            checkColumn(item.second, column[0]);
+            checkAffinity(item.second, column[0]);
             if ("1" == column[1]) jAbsent_[item.first];
         }
+        if (blRowidKey_ && kLong != members_.at(key_[0]).form)
+            refuseMember(key_[0], "over an integer primary key, expected \"long long\"");
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
                                     join(names_, "','") + "')");
         if (!others.empty())
@@ -631,16 +632,13 @@ private:
     }
 
     // Another affinity changes a value or its order.
-    void checkColumn(const Member& member, const std::string& strType) const
+    void checkAffinity(const Member& member, const std::string& strType) const
     {
         const bool blText = kText == member.form || isJson(member.form);
         const std::string strKind = select("select typeof(cast('7' as " + strType + "))")[0];
         if (!strType.empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
             refuseMember(member.strName, "column type ", quoted(strType), ", expected ",
                          blText ? "a text column" : "an integer column");
-        if (blRowidKey_ && key_[0] == member.strName && kLong != member.form)
-            refuseMember(member.strName, "type word ", quoted(kForms[member.form].szWord),
-                         " over an integer primary key, expected \"long long\"");
     }
 
     // ---- Values
@@ -707,14 +705,14 @@ private:
 
     static bool isUtf8(const std::string& strText)
     {
-        constexpr std::uint32_t kLeast[] = {0, 0x80, 0x800, 0x10000};
+        constexpr unsigned kLeast[] = {0, 0x80, 0x800, 0x10000};
         const auto byteAt = [&](std::size_t u) { return static_cast<unsigned char>(strText[u]); };
         for (std::size_t u = 0; u < strText.size();) {
             const unsigned uLead = byteAt(u++);
             if (0x80 > uLead) continue;
             if (0xc0 > uLead || 0xf8 <= uLead) return false;
             const unsigned uMore = 0xf0 <= uLead ? 3 : 0xe0 <= uLead ? 2 : 1;
-            std::uint32_t c = uLead & (0x3fU >> uMore);
+            unsigned c = uLead & (0x3fU >> uMore);
             for (unsigned i = 0; i < uMore; ++i, ++u) {
                 if (0x80 != (byteAt(u) & 0xc0)) return false;  // so is the NUL at the end
                 c = c << 6 | (byteAt(u) & 0x3fU);
@@ -738,10 +736,7 @@ private:
     void checkKey(const Json::Value& jRecord) const
     {
         for (const std::string& strKey : key_)
-            if (jRecord[strKey].isNull())
-                refuseMember(strKey, "missing, expected ",
-                             kForms[members_.at(strKey).form].szExpected,
-                             ": it is part of the key");
+            if (jRecord[strKey].isNull()) refuseMember(strKey, "missing, expected the whole key");
     }
 
     // With its defaults, and null for what no column fills in: in an integer key, SQLite does.
@@ -763,13 +758,21 @@ private:
     }
 
     // insert into item (id,name) values (1,'x'),(2,'y')
-    // The records have the same members, and their keys if they are several. Returns the first row.
+    // One by one if the records have not all their keys and the same members. Returns the first
+    // row.
     Json::Value insert(std::vector<Json::Value> records)
     {
+        const Texts names = records[0].getMemberNames();
+        const auto isAlike = [&](const Json::Value& jRecord) {
+            return !jRecord[key_[0]].isNull() && names == jRecord.getMemberNames();
+        };
+        if (1 < records.size() && !std::all_of(records.begin(), records.end(), isAlike)) {
+            for (const Json::Value& jRecord : records) insert({jRecord});
+            return {};
+        }
         Texts lists;
         for (const Json::Value& jRecord : records) lists.push_back(values(jRecord));
-        const std::string strNames = join(records[0].getMemberNames(), ",");
-        write("insert into " + strName_ + " (" + strNames + ") values " + join(lists, ","),
+        write("insert into " + strName_ + " (" + join(names, ",") + ") values " + join(lists, ","),
               records.size());
         Json::Value& jKey = records[0][key_[0]];
         // One row was inserted, so the rowid is its own.
@@ -811,24 +814,12 @@ private:
                 batch.push_back(filled(jRecords[u]));
                 if (nMost > batch.size() && u + 1 < jRecords.size()) continue;
                 if (1 < nMost) strRecord_.clear();
-                insertBatch(std::move(batch));
+                insert(std::move(batch));
                 batch.clear();
             }
             strRecord_.clear();
             return jRecords.size();
         });
-    }
-
-    void insertBatch(std::vector<Json::Value> batch)
-    {
-        const Texts names = batch[0].getMemberNames();
-        const auto isAlike = [&](const Json::Value& jRecord) {
-            return !jRecord[key_[0]].isNull() && names == jRecord.getMemberNames();
-        };
-        if (std::all_of(batch.begin(), batch.end(), isAlike))
-            insert(std::move(batch));
-        else
-            for (const Json::Value& jRecord : batch) insert({jRecord});
     }
 
     // update item set (id,name)=(1,'x') where id=1
@@ -946,10 +937,8 @@ private:
                          kForms[member.form].szWord, "\", expected \"string\"",
                          blLike ? "" : ", \"int\" or \"long long\"");
         if (blLike || blOrder || !jValue.isNull()) checkFits(member, jValue);
-        const int nMost = sqlite3_limit(pDb_, SQLITE_LIMIT_LIKE_PATTERN_LENGTH, -1);
-        if (blLike && static_cast<std::size_t>(nMost) < jValue.asString().size())
-            refuseMember(member.strName, "operator \"$like\": a string of more than ",
-                         std::to_string(nMost), " bytes");
+        if (blLike && kMaxPattern < jValue.asString().size())
+            refuseMember(member.strName, "operator \"$like\": a string of more than 1000 bytes");
         if ("$eq" == strOperator) return equals(member.strName, jValue);
         return member.strName + found->second + literal(member.strName, jValue) +
                (blLike ? " escape '\\'" : "");
@@ -1075,11 +1064,10 @@ private:
     // Known before the rows take memory.
     std::size_t bytesOf(const std::string& strFilter) const
     {
-        const std::string strBefore = "ifnull(length(cast(";
-        const std::string strAfter = " as blob)),0)";
-        return std::stoull(select("select cast(total(n) as integer) from (select " + strBefore +
-                                  join(names_, (strAfter + "+" + strBefore).c_str()) + strAfter +
-                                  " as n from " + strName_ + " where (" + strFilter + "))")[0]);
+        const std::string strLengths = join(names_, " as blob)),0)+ifnull(length(cast(");
+        return std::stoull(select(
+            "select cast(total(n) as integer) from (select ifnull(length(cast(" + strLengths +
+            " as blob)),0) as n from " + strName_ + " where (" + strFilter + "))")[0]);
     }
 
     sqlite3* const pDb_;
@@ -1147,34 +1135,24 @@ inline int VornJsonTable::save(const Json::Value& jRecord, Json::Value& jStored)
 inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::Value& jOptions,
                                      const RowCallback& callback)
 {
-    std::string strWhere;
-    Json::Value jNext;
-    long long nRecords = call({&jCondition, &jOptions}, [&] {
-        strWhere = condition(jCondition);
+    return call({&jCondition, &jOptions}, [&] {
+        const std::string strWhere = condition(jCondition);
         checkOptions(jOptions);
-        jNext = jOptions;
-        return 0;
-    });
-    if (0 > nRecords) return -1;
-    long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
-    for (long long nRows = kPage; kPage == nRows; iLeft -= kPage) {
-        Json::Value jPage;
-        jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
-        // One call each, since the callback may make calls of its own.
-        nRows = call({}, [&] {
-            jPage = page(strWhere, jNext);
-            return jPage.size();
-        });
-        if (0 > nRows) return -1;
-        for (const Json::Value& jRecord : jPage) {
-            ++nRecords;
-            const long long iMore = call({}, [&] { return callback(jRecord) ? 1 : 0; });
-            if (1 != iMore) return 0 > iMore ? -1 : nRecords;
+        Json::Value jNext = jOptions;
+        long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
+        for (long long nRecords = 0;; iLeft -= kPage) {
+            jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
+            limitSteps(limits_.nSteps);  // a call of the callback's has ended that
+            const Json::Value jPage = page(strWhere, jNext);
+            for (const Json::Value& jRecord : jPage) {
+                ++nRecords;
+                if (!callback(jRecord)) return nRecords;
+            }
+            if (kPage > static_cast<long long>(jPage.size())) return nRecords;
+            jNext["after"] = jPage[jPage.size() - 1];
+            jNext.removeMember("offset");
         }
-        if (0 < nRows) jNext["after"] = jPage[jPage.size() - 1];
-        jNext.removeMember("offset");
-    }
-    return nRecords;
+    });
 }
 
 #endif

@@ -84,8 +84,7 @@ TEST_F(Construction, RefusesColumnsThatChangeAValueOrItsOrder)
         for (const char* szWord : {"int", "long long", "bool"})
             expectType(szWord, szType, "an integer column");
     for (const char* szWord : {"int", "bool"})
-        expectReason(std::string("member \"m\": type word \"") + szWord +
-                         "\" over an integer primary key, expected \"long long\"",
+        expectReason("member \"m\": over an integer primary key, expected \"long long\"",
                      word(szWord), "m integer primary key");
     // This one is not the rowid.
     expectReason("", word("int"), "m integer primary key desc");

@@ -12,9 +12,7 @@ constexpr char kMembers[] = R"({
 constexpr char kColumns[] =
     "id integer primary key, name text unique, note text not null, tags text";
 
-constexpr char kMissingKey[] =
-    "refused: member \"id\": missing, expected an integer from -9223372036854775808 to "
-    "9223372036854775807: it is part of the key";
+constexpr char kMissingKey[] = "refused: member \"id\": missing, expected the whole key";
 constexpr char kOtherValue[] =
     ": the row holds another value than was sent; a trigger may have set it";
 
