@@ -44,7 +44,7 @@
 /// Transactions: a call that writes runs in a transaction of its own (`begin immediate`), or in a
 /// savepoint if the host has a transaction open; a call that reads runs in a read transaction. Some
 /// errors make SQLite roll back the host's transaction too: a full disk, `on conflict rollback`,
-/// a statement that is out of steps. The reason then says so.
+/// a statement that is out of steps. sqlite3_get_autocommit() tells.
 ///
 /// Locks: while another connection holds a lock, a call tries again for five seconds or more, as
 /// the calls of VornJsonDbApi do. If the lock outlasts that, the cause is kLocked.
@@ -147,8 +147,12 @@ public:
     /// - columns that are missing, not in the definition, generated, or spelt in another case;
     /// - names that are not plain identifiers, or that SQLite does not take without quotes;
     /// - another definition of the same table name earlier in the process.
-    VornJsonTable(sqlite3* pDb, std::string strName, Json::Value jDefinition,
-                  std::string strCreate);
+    VornJsonTable(sqlite3* pDb, std::string strName, Json::Value jDefinition, std::string strCreate)
+        : pDb_(pDb), strName_(std::move(strName))
+    {
+        call({}, [&] { return open(jDefinition, strCreate); });
+        strRefused_ = end_.strReason;
+    }
 
     VornJsonTable(const VornJsonTable&) = delete;
     VornJsonTable& operator=(const VornJsonTable&) = delete;
@@ -183,18 +187,51 @@ public:
     /// where SQLite does not make one.
     ///
     /// Returns 0 or -1.
-    int create(const Json::Value& jRecord, Json::Value& jStored);
+    int create(const Json::Value& jRecord, Json::Value& jStored)
+    {
+        return static_cast<int>(call({&jRecord}, [&] {
+            const Json::Value jFilled = filled(jRecord);
+            jStored = transact("begin immediate", [&] { return insert({jFilled}); });
+            return 0;
+        }));
+    }
 
     /// Inserts every record of the array @p jRecords as create() does, all of them or none.
     /// Records of the same members go into one statement. The reason names the record that failed
     /// by its position, counted from 0. Returns their number, or -1.
-    long long createMany(const Json::Value& jRecords);
+    long long createMany(const Json::Value& jRecords)
+    {
+        return call({&jRecords}, [&] {
+            expect(jRecords.isArray(), "the records are ", jRecords, "an array");
+            try {
+                return insertAll(jRecords, kBatch);
+            } catch (const Failure& failure) {
+                if (Cause::kRefused == failure.cause || Cause::kLocked == failure.cause ||
+                    Cause::kLimit == failure.cause)
+                    throw;
+            }
+            // One by one, to find the record that failed.
+            return insertAll(jRecords, 1);
+        });
+    }
 
     /// Updates the row that has the key of @p jRecord, or inserts the record as create() does, and
     /// sets @p jStored to the row as it was read back. The record must contain the whole key.
     /// Members left out keep their value, unless a trigger sets them. No other row is touched: a
     /// conflict with another constraint is a duplicate. Returns 0 or -1.
-    int save(const Json::Value& jRecord, Json::Value& jStored);
+    int save(const Json::Value& jRecord, Json::Value& jStored)
+    {
+        return static_cast<int>(call({&jRecord}, [&] {
+            check(jRecord);
+            checkKey(jRecord);
+            const std::string strKey = keyTerm(jRecord);
+            jStored = transact("begin immediate", [&] {
+                const bool blThere = 0 < change(strKey, jRecord);
+                return blThere ? readBack({strKey})[0] : insert({filled(jRecord)});
+            });
+            return 0;
+        }));
+    }
 
     /// Sets @p jRecords to the array of the records that the condition selects. Returns their
     /// number, or -1.
@@ -216,7 +253,27 @@ public:
     /// Returns the number of calls, also if the callback stopped, or -1. If the callback throws
     /// anything but std::bad_alloc, the result is -1 with its message as the reason.
     long long each(const Json::Value& jCondition, const Json::Value& jOptions,
-                   const RowCallback& callback);
+                   const RowCallback& callback)
+    {
+        return call({&jCondition, &jOptions}, [&] {
+            const std::string strWhere = condition(jCondition);
+            checkOptions(jOptions);
+            Json::Value jNext = jOptions;
+            long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
+            for (long long nRecords = 0;; iLeft -= kPage) {
+                jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
+                limitSteps(limits_.nSteps);  // a call of the callback's has ended that
+                const Json::Value jPage = page(strWhere, jNext);
+                for (const Json::Value& jRecord : jPage) {
+                    ++nRecords;
+                    if (!callback(jRecord)) return nRecords;
+                }
+                if (kPage > static_cast<long long>(jPage.size())) return nRecords;
+                jNext["after"] = jPage[jPage.size() - 1];
+                jNext.removeMember("offset");
+            }
+        });
+    }
 
     /// Sets @p jRecord to the first record, in the order of the key, that the condition selects.
     /// Returns 1, or 0 if there is none, or -1.
@@ -235,11 +292,10 @@ public:
     long long count(const Json::Value& jCondition)
     {
         return call({&jCondition}, [&] {
-            const std::string strSql = "select count(*) from " + strName_ + " where ";
-            const std::string strWhere = condition(jCondition);
+            const std::string strWhere = " where " + condition(jCondition);
             return transact("begin", [&] {
                 lockForReading();
-                return std::stoll(select(strSql + strWhere)[0]);
+                return std::stoll(select("select count(*) from " + strName_ + strWhere)[0]);
             });
         });
     }
@@ -378,7 +434,6 @@ private:
     template <typename Work>
     long long call(std::initializer_list<const Json::Value*> arguments, Work work)
     {
-        const bool blHosts = nullptr != pDb_ && 0 == sqlite3_get_autocommit(pDb_);
         Failure end;
         long long iResult = -1;
         strRecord_.clear();
@@ -403,8 +458,6 @@ private:
             end = {Cause::kFailed, "the callback threw", {}};
         }
         limitSteps(0);
-        if (0 > iResult && blHosts && 0 != sqlite3_get_autocommit(pDb_))
-            end.strReason += "; SQLite has rolled back the host's transaction";
         std::swap(end_, end);
         return iResult;
     }
@@ -933,9 +986,9 @@ private:
         const bool blLike = "$like" == strOperator;
         const bool blOrder = '<' == *found->second || '>' == *found->second;
         if ((blLike && kText != member.form) || (blOrder && kLong < member.form))
-            refuseMember(member.strName, "operator ", quoted(strOperator), ": type word \"",
-                         kForms[member.form].szWord, "\", expected \"string\"",
-                         blLike ? "" : ", \"int\" or \"long long\"");
+            refuseMember(member.strName, "operator ", quoted(strOperator), ": type word ",
+                         quoted(kForms[member.form].szWord), ", expected ",
+                         blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\"");
         if (blLike || blOrder || !jValue.isNull()) checkFits(member, jValue);
         if (blLike && kMaxPattern < jValue.asString().size())
             refuseMember(member.strName, "operator \"$like\": a string of more than 1000 bytes");
@@ -1084,75 +1137,5 @@ private:
     std::string strRecord_;   // which one of several is at work, for the reason
     int nTerms_ = 0;          // of the condition that is being translated
 };
-
-inline VornJsonTable::VornJsonTable(sqlite3* pDb, std::string strName, Json::Value jDefinition,
-                                    std::string strCreate)
-    : pDb_(pDb), strName_(std::move(strName))
-{
-    call({}, [&] { return open(jDefinition, strCreate); });
-    strRefused_ = end_.strReason;
-}
-
-inline int VornJsonTable::create(const Json::Value& jRecord, Json::Value& jStored)
-{
-    return static_cast<int>(call({&jRecord}, [&] {
-        const Json::Value jFilled = filled(jRecord);
-        jStored = transact("begin immediate", [&] { return insert({jFilled}); });
-        return 0;
-    }));
-}
-
-inline long long VornJsonTable::createMany(const Json::Value& jRecords)
-{
-    return call({&jRecords}, [&] {
-        expect(jRecords.isArray(), "the records are ", jRecords, "an array");
-        try {
-            return insertAll(jRecords, kBatch);
-        } catch (const Failure& failure) {
-            if (Cause::kRefused == failure.cause || Cause::kLocked == failure.cause ||
-                Cause::kLimit == failure.cause)
-                throw;
-        }
-        // One by one, to find the record that failed.
-        return insertAll(jRecords, 1);
-    });
-}
-
-inline int VornJsonTable::save(const Json::Value& jRecord, Json::Value& jStored)
-{
-    return static_cast<int>(call({&jRecord}, [&] {
-        check(jRecord);
-        checkKey(jRecord);
-        const std::string strKey = keyTerm(jRecord);
-        jStored = transact("begin immediate", [&] {
-            const bool blThere = 0 < change(strKey, jRecord);
-            return blThere ? readBack({strKey})[0] : insert({filled(jRecord)});
-        });
-        return 0;
-    }));
-}
-
-inline long long VornJsonTable::each(const Json::Value& jCondition, const Json::Value& jOptions,
-                                     const RowCallback& callback)
-{
-    return call({&jCondition, &jOptions}, [&] {
-        const std::string strWhere = condition(jCondition);
-        checkOptions(jOptions);
-        Json::Value jNext = jOptions;
-        long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
-        for (long long nRecords = 0;; iLeft -= kPage) {
-            jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
-            limitSteps(limits_.nSteps);  // a call of the callback's has ended that
-            const Json::Value jPage = page(strWhere, jNext);
-            for (const Json::Value& jRecord : jPage) {
-                ++nRecords;
-                if (!callback(jRecord)) return nRecords;
-            }
-            if (kPage > static_cast<long long>(jPage.size())) return nRecords;
-            jNext["after"] = jPage[jPage.size() - 1];
-            jNext.removeMember("offset");
-        }
-    });
-}
 
 #endif
