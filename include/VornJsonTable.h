@@ -203,11 +203,13 @@ public:
     {
         return call({&jRecords}, [&] {
             expect(jRecords.isArray(), "the records are ", jRecords, "an array");
+            const int iAutocommit = sqlite3_get_autocommit(pDb_);
             try {
                 return insertAll(jRecords, kBatch);
             } catch (const Failure& failure) {
+                // A trigger may have ended the host's transaction.
                 if (Cause::kRefused == failure.cause || Cause::kLocked == failure.cause ||
-                    Cause::kLimit == failure.cause)
+                    Cause::kLimit == failure.cause || iAutocommit != sqlite3_get_autocommit(pDb_))
                     throw;
             }
             // One by one, to find the record that failed.

@@ -247,4 +247,20 @@ TEST_F(Write, EndsWhenTheHostsTransactionIsLost)
     EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
 }
 
+// The trigger sees a row of the host's transaction, so a second attempt after it would succeed.
+TEST_F(Write, TriesNothingAgainOutsideTheHostsTransaction)
+{
+    front_.run(
+        "create table @_closed (a); create trigger @_t before insert on @ when new.id = 3 and "
+        "exists (select 1 from @_closed) begin select raise(rollback, 'closed'); end");
+    const Json::Value jRecords = json(R"([{"id":1},{"id":2},{"id":3},{"id":4}])");
+    front_.run("begin; insert into @_closed values (1)");
+    EXPECT_EQ(-1, front_.table->createMany(jRecords));
+    EXPECT_EQ("closed", front_.table->reason());
+    EXPECT_EQ(VornJsonTable::Cause::kFailed, front_.table->cause());
+    EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
+    EXPECT_EQ("0", front_.list({}));
+    EXPECT_EQ("4", front_.createMany(jRecords));
+}
+
 }  // namespace
