@@ -493,23 +493,21 @@ private:
                  " steps");
         if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
             fail(Cause::kLocked, "locked: ", strError);
-        Failure failure{Cause::kFailed, strError, {}};
         if (SQLITE_CONSTRAINT_UNIQUE != iCode && SQLITE_CONSTRAINT_PRIMARYKEY != iCode &&
             SQLITE_CONSTRAINT_ROWID != iCode)
-            throw failure;
+            fail(Cause::kFailed, strError);
         // UNIQUE constraint failed: item.name, item.lang
+        Texts columns;
         std::istringstream words(strError.substr(strError.find(':') + 1));
         for (std::string strWord; words >> strWord && "index" != strWord;) {
             const std::size_t uDot = std::min(strWord.find('.'), strWord.size());
             // A trigger may have written to another table.
             if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str()))
-                throw Failure{Cause::kFailed, strError, {}};
+                fail(Cause::kFailed, strError);
             strWord.erase(0, uDot + 1);
-            failure.columns.push_back(strWord.substr(0, strWord.find(',')));
+            columns.push_back(strWord.substr(0, strWord.find(',')));
         }
-        failure.cause = Cause::kDuplicate;
-        failure.strReason = "duplicate: " + strError;
-        throw failure;
+        throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
 
     // Runs one statement that gives no rows and returns the number of rows changed.
@@ -960,9 +958,8 @@ private:
     {
         const Texts names = jValue.isObject() ? jValue.getMemberNames() : Texts();
         const auto isOperator = [](const std::string& strName) { return '$' == strName[0]; };
-        const bool blOperators = isJson(member.form)
-                                     ? std::any_of(names.begin(), names.end(), isOperator)
-                                     : jValue.isObject();
+        const bool blAny = std::any_of(names.begin(), names.end(), isOperator);
+        const bool blOperators = isJson(member.form) ? blAny : jValue.isObject();
         if (!blOperators) return term(member, "$eq", jValue);
         if (names.empty()) refuseMember(member.strName, "an empty object, expected operators");
         Texts parts;
@@ -1101,10 +1098,11 @@ private:
             Json::Value jRecords(Json::arrayValue);
             std::size_t nBytes = 0;
             for (const std::string& strRange : ranges) {
-                const std::string strFilter = strWhere + " and " + strRange + ") order by " +
-                                              join(order, ",") + " limit " +
-                                              std::to_string(iLimit - jRecords.size()) +
-                                              " offset (" + std::to_string(iOffset);
+                const std::string strFilter =
+                    join({strWhere, " and ", strRange, ") order by ", join(order, ","), " limit ",
+                          std::to_string(iLimit - jRecords.size()), " offset (",
+                          std::to_string(iOffset)},
+                         "");
                 if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
                 checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
