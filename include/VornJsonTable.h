@@ -165,6 +165,11 @@ public:
     /// expressions.
     const std::vector<std::string>& columns() const { return end_.columns; }
 
+    /// After createMany() failed: the position of the record that failed, counted from 0; -1 if it
+    /// was no single one, such as after a lock, a constraint that SQLite checks at the commit, or a
+    /// trigger that ended the host's transaction. -1 after any other call.
+    long long record() const { return end_.iRecord; }
+
     /// The members of the primary key, in its order.
     const std::vector<std::string>& key() const { return key_; }
 
@@ -197,8 +202,8 @@ public:
     }
 
     /// Inserts every record of the array @p jRecords as create() does, all of them or none.
-    /// Records of the same members go into one statement. The reason names the record that failed
-    /// by its position, counted from 0. Returns their number, or -1.
+    /// Records of the same members go into one statement. record() gives the position of the one
+    /// that failed, and the reason begins with it. Returns their number, or -1.
     long long createMany(const Json::Value& jRecords)
     {
         return call({&jRecords}, [&] {
@@ -208,7 +213,7 @@ public:
                 return insertAll(jRecords, kBatch);
             } catch (const Failure& failure) {
                 // A trigger may have ended the host's transaction.
-                if (Cause::kRefused == failure.cause || Cause::kLocked == failure.cause ||
+                if (0 <= failure.iRecord || Cause::kLocked == failure.cause ||
                     Cause::kLimit == failure.cause || iAutocommit != sqlite3_get_autocommit(pDb_))
                     throw;
             }
@@ -346,6 +351,7 @@ private:
         Cause cause = Cause::kNone;
         std::string strReason = {};
         Texts columns = {};
+        long long iRecord = -1;
     };
 
     using SortKeys = std::vector<std::pair<std::string, bool>>;  // true: descending
@@ -438,7 +444,6 @@ private:
     {
         Failure end;
         long long iResult = -1;
-        strRecord_.clear();
         try {
             if (!strRefused_.empty()) refuse(strRefused_);
             std::size_t nMembers = 0;
@@ -450,7 +455,6 @@ private:
             iResult = work();
         } catch (const Failure& failure) {
             end = failure;
-            end.strReason.insert(0, strRecord_);
         } catch (const std::bad_alloc&) {
             limitSteps(0);
             throw;
@@ -863,14 +867,18 @@ private:
         return transact("begin immediate", [&] {
             std::vector<Json::Value> batch;
             for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
-                strRecord_ = "record " + std::to_string(u) + ": ";
-                batch.push_back(filled(jRecords[u]));
-                if (nMost > batch.size() && u + 1 < jRecords.size()) continue;
-                if (1 < nMost) strRecord_.clear();
-                insert(std::move(batch));
-                batch.clear();
+                try {
+                    batch.push_back(filled(jRecords[u]));
+                    if (nMost > batch.size() && u + 1 < jRecords.size()) continue;
+                    insert(std::move(batch));
+                    batch.clear();
+                } catch (Failure& failure) {
+                    if (1 < nMost && Cause::kRefused != failure.cause) throw;
+                    failure.strReason.insert(0, "record " + std::to_string(u) + ": ");
+                    failure.iRecord = u;
+                    throw;
+                }
             }
-            strRecord_.clear();
             return jRecords.size();
         });
     }
@@ -1134,7 +1142,6 @@ private:
     Limits limits_{0, 0, 0, 0, 0};
     std::string strRefused_;  // why the construction was refused
     Failure end_;             // of the last call
-    std::string strRecord_;   // which one of several is at work, for the reason
     int nTerms_ = 0;          // of the condition that is being translated
 };
 

@@ -77,20 +77,24 @@ TEST_F(Write, CreatesManyOrNone)
     const struct {
         const char* szRecords;
         const char* szOutcome;
+        long long iRecord;
     } cases[] = {
         {R"([{"id":3,"name":"c"},{"id":4,"name":"a"},{"id":5,"name":"d"}])",
-         "duplicate: record 1: duplicate: UNIQUE constraint failed: @.name"},
+         "duplicate: record 1: duplicate: UNIQUE constraint failed: @.name", 1},
         {R"([{"id":3,"name":"c"},{"id":3,"name":"d"}])",
-         "duplicate: record 1: duplicate: UNIQUE constraint failed: @.id"},
+         "duplicate: record 1: duplicate: UNIQUE constraint failed: @.id", 1},
         {R"([{"name":"c"},{"id":3},{"id":4,"nam":"a"}])",
-         "refused: record 2: member \"nam\": not declared for the table \"@\""},
+         "refused: record 2: member \"nam\": not declared for the table \"@\"", 2},
         {R"([{"id":3},{"id":4},7])",
-         "refused: record 2: the record is the integer 7, expected an object"},
-        {R"({"id":3})", "refused: the records are an object, expected an array"},
+         "refused: record 2: the record is the integer 7, expected an object", 2},
+        {R"({"id":3})", "refused: the records are an object, expected an array", -1},
     };
     for (const auto& one : cases) {
         SCOPED_TRACE(one.szRecords);
         expectUnchanged(front_.named(one.szOutcome), front_.createMany(json(one.szRecords)));
+        EXPECT_EQ(-1, front_.table->record());  // all() was the last call
+        front_.createMany(json(one.szRecords));
+        EXPECT_EQ(one.iRecord, front_.table->record());
     }
     Json::Value jMany = json("[]");
     for (int i = 0; i < 250; ++i) jMany[i]["name"] = "n" + std::to_string(i % 203);
@@ -247,6 +251,19 @@ TEST_F(Write, EndsWhenTheHostsTransactionIsLost)
     EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
 }
 
+TEST_F(Write, BlamesNoRecordForWhatFailsAtTheCommit)
+{
+    Front front(database_, R"({"id":{"cpptype":"long long"},"of":{"cpptype":"long long"}})",
+                "id integer primary key, of integer references @ deferrable initially deferred");
+    EXPECT_EQ("", front.table->reason());
+    front.run("pragma foreign_keys=on");
+    EXPECT_EQ("2", front.createMany(json(R"([{"id":1,"of":2},{"id":2}])")));
+    EXPECT_EQ("failed: FOREIGN KEY constraint failed",
+              front.createMany(json(R"([{"id":3},{"id":4,"of":9},{"id":5}])")));
+    EXPECT_EQ(-1, front.table->record());
+    EXPECT_EQ("2", front.list({}));
+}
+
 // The trigger sees a row of the host's transaction, so a second attempt after it would succeed.
 TEST_F(Write, TriesNothingAgainOutsideTheHostsTransaction)
 {
@@ -257,6 +274,7 @@ TEST_F(Write, TriesNothingAgainOutsideTheHostsTransaction)
     front_.run("begin; insert into @_closed values (1)");
     EXPECT_EQ(-1, front_.table->createMany(jRecords));
     EXPECT_EQ("closed", front_.table->reason());
+    EXPECT_EQ(-1, front_.table->record());
     EXPECT_EQ(VornJsonTable::Cause::kFailed, front_.table->cause());
     EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
     EXPECT_EQ("0", front_.list({}));
