@@ -208,17 +208,12 @@ public:
     {
         return call({&jRecords}, [&] {
             expect(jRecords.isArray(), "the records are ", jRecords, "an array");
-            const int iAutocommit = sqlite3_get_autocommit(pDb_);
-            try {
-                return insertAll(jRecords, kBatch);
-            } catch (const Failure& failure) {
-                // A trigger may have ended the host's transaction.
-                if (0 <= failure.iRecord || Cause::kLocked == failure.cause ||
-                    Cause::kLimit == failure.cause || iAutocommit != sqlite3_get_autocommit(pDb_))
-                    throw;
-            }
-            // One by one, to find the record that failed.
-            return insertAll(jRecords, 1);
+            return transact("begin immediate", [&] {
+                const Json::ArrayIndex nRecords = jRecords.size();
+                for (Json::ArrayIndex u = 0; u < nRecords; u += kBatch)
+                    insertRange(jRecords, u, std::min(u + kBatch, nRecords));
+                return nRecords;
+            });
         });
     }
 
@@ -378,30 +373,22 @@ private:
 
     // ---- Calls
 
-    template <typename... Parts>
-    [[noreturn]] static void fail(Cause cause, const Parts&... parts)
+    [[noreturn]] static void fail(Cause cause, const std::string& strReason)
     {
-        std::string strReason;
-        ((strReason += parts), ...);
-        throw Failure{cause, strReason, {}};
+        throw Failure{cause, strReason};
     }
 
-    template <typename... Parts>
-    [[noreturn]] static void refuse(const Parts&... parts)
-    {
-        fail(Cause::kRefused, parts...);
-    }
+    [[noreturn]] static void refuse(const std::string& strWhy) { fail(Cause::kRefused, strWhy); }
 
-    template <typename... Parts>
-    [[noreturn]] static void refuseMember(const std::string& strMember, const Parts&... parts)
+    [[noreturn]] static void refuseMember(const std::string& strMember, const std::string& strWhy)
     {
-        refuse("member ", quoted(strMember), ": ", parts...);
+        refuse("member " + quoted(strMember) + ": " + strWhy);
     }
 
     static void expect(bool blFits, const std::string& strWhat, const Json::Value& jValue,
                        const char* szExpected)
     {
-        if (!blFits) refuse(strWhat, kindOf(jValue), ", expected ", szExpected);
+        if (!blFits) refuse(strWhat + kindOf(jValue) + ", expected " + szExpected);
     }
 
     // Runs the work in a transaction, or in a savepoint of the host's, and undoes it if it throws.
@@ -459,9 +446,9 @@ private:
             limitSteps(0);
             throw;
         } catch (const std::exception& error) {
-            end = {Cause::kFailed, error.what(), {}};
+            end = {Cause::kFailed, error.what()};
         } catch (...) {
-            end = {Cause::kFailed, "the callback threw", {}};
+            end = {Cause::kFailed, "the callback threw"};
         }
         limitSteps(0);
         std::swap(end_, end);
@@ -471,7 +458,8 @@ private:
     static void checkLimit(const char* szWhat, std::size_t nMost, std::size_t n, const char* szUnit)
     {
         if (0 < nMost && nMost < n)
-            fail(Cause::kLimit, "the ", szWhat, " has more than ", std::to_string(nMost), szUnit);
+            fail(Cause::kLimit,
+                 "the " + (szWhat + (" has more than " + std::to_string(nMost))) + szUnit);
     }
 
     static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes)
@@ -493,10 +481,10 @@ private:
         const int iPrimary = iCode & 0xff;
         const std::string strError = sqlite3_errmsg(pDb_);
         if (SQLITE_INTERRUPT == iPrimary && 0 < limits_.nSteps)
-            fail(Cause::kLimit, "a statement takes more than ", std::to_string(limits_.nSteps),
-                 " steps");
+            fail(Cause::kLimit,
+                 "a statement takes more than " + std::to_string(limits_.nSteps) + " steps");
         if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
-            fail(Cause::kLocked, "locked: ", strError);
+            fail(Cause::kLocked, "locked: " + strError);
         if (SQLITE_CONSTRAINT_UNIQUE != iCode && SQLITE_CONSTRAINT_PRIMARYKEY != iCode &&
             SQLITE_CONSTRAINT_ROWID != iCode)
             fail(Cause::kFailed, strError);
@@ -563,38 +551,40 @@ private:
         if (0 > pApi_->recList(jRequest, jRows)) failSql();
     }
 
-    // The SQL of a value that fits.
-    std::string literal(const std::string& strMember, const Json::Value& jValue)
+    // The SQL of a value that fits: 'O''Brien', 5, null
+    std::string literal(std::string strMember, const Json::Value& jValue)
     {
-        return jValue.isNull() ? "null" : equals(strMember, jValue).substr(strMember.size() + 1);
+        if (jValue.isNull()) return "null";
+        std::string strTerm;  // name='O''Brien'
+        if (0 > pApi_->SqlMakeByMatchField(strMember, const_cast<Json::Value&>(jValue), strTerm))
+            throw std::bad_alloc();
+        return strTerm.substr(strMember.size() + 1);
     }
 
     // name='O''Brien', id=5, note is null
     std::string equals(const std::string& strMember, const Json::Value& jValue)
     {
-        if (jValue.isNull()) return strMember + " is null";
-        std::string strField = strMember;
-        std::string strTerm;
-        if (0 > pApi_->SqlMakeByMatchField(strField, const_cast<Json::Value&>(jValue), strTerm))
-            throw std::bad_alloc();
-        return strTerm;
+        return strMember + (jValue.isNull() ? " is " : "=") + literal(strMember, jValue);
     }
 
     // ('x','en')
     std::string values(const Json::Value& jRecord)
     {
-        Texts parts;
-        for (auto it = jRecord.begin(); it != jRecord.end(); ++it)
-            parts.push_back(literal(it.name(), *it));
-        return "(" + join(parts, ",") + ")";
+        const auto value = [&](const auto& strName) { return literal(strName, jRecord[strName]); };
+        return "(" + join(jRecord.getMemberNames(), ",", value) + ")";
+    }
+
+    template <typename Range, typename ToText>
+    static std::string join(const Range& range, const char* szBetween, ToText toText)
+    {
+        std::string strOut;
+        for (const auto& each : range) strOut += (strOut.empty() ? "" : szBetween) + toText(each);
+        return strOut;
     }
 
     static std::string join(const Texts& texts, const char* szBetween)
     {
-        std::string strOut;
-        for (const std::string& strText : texts)
-            strOut += (strOut.empty() ? "" : szBetween) + strText;
-        return strOut;
+        return join(texts, szBetween, [](const auto& strText) { return strText; });
     }
 
     // ---- Construction
@@ -607,7 +597,7 @@ private:
         const Json::Value jMembers =
             Json::Path("." + strName_ + ".member").resolve(std::as_const(jDefinition));
         if (!jMembers.isObject() || jMembers.empty())
-            refuse("the definition has no members for the table ", quoted(strName_));
+            refuse("the definition has no members for the table " + quoted(strName_));
         names_ = jMembers.getMemberNames();
         Json::Value jTypes;
         for (const std::string& strMember : names_) {
@@ -623,11 +613,11 @@ private:
             lockForReading();
             readColumns();
             if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
-                refuse("table ", quoted(strName_), ": ", sqlite3_errmsg(pDb_));
+                refuse("table " + quoted(strName_) + ": " + sqlite3_errmsg(pDb_));
             // Types are kept by table name for the life of the process.
             const Json::Value& jHeld = VORN_JSON_DB::recType(jDefinition, strName_);
             if (jHeld.toStyledString() != jTypes.toStyledString())
-                refuse("the process already holds the table ", quoted(strName_),
+                refuse("the process already holds the table " + quoted(strName_) +
                        " with other types; use the same definition or another name");
             return 0;
         });
@@ -637,16 +627,17 @@ private:
     // "current_time" is the time even so.
     void checkName(const char* szWhat, const std::string& strName) const
     {
-        const std::string strLetters = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_";
         const bool blPlain =
-            std::string::npos != strLetters.find(strName[0]) &&
-            std::string::npos == strName.find_first_not_of(strLetters + "0123456789");
+            '9' < strName[0] &&
+            std::string::npos ==
+                strName.find_first_not_of(
+                    "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_0123456789");
         const std::string strSql = "with " + strName + " as (select 7 as \"" + strName +
                                    "\") select " + strName + "||" + strName + " from " + strName +
                                    " where (" + strName + "=7) order by " + strName + " desc";
         if (!blPlain || !prepare(strSql) || Texts{"77"} != select(strSql))
             refuse(
-                szWhat, quoted(strName),
+                szWhat + quoted(strName) +
                 ": expected a name of letters, digits and \"_\" that SQLite takes without quotes");
     }
 
@@ -658,7 +649,7 @@ private:
         const auto found = std::find_if(std::begin(kForms), std::end(kForms),
                                         [&](const auto& row) { return row.szWord == strWord; });
         if (std::end(kForms) == found)
-            refuseMember(strMember, "type word ", quoted(strWord), ", expected ", kWords);
+            refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
         const Member member{strMember, static_cast<Form>(found - std::begin(kForms))};
         const Json::Value& jDefault = jMember["cppDefaultValue"];
         if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
@@ -669,7 +660,7 @@ private:
     {
         const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
         key_ = select("select name " + strColumns + "pk order by pk");
-        if (key_.empty()) refuse("table ", quoted(strName_), ": no primary key");
+        if (key_.empty()) refuse("table " + quoted(strName_) + ": no primary key");
         // An integer primary key is the rowid itself and has no index.
         const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
         blRowidKey_ = select("select 1 " + strIndexes + "origin='pk'").empty();
@@ -677,7 +668,13 @@ private:
             const Texts column = select("select type, dflt_value is null or pk " + strColumns +
                                         "name='" + item.first + "'");
             if (column.empty()) refuseMember(item.first, "the table has no column of this name");
-            checkAffinity(item.second, column[0]);
+            // Another affinity changes a value or its order.
+            const Form form = item.second.form;
+            const bool blText = kText == form || isJson(form);
+            const std::string strKind = select("select typeof(cast('7' as " + column[0] + "))")[0];
+            if (!column[0].empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
+                refuseMember(item.first, "column type " + quoted(column[0]) + ", expected " +
+                                             (blText ? "a text column" : "an integer column"));
             if ("1" == column[1]) jAbsent_[item.first];
         }
         if (blRowidKey_ && kLong != members_.at(key_[0]).form)
@@ -685,17 +682,7 @@ private:
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
                                     join(names_, "','") + "')");
         if (!others.empty())
-            refuse("column ", quoted(others[0]), ": not in the definition; declare it");
-    }
-
-    // Another affinity changes a value or its order.
-    void checkAffinity(const Member& member, const std::string& strType) const
-    {
-        const bool blText = kText == member.form || isJson(member.form);
-        const std::string strKind = select("select typeof(cast('7' as " + strType + "))")[0];
-        if (!strType.empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
-            refuseMember(member.strName, "column type ", quoted(strType), ", expected ",
-                         blText ? "a text column" : "an integer column");
+            refuse("column " + quoted(others[0]) + ": not in the definition; declare it");
     }
 
     // ---- Values
@@ -704,7 +691,7 @@ private:
     {
         const auto found = members_.find(strMember);
         if (members_.end() == found)
-            refuseMember(strMember, "not declared for the table ", quoted(strName_));
+            refuseMember(strMember, "not declared for the table " + quoted(strName_));
         return found->second;
     }
 
@@ -738,35 +725,34 @@ private:
 
     static void checkFits(const Member& member, const Json::Value& jValue, const char* szIs = "")
     {
-        if (!hasKind(member.form, jValue))
-            refuseMember(member.strName, szIs, kindOf(jValue), ", expected ",
-                         kForms[member.form].szExpected);
-        const bool blText = kText == member.form;
-        if (!isExact(jValue, 1) || (blText && std::string::npos != jValue.asString().find('\0')))
-            refuseMember(
-                member.strName, szIs, kindOf(jValue), ", expected UTF-8",
-                blText ? " without NUL bytes" : ", finite numbers and 1000 levels at most");
+        const bool blKind = hasKind(member.form, jValue);
+        if (blKind && isExact(member.form, jValue, 1)) return;
+        const char* szExact = kText == member.form
+                                  ? "UTF-8 without NUL bytes"
+                                  : "UTF-8, finite numbers and 1000 levels at most";
+        refuseMember(member.strName, szIs + kindOf(jValue) + ", expected " +
+                                         (blKind ? szExact : kForms[member.form].szExpected));
     }
 
     // Whether a text can hold the value.
-    static bool isExact(const Json::Value& jValue, int iLevel)
+    static bool isExact(Form form, const Json::Value& jValue, int iLevel)
     {
         if (kMaxLevels < iLevel) return false;
-        if (jValue.isString()) return isUtf8(jValue.asString());
+        if (jValue.isString()) return isUtf8(jValue.asString(), kText != form);
         if (Json::realValue == jValue.type()) return std::isfinite(jValue.asDouble());
         for (auto it = jValue.begin(); it != jValue.end(); ++it)
-            if (!isExact(*it, iLevel + 1) || (jValue.isObject() && !isUtf8(it.name())))
+            if (!isExact(form, *it, iLevel + 1) || (jValue.isObject() && !isUtf8(it.name(), true)))
                 return false;
         return true;
     }
 
-    static bool isUtf8(const std::string& strText)
+    static bool isUtf8(const std::string& strText, bool blNul)
     {
         constexpr unsigned kLeast[] = {0, 0x80, 0x800, 0x10000};
         const auto byteAt = [&](std::size_t u) { return static_cast<unsigned char>(strText[u]); };
         for (std::size_t u = 0; u < strText.size();) {
             const unsigned uLead = byteAt(u++);
-            if (0x80 > uLead) continue;
+            if (0x80 > uLead && (blNul || 0 != uLead)) continue;
             if (0xc0 > uLead || 0xf8 <= uLead) return false;
             const unsigned uMore = 0xf0 <= uLead ? 3 : 0xe0 <= uLead ? 2 : 1;
             unsigned c = uLead & (0x3fU >> uMore);
@@ -809,9 +795,8 @@ private:
     // code='x' and lang='en'
     std::string keyTerm(const Json::Value& jRecord)
     {
-        Texts parts;
-        for (const std::string& strKey : key_) parts.push_back(equals(strKey, jRecord[strKey]));
-        return join(parts, " and ");
+        const auto part = [&](const auto& strKey) { return equals(strKey, jRecord[strKey]); };
+        return join(key_, " and ", part);
     }
 
     // insert into item (id,name) values (1,'x'),(2,'y')
@@ -827,9 +812,9 @@ private:
             for (const Json::Value& jRecord : records) insert({jRecord});
             return {};
         }
-        Texts lists;
-        for (const Json::Value& jRecord : records) lists.push_back(values(jRecord));
-        write("insert into " + strName_ + " (" + join(names, ",") + ") values " + join(lists, ","),
+        const auto list = [&](const Json::Value& jRecord) { return values(jRecord); };
+        write("insert into " + strName_ + " (" + join(names, ",") + ") values " +
+                  join(records, ",", list),
               records.size());
         Json::Value& jKey = records[0][key_[0]];
         // One row was inserted, so the rowid is its own.
@@ -857,30 +842,30 @@ private:
     {
         for (const std::string& strName : jSent.getMemberNames())
             if (literal(strName, jSent[strName]) != literal(strName, jStored[strName]))
-                fail(Cause::kChanged, "member ", quoted(strName),
-                     ": the row holds another value than was sent; a trigger may have set it");
+                fail(Cause::kChanged,
+                     "member " + quoted(strName) +
+                         ": the row holds another value than was sent; a trigger may have set it");
     }
 
-    // All of the records or none, in statements of up to so many.
-    Json::ArrayIndex insertAll(const Json::Value& jRecords, std::size_t nMost)
+    // Inserts the records from uFrom to before uTo together, or one by one to find what failed.
+    void insertRange(const Json::Value& jRecords, Json::ArrayIndex uFrom, Json::ArrayIndex uTo)
     {
-        return transact("begin immediate", [&] {
-            std::vector<Json::Value> batch;
-            for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
-                try {
-                    batch.push_back(filled(jRecords[u]));
-                    if (nMost > batch.size() && u + 1 < jRecords.size()) continue;
-                    insert(std::move(batch));
-                    batch.clear();
-                } catch (Failure& failure) {
-                    if (1 < nMost && Cause::kRefused != failure.cause) throw;
-                    failure.strReason.insert(0, "record " + std::to_string(u) + ": ");
-                    failure.iRecord = u;
-                    throw;
-                }
+        std::vector<Json::Value> records;
+        try {
+            for (Json::ArrayIndex u = uFrom; u < uTo; ++u) records.push_back(filled(jRecords[u]));
+            transact("begin immediate", [&] { return insert(records); });
+        } catch (Failure& failure) {
+            if (Cause::kLocked == failure.cause) throw;
+            const bool blRefused = Cause::kRefused == failure.cause;
+            if (blRefused || uFrom + 1 == uTo) {
+                failure.iRecord = uFrom + (blRefused ? records.size() : 0);
+                failure.strReason.insert(0, "record " + std::to_string(failure.iRecord) + ": ");
+                throw;
             }
-            return jRecords.size();
-        });
+            // A trigger may have ended the transaction.
+            if (0 != sqlite3_get_autocommit(pDb_)) throw;
+            for (Json::ArrayIndex u = uFrom; u < uTo; ++u) insertRange(jRecords, u, u + 1);
+        }
     }
 
     // update item set (id,name)=(1,'x') where id=1
@@ -889,14 +874,13 @@ private:
     {
         lockForReading();
         // The key of each row as it will be: quote() gives the SQL of a value.
-        Texts columns;
-        for (const std::string& strKey : key_) {
+        const auto column = [&](const auto& strKey) {
             const bool blSet = jValues.isMember(strKey);
-            columns.push_back("'" + strKey + "='||quote(" +
-                              (blSet ? literal(strKey, jValues[strKey]) : strKey) + ")");
-        }
-        const Texts terms = select("select " + join(columns, "||' and '||") + " from " + strName_ +
-                                   " where " + strWhere);
+            return "'" + strKey + "='||quote(" +
+                   (blSet ? literal(strKey, jValues[strKey]) : strKey) + ")";
+        };
+        const Texts terms = select("select " + join(key_, "||' and '||", column) + " from " +
+                                   strName_ + " where " + strWhere);
         write("update " + strName_ + " set (" + join(jValues.getMemberNames(), ",") +
                   ")=" + values(jValues) + " where " + strWhere,
               terms.size());
@@ -935,7 +919,8 @@ private:
     {
         nTerms_ = 0;
         const bool blEmpty = jCondition.empty() && !jCondition.isArray();
-        if (blEmpty && nullptr != szIfEmpty) refuse("the condition is empty; ", szIfEmpty);
+        if (blEmpty && nullptr != szIfEmpty)
+            refuse(std::string("the condition is empty; ") + szIfEmpty);
         return blEmpty ? "1" : "(" + terms(jCondition, 0) + ")";
     }
 
@@ -954,9 +939,8 @@ private:
             }
             expect(jValue.isArray() && !jValue.empty(), "operator \"$or\": ", jValue,
                    "an array of one or more conditions");
-            Texts either;
-            for (const Json::Value& jEach : jValue) either.push_back(terms(jEach, iNesting + 1));
-            parts.push_back("((" + join(either, ") or (") + "))");
+            const auto each = [&](const auto& jEach) { return terms(jEach, iNesting + 1); };
+            parts.push_back("((" + join(jValue, ") or (", each) + "))");
         }
         return join(parts, " and ");
     }
@@ -970,37 +954,40 @@ private:
         const bool blOperators = isJson(member.form) ? blAny : jValue.isObject();
         if (!blOperators) return term(member, "$eq", jValue);
         if (names.empty()) refuseMember(member.strName, "an empty object, expected operators");
-        Texts parts;
-        for (const std::string& strName : names)
-            parts.push_back(term(member, strName, jValue[strName]));
-        return join(parts, " and ");
+        const auto part = [&](const auto& str) { return term(member, str, jValue[str]); };
+        return join(names, " and ", part);
     }
 
     std::string term(const Member& member, const std::string& strOperator,
                      const Json::Value& jValue)
     {
         if (kMaxTerms < ++nTerms_)
-            refuse("the condition has more than ", std::to_string(kMaxTerms), " terms");
+            refuse("the condition has more than " + std::to_string(kMaxTerms) + " terms");
         if ("$in" == strOperator) return listTerm(member, jValue);
-        static const std::map<std::string, const char*> operators = {
-            {"$eq", "="}, {"$ne", " is not "}, {"$gt", ">"},       {"$gte", ">="},
-            {"$lt", "<"}, {"$lte", "<="},      {"$like", " like "}};
+        // Its SQL, and the last form that it is for.
+        static const std::map<std::string, std::pair<const char*, Form>> operators = {
+            {"$eq", {"=", kAny}},        {"$ne", {" is not ", kAny}}, {"$gt", {">", kLong}},
+            {"$gte", {">=", kLong}},     {"$lt", {"<", kLong}},       {"$lte", {"<=", kLong}},
+            {"$like", {" like ", kText}}};
         const auto found = operators.find(strOperator);
+        const std::string strWhat = "operator " + quoted(strOperator) + ": ";
         if (operators.end() == found)
-            refuseMember(member.strName, "operator ", quoted(strOperator),
-                         ": unknown, expected \"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", "
-                         "\"$lte\", \"$in\" or \"$like\"");
-        const bool blLike = "$like" == strOperator;
-        const bool blOrder = '<' == *found->second || '>' == *found->second;
-        if ((blLike && kText != member.form) || (blOrder && kLong < member.form))
-            refuseMember(member.strName, "operator ", quoted(strOperator), ": type word ",
-                         quoted(kForms[member.form].szWord), ", expected ",
-                         blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\"");
-        if (blLike || blOrder || !jValue.isNull()) checkFits(member, jValue);
+            refuseMember(member.strName,
+                         strWhat +
+                             "unknown, expected \"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", "
+                             "\"$lte\", \"$in\" or \"$like\"");
+        const auto [szSql, last] = found->second;
+        const bool blLike = kText == last;
+        if (last < member.form)
+            refuseMember(member.strName,
+                         strWhat + "type word " + quoted(kForms[member.form].szWord) +
+                             ", expected " +
+                             (blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\""));
+        if (kAny != last || !jValue.isNull()) checkFits(member, jValue);
         if (blLike && kMaxPattern < jValue.asString().size())
-            refuseMember(member.strName, "operator \"$like\": a string of more than 1000 bytes");
+            refuseMember(member.strName, strWhat + "a string of more than 1000 bytes");
         if ("$eq" == strOperator) return equals(member.strName, jValue);
-        return member.strName + found->second + literal(member.strName, jValue) +
+        return member.strName + szSql + literal(member.strName, jValue) +
                (blLike ? " escape '\\'" : "");
     }
 
@@ -1036,7 +1023,7 @@ private:
             else if ("after" == strOption)
                 expect(jValue.isObject(), strWhat, jValue, "a record");
             else
-                refuse(strWhat, "unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
+                refuse(strWhat + "unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
         }
     }
 
@@ -1089,9 +1076,8 @@ private:
     {
         checkOptions(jOptions);
         const SortKeys keys = sortKeys(jOptions["sort"]);
-        Texts order;
-        for (const auto& [strName, blDescending] : keys)
-            order.push_back(strName + (blDescending ? " desc" : ""));
+        const auto order = [](const auto& key) { return key.first + (key.second ? " desc" : ""); };
+        const std::string strOrder = join(keys, ",", order);
         const long long iOffset = jOptions.get("offset", 0).asInt64();
         const long long iAsked = jOptions.get("limit", Json::Int64(kNoLimit)).asInt64();
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
@@ -1107,7 +1093,7 @@ private:
             std::size_t nBytes = 0;
             for (const std::string& strRange : ranges) {
                 const std::string strFilter =
-                    join({strWhere, " and ", strRange, ") order by ", join(order, ","), " limit ",
+                    join({strWhere, " and ", strRange, ") order by ", strOrder, " limit ",
                           std::to_string(iLimit - jRecords.size()), " offset (",
                           std::to_string(iOffset)},
                          "");
