@@ -336,11 +336,6 @@ private:
         const char* szExpected;
     };
 
-    struct Member {
-        std::string strName;
-        Form form;
-    };
-
     // How a call ended. Thrown and caught inside.
     struct Failure {
         Cause cause = Cause::kNone;
@@ -490,14 +485,14 @@ private:
             fail(Cause::kFailed, strError);
         // UNIQUE constraint failed: item.name, item.lang
         Texts columns;
+        const std::string strTable = strName_ + ".";
+        const int iLength = static_cast<int>(strTable.size());
         std::istringstream words(strError.substr(strError.find(':') + 1));
         for (std::string strWord; words >> strWord && "index" != strWord;) {
-            const std::size_t uDot = std::min(strWord.find('.'), strWord.size());
             // A trigger may have written to another table.
-            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str()))
+            if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), iLength))
                 fail(Cause::kFailed, strError);
-            strWord.erase(0, uDot + 1);
-            columns.push_back(strWord.substr(0, strWord.find(',')));
+            columns.push_back(strWord.substr(iLength, strWord.find(',') - iLength));
         }
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
@@ -527,18 +522,17 @@ private:
         return {pStatement, sqlite3_finalize};
     }
 
-    // The cells of a statement of the table's own, row by row; NULL as an empty text.
+    // The first column of a statement of the table's own; NULL as an empty text.
     Texts select(const std::string& strSql) const
     {
         const auto pStatement = prepare(strSql);
         if (nullptr == pStatement) failSql();
         Texts cells;
         int iStatus = sqlite3_step(pStatement.get());
-        for (; SQLITE_ROW == iStatus; iStatus = sqlite3_step(pStatement.get()))
-            for (int i = 0; i < sqlite3_column_count(pStatement.get()); ++i) {
-                const auto* szText = sqlite3_column_text(pStatement.get(), i);
-                cells.emplace_back(szText ? reinterpret_cast<const char*>(szText) : "");
-            }
+        for (; SQLITE_ROW == iStatus; iStatus = sqlite3_step(pStatement.get())) {
+            const auto* szText = sqlite3_column_text(pStatement.get(), 0);
+            cells.emplace_back(szText ? reinterpret_cast<const char*>(szText) : "");
+        }
         if (SQLITE_DONE != iStatus) failSql();
         return cells;
     }
@@ -650,10 +644,9 @@ private:
                                         [&](const auto& row) { return row.szWord == strWord; });
         if (std::end(kForms) == found)
             refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
-        const Member member{strMember, static_cast<Form>(found - std::begin(kForms))};
+        members_[strMember] = static_cast<Form>(found - std::begin(kForms));
         const Json::Value& jDefault = jMember["cppDefaultValue"];
-        if (!jDefault.isNull()) checkFits(member, jDefault, "the default is ");
-        members_.emplace(strMember, member);
+        if (!jDefault.isNull()) checkFits(strMember, jDefault, "the default is ");
     }
 
     void readColumns()
@@ -664,20 +657,20 @@ private:
         // An integer primary key is the rowid itself and has no index.
         const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
         blRowidKey_ = select("select 1 " + strIndexes + "origin='pk'").empty();
-        for (const auto& item : members_) {
-            const Texts column = select("select type, dflt_value is null or pk " + strColumns +
-                                        "name='" + item.first + "'");
-            if (column.empty()) refuseMember(item.first, "the table has no column of this name");
+        for (const std::string& strMember : names_) {
+            const std::string strIs = strColumns + "name='" + strMember + "'";
+            const Texts types = select("select type " + strIs);
+            if (types.empty()) refuseMember(strMember, "the table has no column of this name");
             // Another affinity changes a value or its order.
-            const Form form = item.second.form;
-            const bool blText = kText == form || isJson(form);
-            const std::string strKind = select("select typeof(cast('7' as " + column[0] + "))")[0];
-            if (!column[0].empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
-                refuseMember(item.first, "column type " + quoted(column[0]) + ", expected " +
-                                             (blText ? "a text column" : "an integer column"));
-            if ("1" == column[1]) jAbsent_[item.first];
+            const bool blText = kText == formOf(strMember) || isJson(formOf(strMember));
+            const std::string strKind = select("select typeof(cast('7' as " + types[0] + "))")[0];
+            if (!types[0].empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
+                refuseMember(strMember, "column type " + quoted(types[0]) + ", expected " +
+                                            (blText ? "a text column" : "an integer column"));
+            if (!select("select 1 " + strIs + " and (pk or dflt_value is null)").empty())
+                jAbsent_[strMember];
         }
-        if (blRowidKey_ && kLong != members_.at(key_[0]).form)
+        if (blRowidKey_ && kLong != formOf(key_[0]))
             refuseMember(key_[0], "over an integer primary key, expected \"long long\"");
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
                                     join(names_, "','") + "')");
@@ -687,7 +680,7 @@ private:
 
     // ---- Values
 
-    const Member& declared(const std::string& strMember) const
+    Form formOf(const std::string& strMember) const
     {
         const auto found = members_.find(strMember);
         if (members_.end() == found)
@@ -706,32 +699,30 @@ private:
         constexpr const char* kKinds[] = {
             "null",     "the integer ", "the integer ", "a number with a fraction",
             "a string", "a boolean",    "an array",     "an object"};
-        return kKinds[jValue.type()] + (isInteger(jValue) ? jValue.asString() : "");
+        const bool blInteger = jValue.isIntegral() && Json::realValue != jValue.type();
+        return kKinds[jValue.type()] + (blInteger ? jValue.asString() : "");
     }
 
     static bool isJson(Form form) { return kObject <= form; }
 
-    static bool isInteger(const Json::Value& jValue)
-    {
-        return Json::intValue == jValue.type() || Json::uintValue == jValue.type();
-    }
-
     static bool hasKind(Form form, const Json::Value& jValue)
     {
-        if (kInt == form) return isInteger(jValue) && jValue.isInt();
-        if (kLong == form) return isInteger(jValue) && jValue.isInt64();
+        if (kInt == form || kLong == form)
+            return Json::realValue != jValue.type() &&
+                   (kInt == form ? jValue.isInt() : jValue.isInt64());
         return kAny == form || kForms[form].type == jValue.type();
     }
 
-    static void checkFits(const Member& member, const Json::Value& jValue, const char* szIs = "")
+    void checkFits(const std::string& strMember, const Json::Value& jValue,
+                   const char* szIs = "") const
     {
-        const bool blKind = hasKind(member.form, jValue);
-        if (blKind && isExact(member.form, jValue, 1)) return;
-        const char* szExact = kText == member.form
-                                  ? "UTF-8 without NUL bytes"
-                                  : "UTF-8, finite numbers and 1000 levels at most";
-        refuseMember(member.strName, szIs + kindOf(jValue) + ", expected " +
-                                         (blKind ? szExact : kForms[member.form].szExpected));
+        const Form form = formOf(strMember);
+        const bool blKind = hasKind(form, jValue);
+        if (blKind && isExact(form, jValue, 1)) return;
+        const char* szExact = kText == form ? "UTF-8 without NUL bytes"
+                                            : "UTF-8, finite numbers and 1000 levels at most";
+        refuseMember(strMember, szIs + kindOf(jValue) + ", expected " +
+                                    (blKind ? szExact : kForms[form].szExpected));
     }
 
     // Whether a text can hold the value.
@@ -771,8 +762,10 @@ private:
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
-            const Member& member = declared(it.name());
-            if (!it->isNull()) checkFits(member, *it);
+            if (it->isNull())
+                formOf(it.name());
+            else
+                checkFits(it.name(), *it);
         }
     }
 
@@ -934,7 +927,7 @@ private:
         for (const std::string& strName : jCondition.getMemberNames()) {
             const Json::Value& jValue = jCondition[strName];
             if ("$or" != strName) {
-                parts.push_back(memberTerms(declared(strName), jValue));
+                parts.push_back(memberTerms(strName, jValue));
                 continue;
             }
             expect(jValue.isArray() && !jValue.empty(), "operator \"$or\": ", jValue,
@@ -946,24 +939,24 @@ private:
     }
 
     // A JSON member may equal an object: only names that begin with "$" are operators.
-    std::string memberTerms(const Member& member, const Json::Value& jValue)
+    std::string memberTerms(const std::string& strMember, const Json::Value& jValue)
     {
         const Texts names = jValue.isObject() ? jValue.getMemberNames() : Texts();
         const auto isOperator = [](const std::string& strName) { return '$' == strName[0]; };
         const bool blAny = std::any_of(names.begin(), names.end(), isOperator);
-        const bool blOperators = isJson(member.form) ? blAny : jValue.isObject();
-        if (!blOperators) return term(member, "$eq", jValue);
-        if (names.empty()) refuseMember(member.strName, "an empty object, expected operators");
-        const auto part = [&](const auto& str) { return term(member, str, jValue[str]); };
+        const bool blOperators = isJson(formOf(strMember)) ? blAny : jValue.isObject();
+        if (!blOperators) return term(strMember, "$eq", jValue);
+        if (names.empty()) refuseMember(strMember, "an empty object, expected operators");
+        const auto part = [&](const auto& str) { return term(strMember, str, jValue[str]); };
         return join(names, " and ", part);
     }
 
-    std::string term(const Member& member, const std::string& strOperator,
+    std::string term(const std::string& strMember, const std::string& strOperator,
                      const Json::Value& jValue)
     {
         if (kMaxTerms < ++nTerms_)
             refuse("the condition has more than " + std::to_string(kMaxTerms) + " terms");
-        if ("$in" == strOperator) return listTerm(member, jValue);
+        if ("$in" == strOperator) return listTerm(strMember, jValue);
         // Its SQL, and the last form that it is for.
         static const std::map<std::string, std::pair<const char*, Form>> operators = {
             {"$eq", {"=", kAny}},        {"$ne", {" is not ", kAny}}, {"$gt", {">", kLong}},
@@ -972,38 +965,37 @@ private:
         const auto found = operators.find(strOperator);
         const std::string strWhat = "operator " + quoted(strOperator) + ": ";
         if (operators.end() == found)
-            refuseMember(member.strName,
+            refuseMember(strMember,
                          strWhat +
                              "unknown, expected \"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", "
                              "\"$lte\", \"$in\" or \"$like\"");
         const auto [szSql, last] = found->second;
+        const Form form = formOf(strMember);
         const bool blLike = kText == last;
-        if (last < member.form)
-            refuseMember(member.strName,
-                         strWhat + "type word " + quoted(kForms[member.form].szWord) +
-                             ", expected " +
+        if (last < form)
+            refuseMember(strMember,
+                         strWhat + "type word " + quoted(kForms[form].szWord) + ", expected " +
                              (blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\""));
-        if (kAny != last || !jValue.isNull()) checkFits(member, jValue);
+        if (kAny != last || !jValue.isNull()) checkFits(strMember, jValue);
         if (blLike && kMaxPattern < jValue.asString().size())
-            refuseMember(member.strName, strWhat + "a string of more than 1000 bytes");
-        if ("$eq" == strOperator) return equals(member.strName, jValue);
-        return member.strName + szSql + literal(member.strName, jValue) +
-               (blLike ? " escape '\\'" : "");
+            refuseMember(strMember, strWhat + "a string of more than 1000 bytes");
+        if ("$eq" == strOperator) return equals(strMember, jValue);
+        return strMember + szSql + literal(strMember, jValue) + (blLike ? " escape '\\'" : "");
     }
 
     // A record without the member is in no list, unless null is in the list.
-    std::string listTerm(const Member& member, const Json::Value& jList)
+    std::string listTerm(const std::string& strMember, const Json::Value& jList)
     {
-        expect(jList.isArray(), "member " + quoted(member.strName) + ": operator \"$in\": ", jList,
+        expect(jList.isArray(), "member " + quoted(strMember) + ": operator \"$in\": ", jList,
                "an array");
         Texts items;
         for (const Json::Value& jValue : jList) {
             if (jValue.isNull()) continue;
-            checkFits(member, jValue);
-            items.push_back(literal(member.strName, jValue));
+            checkFits(strMember, jValue);
+            items.push_back(literal(strMember, jValue));
         }
-        const std::string strNull = " or " + member.strName + " is null";
-        return "(" + member.strName + " in (" + join(items, ",") + ")" +
+        const std::string strNull = " or " + strMember + " is null";
+        return "(" + strMember + " in (" + join(items, ",") + ")" +
                (items.size() < jList.size() ? strNull : "") + ")";
     }
 
@@ -1036,10 +1028,10 @@ private:
             expect(jKey.isString(), "option \"sort\": ", jKey, "the name of a member");
             const std::string strKey = jKey.asString();
             blDescending = '-' == strKey[0];
-            const Member& member = declared(strKey.substr(blDescending ? 1 : 0));
-            if (isJson(member.form))
-                refuseMember(member.strName, "JSON in option \"sort\", expected what has an order");
-            keys.emplace_back(member.strName, blDescending);
+            const std::string strMember = strKey.substr(blDescending ? 1 : 0);
+            if (isJson(formOf(strMember)))
+                refuseMember(strMember, "JSON in option \"sort\", expected what has an order");
+            keys.emplace_back(strMember, blDescending);
         }
         for (const std::string& strKey : key_) {
             const auto isKey = [&](const auto& key) { return strKey == key.first; };
@@ -1077,8 +1069,9 @@ private:
         checkOptions(jOptions);
         const SortKeys keys = sortKeys(jOptions["sort"]);
         const auto order = [](const auto& key) { return key.first + (key.second ? " desc" : ""); };
-        const std::string strOrder = join(keys, ",", order);
+        const std::string strOrder = ") order by " + join(keys, ",", order) + " limit ";
         const long long iOffset = jOptions.get("offset", 0).asInt64();
+        const std::string strOffset = " offset (" + std::to_string(iOffset);
         const long long iAsked = jOptions.get("limit", Json::Int64(kNoLimit)).asInt64();
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
@@ -1092,11 +1085,9 @@ private:
             Json::Value jRecords(Json::arrayValue);
             std::size_t nBytes = 0;
             for (const std::string& strRange : ranges) {
+                const std::string strLimit = std::to_string(iLimit - jRecords.size());
                 const std::string strFilter =
-                    join({strWhere, " and ", strRange, ") order by ", strOrder, " limit ",
-                          std::to_string(iLimit - jRecords.size()), " offset (",
-                          std::to_string(iOffset)},
-                         "");
+                    strWhere + " and " + strRange + strOrder + strLimit + strOffset;
                 if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
                 checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
@@ -1120,7 +1111,7 @@ private:
     sqlite3* const pDb_;
     std::string strName_;
     std::unique_ptr<VornJsonDbApi> pApi_;
-    std::map<std::string, Member> members_;
+    std::map<std::string, Form> members_;
     Texts names_;          // of the members
     Json::Value jAbsent_;  // null for each member that neither SQLite nor its column fills in
     Texts key_;
