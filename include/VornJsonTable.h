@@ -621,15 +621,12 @@ private:
     // "current_time" is the time even so.
     void checkName(const char* szWhat, const std::string& strName) const
     {
-        const bool blPlain =
-            '9' < strName[0] &&
-            std::string::npos ==
-                strName.find_first_not_of(
-                    "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_0123456789");
-        const std::string strSql = "with " + strName + " as (select 7 as \"" + strName +
-                                   "\") select " + strName + "||" + strName + " from " + strName +
-                                   " where (" + strName + "=7) order by " + strName + " desc";
-        if (!blPlain || !prepare(strSql) || Texts{"77"} != select(strSql))
+        constexpr char kPlain[] = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_0123456789";
+        const std::string strSql = join({"with ", " as (select 7 as ", ") select ", "||", " from ",
+                                         " where (", "=7) order by ", " desc"},
+                                        strName.c_str());
+        if ('9' >= strName[0] || std::string::npos != strName.find_first_not_of(kPlain) ||
+            !prepare(strSql) || Texts{"77"} != select(strSql))
             refuse(
                 szWhat + quoted(strName) +
                 ": expected a name of letters, digits and \"_\" that SQLite takes without quotes");
@@ -646,7 +643,7 @@ private:
             refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
         members_[strMember] = static_cast<Form>(found - std::begin(kForms));
         const Json::Value& jDefault = jMember["cppDefaultValue"];
-        if (!jDefault.isNull()) checkFits(strMember, jDefault, "the default is ");
+        checkFits(strMember, jDefault, "the default is ");
     }
 
     void readColumns()
@@ -718,7 +715,7 @@ private:
     {
         const Form form = formOf(strMember);
         const bool blKind = hasKind(form, jValue);
-        if (blKind && isExact(form, jValue, 1)) return;
+        if (jValue.isNull() || (blKind && isExact(form, jValue, 1))) return;
         const char* szExact = kText == form ? "UTF-8 without NUL bytes"
                                             : "UTF-8, finite numbers and 1000 levels at most";
         refuseMember(strMember, szIs + kindOf(jValue) + ", expected " +
@@ -762,10 +759,7 @@ private:
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
-            if (it->isNull())
-                formOf(it.name());
-            else
-                checkFits(it.name(), *it);
+            checkFits(it.name(), *it);
         }
     }
 
@@ -868,9 +862,8 @@ private:
         lockForReading();
         // The key of each row as it will be: quote() gives the SQL of a value.
         const auto column = [&](const auto& strKey) {
-            const bool blSet = jValues.isMember(strKey);
             return "'" + strKey + "='||quote(" +
-                   (blSet ? literal(strKey, jValues[strKey]) : strKey) + ")";
+                   (jValues.isMember(strKey) ? literal(strKey, jValues[strKey]) : strKey) + ")";
         };
         const Texts terms = select("select " + join(key_, "||' and '||", column) + " from " +
                                    strName_ + " where " + strWhere);
@@ -976,7 +969,9 @@ private:
             refuseMember(strMember,
                          strWhat + "type word " + quoted(kForms[form].szWord) + ", expected " +
                              (blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\""));
-        if (kAny != last || !jValue.isNull()) checkFits(strMember, jValue);
+        if (kAny != last && jValue.isNull())
+            refuseMember(strMember, kindOf(jValue) + ", expected " + kForms[form].szExpected);
+        checkFits(strMember, jValue);
         if (blLike && kMaxPattern < jValue.asString().size())
             refuseMember(strMember, strWhat + "a string of more than 1000 bytes");
         if ("$eq" == strOperator) return equals(strMember, jValue);
@@ -990,9 +985,8 @@ private:
                "an array");
         Texts items;
         for (const Json::Value& jValue : jList) {
-            if (jValue.isNull()) continue;
             checkFits(strMember, jValue);
-            items.push_back(literal(strMember, jValue));
+            if (!jValue.isNull()) items.push_back(literal(strMember, jValue));
         }
         const std::string strNull = " or " + strMember + " is null";
         return "(" + strMember + " in (" + join(items, ",") + ")" +
@@ -1102,10 +1096,12 @@ private:
     // Known before the rows take memory.
     std::size_t bytesOf(const std::string& strFilter) const
     {
-        const std::string strLengths = join(names_, " as blob)),0)+ifnull(length(cast(");
-        return std::stoull(select(
-            "select cast(total(n) as integer) from (select ifnull(length(cast(" + strLengths +
-            " as blob)),0) as n from " + strName_ + " where (" + strFilter + "))")[0]);
+        const auto length = [](const auto& strName) {
+            return "ifnull(length(cast(" + strName + " as blob)),0)";
+        };
+        return std::stoull(select("select cast(total(n) as integer) from (select " +
+                                  join(names_, "+", length) + " as n from " + strName_ +
+                                  " where (" + strFilter + "))")[0]);
     }
 
     sqlite3* const pDb_;
