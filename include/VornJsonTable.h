@@ -228,8 +228,8 @@ public:
             checkKey(jRecord);
             const std::string strKey = keyTerm(jRecord);
             jStored = transact("begin immediate", [&] {
-                const bool blThere = 0 < change(strKey, jRecord);
-                return blThere ? readBack({strKey})[0] : insert({filled(jRecord)});
+                if (0 < change(strKey, jRecord)) return readBack({strKey})[0];
+                return insert({filled(jRecord)});
             });
             return 0;
         }));
@@ -264,7 +264,6 @@ public:
             long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
             for (long long nRecords = 0;; iLeft -= kPage) {
                 jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
-                limitSteps(limits_.nSteps);  // a call of the callback's has ended that
                 const Json::Value jPage = page(strWhere, jNext);
                 for (const Json::Value& jRecord : jPage) {
                     ++nRecords;
@@ -312,7 +311,7 @@ public:
     }
 
     /// The same for every record of the table.
-    long long updateAll(const Json::Value& jValues) { return updateRows({}, jValues, nullptr); }
+    long long updateAll(const Json::Value& jValues) { return updateRows({}, jValues, ""); }
 
     /// Deletes the records that the condition selects. An empty condition is refused. Returns the
     /// number of rows deleted, or -1.
@@ -322,7 +321,7 @@ public:
     }
 
     /// Deletes every record. Returns the number of rows deleted, or -1.
-    long long removeAll() { return removeRows({}, nullptr); }
+    long long removeAll() { return removeRows({}, ""); }
 
 private:
     using Texts = std::vector<std::string>;
@@ -358,12 +357,8 @@ private:
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
         {"Json::Value", Json::nullValue, "a JSON value"}};
-    static constexpr int kMaxLevels = 1000;           // of JSON, as the library reads it
-    static constexpr int kMaxTerms = 300;             // of a condition
-    static constexpr int kMaxNesting = 10;            // of "$or"
-    static constexpr std::size_t kMaxPattern = 1000;  // bytes
-    static constexpr unsigned kBatch = 100;           // rows of a statement
-    static constexpr long long kPage = 200;           // rows of a page of each()
+    static constexpr unsigned kBatch = 100;  // rows of a statement
+    static constexpr long long kPage = 200;  // rows of a page of each()
     static constexpr long long kNoLimit = std::numeric_limits<long long>::max();
 
     // ---- Calls
@@ -393,6 +388,7 @@ private:
         const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
         const char* szUndo =
             blHosts ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
+        limitSteps(limits_.nSteps);
         run(blHosts ? "savepoint vorn_json_table" : szBegin);
         try {
             auto result = work();
@@ -403,7 +399,6 @@ private:
             // Twice, because the first may lack memory. SQLite may have rolled back by itself.
             for (int i = 0; i < 2 && 0 == sqlite3_get_autocommit(pDb_); ++i)
                 if (SQLITE_OK == sqlite3_exec(pDb_, szUndo, nullptr, nullptr, nullptr)) break;
-            limitSteps(limits_.nSteps);
             throw;
         }
     }
@@ -424,37 +419,35 @@ private:
     template <typename Work>
     long long call(std::initializer_list<const Json::Value*> arguments, Work work)
     {
-        Failure end;
         long long iResult = -1;
         try {
             if (!strRefused_.empty()) refuse(strRefused_);
             std::size_t nMembers = 0;
             std::size_t nBytes = 0;
             for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes);
-            checkLimit("request", limits_.nRequestMembers, nMembers, " members");
-            checkLimit("request", limits_.nRequestBytes, nBytes, " bytes");
-            limitSteps(limits_.nSteps);
+            checkLimit("the request", limits_.nRequestMembers, nMembers, " members");
+            checkLimit("the request", limits_.nRequestBytes, nBytes, " bytes");
             iResult = work();
+            end_ = {};
         } catch (const Failure& failure) {
-            end = failure;
+            end_ = failure;
         } catch (const std::bad_alloc&) {
             limitSteps(0);
             throw;
         } catch (const std::exception& error) {
-            end = {Cause::kFailed, error.what()};
+            end_ = {Cause::kFailed, error.what()};
         } catch (...) {
-            end = {Cause::kFailed, "the callback threw"};
+            end_ = {Cause::kFailed, "the callback threw"};
         }
         limitSteps(0);
-        std::swap(end_, end);
         return iResult;
     }
 
-    static void checkLimit(const char* szWhat, std::size_t nMost, std::size_t n, const char* szUnit)
+    static void checkLimit(const std::string& strWhat, std::size_t nMost, std::size_t n,
+                           const char* szUnit)
     {
         if (0 < nMost && nMost < n)
-            fail(Cause::kLimit,
-                 "the " + (szWhat + (" has more than " + std::to_string(nMost))) + szUnit);
+            fail(Cause::kLimit, strWhat + " has more than " + std::to_string(nMost) + szUnit);
     }
 
     static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes)
@@ -642,8 +635,7 @@ private:
         if (std::end(kForms) == found)
             refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
         members_[strMember] = static_cast<Form>(found - std::begin(kForms));
-        const Json::Value& jDefault = jMember["cppDefaultValue"];
-        checkFits(strMember, jDefault, "the default is ");
+        checkFits(strMember, jMember["cppDefaultValue"], "the default is ");
     }
 
     void readColumns()
@@ -655,8 +647,7 @@ private:
         const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
         blRowidKey_ = select("select 1 " + strIndexes + "origin='pk'").empty();
         for (const std::string& strMember : names_) {
-            const std::string strIs = strColumns + "name='" + strMember + "'";
-            const Texts types = select("select type " + strIs);
+            const Texts types = select("select type " + strColumns + "name='" + strMember + "'");
             if (types.empty()) refuseMember(strMember, "the table has no column of this name");
             // Another affinity changes a value or its order.
             const bool blText = kText == formOf(strMember) || isJson(formOf(strMember));
@@ -664,9 +655,9 @@ private:
             if (!types[0].empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
                 refuseMember(strMember, "column type " + quoted(types[0]) + ", expected " +
                                             (blText ? "a text column" : "an integer column"));
-            if (!select("select 1 " + strIs + " and (pk or dflt_value is null)").empty())
-                jAbsent_[strMember];
         }
+        const std::string strAbsent = "select name " + strColumns + "pk or dflt_value is null";
+        for (const std::string& strMember : select(strAbsent)) jAbsent_[strMember];
         if (blRowidKey_ && kLong != formOf(key_[0]))
             refuseMember(key_[0], "over an integer primary key, expected \"long long\"");
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
@@ -725,7 +716,7 @@ private:
     // Whether a text can hold the value.
     static bool isExact(Form form, const Json::Value& jValue, int iLevel)
     {
-        if (kMaxLevels < iLevel) return false;
+        if (1000 < iLevel) return false;  // the library reads no more
         if (jValue.isString()) return isUtf8(jValue.asString(), kText != form);
         if (Json::realValue == jValue.type()) return std::isfinite(jValue.asDouble());
         for (auto it = jValue.begin(); it != jValue.end(); ++it)
@@ -758,9 +749,7 @@ private:
     void check(const Json::Value& jRecord) const
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
-        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
-            checkFits(it.name(), *it);
-        }
+        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) checkFits(it.name(), *it);
     }
 
     void checkKey(const Json::Value& jRecord) const
@@ -782,8 +771,7 @@ private:
     // code='x' and lang='en'
     std::string keyTerm(const Json::Value& jRecord)
     {
-        const auto part = [&](const auto& strKey) { return equals(strKey, jRecord[strKey]); };
-        return join(key_, " and ", part);
+        return join(key_, " and ", [&](const auto& str) { return equals(str, jRecord[str]); });
     }
 
     // insert into item (id,name) values (1,'x'),(2,'y')
@@ -799,9 +787,8 @@ private:
             for (const Json::Value& jRecord : records) insert({jRecord});
             return {};
         }
-        const auto list = [&](const Json::Value& jRecord) { return values(jRecord); };
         write("insert into " + strName_ + " (" + join(names, ",") + ") values " +
-                  join(records, ",", list),
+                  join(records, ",", [&](const auto& jRecord) { return values(jRecord); }),
               records.size());
         Json::Value& jKey = records[0][key_[0]];
         // One row was inserted, so the rowid is its own.
@@ -892,8 +879,8 @@ private:
     long long removeRows(const Json::Value& jCondition, const char* szIfEmpty)
     {
         return call({&jCondition}, [&] {
-            const std::string strWhere = condition(jCondition, szIfEmpty);
-            const std::string strSql = "delete from " + strName_ + " where " + strWhere;
+            const std::string strSql =
+                "delete from " + strName_ + " where " + condition(jCondition, szIfEmpty);
             return transact("begin immediate", [&] { return run(strSql); });
         });
     }
@@ -901,12 +888,11 @@ private:
     // ---- Conditions
 
     // The SQL of a condition; 1 for an empty one.
-    std::string condition(const Json::Value& jCondition, const char* szIfEmpty = nullptr)
+    std::string condition(const Json::Value& jCondition, const std::string& strIfEmpty = "")
     {
         nTerms_ = 0;
         const bool blEmpty = jCondition.empty() && !jCondition.isArray();
-        if (blEmpty && nullptr != szIfEmpty)
-            refuse(std::string("the condition is empty; ") + szIfEmpty);
+        if (blEmpty && !strIfEmpty.empty()) refuse("the condition is empty; " + strIfEmpty);
         return blEmpty ? "1" : "(" + terms(jCondition, 0) + ")";
     }
 
@@ -915,7 +901,7 @@ private:
     {
         expect(jCondition.isObject(), "the condition is ", jCondition, "an object");
         if (jCondition.empty()) refuse("a condition in a list is empty");
-        if (kMaxNesting < iNesting) refuse("operator \"$or\": nested deeper than 10 levels");
+        if (10 < iNesting) refuse("operator \"$or\": nested deeper than 10 levels");
         Texts parts;
         for (const std::string& strName : jCondition.getMemberNames()) {
             const Json::Value& jValue = jCondition[strName];
@@ -947,8 +933,7 @@ private:
     std::string term(const std::string& strMember, const std::string& strOperator,
                      const Json::Value& jValue)
     {
-        if (kMaxTerms < ++nTerms_)
-            refuse("the condition has more than " + std::to_string(kMaxTerms) + " terms");
+        if (300 < ++nTerms_) refuse("the condition has more than 300 terms");
         if ("$in" == strOperator) return listTerm(strMember, jValue);
         // Its SQL, and the last form that it is for.
         static const std::map<std::string, std::pair<const char*, Form>> operators = {
@@ -972,7 +957,7 @@ private:
         if (kAny != last && jValue.isNull())
             refuseMember(strMember, kindOf(jValue) + ", expected " + kForms[form].szExpected);
         checkFits(strMember, jValue);
-        if (blLike && kMaxPattern < jValue.asString().size())
+        if (blLike && 1000 < jValue.asString().size())
             refuseMember(strMember, strWhat + "a string of more than 1000 bytes");
         if ("$eq" == strOperator) return equals(strMember, jValue);
         return strMember + szSql + literal(strMember, jValue) + (blLike ? " escape '\\'" : "");
@@ -1083,11 +1068,11 @@ private:
                 const std::string strFilter =
                     strWhere + " and " + strRange + strOrder + strLimit + strOffset;
                 if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
-                checkLimit("answer", limits_.nAnswerBytes, nBytes, " bytes");
+                checkLimit("the answer", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
                 if (iLimit == jRecords.size()) break;
             }
-            checkLimit("answer", limits_.nAnswerRows, jRecords.size(),
+            checkLimit("the answer", limits_.nAnswerRows, jRecords.size(),
                        " records; use the option \"limit\"");
             return jRecords;
         });
@@ -1096,12 +1081,12 @@ private:
     // Known before the rows take memory.
     std::size_t bytesOf(const std::string& strFilter) const
     {
-        const auto length = [](const auto& strName) {
-            return "ifnull(length(cast(" + strName + " as blob)),0)";
+        const auto part = [](const auto& str) {
+            return "ifnull(length(cast(" + str + " as blob)),0)";
         };
-        return std::stoull(select("select cast(total(n) as integer) from (select " +
-                                  join(names_, "+", length) + " as n from " + strName_ +
-                                  " where (" + strFilter + "))")[0]);
+        const std::string strSum = join(names_, "+", part);
+        return std::stoull(select("select cast(total(n) as integer) from (select " + strSum +
+                                  " as n from " + strName_ + " where (" + strFilter + "))")[0]);
     }
 
     sqlite3* const pDb_;
