@@ -175,11 +175,7 @@ public:
 
     /// Sets limits for the calls from now on. A new table has none: setLimits({}) sets the defaults
     /// of Limits.
-    void setLimits(const Limits& limits)
-    {
-        limitSteps(0);
-        limits_ = limits;
-    }
+    void setLimits(const Limits& limits) { limits_ = limits; }
 
     /// Inserts the record @p jRecord and sets @p jStored to the row as it was read back.
     ///
@@ -209,10 +205,9 @@ public:
         return call({&jRecords}, [&] {
             expect(jRecords.isArray(), "the records are ", jRecords, "an array");
             return transact("begin immediate", [&] {
-                const Json::ArrayIndex nRecords = jRecords.size();
-                for (Json::ArrayIndex u = 0; u < nRecords; u += kBatch)
-                    insertRange(jRecords, u, std::min(u + kBatch, nRecords));
-                return nRecords;
+                for (Json::ArrayIndex u = 0; u < jRecords.size(); u += kBatch)
+                    insertRange(jRecords, u, std::min(u + kBatch, jRecords.size()));
+                return jRecords.size();
             });
         });
     }
@@ -262,14 +257,16 @@ public:
             checkOptions(jOptions);
             Json::Value jNext = jOptions;
             long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
-            for (long long nRecords = 0;; iLeft -= kPage) {
-                jNext["limit"] = Json::Int64(std::min(iLeft, kPage));
-                const Json::Value jPage = page(strWhere, jNext);
+            const auto nMost = static_cast<long long>(limits_.nAnswerRows);
+            const long long iPage = 0 < nMost ? std::min(nMost, kPage) : kPage;
+            for (long long nRecords = 0;; iLeft -= iPage) {
+                jNext["limit"] = Json::Int64(std::min(iLeft, iPage));
+                const Json::Value jPage = page(strWhere, jNext, true);
                 for (const Json::Value& jRecord : jPage) {
                     ++nRecords;
                     if (!callback(jRecord)) return nRecords;
                 }
-                if (kPage > static_cast<long long>(jPage.size())) return nRecords;
+                if (iPage > jPage.size()) return nRecords;
                 jNext["after"] = jPage[jPage.size() - 1];
                 jNext.removeMember("offset");
             }
@@ -388,11 +385,12 @@ private:
         const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
         const char* szUndo =
             blHosts ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
-        limitSteps(limits_.nSteps);
         run(blHosts ? "savepoint vorn_json_table" : szBegin);
+        limitSteps(limits_.nSteps);
         try {
             auto result = work();
             run(blHosts ? "release vorn_json_table" : "commit");
+            limitSteps(0);
             return result;
         } catch (...) {
             limitSteps(0);
@@ -432,14 +430,12 @@ private:
         } catch (const Failure& failure) {
             end_ = failure;
         } catch (const std::bad_alloc&) {
-            limitSteps(0);
             throw;
         } catch (const std::exception& error) {
             end_ = {Cause::kFailed, error.what()};
         } catch (...) {
             end_ = {Cause::kFailed, "the callback threw"};
         }
-        limitSteps(0);
         return iResult;
     }
 
@@ -490,19 +486,15 @@ private:
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
 
-    // Runs one statement that gives no rows and returns the number of rows changed.
-    int run(const std::string& strSql)
+    // Runs one statement that gives no rows, and has to change so many if their number is known.
+    // Returns the number of rows changed.
+    int run(const std::string& strSql, long long iRows = -1)
     {
         const int iChanges = pApi_->runSqlEx(strSql);
         if (0 > iChanges) failSql();
-        return iChanges;
-    }
-
-    // Runs a statement that has to change so many rows.
-    void write(const std::string& strSql, std::size_t nRows)
-    {
-        if (static_cast<int>(nRows) != run(strSql))
+        if (0 <= iRows && iRows != iChanges)
             fail(Cause::kChanged, "a trigger or an \"on conflict\" clause ignored a record");
+        return iChanges;
     }
 
     // From here on, no read in the transaction meets a lock.
@@ -588,10 +580,18 @@ private:
         names_ = jMembers.getMemberNames();
         Json::Value jTypes;
         for (const std::string& strMember : names_) {
-            declare(strMember, jMembers[strMember]);
+            checkName("member ", strMember);
+            const Json::Value& jMember = jMembers[strMember];
+            const bool blWord = jMember.isObject() && jMember["cpptype"].isString();
+            const std::string strWord = blWord ? jMember["cpptype"].asString() : "";
+            const auto found = std::find_if(std::begin(kForms), std::end(kForms),
+                                            [&](const auto& row) { return row.szWord == strWord; });
+            if (std::end(kForms) == found)
+                refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
+            members_[strMember] = static_cast<Form>(found - std::begin(kForms));
+            checkFits(strMember, jMember["cppDefaultValue"], "the default is ");
             for (const char* szKey : {"cpptype", "cppDefaultValue"})
-                if (jMembers[strMember].isMember(szKey))
-                    jTypes[strMember][szKey] = jMembers[strMember][szKey];
+                if (jMember.isMember(szKey)) jTypes[strMember][szKey] = jMember[szKey];
         }
         pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strCreate);
         // The constructor cannot say whether the statement failed.
@@ -625,27 +625,26 @@ private:
                 ": expected a name of letters, digits and \"_\" that SQLite takes without quotes");
     }
 
-    void declare(const std::string& strMember, const Json::Value& jMember)
-    {
-        checkName("member ", strMember);
-        const bool blWord = jMember.isObject() && jMember["cpptype"].isString();
-        const std::string strWord = blWord ? jMember["cpptype"].asString() : "";
-        const auto found = std::find_if(std::begin(kForms), std::end(kForms),
-                                        [&](const auto& row) { return row.szWord == strWord; });
-        if (std::end(kForms) == found)
-            refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
-        members_[strMember] = static_cast<Form>(found - std::begin(kForms));
-        checkFits(strMember, jMember["cppDefaultValue"], "the default is ");
-    }
-
     void readColumns()
     {
         const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
         key_ = select("select name " + strColumns + "pk order by pk");
         if (key_.empty()) refuse("table " + quoted(strName_) + ": no primary key");
         // An integer primary key is the rowid itself and has no index.
-        const std::string strIndexes = "from pragma_index_list('" + strName_ + "') where ";
-        blRowidKey_ = select("select 1 " + strIndexes + "origin='pk'").empty();
+        const std::string strIndex =
+            "select name from pragma_index_list('" + strName_ + "') where origin='pk'";
+        blRowidKey_ = select(strIndex).empty();
+        for (const std::string& strKey : key_) {
+            const char* szCollation = nullptr;
+            if (SQLITE_OK != sqlite3_table_column_metadata(pDb_, nullptr, strName_.c_str(),
+                                                           strKey.c_str(), nullptr, &szCollation,
+                                                           nullptr, nullptr, nullptr))
+                failSql();
+            if (!select("select 1 from pragma_index_xinfo((" + strIndex + ")) where name='" +
+                        strKey + "' and lower(coll)<>lower('" + szCollation + "')")
+                     .empty())
+                refuseMember(strKey, "the primary key has another collation than the column");
+        }
         for (const std::string& strMember : names_) {
             const Texts types = select("select type " + strColumns + "name='" + strMember + "'");
             if (types.empty()) refuseMember(strMember, "the table has no column of this name");
@@ -670,10 +669,9 @@ private:
 
     Form formOf(const std::string& strMember) const
     {
-        const auto found = members_.find(strMember);
-        if (members_.end() == found)
+        if (0 == members_.count(strMember))
             refuseMember(strMember, "not declared for the table " + quoted(strName_));
-        return found->second;
+        return members_.at(strMember);
     }
 
     // A text from outside in a reason: one line, and not too long.
@@ -695,10 +693,10 @@ private:
 
     static bool hasKind(Form form, const Json::Value& jValue)
     {
-        if (kInt == form || kLong == form)
-            return Json::realValue != jValue.type() &&
-                   (kInt == form ? jValue.isInt() : jValue.isInt64());
-        return kAny == form || kForms[form].type == jValue.type();
+        const Json::ValueType type = kForms[form].type;
+        if (Json::intValue != type) return kAny == form || type == jValue.type();
+        return Json::realValue != jValue.type() &&
+               (kInt == form ? jValue.isInt() : jValue.isInt64());
     }
 
     void checkFits(const std::string& strMember, const Json::Value& jValue,
@@ -707,10 +705,10 @@ private:
         const Form form = formOf(strMember);
         const bool blKind = hasKind(form, jValue);
         if (jValue.isNull() || (blKind && isExact(form, jValue, 1))) return;
-        const char* szExact = kText == form ? "UTF-8 without NUL bytes"
-                                            : "UTF-8, finite numbers and 1000 levels at most";
-        refuseMember(strMember, szIs + kindOf(jValue) + ", expected " +
-                                    (blKind ? szExact : kForms[form].szExpected));
+        const char* szExpected = !blKind         ? kForms[form].szExpected
+                                 : kText == form ? "UTF-8 without NUL bytes"
+                                                 : "UTF-8, finite numbers and 1000 levels at most";
+        refuseMember(strMember, szIs + kindOf(jValue) + ", expected " + szExpected);
     }
 
     // Whether a text can hold the value.
@@ -728,16 +726,15 @@ private:
     static bool isUtf8(const std::string& strText, bool blNul)
     {
         constexpr unsigned kLeast[] = {0, 0x80, 0x800, 0x10000};
-        const auto byteAt = [&](std::size_t u) { return static_cast<unsigned char>(strText[u]); };
         for (std::size_t u = 0; u < strText.size();) {
-            const unsigned uLead = byteAt(u++);
-            if (0x80 > uLead && (blNul || 0 != uLead)) continue;
-            if (0xc0 > uLead || 0xf8 <= uLead) return false;
-            const unsigned uMore = 0xf0 <= uLead ? 3 : 0xe0 <= uLead ? 2 : 1;
-            unsigned c = uLead & (0x3fU >> uMore);
-            for (unsigned i = 0; i < uMore; ++i, ++u) {
-                if (0x80 != (byteAt(u) & 0xc0)) return false;  // so is the NUL at the end
-                c = c << 6 | (byteAt(u) & 0x3fU);
+            unsigned c = static_cast<unsigned char>(strText[u++]);
+            const unsigned uMore = 0xf0 <= c ? 3 : 0xe0 <= c ? 2 : 0xc0 <= c ? 1 : 0;
+            if (0 == uMore && (0x80 <= c || (0 == c && !blNul))) return false;
+            if (0 < uMore) c &= 1 == uMore ? 0x1fU : 0x0fU;
+            for (unsigned i = 0; i < uMore; ++i) {
+                const unsigned uNext = static_cast<unsigned char>(strText[u++]);
+                if (0x80 != (uNext & 0xc0)) return false;  // so is the NUL at the end
+                c = c << 6 | (uNext & 0x3fU);
             }
             if (kLeast[uMore] > c || 0x10ffff < c || (0xd800 <= c && 0xdfff >= c)) return false;
         }
@@ -787,9 +784,9 @@ private:
             for (const Json::Value& jRecord : records) insert({jRecord});
             return {};
         }
-        write("insert into " + strName_ + " (" + join(names, ",") + ") values " +
-                  join(records, ",", [&](const auto& jRecord) { return values(jRecord); }),
-              records.size());
+        run("insert into " + strName_ + " (" + join(names, ",") + ") values " +
+                join(records, ",", [&](const auto& jRecord) { return values(jRecord); }),
+            static_cast<long long>(records.size()));
         Json::Value& jKey = records[0][key_[0]];
         // One row was inserted, so the rowid is its own.
         if (jKey.isNull()) jKey = Json::Int64(sqlite3_last_insert_rowid(pDb_));
@@ -830,9 +827,8 @@ private:
             transact("begin immediate", [&] { return insert(records); });
         } catch (Failure& failure) {
             if (Cause::kLocked == failure.cause) throw;
-            const bool blRefused = Cause::kRefused == failure.cause;
-            if (blRefused || uFrom + 1 == uTo) {
-                failure.iRecord = uFrom + (blRefused ? records.size() : 0);
+            if (Cause::kRefused == failure.cause || uFrom + 1 == uTo) {
+                failure.iRecord = uFrom + 1 == uTo ? uFrom : uFrom + records.size();
                 failure.strReason.insert(0, "record " + std::to_string(failure.iRecord) + ": ");
                 throw;
             }
@@ -849,20 +845,21 @@ private:
         lockForReading();
         // The key of each row as it will be: quote() gives the SQL of a value.
         const auto column = [&](const auto& strKey) {
-            return "'" + strKey + "='||quote(" +
+            return "'" + strKey + " is '||quote(" +
                    (jValues.isMember(strKey) ? literal(strKey, jValues[strKey]) : strKey) + ")";
         };
         const Texts terms = select("select " + join(key_, "||' and '||", column) + " from " +
                                    strName_ + " where " + strWhere);
-        write("update " + strName_ + " set (" + join(jValues.getMemberNames(), ",") +
-                  ")=" + values(jValues) + " where " + strWhere,
-              terms.size());
-        for (auto it = terms.begin(); it != terms.end();) {
-            const auto end = it + std::min<std::ptrdiff_t>(kBatch, terms.end() - it);
-            for (const Json::Value& jRow : readBack(Texts(it, end))) compare(jValues, jRow);
-            it = end;
+        const auto nRows = static_cast<std::ptrdiff_t>(terms.size());
+        run("update " + strName_ + " set (" + join(jValues.getMemberNames(), ",") +
+                ")=" + values(jValues) + " where " + strWhere,
+            nRows);
+        for (std::ptrdiff_t i = 0; i < nRows; i += kBatch) {
+            const auto begin = terms.begin() + i;
+            const Texts batch(begin, begin + std::min<std::ptrdiff_t>(kBatch, nRows - i));
+            for (const Json::Value& jRow : readBack(batch)) compare(jValues, jRow);
         }
-        return static_cast<long long>(terms.size());
+        return nRows;
     }
 
     long long updateRows(const Json::Value& jCondition, const Json::Value& jValues,
@@ -973,9 +970,8 @@ private:
             checkFits(strMember, jValue);
             if (!jValue.isNull()) items.push_back(literal(strMember, jValue));
         }
-        const std::string strNull = " or " + strMember + " is null";
         return "(" + strMember + " in (" + join(items, ",") + ")" +
-               (items.size() < jList.size() ? strNull : "") + ")";
+               (items.size() < jList.size() ? " or " + strMember + " is null" : "") + ")";
     }
 
     // ---- Sorting and pages
@@ -1043,7 +1039,8 @@ private:
     }
 
     // The rows of a list. The raw filter carries the order, the limit and the offset.
-    Json::Value page(const std::string& strWhere, const Json::Value& jOptions)
+    Json::Value page(const std::string& strWhere, const Json::Value& jOptions,
+                     bool blGoesOn = false)
     {
         checkOptions(jOptions);
         const SortKeys keys = sortKeys(jOptions["sort"]);
@@ -1074,6 +1071,14 @@ private:
             }
             checkLimit("the answer", limits_.nAnswerRows, jRecords.size(),
                        " records; use the option \"limit\"");
+            if (!blGoesOn || jRecords.empty() || iLimit > jRecords.size()) return jRecords;
+            // A record that reads otherwise than it is stored would lead to the same page again.
+            const auto isLast = [&](const auto& key) {
+                return equals(key.first, jRecords[jRecords.size() - 1][key.first]);
+            };
+            if (select("select 1 from " + strName_ + " where " + join(keys, " and ", isLast))
+                    .empty())
+                refuse("the last record of a page reads otherwise than it is stored");
             return jRecords;
         });
     }

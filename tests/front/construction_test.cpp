@@ -171,6 +171,17 @@ TEST_F(Construction, RefusesTablesWithoutAKey)
               Front(database_, "front_keyless", word("int"), "m int").table->reason());
 }
 
+// Two records of the key would be one to every condition.
+TEST_F(Construction, RefusesAKeyOfAnotherCollationThanItsColumn)
+{
+    const char* const szOther =
+        "member \"m\": the primary key has another collation than the column";
+    expectReason(szOther, word("string"), "m text collate nocase, primary key (m collate binary)");
+    expectReason(szOther, word("string"), "m text, primary key (m collate nocase)");
+    expectReason("", word("string"), "m text collate nocase, primary key (m)");
+    expectReason("", word("string"), "m text collate NoCase, primary key (m)) without rowid --");
+}
+
 TEST_F(Construction, RefusesWhatItCannotOpen)
 {
     const Json::Value jNone;

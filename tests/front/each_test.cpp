@@ -110,6 +110,41 @@ TEST_F(Each, LetsTheCallbackUseTheTable)
     EXPECT_EQ("0", front_.list({}));
 }
 
+// What another program stored in a column of another kind sorts elsewhere than it reads.
+TEST_F(Each, NeverReadsAPageTwice)
+{
+    const struct {
+        const char* szWord;
+        const char* szType;
+        const char* szValue;
+    } cases[] = {
+        {"int", "int", "3000000000 + i"},
+        {"int", "int", "'x' || i"},
+        {"string", "text", "cast('x' || i as blob)"},
+        {"string", "text", "'x' || char(0) || i"},
+    };
+    for (const auto& one : cases) {
+        SCOPED_TRACE(one.szValue);
+        Front front(database_,
+                    std::string(R"({"id":{"cpptype":")") + one.szWord +
+                        R"("},"nr":{"cpptype":"long long"}})",
+                    std::string("nr integer primary key, id ") + one.szType);
+        front.run(std::string("with recursive n(i) as (select 1 union all select i + 1 from n "
+                              "where i < 500) insert into @ select i, ") +
+                  one.szValue + " from n");
+        int nCalls = 0;
+        const auto each = [&](const char* szOptions) {
+            return front.table->each({}, json(szOptions),
+                                     [&](const Json::Value&) { return 1000 > ++nCalls; });
+        };
+        EXPECT_EQ(-1, each(R"({"sort":["id"]})"));
+        EXPECT_EQ("the last record of a page reads otherwise than it is stored",
+                  front.table->reason());
+        EXPECT_EQ(0, nCalls);
+        EXPECT_EQ(500, each("{}"));
+    }
+}
+
 class FrontLimits : public Each {
 protected:
     void limit(std::size_t VornJsonTable::Limits::*pLimit, std::size_t nMost)
@@ -145,6 +180,23 @@ TEST_F(FrontLimits, EndACallWithAReason)
     limit(&Limits::nAnswerBytes, 12);
     EXPECT_EQ("5", front_.list(json(R"({"id":{"$lt":5}})"), {}));
     EXPECT_EQ("limit: the answer has more than 12 bytes", front_.list({}));
+}
+
+TEST_F(FrontLimits, BoundThePagesOfEach)
+{
+    limit(&Limits::nAnswerRows, 7);
+    EXPECT_EQ(std::to_string(kRecords), each("{}", "{}"));
+    EXPECT_EQ("20", each("{}", R"({"limit":20})"));
+}
+
+// The host's own statements run to their end.
+TEST_F(FrontLimits, EndWithTheCall)
+{
+    front_.table->setLimits({0, 0, 0, 0, 100});
+    EXPECT_EQ("limit: a statement takes more than 100 steps", front_.list({}));
+    EXPECT_EQ(std::to_string(kRecords), database_.value(front_.named("select count(*) from @")));
+    EXPECT_EQ("1", front_.get(json(R"({"id":7})")));
+    EXPECT_EQ("0", database_.value(front_.named("select count(*) from @ where text = 'x'")));
 }
 
 TEST_F(FrontLimits, HaveDefaultsForStrangers)

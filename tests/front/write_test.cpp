@@ -138,6 +138,16 @@ TEST_F(Write, SavesAKeyThatOnlyTheCollationFindsEqual)
               front.create(json(R"({"code":"aBc"})")));
 }
 
+// A text key of another program's may be NULL, in many rows.
+TEST_F(Write, UpdatesRecordsWithoutAKey)
+{
+    Front front(database_, R"({"code":{"cpptype":"string"},"n":{"cpptype":"int"}})",
+                "code text primary key, n integer");
+    front.run("insert into @ values (null, 1), (null, 2), ('a', 3)");
+    EXPECT_EQ("3", front.update(json(R"({"n":{"$gt":0}})"), json(R"({"n":7})")));
+    EXPECT_EQ("3", front.list(json(R"({"n":7})")));
+}
+
 TEST_F(Write, UpdatesAndRemovesByACondition)
 {
     begin(R"([{"id":1,"name":"a"},{"id":2,"name":"b"},{"id":3,"name":"c"}])");
