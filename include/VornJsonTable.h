@@ -91,7 +91,6 @@
 #include <cerrno>
 #include <cmath>
 #include <functional>
-#include <limits>
 #include <map>
 #include <memory>
 #include <new>
@@ -219,8 +218,7 @@ public:
     int save(const Json::Value& jRecord, Json::Value& jStored)
     {
         return static_cast<int>(call({&jRecord}, [&] {
-            check(jRecord);
-            checkKey(jRecord);
+            check(jRecord, true);
             const std::string strKey = keyTerm(jRecord);
             jStored = transact("begin immediate", [&] {
                 if (0 < change(strKey, jRecord)) return readBack({strKey})[0];
@@ -256,7 +254,7 @@ public:
             const std::string strWhere = condition(jCondition);
             checkOptions(jOptions);
             Json::Value jNext = jOptions;
-            long long iLeft = jNext.get("limit", Json::Int64(kNoLimit)).asInt64();
+            long long iLeft = jNext.get("limit", Json::Value::maxInt64).asInt64();
             const auto nMost = static_cast<long long>(limits_.nAnswerRows);
             const long long iPage = 0 < nMost ? std::min(nMost, kPage) : kPage;
             for (long long nRecords = 0;; iLeft -= iPage) {
@@ -356,7 +354,6 @@ private:
         {"Json::Value", Json::nullValue, "a JSON value"}};
     static constexpr unsigned kBatch = 100;  // rows of a statement
     static constexpr long long kPage = 200;  // rows of a page of each()
-    static constexpr long long kNoLimit = std::numeric_limits<long long>::max();
 
     // ---- Calls
 
@@ -409,8 +406,7 @@ private:
             errno = 0;
             return 1;
         };
-        if (0 < limits_.nSteps && nullptr != pDb_)
-            sqlite3_progress_handler(pDb_, nSteps, stop, nullptr);
+        if (0 < limits_.nSteps) sqlite3_progress_handler(pDb_, nSteps, stop, nullptr);
     }
 
     // Every operation goes through here: what is thrown inside becomes -1 and a reason.
@@ -475,13 +471,13 @@ private:
         // UNIQUE constraint failed: item.name, item.lang
         Texts columns;
         const std::string strTable = strName_ + ".";
-        const int iLength = static_cast<int>(strTable.size());
+        const std::size_t n = strTable.size();
         std::istringstream words(strError.substr(strError.find(':') + 1));
         for (std::string strWord; words >> strWord && "index" != strWord;) {
             // A trigger may have written to another table.
-            if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), iLength))
+            if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), static_cast<int>(n)))
                 fail(Cause::kFailed, strError);
-            columns.push_back(strWord.substr(iLength, strWord.find(',') - iLength));
+            columns.push_back(strWord.substr(n, strWord.find(',') - n));
         }
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
@@ -640,9 +636,10 @@ private:
                                                            strKey.c_str(), nullptr, &szCollation,
                                                            nullptr, nullptr, nullptr))
                 failSql();
-            if (!select("select 1 from pragma_index_xinfo((" + strIndex + ")) where name='" +
-                        strKey + "' and lower(coll)<>lower('" + szCollation + "')")
-                     .empty())
+            const Texts other =
+                select("select 1 from pragma_index_xinfo((" + strIndex + ")) where name='" +
+                       strKey + "' and coll<>'" + szCollation + "' collate nocase");
+            if (!other.empty())
                 refuseMember(strKey, "the primary key has another collation than the column");
         }
         for (const std::string& strMember : names_) {
@@ -743,25 +740,22 @@ private:
 
     // ---- Writing
 
-    void check(const Json::Value& jRecord) const
+    void check(const Json::Value& jRecord, bool blWithKey = false) const
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) checkFits(it.name(), *it);
-    }
-
-    void checkKey(const Json::Value& jRecord) const
-    {
         for (const std::string& strKey : key_)
-            if (jRecord[strKey].isNull()) refuseMember(strKey, "missing, expected the whole key");
+            if (blWithKey && jRecord[strKey].isNull())
+                refuseMember(strKey, "missing, expected the whole key");
     }
 
     // With its defaults, and null for what no column fills in: in an integer key, SQLite does.
     Json::Value filled(Json::Value jRecord)
     {
-        check(jRecord);
+        expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         pApi_->fillDefaultValue(jRecord, false);
         VORN_JSON_DB::jsonCopyMember(jRecord, jAbsent_, false);
-        if (!blRowidKey_) checkKey(jRecord);
+        check(jRecord, !blRowidKey_);
         return jRecord;
     }
 
@@ -1020,8 +1014,7 @@ private:
     // from it in the last key only, then those that differ in the one before, and so on.
     Texts rangesAfter(const SortKeys& keys, const Json::Value& jLast)
     {
-        check(jLast);
-        checkKey(jLast);
+        check(jLast, true);
         std::string strEqual;
         Texts ranges;
         for (const auto& [strName, blDescending] : keys) {
@@ -1048,7 +1041,7 @@ private:
         const std::string strOrder = ") order by " + join(keys, ",", order) + " limit ";
         const long long iOffset = jOptions.get("offset", 0).asInt64();
         const std::string strOffset = " offset (" + std::to_string(iOffset);
-        const long long iAsked = jOptions.get("limit", Json::Int64(kNoLimit)).asInt64();
+        const long long iAsked = jOptions.get("limit", Json::Value::maxInt64).asInt64();
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
         const long long iLimit = 0 < nMost ? std::min(iAsked, nMost + 1) : iAsked;
