@@ -380,13 +380,12 @@ private:
     auto transact(const char* szBegin, Work work) -> decltype(work())
     {
         const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
-        const char* szUndo =
-            blHosts ? "rollback to vorn_json_table; release vorn_json_table" : "rollback";
-        run(blHosts ? "savepoint vorn_json_table" : szBegin);
+        const char* szUndo = blHosts ? "rollback to vorn_table; release vorn_table" : "rollback";
+        run(blHosts ? "savepoint vorn_table" : szBegin);
         limitSteps(limits_.nSteps);
         try {
             auto result = work();
-            run(blHosts ? "release vorn_json_table" : "commit");
+            run(blHosts ? "release vorn_table" : "commit");
             limitSteps(0);
             return result;
         } catch (...) {
@@ -637,13 +636,15 @@ private:
                                                            nullptr, nullptr, nullptr))
                 failSql();
             const Texts other =
-                select("select 1 from pragma_index_xinfo((" + strIndex + ")) where name='" +
-                       strKey + "' and coll<>'" + szCollation + "' collate nocase");
+                select(join({"select 1 from pragma_index_xinfo((", strIndex, ")) where name='",
+                             strKey, "' and coll<>'", szCollation, "' collate nocase"},
+                            ""));
             if (!other.empty())
                 refuseMember(strKey, "the primary key has another collation than the column");
         }
+        const std::string strTypes = "select type " + strColumns + "name='";
         for (const std::string& strMember : names_) {
-            const Texts types = select("select type " + strColumns + "name='" + strMember + "'");
+            const Texts types = select(join({strTypes, strMember, "'"}, ""));
             if (types.empty()) refuseMember(strMember, "the table has no column of this name");
             // Another affinity changes a value or its order.
             const bool blText = kText == formOf(strMember) || isJson(formOf(strMember));
@@ -822,7 +823,8 @@ private:
         } catch (Failure& failure) {
             if (Cause::kLocked == failure.cause) throw;
             if (Cause::kRefused == failure.cause || uFrom + 1 == uTo) {
-                failure.iRecord = uFrom + 1 == uTo ? uFrom : uFrom + records.size();
+                failure.iRecord =
+                    uFrom + (uFrom + 1 == uTo ? 0U : static_cast<unsigned>(records.size()));
                 failure.strReason.insert(0, "record " + std::to_string(failure.iRecord) + ": ");
                 throw;
             }
@@ -1054,9 +1056,9 @@ private:
             Json::Value jRecords(Json::arrayValue);
             std::size_t nBytes = 0;
             for (const std::string& strRange : ranges) {
-                const std::string strLimit = std::to_string(iLimit - jRecords.size());
-                const std::string strFilter =
-                    strWhere + " and " + strRange + strOrder + strLimit + strOffset;
+                std::string strFilter = strWhere + " and ";
+                strFilter.append(strRange).append(strOrder);
+                strFilter.append(std::to_string(iLimit - jRecords.size())).append(strOffset);
                 if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
                 checkLimit("the answer", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
