@@ -142,7 +142,7 @@ public:
     /// - columns that change a value or its order: text in a column that is not text, integers in
     ///   one that is text or real, JSON in one that is not text; anything but "long long" over an
     ///   integer primary key;
-    /// - tables without a primary key;
+    /// - tables without a primary key, or with one of another collation than its columns;
     /// - columns that are missing, not in the definition, generated, or spelt in another case;
     /// - names that are not plain identifiers, or that SQLite does not take without quotes;
     /// - another definition of the same table name earlier in the process.
@@ -240,10 +240,11 @@ public:
     }
 
     /// Calls @p callback with each record that the condition selects, in the order of the options.
-    /// It reads pages of 200 records, so it needs the memory of one page. Each page is read as a
-    /// whole before its records are handed out, and no statement is open meanwhile, so the callback
-    /// may use the table. Open a transaction around the call if all
-    /// pages have to show the same state.
+    /// It reads pages of 200 records, or of nAnswerRows if that is less, so it needs the memory of
+    /// one page. Each page is read as a whole before its records are handed out, and no statement
+    /// is open meanwhile, so the callback may use the table. Open a transaction around the call if
+    /// all pages have to show the same state. If the last record of a page reads otherwise than
+    /// another program stored it, the call ends with kRefused.
     ///
     /// Returns the number of calls, also if the callback stopped, or -1. If the callback throws
     /// anything but std::bad_alloc, the result is -1 with its message as the reason.
