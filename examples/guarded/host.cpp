@@ -1,70 +1,79 @@
 // SPDX-License-Identifier: MIT
 #include "host.h"
 
-#include "guard.h"
-
+#include <json/reader.h>
 #include <json/writer.h>
 
-#include <memory>
-#include <sstream>
+#include <stdexcept>
 
 namespace {
 
-std::string strTable = "note";
+// The reason may be told to the user.
+class Refused : public std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
 
-Json::Value& definition()
+void refuseIf(bool blBad, const std::string& strReason)
 {
-    static Json::Value jDefinition = [] {
-        Json::Value jMade;
-        Json::Value& jMember = jMade[strTable]["member"];
-        jMember["author"]["cpptype"] = "string";
-        jMember["author"]["cppDefaultValue"] = "nobody";
-        jMember["done"]["cpptype"] = "bool";
-        jMember["done"]["cppDefaultValue"] = false;
-        jMember["id"]["cpptype"] = "long long";
-        jMember["text"]["cpptype"] = "string";
-        jMember["text"]["cppDefaultValue"] = "";
-        jMember["topics"]["cpptype"] = "Json::arrayValue";
-        jMember["topics"]["cppDefaultValue"] = Json::Value(Json::arrayValue);
-        return jMade;
-    }();
-    return jDefinition;
+    if (blBad) throw Refused(strReason);
 }
 
-int save(VornJsonDbApi& notes, Json::Value& jRecord, Json::Value& jStored)
+// Ids are never used again: a user may still hold that of a deleted note.
+constexpr char kCreate[] =
+    "create table if not exists note (author text not null, body text, done integer, "
+    "id integer primary key autoincrement, title text, topics text);"
+    "create index if not exists note_author on note (author)";
+
+VornJsonTable::Limits limits()
 {
-    jStored = jRecord;
-    notes.fillDefaultValue(jStored, false);  // the record needs the member that comes last
-    return notes.recSave(jStored, false);
+    VornJsonTable::Limits limits;
+    limits.nRequestMembers = 200;
+    limits.nAnswerRows = 100;
+    limits.nAnswerBytes = 1000000;
+    limits.nSteps = 2000000;
+    return limits;
 }
 
-// Whether the request finds a note.
-bool finds(VornJsonDbApi& notes, Json::Value jRequest)
+Json::Value parsed(const std::string& strLine)
 {
-    jRequest["limit"] = 1;
-    Json::Value jNote;
-    const int iFound = notes.recGetOne(jRequest, jNote);
-    if (0 > iFound) throw std::runtime_error("a note cannot be looked up");
-    return 0 < iFound;
+    refuseIf(kMaxLine < strLine.size(), "the command is too long");
+    Json::CharReaderBuilder builder;
+    Json::CharReaderBuilder::strictMode(&builder.settings_);  // also refuses a duplicate key
+    const std::unique_ptr<Json::CharReader> pReader(builder.newCharReader());
+    Json::Value jCommand;
+    bool blRead = false;
+    try {
+        const char* szLine = strLine.data();
+        blRead = pReader->parse(szLine, szLine + strLine.size(), &jCommand, nullptr);
+    } catch (const Json::RuntimeError&) {
+        throw Refused("the command is nested too deep");
+    }
+    refuseIf(!blRead || !jCommand.isObject(), "the command is not a JSON object");
+    return jCommand;
 }
 
-// With more of them a list of the author's notes would take too many steps.
-void checkQuota(VornJsonDbApi& notes, const Json::Value& jNote)
+// The operation of a command that has all its members, and no others.
+std::string operationOf(const Json::Value& jCommand)
 {
-    Json::Value jLast;
-    jLast["author"] = jNote["author"];
-    jLast["offset"] = kMaxNotes - 1;
-    if (finds(notes, jLast)) throw guard::Refused("the author has too many notes");
+    static const std::map<std::string, Json::Value::Members> operations = {
+        {"create", {"op", "record"}}, {"delete", {"condition", "op"}},
+        {"get", {"condition", "op"}}, {"list", {"condition", "op", "options"}},
+        {"save", {"op", "record"}},   {"update", {"condition", "op", "values"}}};
+    const Json::Value& jOperation = jCommand["op"];
+    const auto found = operations.find(jOperation.isString() ? jOperation.asString() : "");
+    refuseIf(operations.end() == found, "there is no such operation");
+    refuseIf(found->second != jCommand.getMemberNames(), "the command has other members");
+    for (const std::string& strName : found->second)
+        refuseIf("op" != strName && !jCommand[strName].isObject(),
+                 "the " + strName + " is not an object");
+    return found->first;
 }
 
-// A save would make a note where there is none, with any id, or take over another author's.
-void checkSaved(VornJsonDbApi& notes, const Json::Value& jNote)
+// SQLite makes the ids, and the host knows the author.
+void refuseMembers(const Json::Value& jRecord, const std::vector<std::string>& names)
 {
-    Json::Value jSame;
-    for (const char* szName : {"id", "author"}) jSame[szName] = jNote[szName];
-    // The library ignores a condition without a value.
-    if (!jNote.isMember("id") || !finds(notes, jSame))
-        throw guard::Refused("the author has no such note");
+    for (const std::string& strName : names)
+        refuseIf(jRecord.isMember(strName), "\"" + strName + "\" cannot be set");
 }
 
 // In ASCII, so that an answer is one line whatever is in it.
@@ -81,74 +90,105 @@ std::string toLine(const Json::Value& jValue)
 
 }  // namespace
 
-const Json::Value& noteTypes()
+Json::Value noteDefinition()
 {
-    return VORN_JSON_DB::recType(definition(), strTable);
+    Json::Value jDefinition;
+    Json::Value& jMember = jDefinition["note"]["member"];
+    jMember["author"]["cpptype"] = "string";
+    jMember["body"]["cpptype"] = "string";
+    jMember["done"]["cpptype"] = "bool";
+    jMember["done"]["cppDefaultValue"] = false;
+    jMember["id"]["cpptype"] = "long long";
+    jMember["title"]["cpptype"] = "string";
+    jMember["topics"]["cpptype"] = "Json::arrayValue";
+    jMember["topics"]["cppDefaultValue"] = Json::Value(Json::arrayValue);
+    return jDefinition;
 }
 
-VornJsonDbApi openNotes(sqlite3* pDb)
+bool readLine(std::istream& stream, std::string& strLine)
 {
-    // Without autoincrement the id of a deleted note would be given to another author's.
-    std::string strCreate =
-        "create table if not exists note (author text, done integer, "
-        "id integer primary key autoincrement, text text, topics text); "
-        "create index if not exists note_author on note (author)";
-    return VornJsonDbApi(pDb, strTable, definition(), strCreate);
+    strLine.clear();
+    char c = 0;
+    while (stream.get(c) && '\n' != c)
+        if (kMaxLine >= strLine.size()) strLine += c;
+    return stream.good() || !strLine.empty();
 }
 
-void checkNote(VornJsonDbApi& notes, const Json::Value& jCommand)
+Host::Host(sqlite3* pDb, const std::string& strAuthor)
+    : notes_(pDb, "note", noteDefinition(), kCreate), strFailure_(notes_.reason())
 {
-    const std::string strOperation = jCommand["op"].asString();
-    if ("create" != strOperation && "save" != strOperation) return;
-    Json::Value jNote = jCommand["record"];
-    notes.fillDefaultValue(jNote, false);
-    if ("create" == strOperation)
-        checkQuota(notes, jNote);
-    else
-        checkSaved(notes, jNote);
+    jAll_["author"] = strAuthor;
+    notes_.setLimits(limits());
 }
 
-int perform(VornJsonDbApi& notes, Json::Value& jCommand, Json::Value& jAnswer)
+// Whatever the user asks for, it is in the notes of the author.
+Json::Value Host::mine(const Json::Value& jCondition) const
 {
-    const std::string strOperation = jCommand["op"].asString();
-    if ("create" == strOperation) return notes.recCreate(jCommand["record"], jAnswer["record"]);
-    if ("save" == strOperation) return save(notes, jCommand["record"], jAnswer["record"]);
-    if ("list" == strOperation) return notes.recList(jCommand["request"], jAnswer["records"]);
-    if ("get" == strOperation) return notes.recGetOne(jCommand["request"], jAnswer["record"]);
-    if ("delete" == strOperation) return notes.recDelete(jCommand["request"]);
-    return notes.recUpdateByFilter(jCommand["request"], jCommand["values"]);
+    Json::Value jMine = jAll_;
+    jMine["$or"].append(jCondition);
+    return jMine;
 }
 
-Access accessOf(const Json::Value& jCommand)
+// The result of a call that did not fail.
+Json::Value Host::done(long long iResult) const
 {
-    const std::string strOperation = jCommand["op"].asString();
-    if ("create" == strOperation || "save" == strOperation) return Access::kInsert;
-    if ("update" == strOperation) return Access::kUpdate;
-    if ("delete" == strOperation) return Access::kDelete;
-    return Access::kRead;
+    using Cause = VornJsonTable::Cause;
+    const Cause cause = notes_.cause();
+    refuseIf(Cause::kRefused == cause || Cause::kLimit == cause, notes_.reason());
+    if (0 > iResult) throw std::runtime_error(notes_.reason());
+    return Json::Int64(iResult);
+}
+
+Json::Value Host::create(Json::Value jRecord, Json::Value& jStored)
+{
+    refuseMembers(jRecord, {"author", "id"});
+    refuseIf(done(notes_.count(jAll_)) >= kMaxNotes, "there are too many notes");
+    jRecord["author"] = jAll_["author"];
+    return done(notes_.create(jRecord, jStored));
+}
+
+Json::Value Host::save(const Json::Value& jRecord, Json::Value& jStored)
+{
+    refuseMembers(jRecord, {"author"});
+    Json::Value jSame;
+    jSame["id"]["$eq"] = jRecord["id"];
+    refuseIf(done(notes_.count(mine(jSame))) != 1, "there is no such note");
+    return done(notes_.save(jRecord, jStored));
+}
+
+Json::Value Host::perform(const Json::Value& jCommand)
+{
+    const std::string strOperation = operationOf(jCommand);
+    const Json::Value& jAsked = jCommand["condition"];
+    Json::Value jAnswer;
+    Json::Value& jResult = jAnswer["result"];
+    if ("create" == strOperation) {
+        jResult = create(jCommand["record"], jAnswer["record"]);
+    } else if ("save" == strOperation) {
+        jResult = save(jCommand["record"], jAnswer["record"]);
+    } else if ("list" == strOperation) {
+        jResult = done(notes_.list(jAsked.empty() ? jAll_ : mine(jAsked), jCommand["options"],
+                                   jAnswer["records"]));
+    } else if ("get" == strOperation) {
+        jResult = done(notes_.get(mine(jAsked), jAnswer["record"]));
+    } else if ("update" == strOperation) {
+        refuseMembers(jCommand["values"], {"author", "id"});
+        jResult = done(notes_.update(mine(jAsked), jCommand["values"]));
+    } else {
+        jResult = done(notes_.remove(mine(jAsked)));
+    }
+    return jAnswer;
 }
 
 Json::Value Host::answer(const std::string& strLine)
 {
     Json::Value jAnswer;
     try {
-        Json::Value jCommand = guard::readCommand(strLine);
-        guard::checkCommand(noteTypes(), jCommand);
-        notes_.setErrMsg("");
-        const int iResult = fence_.run(accessOf(jCommand), [&] {
-            checkNote(notes_, jCommand);
-            return perform(notes_, jCommand, jAnswer);
-        });
-        jAnswer["result"] = iResult;
-        if (0 <= iResult) return jAnswer;
-        jAnswer.clear();  // a list may hold what was read before the failure
-        const std::string strReason = notes_.getErrMsg();
-        jAnswer["error"] = strReason.empty() ? "failed" : strReason;
-    } catch (const guard::Refused& refused) {
+        return perform(parsed(strLine));
+    } catch (const Refused& refused) {
         jAnswer["refused"] = refused.what();
     } catch (const std::exception&) {
-        // A value of the wrong kind, or a lack of memory. What it says is not for strangers.
-        jAnswer.clear();
+        // A lock, the disk or a lack of memory. What it says is not for users.
         jAnswer["error"] = "failed";
     }
     return jAnswer;

@@ -1,49 +1,42 @@
 // SPDX-License-Identifier: MIT
 /// @file
-/// The host: a table of notes, and commands of strangers for it.
+/// The host: a table of notes, and the commands of one of its users.
 ///
-///     {"op": "create", "record": {"author": "Ann", "text": "hello"}}
-///     {"op": "save",   "record": {"id": 1, "author": "Ann", "text": "hello again"}}
-///     {"op": "list",   "request": {"author": "Ann", "limit": 10, "offset": 20}}
-///     {"op": "get",    "request": {"id": 1}}
-///     {"op": "update", "request": {"id": 1}, "values": {"done": true}}
-///     {"op": "delete", "request": {"id": 1}}
+///     {"op": "create", "record": {"title": "Tea", "topics": ["kitchen"]}}
+///     {"op": "save",   "record": {"id": 1, "body": "2 cups"}}
+///     {"op": "list",   "condition": {"done": false}, "options": {"sort": ["-id"], "limit": 10}}
+///     {"op": "get",    "condition": {"id": 1}}
+///     {"op": "update", "condition": {"id": {"$in": [1, 2]}}, "values": {"done": true}}
+///     {"op": "delete", "condition": {"id": 1}}
 ///
-/// Each has one answer: {"result": 0, "record": {...}}, {"result": 0, "records": [...]},
-/// {"result": 1}, {"refused": "reason"} or {"error": "reason"}.
+/// Each has one answer: {"result": 0, "record": {...}}, {"result": 2, "records": [...]},
+/// {"result": 1}, {"refused": "reason"} or {"error": "failed"}.
 #ifndef EXAMPLES_GUARDED_HOST_H
 #define EXAMPLES_GUARDED_HOST_H
 
-#include "fence.h"
+#include <VornJsonTable.h>
 
-#include <VornJsonDbApi.h>
-
+#include <istream>
 #include <ostream>
-#include <string>
 
+constexpr std::size_t kMaxLine = 8 * 1024;
 // How many notes an author may have.
 constexpr int kMaxNotes = 1000;
 
-// The types of the notes' members, as the guard reads them.
-const Json::Value& noteTypes();
+// Reads a line; false at the end of the stream. Of a line that is too long it keeps one byte more
+// than is allowed and drops the rest.
+bool readLine(std::istream& stream, std::string& strLine);
 
-// A handle for the table "note", which it creates with an index on the author.
-VornJsonDbApi openNotes(sqlite3* pDb);
+// Of the table "note".
+Json::Value noteDefinition();
 
-// Checks what only the table can tell about a command that the guard lets through. Refuses in the
-// same way.
-void checkNote(VornJsonDbApi& notes, const Json::Value& jCommand);
-
-// Performs the command unchecked; guard and fence surround this call. Adds what it reads to the
-// answer and returns the library's result.
-int perform(VornJsonDbApi& notes, Json::Value& jCommand, Json::Value& jAnswer);
-
-// The access that the command needs.
-Access accessOf(const Json::Value& jCommand);
-
+// It reaches the notes of the author only, who has to have logged in.
 class Host {
 public:
-    explicit Host(sqlite3* pDb) : notes_(openNotes(pDb)), fence_(pDb, "note") {}
+    Host(sqlite3* pDb, const std::string& strAuthor);
+
+    // Why the table cannot be used; empty if it can.
+    const std::string& failure() const { return strFailure_; }
 
     // Answers one line. Throws only if memory runs out.
     Json::Value answer(const std::string& strLine);
@@ -52,8 +45,15 @@ public:
     void serve(const std::string& strLine, std::ostream& stream);
 
 private:
-    VornJsonDbApi notes_;
-    Fence fence_;
+    Json::Value perform(const Json::Value& jCommand);
+    Json::Value create(Json::Value jRecord, Json::Value& jStored);
+    Json::Value save(const Json::Value& jRecord, Json::Value& jStored);
+    Json::Value mine(const Json::Value& jCondition) const;
+    Json::Value done(long long iResult) const;
+
+    VornJsonTable notes_;
+    Json::Value jAll_;  // the condition of all notes of the author
+    std::string strFailure_;
 };
 
 #endif

@@ -8,8 +8,8 @@ program=$1 work=$2
 
 most=100000 # KB of address space, more than enough
 step=2000
-list='{"op":"list","request":{}}'
-get='{"op":"get","request":{"id":100}}'
+list='{"op":"list","condition":{},"options":{}}'
+get='{"op":"get","condition":{"id":60}}'
 
 rm -rf "$work"
 mkdir -p "$work"
@@ -22,16 +22,16 @@ repeated() {
 
 # under KB COMMAND...: the answers
 under() {
-    (ulimit -v "$1" && printf '%s\n' "${@:2}" | "$program" notes.db 2>err)
+    (ulimit -v "$1" && printf '%s\n' "${@:2}" | "$program" notes.db Ann 2>err)
 }
 
-topics="$(repeated 980 '0,')\"$(repeated 3000 é)\""
+topics="$(repeated 190 '0,')\"$(repeated 3800 é)\""
 text=$(repeated 4050 é)
-for id in $(seq 100); do
+for id in $(seq 60); do
     echo "{\"op\":\"create\",\"record\":{\"topics\":[$topics]}}"
-    echo "{\"op\":\"update\",\"request\":{\"id\":$id},\"values\":{\"text\":\"$text\"}}"
-done | "$program" notes.db >made
-[ "$(grep -c '"result":0' made)" = 200 ] || { echo "the notes were not made"; exit 1; }
+    echo "{\"op\":\"update\",\"condition\":{\"id\":$id},\"values\":{\"body\":\"$text\"}}"
+done | "$program" notes.db Ann >made
+[ "$(grep -c '"result":[01]' made)" = 120 ] || { echo "the notes were not made"; exit 1; }
 right_list=$(under unlimited "$list")
 right_get=$(under unlimited "$get")
 

@@ -1,20 +1,19 @@
 // SPDX-License-Identifier: MIT
-// The example's tables, somebody else's table beside them, and the host with none, one or both of
-// its layers.
+// The example's table, somebody else's table beside it, and Eve, who sends lines to the example, or
+// to a host that passes what it reads to the library unchecked.
 #pragma once
 
 #include "support/database.h"
 
-#include "examples/guarded/fence.h"
 #include "examples/guarded/host.h"
 
 #include <memory>
 #include <string>
 #include <vector>
 
-// The lines of a stranger: the operation with its record or request, and the values of an update.
+// Eve's lines: the operation with its record or condition, and the options or values.
 struct Command {
-    std::string operator()(const std::string& strArgument, const std::string& strValues = "") const;
+    std::string operator()(const std::string& strArgument, const std::string& strMore = "{}") const;
 
     const char* szOperation;
 };
@@ -23,38 +22,39 @@ inline constexpr Command create{"create"}, save{"save"}, list{"list"}, get{"get"
 
 std::string repeated(unsigned uTimes, const std::string& strText);
 
-// A line for World::send(): the host itself reads note 1 and saves it again.
-inline constexpr char kHostSavesAgain[] = "(the host saves note 1 again)";
+// As a host that never thought of strangers reads a line: at any depth, the last of equal keys.
+Json::Value readAnything(const std::string& strLine);
+
+// Lines for World::send(): Ann sends what follows, and the host itself reads note 3, which is
+// Eve's, and saves it again.
+inline constexpr char kAnn[] = "Ann: ";
+inline constexpr char kHostSavesAgain[] = "(the host saves note 3 again)";
 
 class World {
 public:
-    enum class Layers { kNone, kGuard, kFence, kBoth };
+    enum class Kind { kUnchecked, kExample };
 
-    explicit World(Layers layers, unsigned uMoreNotes = 0);
+    // Of the further notes, Eve gets as many as she may have.
+    explicit World(Kind kind, unsigned uMoreNotes = 0);
 
-    // Sends the lines and keeps their answers. Without the guard the reader takes what it can.
+    // Sends the lines and keeps their answers.
     void send(const std::string& strLines);
 
-    // Takes the layers away, so that a test can look at the database.
-    void stop();
-
-    // Both tables and the schema as text, at first and after stop().
+    // What is not Eve's, as text: the schema, the other table, and the notes of the others.
     std::string contents();
 
     std::vector<Json::Value> answers;
     bool blThrown = false;       // an exception reached the host
     bool blTransaction = false;  // one was open after the last line
-    long long iSteps = 0;        // thousands that SQLite took without a fence
+    long long iSteps = 0;        // that SQLite took
     std::string strBefore;       // the contents before the first line
     Database database;
 
 private:
-    Json::Value call(Json::Value& jCommand);
-    Json::Value answer(const std::string& strLine);
+    Json::Value answer(const std::string& strAuthor, const std::string& strLine);
+    Json::Value perform(const std::string& strAuthor, const Json::Value& jCommand);
     void saveAgain();
 
-    Layers layers_;
-    std::unique_ptr<Host> pHost_;            // with both layers
-    std::unique_ptr<VornJsonDbApi> pNotes_;  // otherwise
-    std::unique_ptr<Fence> pFence_;
+    Kind kind_;
+    std::unique_ptr<VornJsonDbApi> pNotes_;  // unchecked
 };
