@@ -35,6 +35,7 @@ without() {
 }
 without clang++ -DVORNJSONDB_HARDENING_CHECK=/usr/bin/true
 without hardening-check
+without python3 -DVORNJSONDB_HARDENING_CHECK=/usr/bin/true
 
 # As CMake 4.3 names SQLite's target, without the older name.
 configures -DCMAKE_MODULE_PATH="$(sqlite_named SQLite3::SQLite3)" || fail "it needs the older name of SQLite's target"
