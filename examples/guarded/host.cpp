@@ -76,6 +76,19 @@ void refuseMembers(const Json::Value& jRecord, const std::vector<std::string>& n
         refuseIf(jRecord.isMember(strName), "\"" + strName + "\" cannot be set");
 }
 
+// The patterns of a condition: each is compared at every place of every text, and SQLite counts
+// that as one step.
+std::size_t patternBytes(const Json::Value& jCondition)
+{
+    std::size_t nBytes = 0;
+    for (auto it = jCondition.begin(); it != jCondition.end(); ++it) {
+        if (jCondition.isObject() && "$like" == it.name() && it->isString())
+            nBytes += it->asString().size();
+        nBytes += patternBytes(*it);
+    }
+    return nBytes;
+}
+
 // In ASCII, so that an answer is one line whatever is in it.
 std::string toLine(const Json::Value& jValue)
 {
@@ -160,6 +173,7 @@ Json::Value Host::perform(const Json::Value& jCommand)
 {
     const std::string strOperation = operationOf(jCommand);
     const Json::Value& jAsked = jCommand["condition"];
+    refuseIf(kMaxPatterns < patternBytes(jAsked), "the patterns are too long");
     Json::Value jAnswer;
     Json::Value& jResult = jAnswer["result"];
     if ("create" == strOperation) {

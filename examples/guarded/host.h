@@ -22,6 +22,8 @@
 constexpr std::size_t kMaxLine = 8 * 1024;
 // How many notes an author may have.
 constexpr int kMaxNotes = 1000;
+// How many bytes the patterns of a condition may have.
+constexpr std::size_t kMaxPatterns = 30;
 
 // Reads a line; false at the end of the stream. Of a line that is too long it keeps one byte more
 // than is allowed and drops the rest.

@@ -67,6 +67,9 @@ TEST_F(GuardedHost, RefusesWithAReason)
          {create(R"({"author":"Ann"})"), save(R"({"id":1,"author":"Ann"})"),
           update(kOne, R"({"author":"Eve"})")}},
         {"\"id\" cannot be set", {create(R"({"id":null})"), update(kOne, kOne)}},
+        {"the patterns are too long",
+         {list(R"({"$or":[{"title":{"$like":"%1234567890%"}},{"id":{"$ne":7},"body":{"$like":)"
+               R"("%123456789012345678"}}]})")}},
         {"the request has more than 200 members",
          {list(R"({"id":{"$in":[1)" + repeated(198, ",1") + "]}}")}},
     };
@@ -107,7 +110,8 @@ TEST_F(GuardedHost, WorstRequestIsWithinTheSteps)
     fill("crowd", 40 * kMaxNotes);
     fill("Ann", kMaxNotes);
     std::string strWorst = R"({"$or":[{"id":0})";
-    for (int i = 0; i < 45; ++i) strWorst += R"(,{"title":{"$gt":"x","$ne":null}})";
+    strWorst += R"(,{"title":{"$like":"%1234567890%"}},{"body":{"$like":"%1234567890123456"}})";
+    for (int i = 0; i < 44; ++i) strWorst += R"(,{"title":{"$gt":"x","$ne":null}})";
     strWorst += "]}";
     for (const std::string& strLine :
          {list(strWorst, R"({"sort":["-body","title","done"],"offset":900})"), get(strWorst),
