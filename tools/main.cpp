@@ -32,6 +32,24 @@ struct Command {
 };
 
 constexpr Command kCommands[] = {
+    {"import", "DATABASE TABLE [FILE] [--array NAME] [--batch N]", 2, 3, " array batch ", import,
+     "insert all records of a file or none, or keep every N of them"},
+    {"export",
+     "DATABASE TABLE [CONDITION] [--csv] [--sort [-]MEMBER,...] [--limit N] [--offset N] "
+     "[--after RECORD]",
+     2, 3, " csv sort limit offset after ", exportRecords,
+     "print the records as JSON lines or CSV"},
+    {"list",
+     "DATABASE TABLE [CONDITION] [--sort [-]MEMBER,...] [--limit N] [--offset N] [--after RECORD]",
+     2, 3, " sort limit offset after ", list, "print the records, one per line"},
+    {"get", "DATABASE TABLE CONDITION", 3, 3, " ", get, "print the first record"},
+    {"count", "DATABASE TABLE [CONDITION]", 2, 3, " ", count, "print the number of records"},
+    {"create", "DATABASE TABLE RECORD", 3, 3, " ", create, "insert a record"},
+    {"save", "DATABASE TABLE RECORD", 3, 3, " ", save, "update or insert a record by its key"},
+    {"update", "DATABASE TABLE CONDITION|--all VALUES", 3, 4, " all ", update,
+     "set members of records"},
+    {"delete", "DATABASE TABLE CONDITION|--all", 2, 3, " all ", tool::remove, "delete records"},
+    {"check", "DATABASE [TABLE]", 1, 2, " ", check, "print which values are not read as they are"},
     {"describe", "DATABASE TABLE", 2, 2, " ", describe,
      "print the definition of a table that exists"},
     {"infer", "FILE [--table NAME] [--key MEMBER] [--array NAME]", 1, 1, " table key array ", infer,

@@ -9,6 +9,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 
 namespace tool {
@@ -27,6 +28,7 @@ constexpr std::size_t kBuffer = 64 * 1024;
 
 Output::Output() : iFile_(dup(STDOUT_FILENO))
 {
+    std::setvbuf(stdout, nullptr, _IOLBF, 0);
     if (0 <= dup2(STDERR_FILENO, STDOUT_FILENO)) return;
     // Standard error is closed, and the log is for nobody.
     const int iNull = open("/dev/null", O_WRONLY);

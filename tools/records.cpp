@@ -1,0 +1,104 @@
+// SPDX-License-Identifier: MIT
+// One record, or those that a condition selects: create, save, get, count, update, delete.
+#include "commands.h"
+#include "database.h"
+#include "failure.h"
+#include "json_text.h"
+
+#include <iostream>
+#include <iterator>
+
+namespace tool {
+
+namespace {
+
+// {"updated":3}
+void printCount(Output& output, const char* szWhat, long long nRecords)
+{
+    Json::Value jCount;
+    jCount[szWhat] = Json::Int64(nRecords);
+    output.line(jCount);
+}
+
+// With --all, no condition is among the arguments.
+void checkCount(const Arguments& arguments, std::size_t nWithCondition)
+{
+    if (arguments.values.size() != nWithCondition - (arguments.has("all") ? 1 : 0))
+        throw UsageError("expected either a condition or --all");
+}
+
+}  // namespace
+
+Json::Value parseArgument(const std::string& strArgument, const char* szName)
+{
+    if ("-" != strArgument) return parseJson(strArgument, {szName});
+    const std::string strText(std::istreambuf_iterator<char>(std::cin), {});
+    return parseJson(strText, {"standard input", 1});
+}
+
+int create(const Arguments& arguments, Output& output)
+{
+    const Json::Value jRecord = parseArgument(arguments.values[2], "RECORD");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kCreating);
+    Json::Value jStored;
+    table.checked(table.pRecords->create(jRecord, jStored));
+    output.line(jStored);
+    return kDone;
+}
+
+int save(const Arguments& arguments, Output& output)
+{
+    const Json::Value jRecord = parseArgument(arguments.values[2], "RECORD");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kCreating);
+    Json::Value jStored;
+    table.checked(table.pRecords->save(jRecord, jStored));
+    output.line(jStored);
+    return kDone;
+}
+
+int get(const Arguments& arguments, Output& output)
+{
+    const Json::Value jCondition = parseArgument(arguments.values[2], "CONDITION");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
+    Json::Value jRecord;
+    if (0 == table.checked(table.pRecords->get(jCondition, jRecord))) return kNothingFound;
+    output.line(jRecord);
+    return kDone;
+}
+
+int count(const Arguments& arguments, Output& output)
+{
+    const Json::Value jCondition = parseArgument(arguments.value(2, "{}"), "CONDITION");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
+    output.text(std::to_string(table.checked(table.pRecords->count(jCondition))) + "\n");
+    return kDone;
+}
+
+int update(const Arguments& arguments, Output& output)
+{
+    checkCount(arguments, 4);
+    const bool blAll = arguments.has("all");
+    const Json::Value jCondition =
+        blAll ? Json::Value() : parseArgument(arguments.values[2], "CONDITION");
+    const Json::Value jValues = parseArgument(arguments.values.back(), "VALUES");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
+    const long long nUpdated =
+        blAll ? table.pRecords->updateAll(jValues) : table.pRecords->update(jCondition, jValues);
+    printCount(output, "updated", table.checked(nUpdated));
+    return kDone;
+}
+
+int remove(const Arguments& arguments, Output& output)
+{
+    checkCount(arguments, 3);
+    const bool blAll = arguments.has("all");
+    const Json::Value jCondition =
+        blAll ? Json::Value() : parseArgument(arguments.values[2], "CONDITION");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
+    const long long nDeleted =
+        blAll ? table.pRecords->removeAll() : table.pRecords->remove(jCondition);
+    printCount(output, "deleted", table.checked(nDeleted));
+    return kDone;
+}
+
+}  // namespace tool
