@@ -13,11 +13,6 @@ struct Failure : std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-// The input is not what it should be.
-struct ReadFailure : Failure {
-    using Failure::Failure;
-};
-
 // The command line is wrong.
 struct UsageError : std::runtime_error {
     using std::runtime_error::runtime_error;

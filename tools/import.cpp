@@ -79,18 +79,6 @@ private:
     long long nKept_ = 0;    // in the transactions before
 };
 
-void addRecords(RecordReader& reader, Import& records)
-{
-    Json::Value jRecord;
-    try {
-        while (reader.next(jRecord)) records.add(jRecord, reader.place(), reader.size());
-    } catch (const ReadFailure&) {
-        records.store();  // a record before it may fail, too
-        throw;
-    }
-    records.store();
-}
-
 }  // namespace
 
 int import(const Arguments& arguments, Output& output)
@@ -99,8 +87,10 @@ int import(const Arguments& arguments, Output& output)
     RecordReader reader(arguments.value(2, "-"), arguments.option("array"));
     const Table table = openTable(arguments.values[0], arguments.values[1], Open::kCreating);
     Import records(table, nBatch);
+    Json::Value jRecord;
     try {
-        addRecords(reader, records);
+        while (reader.next(jRecord)) records.add(jRecord, reader.place(), reader.size());
+        records.store();
         records.commit();
     } catch (const Failure& failure) {
         if (0 == nBatch) throw;

@@ -30,7 +30,7 @@ std::unique_ptr<Json::CharReader> newReader()
 [[noreturn]] void fail(Place place, const std::string& strReason, unsigned uLine = 1)
 {
     if (0 < place.uLine) place.uLine += uLine - 1;
-    throw ReadFailure(toString(place) + ": " + strReason);
+    throw Failure(toString(place) + ": " + strReason);
 }
 
 // jsoncpp reports on several lines: "* Line 1, Column 8\n  Missing ':' after object member name\n"

@@ -18,7 +18,7 @@ struct Place {
 // notes.jsonl:7
 std::string toString(const Place& place);
 
-// Throws ReadFailure with the place and the reason if the text is not JSON, names a member twice,
+// Throws Failure with the place and the reason if the text is not JSON, names a member twice,
 // is nested deeper than 1,000 levels, or holds an integer that does not fit into 64 bits.
 Json::Value parseJson(std::string_view strText, const Place& place);
 

@@ -25,7 +25,7 @@ RecordReader::RecordReader(const std::string& strPath, std::string strArray)
 {
     if ("-" == strPath) return;
     file_.open(strPath);
-    if (!file_) throw ReadFailure(strPath + ": " + std::strerror(errno));
+    if (!file_) throw Failure(strPath + ": " + std::strerror(errno));
 }
 
 bool RecordReader::next(Json::Value& jRecord)
@@ -60,7 +60,7 @@ bool RecordReader::nextLine()
             strLine_.erase(0, 3);
         if (std::string::npos != strLine_.find_first_not_of(" \t\r")) return true;
     }
-    if (input_.bad()) throw ReadFailure(place_.strSource + ": " + std::strerror(errno));
+    if (input_.bad()) throw Failure(place_.strSource + ": " + std::strerror(errno));
     return false;
 }
 
@@ -73,8 +73,8 @@ void RecordReader::readArray()
     const bool blObject = !strArray_.empty() && jTop.isObject();
     Json::Value& jArray = blObject ? jTop[strArray_] : jTop;
     if (!jArray.isArray() || strArray_.empty() == blObject)
-        throw ReadFailure(place_.strSource + ": no array" +
-                          (strArray_.empty() ? "" : " under " + toText(strArray_)));
+        throw Failure(place_.strSource + ": no array" +
+                      (strArray_.empty() ? "" : " under " + toText(strArray_)));
     jRecords_.swap(jArray);
 }
 

@@ -16,7 +16,7 @@ public:
     // name is the array of the records.
     RecordReader(const std::string& strPath, std::string strArray);
 
-    // Sets the next record; false at the end. Throws ReadFailure with the line and the reason.
+    // Sets the next record; false at the end. Throws Failure with the line and the reason.
     bool next(Json::Value& jRecord);
 
     // Where the last record began.

@@ -20,11 +20,16 @@ void printCount(Output& output, const char* szWhat, long long nRecords)
     output.line(jCount);
 }
 
-// With --all, no condition is among the arguments.
-void checkCount(const Arguments& arguments, std::size_t nWithCondition)
+// Null with --all, and then it is not among the arguments.
+Json::Value conditionOf(const Arguments& arguments, std::size_t nArguments)
 {
-    if (arguments.values.size() != nWithCondition - (arguments.has("all") ? 1 : 0))
+    const bool blAll = arguments.has("all");
+    if (arguments.values.size() != nArguments - (blAll ? 1 : 0))
         throw UsageError("expected either a condition or --all");
+    if (blAll) return Json::Value();
+    const Json::Value jCondition = parseArgument(arguments.values[2], "CONDITION");
+    if (jCondition.empty()) throw Failure("the condition is empty; --all selects every record");
+    return jCondition;
 }
 
 }  // namespace
@@ -76,27 +81,21 @@ int count(const Arguments& arguments, Output& output)
 
 int update(const Arguments& arguments, Output& output)
 {
-    checkCount(arguments, 4);
-    const bool blAll = arguments.has("all");
-    const Json::Value jCondition =
-        blAll ? Json::Value() : parseArgument(arguments.values[2], "CONDITION");
+    const Json::Value jCondition = conditionOf(arguments, 4);
     const Json::Value jValues = parseArgument(arguments.values.back(), "VALUES");
     const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
-    const long long nUpdated =
-        blAll ? table.pRecords->updateAll(jValues) : table.pRecords->update(jCondition, jValues);
+    const long long nUpdated = jCondition.isNull() ? table.pRecords->updateAll(jValues)
+                                                   : table.pRecords->update(jCondition, jValues);
     printCount(output, "updated", table.checked(nUpdated));
     return kDone;
 }
 
 int remove(const Arguments& arguments, Output& output)
 {
-    checkCount(arguments, 3);
-    const bool blAll = arguments.has("all");
-    const Json::Value jCondition =
-        blAll ? Json::Value() : parseArgument(arguments.values[2], "CONDITION");
+    const Json::Value jCondition = conditionOf(arguments, 3);
     const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
     const long long nDeleted =
-        blAll ? table.pRecords->removeAll() : table.pRecords->remove(jCondition);
+        jCondition.isNull() ? table.pRecords->removeAll() : table.pRecords->remove(jCondition);
     printCount(output, "deleted", table.checked(nDeleted));
     return kDone;
 }
