@@ -1,6 +1,7 @@
 # SPDX-License-Identifier: MIT
 # What is installed: the library, a shared one with its links, the headers, a package for find_package and one for
-# pkg-config, the manual pages and the licence. Both packages can be moved with what they belong to.
+# pkg-config, the program with its completion, the manual pages and the licence. Both packages can be moved with what
+# they belong to.
 include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
@@ -13,6 +14,10 @@ set(licence_folder ${CMAKE_INSTALL_DATAROOTDIR}/doc/${PROJECT_NAME})
 # The folders that are made are noted beside the manifest of the files.
 set(folders ${header_folder} ${package_folder} ${CMAKE_INSTALL_LIBDIR}/pkgconfig
   ${CMAKE_INSTALL_MANDIR}/man3 ${CMAKE_INSTALL_MANDIR}/man7 ${licence_folder})
+set(completion_folder ${CMAKE_INSTALL_DATAROOTDIR}/bash-completion/completions)
+if(VORNJSONDB_TOOL)
+  list(APPEND folders ${CMAKE_INSTALL_BINDIR} ${CMAKE_INSTALL_MANDIR}/man1 ${completion_folder})
+endif()
 install(CODE "set(folders \"${folders}\")\nset(notes \"${CMAKE_BINARY_DIR}/install_folders.txt\")" ALL_COMPONENTS)
 install(SCRIPT cmake/note_folders.cmake ALL_COMPONENTS)
 
@@ -51,6 +56,12 @@ install(FILES man/VornJsonDbApi.3 DESTINATION ${CMAKE_INSTALL_MANDIR}/man3
   COMPONENT vornjsondb_development)
 install(FILES man/vornjsondb.7 DESTINATION ${CMAKE_INSTALL_MANDIR}/man7
   COMPONENT vornjsondb_development)
+
+if(VORNJSONDB_TOOL)
+  install(TARGETS vornjsondb_tool RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT vornjsondb_tools)
+  install(FILES man/vornjsondb.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT vornjsondb_tools)
+  install(FILES tools/completion/vornjsondb DESTINATION ${completion_folder} COMPONENT vornjsondb_tools)
+endif()
 
 install(FILES LICENSE DESTINATION ${licence_folder}
   COMPONENT vornjsondb_runtime)

@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <cstdio>
 #include <optional>
 
 namespace tool {
@@ -40,9 +41,7 @@ public:
     void store()
     {
         if (jRecords_.empty()) return;
-        if (0 > table_.pRecords->createMany(jRecords_))
-            throw Failure(toString(places_[table_.pRecords->position()]) + ": " +
-                          table_.pRecords->reason());
+        if (0 > table_.pRecords->createMany(jRecords_)) fail();
         nStored_ += jRecords_.size();
         jRecords_.clear();
         places_.clear();
@@ -60,6 +59,18 @@ public:
 
 private:
     static constexpr char kBegin[] = "begin immediate";
+
+    // "record 7: ..." becomes the place of that record.
+    [[noreturn]] void fail() const
+    {
+        const std::string strReason = table_.pRecords->reason();
+        std::size_t uRecord = 0;
+        int nRead = 0;
+        std::sscanf(strReason.c_str(), "record %zu: %n", &uRecord, &nRead);
+        if (0 == nRead) throw Failure(strReason);
+        throw Failure(toString(places_.at(uRecord)) + ": " +
+                      strReason.substr(static_cast<std::size_t>(nRead)));
+    }
 
     void keep()
     {

@@ -100,7 +100,7 @@ wrong 'option --batch: "0", expected a number from 1' import "${item[@]}" --batc
 
 # -------------------------------------------------------------------------- many, and progress
 # Neither the records nor their answer have to fit into memory.
-ulimit -v 131072
+ulimit -v "$3"  # KiB
 seq 1 60000 | awk '{ s = sprintf("%2000s", $1); printf "{\"id\": %d, \"name\": \"%s\"}\n", $1, s }' >many.jsonl
 rm -f i.db
 prints '{"imported":60000}' import "${item[@]}" many.jsonl

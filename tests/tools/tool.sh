@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
 # Shared by the tests of the program vornjsondb; sourced, not run, with their arguments: PROGRAM
-# WORK-FOLDER. Leaves the shell in the work folder, which is empty then.
+# WORK-FOLDER [MEMORY]. Leaves the shell in the work folder, which is empty then.
 set -euo pipefail
 export LC_ALL=C.UTF-8
 
