@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: MIT
 # The cases of contrib/scale-out/scale-test with the programs that work on a local file; sourced, not run.
 
-records=build/scale/examples/records
+records=build/scale/tools/vornjsondb
 sharded=build/scale/examples/example_sharded
 holder=build/scale/tests/locks/lock_holder
 languages=examples/tables/languages.json
@@ -14,7 +14,7 @@ members() {
         (select key from json_each(readfile('$languages'), '\$.definition.languages.member') order by key)"
 }
 
-# stored FILE: the languages there, as examples/records lists them.
+# stored FILE: the languages there, as vornjsondb lists them.
 stored() {
     looked_up "$1" "select json_object($(members "''%s'', %s")) from languages"
 }
@@ -30,9 +30,9 @@ languages_row() {
     [ "$2" = "$3" ] || failed "$1: $2 in place of $3: $(tail -n 3 "$work/said")"
 }
 
-# changed CASE COUNT FILE SEEN COMMAND...: a command of examples/records on a file, which is SEEN by another machine.
+# changed CASE COUNT FILE SEEN COMMAND ARGUMENT...: a command of vornjsondb on a file, which is SEEN by another machine.
 changed() {
-    timed "$records" "$3" "$languages" "${@:5}" || failed "$1: its exit status"
+    timed "$records" "$5" "$3" "$languages" "${@:6}" || failed "$1: its exit status"
     stored "$4" >"$work/found" || failed "$1: $4 cannot be read"
     languages_row "$1" "$(sed -n 's/^{"[a-z]*":\([0-9]*\)}$/\1/p' "$work/said")" "$2" "$work/found"
 }
@@ -43,23 +43,24 @@ the_examples() {
     sqlite3 :memory: "select json_object($(members "''%s'', ifnull(value ->> ''%s'', '''')"))
         from json_each(readfile('$iso_codes'), '\$.\"639-3\"')" >"$work/wanted"
     (($(wc -l <"$work/wanted") > 7000)) || failed "the source of the languages"
-    changed "examples/records $1: import" "$(wc -l <"$work/wanted")" "$file" "$seen" import "$iso_codes" 639-3
+    changed "vornjsondb $1: import" "$(wc -l <"$work/wanted")" "$file" "$seen" \
+        import "$iso_codes" --array 639-3
 
-    name="examples/records $1: list"
-    timed "$records" "$file" "$languages" list || failed "$name: its exit status"
+    name="vornjsondb $1: list"
+    timed "$records" list "$file" "$languages" || failed "$name: its exit status"
     languages_row "$name" "$(wc -l <"$work/said")" "$(wc -l <"$work/wanted")" "$work/said"
 
     cp "$work/wanted" "$work/before"
     sed -i 's/"type":"L"}$/"type":"living"}/' "$work/wanted"
-    changed "examples/records $1: update" "$(grep -c '"type":"L"}$' "$work/before")" "$file" "$seen" \
+    changed "vornjsondb $1: update" "$(grep -c '"type":"L"}$' "$work/before")" "$file" "$seen" \
         update '{"type": "L"}' '{"type": "living"}'
     sed -i '/"type":"E"}$/d' "$work/wanted"
-    changed "examples/records $1: delete" "$(grep -c '"type":"E"}$' "$work/before")" "$file" "$seen" \
+    changed "vornjsondb $1: delete" "$(grep -c '"type":"E"}$' "$work/before")" "$file" "$seen" \
         delete '{"type": "E"}'
 
-    say "examples/records $1: every command and refusal"
-    bash tests/host/records_iso_codes_test.sh "$PWD/$records" "$PWD/examples/tables" "$2/records_iso_codes" ||
-        failed "examples/records $1"
+    say "vornjsondb $1: every command and refusal"
+    bash tests/tools/iso_codes_test.sh "$PWD/$records" "$2/iso_codes" ||
+        failed "vornjsondb $1"
 
     name="examples/sharded $1: eight files"
     timed "$sharded" "$2/tenants" || failed "$name: its exit status"
@@ -82,7 +83,7 @@ second_owner() {
     pid=$!
     exec 3>"$work/end"
     within 60 "the other machine does not get the lock" test -s "$work/held"
-    ! timed "$records" -v "$a/languages.db" "$languages" create "$reserved" || failed "$name: it did not"
+    ! timed "$records" -v create "$a/languages.db" "$languages" "$reserved" || failed "$name: it did not"
     [ "$(grep -c 'retry, .*error=database is locked' "$work/said")" = 500 ] || failed "$name: not after 500 attempts"
     exec 3>&-
     ended "$pid" 60 || failed "$name: the holder"
@@ -90,7 +91,7 @@ second_owner() {
     languages_row "$name" "$(grep -c '^{' "$work/said")" 0 "$work/found"
 
     name="the same call once it is free"
-    timed "$records" "$a/languages.db" "$languages" create "$reserved" || failed "$name: its exit status"
+    timed "$records" create "$a/languages.db" "$languages" "$reserved" || failed "$name: its exit status"
     cat "$work/said" >>"$work/wanted"
     stored "$b/languages.db" >"$work/found"
     languages_row "$name" "$(grep -c '^{' "$work/said")" 1 "$work/found"

@@ -46,16 +46,11 @@ add_executable(host host.cpp)
 target_link_libraries(host PRIVATE VornJsonDb::vornjsondb)
 enable_testing()
 include($source/examples/programs.cmake)
-add_executable(records $source/examples/records.cpp)
 add_executable(guarded $source/examples/guarded/host.cpp $source/examples/guarded/main.cpp)
-foreach(name IN ITEMS records guarded)
-  target_link_libraries(\${name} PRIVATE VornJsonDb::vornjsondb)
-endforeach()
+target_link_libraries(guarded PRIVATE VornJsonDb::vornjsondb)
 PROJECT
 quietly "an example against the installed library" \
     ctest --test-dir "$work/found/build" --no-tests=error --output-on-failure
-quietly "records against the installed library" \
-    bash "$source/tests/host/records_test.sh" "$work/found/build/records" "$source/examples/tables" "$work/found/records_test"
 (cd "$source/examples/guarded" && "$work/found/build/guarded" :memory: Ann <commands.txt >"$work/found/answers.txt")
 same "what guarded answers" "$source/examples/guarded/answers.txt" "$work/found/answers.txt"
 

@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
 # Tests how the program ends: usage, help, the log, outputs that cannot be written, and locks.
+project=$(realpath "$(dirname "${BASH_SOURCE[0]}")/../..")
 . "$(dirname "${BASH_SOURCE[0]}")/tool.sh"
 
 cat >item.json <<'END'
@@ -26,7 +27,31 @@ run --help
 same 'help' '0 ' "$status $(cat err)"
 for command in import export list get count create save update delete check describe infer; do
     same "help names $command" 1 "$(grep -c "^  $command " out)"
+    same "the manual page names $command" 1 "$(grep -c "^\.It Cm $command " "$project/man/vornjsondb.1")"
 done
+
+# -------------------------------------------------------------------------------- completion
+. "$project/tools/completion/vornjsondb"
+compopt() { true; }
+# completes WORDS EXPECTED: what may stand in place of the last word
+completes() {
+    read -ra COMP_WORDS <<<"$1"
+    [[ $1 == *' ' ]] && COMP_WORDS+=('')
+    COMP_CWORD=$((${#COMP_WORDS[@]} - 1))
+    _vornjsondb
+    same "completion of $1" "$2" "${COMPREPLY[*]}"
+}
+completes 'vornjsondb im' import
+completes 'vornjsondb -v de' 'delete describe'
+completes 'vornjsondb --ver' '--version --verbose'
+completes 'vornjsondb update --' '--all --verbose'
+completes 'vornjsondb list i.db it' 'item.json item'
+completes 'vornjsondb list --limit 3 i.db it' 'item.json item'
+completes 'vornjsondb list --limit ' ''
+completes 'vornjsondb import i.db item li' lines
+completes 'vornjsondb list i.db item li' ''
+
+# ------------------------------------------------------------------------------------- files
 fails 'absent.db: unable to open database file' list absent.db item.json
 fails 'no table "task"' list i.db task
 fails 'no.json: No such file or directory' list i.db no.json
