@@ -8,16 +8,14 @@
 
 #include <algorithm>
 #include <cstdint>
-#include <cstdio>
 #include <optional>
 
 namespace tool {
 
 namespace {
 
-// What is handed to the table at once. It writes several rows a statement, reads them back, and
-// goes through them one by one if that fails.
-constexpr Json::ArrayIndex kMostRecords = 1000;
+// What is handed to the table at once: as many records as stay in the processor's cache.
+constexpr Json::ArrayIndex kMostRecords = 100;
 constexpr std::size_t kMostBytes = 1024 * 1024;
 
 class Import {
@@ -60,16 +58,40 @@ public:
 private:
     static constexpr char kBegin[] = "begin immediate";
 
-    // "record 7: ..." becomes the place of that record.
-    [[noreturn]] void fail() const
+    [[noreturn]] void fail()
     {
-        const std::string strReason = table_.pRecords->reason();
-        std::size_t uRecord = 0;
-        int nRead = 0;
-        std::sscanf(strReason.c_str(), "record %zu: %n", &uRecord, &nRead);
-        if (0 == nRead) throw Failure(strReason);
-        throw Failure(toString(places_.at(uRecord)) + ": " +
-                      strReason.substr(static_cast<std::size_t>(nRead)));
+        if (0 != sqlite3_get_autocommit(table_.database.get())) repeat();
+        const long long iRecord = table_.pRecords->record();
+        if (0 > iRecord) throw Failure(reason());
+        fail(static_cast<std::size_t>(iRecord));
+    }
+
+    [[noreturn]] void fail(std::size_t uRecord) const
+    {
+        throw Failure(toString(places_[uRecord]) + ": " + reason());
+    }
+
+    // Without the position, "record 7: ".
+    std::string reason() const
+    {
+        const std::string& strReason = table_.pRecords->reason();
+        return 0 > table_.pRecords->record() ? strReason
+                                             : strReason.substr(strReason.find(' ', 7) + 1);
+    }
+
+    // A trigger has ended the transaction, and the table cannot say at which record: it may depend
+    // on records before them.
+    [[noreturn]] void repeat()
+    {
+        const std::string strReason = reason();
+        transaction_.emplace(table_.database.get(), kBegin);
+        for (std::size_t u = 0; u < places_.size(); ++u) {
+            Json::Value jOne;
+            jOne.append(jRecords_[static_cast<Json::ArrayIndex>(u)]);
+            if (0 > table_.pRecords->createMany(jOne)) fail(u);
+        }
+        throw Failure(toString(places_.front()) + "-" + std::to_string(places_.back().uLine) +
+                      ": " + strReason);
     }
 
     void keep()

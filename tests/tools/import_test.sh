@@ -58,31 +58,35 @@ fails 'standard input:2: the record is null, expected an object' import "${item[
 fails 'absent.jsonl: No such file or directory' import "${item[@]}" absent.jsonl
 fails '.: Is a directory' import "${item[@]}" .
 
-# Keys that SQLite makes, and no key at all: a record a statement.
+# Keys that SQLite makes
 table log 'id integer primary key, name text unique' id='long long' name=string
-table plain 'name text' name=string
 rm -f i.db
 printf '{"name": "a"}\n{"name": "a"}\n' >lines
 expect 1 '' 'vornjsondb: import: lines:2: duplicate: UNIQUE constraint failed: log.name' import i.db log.json lines
 prints 0 count i.db log
-printf '{"name": "a"}\n{"name": "a"}\n{}\n' >lines
-prints '{"imported":3}' import i.db plain.json lines
-prints $'{"name":"a"}\n{"name":"a"}\n{}' list i.db plain
+printf '{"name": "a"}\n{"name": "b"}\n{}\n' >lines
+prints '{"imported":3}' import i.db log.json lines
+prints $'{"id":1,"name":"a"}\n{"id":2,"name":"b"}\n{"id":3}' list i.db log
 
-# A trigger that changes, ignores or refuses a row.
-# triggered STATEMENT MESSAGE
+# A trigger that changes, ignores or refuses a row, or ends the transaction.
+# triggered STATEMENT MESSAGE [LINES]
 triggered() {
     rm -f i.db
     "$program" create "${item[@]}" '{"id": 0}' >out
     sqlite3 i.db "create trigger t $1"
     batch 1 '{"id": 1}' >lines
-    fails "lines:1200: $2" import "${item[@]}" lines
+    fails "lines:${3:-1200}: $2" import "${item[@]}" lines
 }
 triggered 'after insert on item when new.id = 1200 begin update item set name = '\''y'\'' where id = 1200; end' \
-    'member "name": the row holds another value than the one sent; a trigger may have changed it'
+    'member "name": the row holds another value than was sent; a trigger may have set it'
 triggered 'before insert on item when new.id = 1200 begin select raise(ignore); end' \
-    'nothing was inserted: a trigger or an "on conflict" clause ignored the record'
+    'a trigger or an "on conflict" clause ignored a record'
 triggered 'before insert on item when new.id = 1200 begin select raise(abort, '\''not 1200'\''); end' 'not 1200'
+triggered 'before insert on item when new.id = 1200 begin select raise(rollback, '\''record 3: no'\''); end' 'record 3: no'
+# It needs a record of an earlier batch, which has gone with the transaction.
+triggered 'before insert on item when exists (select * from item where id = new.id - 1199 and id > 0)
+    begin select raise(rollback, '\''too many'\''); end' 'too many' 1101-1200
+
 # ----------------------------------------------------------------------------------- --batch
 # first N: the ids from 0 to N
 first() { seq -s, 0 "$1"; }
@@ -113,7 +117,7 @@ rm many.jsonl i.db
 # terminal REDIRECTION: what a terminal shows of an import of 2,500 lines
 batch 1 '{"id": 1}' >lines
 terminal() { rm -f i.db; script -qec "'$program' import i.db item.json lines $1" /dev/null </dev/null; }
-same 'progress' $'\r1000 records\r2000 records\r2500 records\r\n.' "$(terminal '>out'; printf .)"
+same 'progress' "$(seq 100 100 2500 | sed 's/.*/\r& records/' | tr -d '\n'; printf '\r\n.')" "$(terminal '>out'; printf .)"
 same 'the output beside it' "$(lines '{"imported":2500}')" "$(text_of out)"
 same 'no progress in a file' $'{"imported":2500}\r' "$(terminal '2>err')"
 same 'nothing there' "$(lines '')" "$(text_of err)"
