@@ -12,14 +12,21 @@ namespace tool {
 
 namespace {
 
-constexpr option kOptions[] = {
-    {"after", required_argument, nullptr, 0},  {"all", no_argument, nullptr, 0},
-    {"array", required_argument, nullptr, 0},  {"batch", required_argument, nullptr, 0},
-    {"csv", no_argument, nullptr, 0},          {"help", no_argument, nullptr, 'h'},
-    {"key", required_argument, nullptr, 0},    {"limit", required_argument, nullptr, 0},
-    {"offset", required_argument, nullptr, 0}, {"sort", required_argument, nullptr, 0},
-    {"table", required_argument, nullptr, 0},  {"verbose", no_argument, nullptr, 'v'},
-    {"version", no_argument, nullptr, 'V'},    {nullptr, 0, nullptr, 0}};
+constexpr option kOptions[] = {{"add-key", required_argument, nullptr, 0},
+                               {"after", required_argument, nullptr, 0},
+                               {"all", no_argument, nullptr, 0},
+                               {"array", required_argument, nullptr, 0},
+                               {"batch", required_argument, nullptr, 0},
+                               {"csv", no_argument, nullptr, 0},
+                               {"help", no_argument, nullptr, 'h'},
+                               {"key", required_argument, nullptr, 0},
+                               {"limit", required_argument, nullptr, 0},
+                               {"offset", required_argument, nullptr, 0},
+                               {"sort", required_argument, nullptr, 0},
+                               {"table", required_argument, nullptr, 0},
+                               {"verbose", no_argument, nullptr, 'v'},
+                               {"version", no_argument, nullptr, 'V'},
+                               {nullptr, 0, nullptr, 0}};
 
 }  // namespace
 

@@ -80,7 +80,7 @@ std::string flawOf(const Cell& cell, const std::string& strWord)
     return flawOfJson(cell, strWord);
 }
 
-// What names a record in a message: its key, or its rowid.
+// What names a record in a message: its key.
 Json::Value nameOf(sqlite3_stmt* pStatement, const std::vector<std::string>& names)
 {
     Json::Value jName;
@@ -97,9 +97,8 @@ Json::Value nameOf(sqlite3_stmt* pStatement, const std::vector<std::string>& nam
 
 // Prints a line for each value that is not read as it is, and returns their number.
 long long checkTable(sqlite3* pDb, const std::string& strTable, const Json::Value& jMembers,
-                     std::vector<std::string> names, Output& output)
+                     const std::vector<std::string>& names, Output& output)
 {
-    if (names.empty()) names = {"rowid"};
     std::string strColumns;
     for (const std::string& strName : names) strColumns += strName + ",";
     const std::vector<std::string> members = jMembers.getMemberNames();

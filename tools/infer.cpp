@@ -80,14 +80,13 @@ Json::Value makeTable(const std::string& strName, const std::map<std::string, Ki
     return jTable;
 }
 
+// Where the key comes from: records that all have it, no record, or the one or the other.
+enum class Key { kMember, kAdded, kEither };
+
 class Inference {
 public:
-    // Without a name, the member "id" is the key if it can be one.
-    explicit Inference(const std::string& strKey)
-        : strKey_(strKey.empty() ? "id" : strKey),
-          blKey_(true),
-          blKeyAsked_(!strKey.empty()),
-          memory_(openDatabase(":memory:", true))
+    Inference(std::string strKey, Key key)
+        : strKey_(std::move(strKey)), key_(key), memory_(openDatabase(":memory:", true))
     {
     }
 
@@ -105,12 +104,22 @@ public:
             else if (kNone != kind && found->second != kind)
                 found->second = kMixed;
         }
-        if (blKey_) addKey(jRecord, place);
+        if (Key::kAdded != key_ && strKeyFlaw_.empty()) strKeyFlaw_ = flawOfKey(jRecord, place);
+        if (Key::kMember == key_ && !strKeyFlaw_.empty()) throw Failure(strKeyFlaw_);
     }
 
-    Json::Value table(const std::string& strName) const
+    Json::Value table(const std::string& strName)
     {
-        const Json::Value jTable = makeTable(strName, kinds_, blKey_ ? strKey_ : "");
+        const auto alike = names_.find(lower(strKey_));
+        const bool blAlike = names_.end() != alike;
+        const bool blThere = blAlike && strKey_ == alike->second;
+        const char* szHint = "; --key names another key, --add-key adds one";
+        if (blThere && !strKeyFlaw_.empty()) throw Failure(strKeyFlaw_ + szHint);
+        if (blAlike && (!blThere || Key::kAdded == key_))
+            throw Failure("key " + toText(strKey_) + ": there is a member " +
+                          toText(alike->second) + szHint);
+        if (!blThere) kinds_[strKey_] = kInteger;
+        const Json::Value jTable = makeTable(strName, kinds_, strKey_);
         bindTable(memory_.get(), jTable);
         return jTable;
     }
@@ -124,33 +133,32 @@ private:
             refuse(place, strMember, "differs from " + toText(found->second) + " only in case");
         try {
             const std::string strName = "name_" + std::to_string(names_.size());
-            bindTable(memory_.get(), makeTable(strName, {{strMember, kText}}, ""));
+            bindTable(memory_.get(), makeTable(strName, {{strMember, kText}}, strMember));
         } catch (const Failure& failure) {
             throw Failure(toString(place) + ": " + failure.what());
         }
     }
 
-    void addKey(const Json::Value& jRecord, const Place& place)
+    // Why the member cannot be the key, or nothing.
+    std::string flawOfKey(const Json::Value& jRecord, const Place& place)
     {
         const Json::Value& jKey = jRecord[strKey_];
         const Kind kind = kindOf(jKey);
         const char* szFlaw = nullptr;
         if (kText != kind && kInteger != kind)
-            szFlaw = kNone == kind ? "missing, and it is the key"
-                                   : "neither a string nor an integer, and it is the key";
+            szFlaw = kNone == kind ? "missing" : "neither a string nor an integer";
         else if (kinds_[strKey_] != kind)
-            szFlaw = "strings and integers, and it is the key";
+            szFlaw = "strings and integers";
         else if (!keys_.insert(jKey.asString()).second)
-            szFlaw = "not unique, and it is the key";
-        if (nullptr == szFlaw) return;
-        if (blKeyAsked_) refuse(place, strKey_, szFlaw);
-        blKey_ = false;
-        keys_.clear();
+            szFlaw = "not unique";
+        if (nullptr == szFlaw) return "";
+        return toString(place) + ": member " + toText(strKey_) + ": " + szFlaw +
+               ", and it is the key";
     }
 
     const std::string strKey_;
-    bool blKey_;
-    const bool blKeyAsked_;
+    const Key key_;
+    std::string strKeyFlaw_;  // of the first record that has one
     Database memory_;
     std::map<std::string, Kind> kinds_;
     std::map<std::string, std::string> names_;  // by the names in lower case
@@ -174,8 +182,13 @@ int infer(const Arguments& arguments, Output& output)
     const std::string& strPath = arguments.values[0];
     if ("-" == strPath && !arguments.has("table"))
         throw UsageError("standard input has no name: --table gives the table one");
+    if (arguments.has("key") && arguments.has("add-key"))
+        throw UsageError("expected either --key or --add-key");
     RecordReader reader(strPath, arguments.option("array"));
-    Inference inference(arguments.option("key"));
+    Inference inference = arguments.has("key")
+                              ? Inference(arguments.option("key"), Key::kMember)
+                              : Inference(arguments.option("add-key", "id"),
+                                          arguments.has("add-key") ? Key::kAdded : Key::kEither);
     Json::Value jRecord;
     if (!reader.next(jRecord)) throw Failure(strPath + ": no records");
     do inference.add(jRecord, reader.place());

@@ -52,9 +52,7 @@ void forEachRecord(const Table& table, const Arguments& arguments,
         jOptions["after"] = parseJson(arguments.option("after"), {"option --after"});
     jOptions["offset"] = Json::Int64(arguments.number("offset", 0, 0));
     long long nLeft = arguments.number("limit", 0, INT64_MAX);
-    const long long nPage = table.pRecords->key().empty() ? INT64_MAX
-                            : jOptions["sort"].empty()    ? kPage
-                                                          : kSortedPage;
+    const long long nPage = jOptions["sort"].empty() ? kPage : kSortedPage;
     const Transaction sameState(table.database.get(), "begin");
     for (bool blMore = true; blMore;) {
         const long long nAsked = std::min(nLeft, nPage);

@@ -10,8 +10,8 @@
 namespace tool {
 
 // Calls the function with each record that the condition, the third argument, and the options
-// --sort, --limit, --offset and --after select. All are of the same state of the table. A table
-// with a key is read in pages, so memory does not grow with the number of records.
+// --sort, --limit, --offset and --after select. All are of the same state of the table. It is read
+// in pages, so memory does not grow with the number of records.
 void forEachRecord(const Table& table, const Arguments& arguments,
                    const std::function<void(const Json::Value& jRecord)>& use);
 

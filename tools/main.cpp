@@ -52,7 +52,8 @@ constexpr Command kCommands[] = {
     {"check", "DATABASE [TABLE]", 1, 2, " ", check, "print which values are not read as they are"},
     {"describe", "DATABASE TABLE", 2, 2, " ", describe,
      "print the definition of a table that exists"},
-    {"infer", "FILE [--table NAME] [--key MEMBER] [--array NAME]", 1, 1, " table key array ", infer,
+    {"infer", "FILE [--table NAME] [--key MEMBER | --add-key NAME] [--array NAME]", 1, 1,
+     " table key add-key array ", infer,
      "print a definition and a CREATE statement for the records of a file"},
 };
 

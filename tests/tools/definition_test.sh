@@ -29,7 +29,8 @@ refuses() {
 # one TYPE WORD VALUE...: each a value of the member m
 one() {
     local value
-    for value in "${@:3}"; do printf '{"m": %s}\n' "$value"; done | infers "m $1" "m=$2"
+    for value in "${@:3}"; do printf '{"m": %s}\n' "$value"; done |
+        infers "id integer primary key, m $1" id='long long' "m=$2"
 }
 one text string '"a"' '"100% \"wool\" Größe"'
 one text string '"7"' null '""'
@@ -46,33 +47,45 @@ one 'json text' Json::Value true 1
 one 'json text' Json::Value '[]' '{}'
 one 'json text' Json::Value '"a\u0000b"'
 one 'json text' Json::Value 1 true 1
-infers 'a text, b integer, c json text' a=string b='long long' c=Json::Value <<<$'{"b": 1, "c": null}\n\n  {"a": "x"}\r'
+infers 'a text, b integer, c json text, id integer primary key' a=string b='long long' c=Json::Value id='long long' <<<$'{"b": 1, "c": null}\n\n  {"a": "x"}\r'
 
-# The key: "id" if it can be one, or the member asked for.
+# The key: "id", which is added if no record has it, or the member asked for.
 infers 'id integer primary key' id='long long' <<<$'{"id": 2}\n{"id": 1}'
 infers 'id text not null primary key' id=string <<<$'{"id": "2"}\n{"id": "1"}'
-infers 'id integer' id='long long' <<<$'{"id": 2}\n{"id": 1}\n{"id": 2}'
-infers 'id integer, x boolean' id='long long' x=bool <<<$'{"id": 2}\n{"x": true}'
-infers 'id json text' id=Json::Value <<<$'{"id": 2}\n{"id": "2"}'
-infers 'id boolean' id=bool <<<'{"id": true}'
+infers 'id integer primary key' id='long long' <<<'{}'
+hint='--key names another key, --add-key adds one'
+refuses 'given.jsonl:3: member "id": not unique, and it is the key; '"$hint" <<<$'{"id": 2}\n{"id": 1}\n{"id": 2}\n{}'
+refuses 'given.jsonl:2: member "id": missing, and it is the key; '"$hint" <<<$'{"id": 2}\n{"x": true}'
+refuses 'given.jsonl:1: member "id": missing, and it is the key; '"$hint" <<<$'{"x": true}\n{"id": 2}'
+refuses 'given.jsonl:2: member "id": strings and integers, and it is the key; '"$hint" <<<$'{"id": 2}\n{"id": "2"}'
+refuses 'given.jsonl:1: member "id": neither a string nor an integer, and it is the key; '"$hint" <<<'{"id": true}'
+refuses 'key "id": there is a member "ID"; '"$hint" <<<'{"ID": 1}'
 printf '{"code": "a", "id": 1}\n{"code": "b", "id": 1}\n' >codes.json
 prints "$(definition codes 'code text not null primary key, id integer' code=string id='long long')" \
     infer codes.json --key code
-prints "$(definition t 'code text, id integer' code=string id='long long')" infer --table t codes.json
+prints "$(definition codes 'code text, id integer, row integer primary key' code=string id='long long' row='long long')" \
+    infer codes.json --add-key row
+prints "$(definition t 'code text not null primary key, id integer' code=string id='long long')" \
+    infer --table t --key code codes.json
 fails 'codes.json:2: member "id": not unique, and it is the key' infer codes.json --key id
+fails 'key "code": there is a member "code"; '"$hint" infer codes.json --add-key code
+fails 'key "Code": there is a member "code"; '"$hint" infer codes.json --add-key Code
+fails 'member "order": '"$name" infer codes.json --add-key order
+wrong 'expected either --key or --add-key' infer codes.json --add-key row --key code
 refuses 'given.jsonl:2: member "id": missing, and it is the key' --key id <<<$'{"id": 1}\n{"x": 1}'
+refuses 'given.jsonl:1: member "idd": missing, and it is the key' --key idd <<<$'{"id": 1}\n{"x": 1}'
 refuses 'given.jsonl:1: member "id": missing, and it is the key' --key id <<<'{"id": null}'
 refuses 'given.jsonl:1: member "id": neither a string nor an integer, and it is the key' --key id <<<'{"id": 1.5}'
 refuses 'given.jsonl:2: member "id": strings and integers, and it is the key' --key id <<<$'{"id": 1}\n{"id": "x"}'
 
 # Arrays, standard input and names of files
 printf '[{"a": 1},\n {"a": null}]' >array-1.json
-prints "$(definition array_1 'a integer' a='long long')" infer array-1.json
+prints "$(definition array_1 'a integer, id integer primary key' a='long long' id='long long')" infer array-1.json
 printf '{"first": 1, "rows": [{"a": 1}]}' >keyed.json
-prints "$(definition keyed 'a integer' a='long long')" infer keyed.json --array rows
-prints "$(definition std 'a integer' a='long long')" infer - --table std <array-1.json
+prints "$(definition keyed 'a integer, id integer primary key' a='long long' id='long long')" infer keyed.json --array rows
+prints "$(definition std 'a integer, id integer primary key' a='long long' id='long long')" infer - --table std <array-1.json
 printf '\xef\xbb\xbf{"a": 1}' >mark.json
-prints "$(definition mark 'a integer' a='long long')" infer mark.json
+prints "$(definition mark 'a integer, id integer primary key' a='long long' id='long long')" infer mark.json
 wrong 'standard input has no name: --table gives the table one' infer -
 
 refuses 'given.jsonl:2: member "order": '"$name" \
@@ -91,7 +104,6 @@ refuses "given.jsonl:3: not valid JSON: column 5: Missing ':' after object membe
 refuses 'given.jsonl:1: not valid JSON: column 9: Duplicate key: '\''a'\''' <<<'{"a": 1,"a": 2}'
 refuses 'given.jsonl:1: JSON of more than 1000 levels' <<<"{\"a\":$(printf '[%.0s' {1..1001})"
 refuses 'given.jsonl: no records' <<<''
-refuses 'the definition has no members for the table "given"' <<<'{}'
 refuses 'table "select": '"$name" --table select <<<'{"a": 1}'
 printf '[{"a": 1},\n{"a":\n 99999999999999999999}]' >large.json
 fails 'large.json:3: member "a": the integer 99999999999999999999 does not fit into 64 bits' infer large.json
@@ -128,13 +140,15 @@ not_described 'member "v": the column holds integer and text values, which no ty
 not_described 'member "v": the column holds blob values, which no type word reads exactly' \
     "create table d (id integer primary key, v blob); insert into d (v) values (x'00')"
 not_described 'member "born": column type "date", expected a text column' \
-    "create table d (born date); insert into d values ('2026-01-01')"
+    "create table d (id integer primary key, born date); insert into d (born) values ('2026-01-01')"
 not_described 'member "a b": '"$name" \
-    'create table d ("a b" text)'
-not_described 'table "d": cannot UPDATE generated column "g"' 'create table d (a integer, g integer as (a + 1))'
-not_described 'member "price": type word "double", expected "string", "long long" or "int" for integers, "bool", '\
-'"Json::objectValue", "Json::arrayValue" or "Json::Value"; a fraction is exact as an integer of its smallest unit, '\
-'as text, or inside a JSON member' 'create table d (price real)'
+    'create table d (id integer primary key, "a b" text)'
+not_described 'table "d": no primary key' 'create table d (a integer, b text)'
+not_described 'table "d": cannot UPDATE generated column "g"' \
+    'create table d (a integer primary key, g integer as (a + 1))'
+not_described 'member "price": type word "double", expected "string", "int", "long long", "bool", "Json::objectValue", '\
+'"Json::arrayValue" or "Json::Value"; fractions as integers of the smallest unit, as text or inside JSON' \
+    'create table d (id integer primary key, price real)'
 fails 'absent.db: unable to open database file' describe absent.db d
 fails 'file is not a database' describe keyed.json d
 
@@ -142,8 +156,28 @@ fails 'file is not a database' describe keyed.json d
 run infer codes.json --key code
 cp out codes.def.json
 sqlite3 c.db "$(sqlite3 :memory: "select json_extract(readfile('codes.def.json'), '\$.create')")"
-create='CREATE TABLE IF NOT EXISTS' prints "$(definition codes \
+prints "$(definition codes \
     'code text not null primary key, id integer' code=string id='long long')" describe c.db codes
+
+# Every kind of member: what is imported is listed as it was, with the file and with the description.
+cat >kinds.jsonl <<'END'
+{"array":[[1],"x"],"boolean":false,"fraction":-0.0,"integer":9223372036854775807,"key":"B","mixed":"1","object":{"a":{"b":[null,1.5]}}}
+{"array":[],"boolean":true,"fraction":0.1,"integer":-9223372036854775808,"key":"a","mixed":1,"none":null,"object":{}}
+{"boolean":null,"fraction":1.0,"integer":null,"key":"b","mixed":18446744073709551615,"text":"a'b\u0001%"}
+{"fraction":5e-324,"integer":4294967296,"key":"c","mixed":[true]}
+{"fraction":null,"key":"ß","mixed":{"":false},"text":""}
+END
+prints "$(create='create table if not exists' definition kinds 'array json text, boolean boolean, fraction json text, '\
+'integer integer, key text not null primary key, mixed json text, none json text, object json text, text text' \
+    array=Json::arrayValue boolean=bool fraction=Json::Value integer='long long' key=string mixed=Json::Value \
+    none=Json::Value object=Json::objectValue text=string)" infer kinds.jsonl --key key
+cp out kinds.json
+prints '{"imported":5}' import kinds.db kinds.json kinds.jsonl
+listed=$(sed -E 's/"(none|boolean|integer|fraction)":null,//g; s/5e-324/4.94065645841247e-324/' kinds.jsonl)
+for table in kinds.json kinds; do
+    prints "$listed" list kinds.db $table
+    expect 0 '' '' check kinds.db $table
+done
 
 wrong 'expected DATABASE TABLE' describe d.db
 wrong 'no option of this command: --csv' describe d.db d --csv
