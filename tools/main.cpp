@@ -107,8 +107,8 @@ int runCommand(const Arguments& arguments, Output& output)
 
 int report(const std::string& strCommand, const char* szWhat)
 {
-    std::fprintf(stderr, "vornjsondb: %s%s%s\n", strCommand.c_str(), strCommand.empty() ? "" : ": ",
-                 szWhat);
+    (void)std::fprintf(stderr, "vornjsondb: %s%s%s\n", strCommand.c_str(),
+                       strCommand.empty() ? "" : ": ", szWhat);
     return kFailed;
 }
 
@@ -116,7 +116,7 @@ int report(const std::string& strCommand, const char* szWhat)
 
 int main(int argc, char** argv)
 {
-    std::signal(SIGPIPE, SIG_IGN);
+    (void)std::signal(SIGPIPE, SIG_IGN);
     Output output;
     Arguments arguments;
     try {
@@ -130,7 +130,7 @@ int main(int argc, char** argv)
         return iStatus;
     } catch (const UsageError& error) {
         report(arguments.strCommand, error.what());
-        std::fputs("Try 'vornjsondb --help'.\n", stderr);
+        (void)std::fputs("Try 'vornjsondb --help'.\n", stderr);
         return kUsage;
     } catch (const ClosedPipe&) {
         return kFailed;

@@ -16,7 +16,7 @@ namespace tool {
 
 namespace {
 
-constexpr std::size_t kBuffer = 64 * 1024;
+constexpr std::size_t kBuffer = 65536;
 
 [[noreturn]] void failWriting()
 {
@@ -28,7 +28,7 @@ constexpr std::size_t kBuffer = 64 * 1024;
 
 Output::Output() : iFile_(dup(STDOUT_FILENO))
 {
-    std::setvbuf(stdout, nullptr, _IOLBF, 0);
+    (void)std::setvbuf(stdout, nullptr, _IOLBF, 0);
     if (0 <= dup2(STDERR_FILENO, STDOUT_FILENO)) return;
     // Standard error is closed, and the log is for nobody.
     const int iNull = open("/dev/null", O_WRONLY);

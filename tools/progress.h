@@ -13,14 +13,14 @@ public:
     Progress() : blShown_(1 == isatty(STDERR_FILENO)) {}
     ~Progress()
     {
-        if (blShown_) std::fputc('\n', stderr);
+        if (blShown_) (void)std::fputc('\n', stderr);
     }
     Progress(const Progress&) = delete;
     Progress& operator=(const Progress&) = delete;
 
     void show(unsigned long long nRecords) const
     {
-        if (blShown_) std::fprintf(stderr, "\r%llu records", nRecords);
+        if (blShown_) (void)std::fprintf(stderr, "\r%llu records", nRecords);
     }
 
 private:

@@ -27,7 +27,7 @@ Json::Value conditionOf(const Arguments& arguments, std::size_t nArguments)
     if (arguments.values.size() != nArguments - (blAll ? 1 : 0))
         throw UsageError("expected either a condition or --all");
     if (blAll) return Json::Value();
-    const Json::Value jCondition = parseArgument(arguments.values[2], "CONDITION");
+    Json::Value jCondition = parseArgument(arguments.values[2], "CONDITION");
     if (jCondition.empty()) throw Failure("the condition is empty; --all selects every record");
     return jCondition;
 }
