@@ -52,6 +52,8 @@ keeps 0 1 '' "lines:150: $duplicate.name" < <(batch 150 '{"id": 3000, "name": "n
 keeps 0 1 '' "lines:150: $duplicate.id" < <(batch 150 '{"id": 140}')
 keeps 0 1 '' 'lines:3: the record is the integer 7, expected an object' <<<$'{"id": 1}\n\n7'
 keeps 0 1 '' "lines:2: not valid JSON: column 6: Missing ',' or ']' in array declaration" <<<$'[{"id": 1},\n7, 8 {}]'
+keeps 0 1 '' "lines:6: $duplicate.id" <<<$'\n[\n{"id": 1},\n\n{"id": 2,\n"name": "x"}, {"id": 0},\n{"id": 3}]'
+keeps 0 1 '' "lines:3: $duplicate.id" --array rows <<<$'{"x": 1,\n"rows": [{"id": 1},\n{"id": 0}]}'
 keeps 0 1 '' 'lines: no array under "row"' --array row <<<'{"rows": []}'
 keeps 0 1 '' 'lines:1: not valid JSON: column 2: Missing '\''}'\'' or object member name' <<<$'{\n"id": 1}'
 fails 'standard input:2: the record is null, expected an object' import "${item[@]}" <<<$'{"id": 1}\nnull'
