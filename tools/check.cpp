@@ -6,6 +6,7 @@
 #include "failure.h"
 #include "json_text.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <map>
 
@@ -115,7 +116,11 @@ long long checkTable(sqlite3* pDb, const std::string& strTable, const Json::Valu
         int iColumn = static_cast<int>(names.size());
         for (const std::string& strMember : members) {
             const Cell cell{pStatement, iColumn++};
-            const std::string strFlaw = flawOf(cell, jMembers[strMember]["cpptype"].asString());
+            const bool blKey = names.end() != std::find(names.begin(), names.end(), strMember);
+            const std::string strFlaw =
+                blKey && SQLITE_NULL == cell.type()
+                    ? "null in the key"
+                    : flawOf(cell, jMembers[strMember]["cpptype"].asString());
             if (strFlaw.empty()) continue;
             Json::Value jFlaw;
             jFlaw["table"] = strTable;

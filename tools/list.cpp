@@ -36,7 +36,12 @@ Json::Value placeOf(const Json::Value& jRecord, const Json::Value& jSort, const 
         const std::string strName = jName.asString();
         copy('-' == strName[0] ? strName.substr(1) : strName);
     }
-    for (const std::string& strMember : table.pRecords->key()) copy(strMember);
+    for (const std::string& strMember : table.pRecords->key()) {
+        if (!jRecord.isMember(strMember))
+            throw Failure("member " + toText(strMember) +
+                          ": null in the key of a record, which no page can follow");
+        copy(strMember);
+    }
     return jPlace;
 }
 

@@ -149,4 +149,13 @@ same 'a table without a key' 1 "$(grep -c '{"reason":"table \\"plain\\": no prim
 same 'values of another kind' 2 "$(grep -c '"record":{"v":[12]},"table":"u"' out)"
 fails 'no table "absent"' check n.db absent
 fails 'table "plain": no primary key' list n.db plain
+
+# SQLite lets NULL into keys that are not integers.
+sqlite3 nulls.db "create table k (code text primary key); insert into k select null from generate_series(1, 1001)"
+prints '{"code":"x"}' create nulls.db k '{"code": "x"}'
+prints '{"code":"x"}' list nulls.db k '{"code": "x"}'
+fails 'member "code": null in the key of a record, which no page can follow' list nulls.db k '{"code": null}'
+run check nulls.db
+same 'null in a key' '1 vornjsondb: check: not read as they are: 1001' "$status $(cat err)"
+same 'the first of them' '{"member":"code","reason":"null in the key","record":{"code":null},"table":"k"}' "$(head -n 1 out)"
 finish
