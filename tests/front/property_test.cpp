@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: MIT
 // Random records of hostile texts through every operation that writes: what is in the file
 // afterwards is what was sent, or the call was refused with a reason and the file is unchanged.
+#include "front/exact.h"
 #include "front/front.h"
 #include "front/random.h"
 
-#include <iconv.h>
-#include <cmath>
 #include <limits>
 #include <map>
 
@@ -35,30 +34,6 @@ const char* const kTriggers[] = {
     "create table @_log (a); create trigger @_t after insert on @ "
     "begin insert into @_log values (new.text); delete from @_log; end",
 };
-
-// A record or value as a text that differs if a kind or a byte differs.
-std::string exact(const Json::Value& jValue)
-{
-    if (jValue.isString())
-        return "s" + std::to_string(jValue.asString().size()) + jValue.asString();
-    if (Json::realValue == jValue.type()) {
-        char szText[40];
-        snprintf(szText, sizeof szText, "%a", jValue.asDouble());
-        return szText;
-    }
-    std::string strText = jValue.isArray() ? "[" : "{";
-    if (!jValue.isArray() && !jValue.isObject()) return jValue.isNull() ? "null" : text(jValue);
-    for (auto it = jValue.begin(); it != jValue.end(); ++it)
-        strText += (jValue.isObject() ? exact(it.name()) : "") + ":" + exact(*it) + ",";
-    return strText;
-}
-
-std::string exactRecord(Json::Value jRecord)
-{
-    for (const std::string& strName : jRecord.getMemberNames())
-        if (jRecord[strName].isNull()) jRecord.removeMember(strName);
-    return exact(jRecord);
-}
 
 class Property : public FrontTest {
 protected:
@@ -219,20 +194,6 @@ TEST_F(Property, StoresWhatWasSentOrChangesNothing)
     }
     // The texts are hostile, but most of them can be stored.
     EXPECT_LT(nRecords / 10, Figures::of("front, calls that stored"));
-}
-
-bool isUtf8(std::string strText)
-{
-    const iconv_t converter = iconv_open("UTF-32LE", "UTF-8");
-    std::string strOut(4 * strText.size() + 4, '\0');
-    char* pIn = strText.data();
-    char* pOut = strOut.data();
-    std::size_t nIn = strText.size();
-    std::size_t nOut = strOut.size();
-    const bool blConverted =
-        static_cast<std::size_t>(-1) != iconv(converter, &pIn, &nIn, &pOut, &nOut);
-    iconv_close(converter);
-    return blConverted;
 }
 
 // Alone: each hostile text as the only one, in each member that takes it.
