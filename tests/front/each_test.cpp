@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: MIT
 // Records handed out one by one, callbacks that throw, and limits.
 #include "front/front.h"
+#include "support/figures.h"
 
+#include <malloc.h>
 #include <stdexcept>
 
 namespace {
@@ -142,6 +144,50 @@ TEST_F(Each, NeverReadsAPageTwice)
                   front.table->reason());
         EXPECT_EQ(0, nCalls);
         EXPECT_EQ(500, each("{}"));
+    }
+}
+
+class EachMemory : public FrontTest {
+protected:
+    // The most that is allocated while each() hands out so many records, of equal size.
+    std::size_t peakOf(int nRecords, const char* szOptions)
+    {
+        Front front(database_, kMembers, kColumns);
+        front.run("create index @_i on @ (rank)");
+        front.run(
+            "with recursive n(i) as (select 1000000 union all select i + 1 from n) insert "
+            "into @ select i, i % 7, 'text ' || i from n limit " +
+            std::to_string(nRecords));
+        std::size_t nPeak = 0;
+        const std::size_t nBefore = bytesInUse();
+        EXPECT_EQ(nRecords, front.table->each({}, json(szOptions), [&nPeak](const Json::Value&) {
+            doubles::state().statements.clear();  // which grow, too
+            nPeak = std::max(nPeak, bytesInUse());
+            return true;
+        }));
+        return nPeak - nBefore;
+    }
+
+private:
+    static std::size_t bytesInUse()
+    {
+        const struct mallinfo2 info = mallinfo2();
+        return info.uordblks + info.hblkhd;
+    }
+};
+
+// A sanitizer's allocator is not counted. What malloc keeps of freed blocks varies; a hundred times
+// the records would need a hundred times as much.
+TEST_F(EachMemory, IsThatOfOnePage)
+{
+    database_.run("pragma cache_size=10");
+    for (const char* szOptions : {"{}", R"({"sort":["-rank"]})"}) {
+        peakOf(1000, szOptions);  // for what only the first call needs
+        const std::size_t nFew = peakOf(1000, szOptions);
+        const std::size_t nMany = peakOf(100000, szOptions);
+        Figures::of("front, bytes of 1,000 records handed out") = static_cast<long long>(nFew);
+        Figures::of("front, bytes of 100,000 records handed out") = static_cast<long long>(nMany);
+        EXPECT_GE(nFew + nFew / 2, nMany);
     }
 }
 
