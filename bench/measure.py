@@ -65,14 +65,15 @@ KEPT = ["fetch", "fetch, two tables", "fetch, after a wide table", "create", "cr
         "create, after a wide table", "rows", "rows, NULL in every second", "rows, NULLs in alternating members",
         "rows, 100 members",
         "types of 10 tables", "types of 100000 tables", "adding 1000 tables", "adding 100000 tables"]
+FRONT = ["create", "create, bare", "create many", "create many, bare", "list", "list, bare", "each"]
 
 
-def count_kept(programs):
-    """Instructions of a call for each case of bench_kept."""
-    say("counting the instructions of what is kept of tables and rows")
+def count_cases(programs, program, cases):
+    """Instructions of a call for each case of the program."""
+    say(f"counting the instructions of the cases of {program}")
     with concurrent.futures.ThreadPoolExecutor(os.cpu_count()) as pool:
-        counts = pool.map(lambda case: programs.counted("bench_kept", case), KEPT)
-        return {case: count["instructions"] / count["calls"] for case, count in zip(KEPT, counts)}
+        counts = pool.map(lambda case: programs.counted(program, case), cases)
+        return {case: count["instructions"] / count["calls"] for case, count in zip(cases, counts)}
 
 
 TEXTS = ["objects", "nested", "integers", "doubles", "escapes"]
@@ -172,7 +173,8 @@ def main():
     results["rows"] = ROWS
     results["counts"] = count_operations(programs, names, lists["operations"])
     results["value_lists"] = count_value_lists(programs)
-    results["kept"] = count_kept(programs)
+    results["kept"] = count_cases(programs, "bench_kept", KEPT)
+    results["front"] = count_cases(programs, "bench_front", FRONT)
     results["texts"] = count_texts(programs)
     results["times"] = take_times(programs)
     results["threads"] = time_threads(programs)
