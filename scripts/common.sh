@@ -8,6 +8,8 @@ build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev 
 # Debian's static SQLite depends on zlib; the fuzz targets build a locale with a decimal comma.
 test_packages=("${build_packages[@]}" clang devscripts locales python3 zlib1g-dev)
 
+site_packages=(doxygen doxygen-awesome-css mkdocs mkdocs-material python3)
+
 say() {
     printf '== %s\n' "$*"
 }

@@ -1,55 +1,57 @@
 # SPDX-License-Identifier: MIT
-"""pages.py FOLDER SITE: writes the guides into FOLDER as Doxygen has to read them, and their pictures into SITE.
-pages.py HEADER: prints the header as Doxygen has to read it.
+"""pages.py FOLDER SITE VERSION: writes FOLDER/mkdocs.yml and, in FOLDER/pages, the guides and the examples as MkDocs
+reads them; the site will be in SITE.
 
-What is plain Markdown on a forge is not quite that to Doxygen: it takes "%s" and quotes in code for marks of its
-own, names headings otherwise and knows no link to a heading of another page. So code is escaped, every heading
-gets the name that a forge gives it, and links lead to the pages of the site. A file that is linked and is no
-guide, such as an example, becomes a page of its own."""
+A forge shows a guide as it is. On the site every heading has the name that a forge gives it, a link whose text is a
+file name shows the title of that page or section instead, and a file that is linked and is no guide, such as an
+example, becomes a page of its own."""
 
-import glob
-import html
+import json
 import os
 import re
 import shutil
 import sys
 
 PROJECT = os.path.abspath(os.path.join(os.path.dirname(__file__), "..", ".."))
-HEADER = "include/VornJsonDbApi.h"
+REFERENCE = "reference"
+HEADERS = {"include/VornJsonDbApi.h": "VornJsonDbApi_8h.html"}
+# In reading order.
+NAVIGATION = {
+    "": ["README.md", "docs/requests.md", "docs/types.md", "docs/limits.md", "docs/log.md"],
+    "Running it": ["docs/performance.md", "docs/reliability.md", "SECURITY.md", "docs/upgrading.md"],
+    "Inside": ["docs/design.md", "CONTRIBUTING.md", "CHANGELOG.md"],
+    "Appendix": ["contrib/scale-out/scale-out.md"],
+}
+EXAMPLES = "examples/README.md"
+LANGUAGES = {".cpp": "cpp", ".h": "cpp", ".sh": "sh", ".json": "json", ".cmake": "cmake"}
 FENCE = re.compile(r"^(```.*?^```$)", re.MULTILINE | re.DOTALL)
 CODE = re.compile(r"(?<!`)(`+)(?!`)(.+?)(?<!`)\1(?!`)", re.DOTALL)
 HEADING = re.compile(r"^(#+) (.+)$", re.MULTILINE)
 LINK = re.compile(r"(!?)\[([^\]]*)\]\(([^)\s]+)\)")
 
-
-def guides():
-    first = ["README.md"]
-    last = ["contrib/scale-out/scale-out.md", "examples/README.md", "SECURITY.md", "CONTRIBUTING.md", "CHANGELOG.md"]
-    return first + sorted(os.path.relpath(path, PROJECT) for path in glob.glob(PROJECT + "/docs/*.md")) + last
-
-
-def page_of(path):
-    """The name of the page without its ".html"."""
-    if path == "README.md":
-        return "index"
-    if path == HEADER:
-        return "VornJsonDbApi_8h"
-    if path == "examples/README.md":
-        return "examples_list"
-    if path.endswith(".md"):
-        return os.path.basename(path)[:-3].lower()
-    return re.sub(r"\W", "_", path)
-
-
-def anchor_of(heading):
-    return re.sub(r"[^\w\- ]", "", heading.lower()).replace(" ", "-")
-
-
-def code(text):
-    """What Doxygen shows unchanged."""
-    text = re.sub(r"[\\@#$%*_`|\[\]!]|::|--", r"\\\g<0>", html.escape(text, quote=False))
-    text = text.replace('"', "&quot;").replace("'", "&apos;").replace("  ", " &nbsp;")
-    return f"<code>{text}</code>"
+CONFIG = {
+    "site_name": "vornjsondb",
+    "use_directory_urls": False,  # the pages can be opened as files
+    "docs_dir": "pages",
+    "theme": {
+        "name": "material",
+        "custom_dir": os.path.join(PROJECT, "docs/site/theme"),
+        "font": False,  # nothing is fetched from elsewhere
+        "features": ["navigation.top", "navigation.sections", "search.highlight"],
+        "palette": [
+            {"media": "(prefers-color-scheme: light)", "scheme": "default",
+             "toggle": {"icon": "material/brightness-4", "name": "Dark colours"}},
+            {"media": "(prefers-color-scheme: dark)", "scheme": "slate",
+             "toggle": {"icon": "material/brightness-7", "name": "Light colours"}},
+        ],
+    },
+    "extra": {"generator": False},
+    "extra_css": ["style.css"],
+    # Words end at the colons of C++ and at the dots of file names, too.
+    "plugins": [{"search": {"lang": "en", "separator": r"[\s\-,:.;!=\[\]{}()\"'`/]+"}}],
+    "markdown_extensions": ["attr_list", "tables", {"toc": {"permalink": True}}, "pymdownx.highlight",
+                            "pymdownx.superfences"],
+}
 
 
 def read(path):
@@ -57,19 +59,46 @@ def read(path):
         return file.read()
 
 
-def header(path):
-    """Line for line, with the code in its comments escaped; "@p name:" would take the colon for a part of the name."""
-    text = re.sub(r"^ *///(?! {5}).*$", lambda line: CODE.sub(lambda match: code(match[2]), line[0]), read(path),
-                  flags=re.MULTILINE)
-    return re.sub(r"@p((?: |\n *///)+)(\w+)", r"\1<code>\2</code>", text)
+def title_of(path):
+    return HEADING.search(FENCE.sub("", read(path)))[2]
+
+
+def anchor_of(heading):
+    return re.sub(r"[^\w\- ]", "", heading.lower()).replace(" ", "-")
+
+
+def section_of(path, anchor):
+    """The heading that has this anchor."""
+    for match in HEADING.finditer(FENCE.sub("", read(path))):
+        if anchor_of(match[2]) == anchor:
+            return match[2]
+    sys.exit(f"{path} has no section {anchor}")
+
+
+def is_file_name(text):
+    return bool(re.fullmatch(r"`?[\w./-]+\.md`?|CHANGELOG", text))
+
+
+def page_of(path):
+    """The Markdown file of the page."""
+    if path == "README.md":
+        return "index.md"
+    if path == EXAMPLES:
+        return "examples.md"
+    if path.endswith(".md"):
+        return os.path.basename(path).lower()
+    return "files/" + re.sub(r"[^\w.]", "_", path) + ".md"
 
 
 class Guide:
-    def __init__(self, path):
+    def __init__(self, path, page=None):
         self.path = path
-        self.title = HEADING.search(read(path))[2]
+        self.page = page or page_of(path)
         self.files = []
         self.pictures = []
+
+    def to(self, target):
+        return os.path.relpath(target, os.path.dirname(self.page))
 
     def link(self, match):
         image, text, target = match.groups()
@@ -81,69 +110,93 @@ class Guide:
             sys.exit(f"{self.path}: no such file: {target}")
         if image:
             self.pictures.append(path)
-            return f'@htmlonly<img src="{os.path.basename(path)}" alt="{html.escape(text)}"/>@endhtmlonly'
-        if not path.endswith(".md") and path != HEADER:
+            return f"![{text}]({self.to('pictures/' + os.path.basename(path))})"
+        if path in HEADERS:
+            return f"[{text}]({self.to(REFERENCE + '/' + HEADERS[path])})"
+        if not path.endswith(".md"):
             self.files.append(path)
-        line = re.fullmatch(r"L(\d+)", anchor)
-        anchor = f"l{int(line[1]):05}" if line else anchor
-        return f"[{text}]({page_of(path)}.html{'#' + anchor if anchor else ''})"
-
-    def heading(self, match):
-        marks, text = match.groups()
-        if marks != "#":
-            return f"\1{anchor_of(text)}\1\n\n{match.group()}"
-        if self.path == "README.md":
-            return f"# {text} {{#mainpage}}"
-        return f"# {text} {{#{page_of(self.path)}}}\n\n[TOC]"
+        elif is_file_name(text):
+            text = section_of(path, anchor) if anchor else title_of(path)
+        return f"[{text}]({self.to(page_of(path))}{'#' + anchor if anchor else ''})"
 
     def text(self, text):
-        """The text between two blocks of code. Code and anchors are put in last, so that nothing changes them."""
+        """The text between two blocks of code. Code is put in last, so that nothing changes it."""
         spans = []
 
         def keep(match):
-            spans.append(code(match[2].replace("\\|", "|")))
+            spans.append(match[0].replace("\\|", "|"))
             return f"\0{len(spans) - 1}\0"
 
-        text = CODE.sub(keep, HEADING.sub(self.heading, text))
-        text = re.sub(r"[%@\\](?=\w)", r"\\\g<0>", text)
-        text = re.sub(r"\*\*([^*]+)\*\*", r"<b>\1</b>", text)
-        text = LINK.sub(self.link, text)
-        text = re.sub("\1(.+?)\1", r'@htmlonly<a id="\1"></a>@endhtmlonly', text)
+        text = HEADING.sub(lambda match: f"{match[0]} {{#{anchor_of(match[2])}}}", text)
+        text = CODE.sub(keep, text)
+        # A link's text may be code.
+        text = LINK.sub(lambda match: self.link(match), text)
         return re.sub("\0(\\d+)\0", lambda match: spans[int(match[1])], text)
 
-    def page(self):
+    def write(self, folder):
         parts = FENCE.split(read(self.path))
-        return "".join(part if part.startswith("```") else self.text(part) for part in parts)
-
-
-def source_page(path, linked_in):
-    command = "include{lineno}" if path.endswith((".cpp", ".h")) else "verbinclude"
-    guides = ", ".join(f"[{guide.title}]({page_of(guide.path)}.html)" for guide in linked_in)
-    return f"/**\n@page {page_of(path)} {path}\nSee {guides}.\n\n@{command} {os.path.join(PROJECT, path)}\n*/\n"
+        write(folder, self.page, "".join(part if part.startswith("```") else self.text(part) for part in parts))
+        for picture in self.pictures:
+            os.makedirs(os.path.join(folder, "pictures"), exist_ok=True)
+            shutil.copy(os.path.join(PROJECT, picture), os.path.join(folder, "pictures"))
 
 
 def write(folder, name, text):
-    with open(os.path.join(folder, name), "w", encoding="utf-8") as file:
+    path = os.path.join(folder, name)
+    os.makedirs(os.path.dirname(path), exist_ok=True)
+    with open(path, "w", encoding="utf-8") as file:
         file.write(text)
 
 
+def block(path):
+    return f"```{LANGUAGES.get(os.path.splitext(path)[1], 'text')}\n{read(path).rstrip()}\n```\n"
+
+
+def output_of(path):
+    """What an example prints, if it is one."""
+    name = os.path.splitext(os.path.basename(path))[0]
+    expected = f"examples/expected/{name}.txt"
+    return expected if os.path.dirname(path) == "examples" and os.path.isfile(os.path.join(PROJECT, expected)) else None
+
+
+def write_file_page(folder, path, linked_in):
+    links = ", ".join(f"[{title_of(guide)}](../{page_of(guide)})" for guide in linked_in)
+    text = f"# {path}\n\nSee {links}.\n\n{block(path)}"
+    output = output_of(path)
+    if output:
+        text += f"\n## What it prints\n\n{block(output)}"
+    write(folder, page_of(path), text)
+
+
+def navigation(examples):
+    entries = []
+    for section, paths in NAVIGATION.items():
+        pages = [{("Start" if path == "README.md" else title_of(path)): page_of(path)} for path in paths]
+        entries += [{section: pages}] if section else pages
+        if not section:
+            entries.append({"Examples": [{"Overview": page_of(EXAMPLES)}] +
+                            [{os.path.basename(path): page_of(path)} for path in examples]})
+            entries.append({"Reference": "reference.md"})
+    return entries
+
+
 def main():
-    if len(sys.argv) == 2:
-        print(header(sys.argv[1]), end="")
-        return
-    folder, site = sys.argv[1:]
+    folder, site, version = sys.argv[1:]
+    pages = os.path.join(folder, "pages")
     linked_in = {}
-    for number, path in enumerate(guides()):
+    for path in [path for paths in NAVIGATION.values() for path in paths] + [EXAMPLES]:
         guide = Guide(path)
-        write(folder, f"{number:02}_{page_of(path)}.md", guide.page())
+        guide.write(pages)
         for file in sorted(set(guide.files)):
-            linked_in.setdefault(file, []).append(guide)
-        for picture in guide.pictures:
-            shutil.copy(os.path.join(PROJECT, picture), site)
-    subpages = "".join(f"- @subpage {page_of(path)}\n" for path in sorted(linked_in))
-    write(folder, "sources.md", f"# Files shown here {{#sources}}\n\n{subpages}")
-    for path, guides_of_it in linked_in.items():
-        write(folder, page_of(path) + ".dox", source_page(path, guides_of_it))
+            linked_in.setdefault(file, []).append(path)
+    for path, guides in linked_in.items():
+        write_file_page(pages, path, guides)
+    reference = Guide("docs/site/reference.md", "reference.md")
+    reference.write(pages)
+    shutil.copy(os.path.join(PROJECT, "docs/site/style.css"), pages)
+    examples = sorted(path for path in linked_in if os.path.dirname(path) == "examples" and path.endswith(".cpp"))
+    config = dict(CONFIG, site_dir=site, nav=navigation(examples), site_description=f"vornjsondb {version}")
+    write(folder, "mkdocs.yml", json.dumps(config, indent=1))
 
 
 main()
