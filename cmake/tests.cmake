@@ -23,3 +23,8 @@ find_program(VORNJSONDB_HARDENING_CHECK hardening-check)
 if(VORNJSONDB_TESTS AND NOT VORNJSONDB_HARDENING_CHECK)
   vornjsondb_left_out("The test of the library with hardening-check" "it was not found")
 endif()
+
+find_program(VORNJSONDB_MESON meson)
+if(VORNJSONDB_TESTS AND NOT VORNJSONDB_MESON)
+  vornjsondb_left_out("The test of a host that is built by Meson" "it was not found")
+endif()

@@ -6,7 +6,7 @@ cd -P "$(dirname "${BASH_SOURCE[0]}")/.."
 build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev libgtest-dev
                 iso-codes pkg-config sqlite3)
 # Debian's static SQLite depends on zlib; the fuzz targets build a locale with a decimal comma.
-test_packages=("${build_packages[@]}" clang devscripts locales python3 zlib1g-dev)
+test_packages=("${build_packages[@]}" clang devscripts locales meson python3 zlib1g-dev)
 
 site_packages=(doxygen doxygen-awesome-css mkdocs mkdocs-material python3)
 

@@ -68,7 +68,7 @@ nothing_left() {
     echo "figure: seconds $way = $((SECONDS - began))"
 }
 
-# found_by_hosts NAME: the README's host is built and run, by CMake and by pkg-config.
+# found_by_hosts NAME: the README's host is built and run, by CMake, pkg-config and Meson.
 found_by_hosts() {
     local folder
     folder=$(host "$1")
@@ -76,6 +76,10 @@ found_by_hosts() {
     in_folder "$folder" "Install it, A host that finds it" 1
     printed
     in_folder "$(host "$1_pkg_config")" "Install it, A host that finds it" 2
+    printed
+    folder=$(host "$1_meson")
+    block "Install it, A host that finds it" meson 1 >"$folder/meson.build"
+    in_folder "$folder" "Install it, A host that finds it" 3
     printed
 }
 

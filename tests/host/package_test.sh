@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: MIT
-# package_test.sh SOURCE WORK HOST EXPECTED HARDENING-CHECK: installs the library as the README says,
+# package_test.sh SOURCE WORK HOST EXPECTED HARDENING-CHECK MESON: installs the library as the README says,
 # moves what was installed, and builds the README's host against it in every way that the README
-# names, and the examples; then removes it. The program hardening-check may be missing.
+# names, and the examples; then removes it. Either program may be missing.
 . "$(dirname "$0")/package.sh"
 [ "$(wc -l <"$host")" -le 30 ] || fail "the host has more than 30 lines"
 
@@ -74,6 +74,18 @@ flags=$(PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig pkg-config --cflags --libs
 # shellcheck disable=SC2086 # several flags
 c++ -std=c++17 "$host" $flags -Wl,-rpath,"$work/moved/$libdir" -o "$work/host"
 runs "$work/host"
+
+# Found by Meson.
+if [ -x "$6" ]; then
+    mkdir "$work/meson"
+    cp "$host" "$work/meson/host.cpp"
+    # shellcheck disable=SC2016 # the marks of a block
+    sed -n '/^```meson$/,/^```$/ { /^```/d; p }' "$source/README.md" >"$work/meson/meson.build"
+    PKG_CONFIG_PATH=$work/moved/$libdir/pkgconfig quietly "Meson does not configure" \
+        "$6" setup "$work/meson/build" "$work/meson"
+    quietly "Meson does not build" "$6" compile -C "$work/meson/build"
+    LD_LIBRARY_PATH=$work/moved/$libdir runs "$work/meson/build/host"
+fi
 
 # pkg-config names folders outside the prefix as they were given.
 quietly "absolute folders do not configure" cmake -S "$source" -B "$work/absolute" "${alone[@]}" \
