@@ -156,8 +156,10 @@ public:
     VornJsonTable(const VornJsonTable&) = delete;
     VornJsonTable& operator=(const VornJsonTable&) = delete;
 
-    /// Why the last call, or the construction, failed; empty and kNone if it did not.
+    /// Why the last call, or the construction, failed, in words; empty if it did not.
     const std::string& reason() const { return end_.strReason; }
+
+    /// The same as a constant; kNone if it did not fail.
     Cause cause() const { return end_.cause; }
 
     /// After a duplicate: the columns of the constraint, in its order; empty for an index on

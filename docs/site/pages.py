@@ -14,10 +14,10 @@ import sys
 
 PROJECT = os.path.abspath(os.path.join(os.path.dirname(__file__), "..", ".."))
 REFERENCE = "reference"
-HEADERS = {"include/VornJsonDbApi.h": "VornJsonDbApi_8h.html"}
+HEADERS = {"include/VornJsonDbApi.h": "VornJsonDbApi_8h.html", "include/VornJsonTable.h": "VornJsonTable_8h.html"}
 # In reading order.
 NAVIGATION = {
-    "": ["README.md", "docs/requests.md", "docs/types.md", "docs/limits.md", "docs/log.md"],
+    "": ["README.md", "docs/requests.md", "docs/front.md", "docs/types.md", "docs/limits.md", "docs/log.md"],
     "Running it": ["docs/performance.md", "docs/reliability.md", "SECURITY.md", "docs/upgrading.md"],
     "Inside": ["docs/design.md", "CONTRIBUTING.md", "CHANGELOG.md"],
     "Appendix": ["contrib/scale-out/scale-out.md"],
