@@ -37,6 +37,13 @@ bool hasTest(const std::string& strSuite, const std::string& strTest)
     return std::string::npos != strTests.find("(" + strSuite + ", " + strTest + ")\n{");
 }
 
+// Whether a test includes the C++ of the section that names it.
+bool isIncluded(const std::string& strPage, const std::string& strTest)
+{
+    static const std::string strTests = folderText("tests");
+    return std::string::npos != strTests.find("#include \"" + strPage + "/" + strTest + ".inc\"\n");
+}
+
 TEST(Documentation, HasNoBlockThatNoTestRuns)
 {
     // The tests of these pages fail when there is a block that they do not know.
@@ -75,7 +82,6 @@ TEST(Documentation, NamesScriptsThatExist)
 // The fixture of these tests looks for the section that names the test.
 TEST(LimitsPage, NamesOneTestInEachSection)
 {
-    const std::string strTests = folderText("tests");
     std::set<std::string> named;
     for (const MarkdownSection& section : limitsPage().sections) {
         SCOPED_TRACE(section.strHeading);
@@ -90,8 +96,7 @@ TEST(LimitsPage, NamesOneTestInEachSection)
         EXPECT_TRUE(named.insert(tests[1]).second);
         EXPECT_PRED2(hasTest, tests[0], tests[1]);
         for (const MarkdownBlock& block : section.blocks) {
-            const std::string strInclude = "#include \"limits/" + tests[1] + ".inc\"";
-            const bool blIncluded = std::string::npos != strTests.find(strInclude);
+            const bool blIncluded = isIncluded("limits", tests[1]);
             EXPECT_TRUE("cpp" == block.strLanguage ? blIncluded : "Limits" == tests[0]);
         }
     }

@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: MIT
-# Writes the C++ of docs/limits.md into files that the tests include: FOLDER/NAME.inc has the block of
-# the section whose test is NAME.
+# Writes the C++ of a page into files that the tests include: FOLDER/NAME.inc has the blocks of the
+# section whose test is NAME.
 /^```/ && inside { inside = 0; next }
 /^```cpp$/ { inside = 1; next }
 inside { text = text $0 "\n" }
