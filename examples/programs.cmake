@@ -11,7 +11,7 @@ endfunction()
 
 find_package(Threads REQUIRED)
 foreach(name IN ITEMS first_steps duplicate_keys nulls_and_raw_filters json_members transactions
-                      two_threads log_on_syslog)
+                      two_threads log_on_syslog operated)
   add_executable(example_${name} ${example_folder}/${name}.cpp)
   target_link_libraries(example_${name} PRIVATE VornJsonDb::vornjsondb Threads::Threads)
   prints_expected(${name})

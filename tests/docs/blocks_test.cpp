@@ -44,11 +44,18 @@ bool isIncluded(const std::string& strPage, const std::string& strTest)
     return std::string::npos != strTests.find("#include \"" + strPage + "/" + strTest + ".inc\"\n");
 }
 
+// Pages whose sections with code name the test that runs it.
+std::vector<std::string> recipePages()
+{
+    return {"operating"};
+}
+
 TEST(Documentation, HasNoBlockThatNoTestRuns)
 {
     // The tests of these pages fail when there is a block that they do not know.
-    const std::set<std::string> known = {"docs/front.md", "docs/limits.md", "docs/log.md",
-                                         "docs/requests.md", "docs/upgrading.md"};
+    std::set<std::string> known = {"docs/front.md", "docs/limits.md", "docs/log.md",
+                                   "docs/requests.md", "docs/upgrading.md"};
+    for (const std::string& strPage : recipePages()) known.insert("docs/" + strPage + ".md");
     for (const std::string& strPage : pages()) {
         if (0 != known.count(strPage)) continue;
         for (const MarkdownSection& section : readPage("../" + strPage).sections) {
@@ -62,6 +69,25 @@ TEST(Documentation, HasNoBlockThatNoTestRuns)
                 EXPECT_PRED3(isRunByInstallWays, section.strHeading, block.strLanguage, n);
             }
         }
+    }
+}
+
+// The fixture of these tests, SectionTest, sees whether they read the blocks that are no C++.
+TEST(Documentation, HasATestForEachRecipe)
+{
+    for (const std::string& strPage : recipePages()) {
+        std::size_t nTests = 0;
+        for (const MarkdownSection& section : readPage(strPage + ".md").sections) {
+            SCOPED_TRACE(strPage + ": " + section.strHeading);
+            const auto test = matches(section.strText, R"(\nTest: `(\w+)\.(\w+)`\n)", {1, 2});
+            if (test.empty() && section.blocks.empty()) continue;
+            ASSERT_EQ(2U, test.size());
+            EXPECT_PRED2(hasTest, test[0], test[1]);
+            for (const MarkdownBlock& block : section.blocks)
+                EXPECT_TRUE("cpp" != block.strLanguage || isIncluded(strPage, test[1]));
+            ++nTests;
+        }
+        EXPECT_LT(0U, nTests) << strPage;
     }
 }
 
