@@ -47,7 +47,7 @@ bool isIncluded(const std::string& strPage, const std::string& strTest)
 // Pages whose sections with code name the test that runs it.
 std::vector<std::string> recipePages()
 {
-    return {"operating", "threads-and-processes"};
+    return {"operating", "speed", "threads-and-processes"};
 }
 
 TEST(Documentation, HasNoBlockThatNoTestRuns)
