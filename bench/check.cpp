@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Whether all contenders do the same work: each operation's results are the same records, and the
 // tables are the same afterwards. The floor runs the very statements of the library instead.

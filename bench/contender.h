@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What is compared: a way for a host to keep JSON records in an SQLite table.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_count CONTENDER OPERATION ROWS, run under
 //     valgrind --tool=callgrind --instr-atstart=no

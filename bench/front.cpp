@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_front CASE, run under callgrind like bench_count: what VornJsonTable.h takes for a record,
 // and what the interface that it stands on takes ("..., bare"). Prints how many records the count

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_kept CASE, run under callgrind like bench_count: what the library keeps of tables and rows
 // (member types, layouts) must not make a call dearer that uses another table, that alternates

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_listing CONTENDER ROWS lists a table of that many rows, in a process of its own, and prints
 // the user CPU time and the growth of the peak memory for each listed row. Small tables are listed

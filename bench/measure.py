@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """Runs the benchmark programs and writes what they measured to a JSON file.
 

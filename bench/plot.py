@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """Plots as SVG text, bars or lines on a logarithmic axis: each function returns the whole file."""
 

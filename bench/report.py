@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """Writes performance.md and its plots from what measure.py measured, prints the document, and fails
 when a limit is missed.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_texts CONTENDER KIND BYTES, run under callgrind like bench_count: what it takes to list
 // rows with one JSON member whose text has about so many bytes ("library"), and what jsoncpp's own

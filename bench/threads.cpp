@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_threads [--without-statistics]: how many times as much work threads with a database each do
 // as one of them alone, from 2 threads to one for each processor; the library and the floor in

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The CPU time of each contender's operations on a table of 1,000 rows, by Google Benchmark. One
 // iteration is one pass over all records, in one transaction; setting up the table is not timed.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // bench_value_list MEMBERS BYTES, run under callgrind like bench_count, counts the instructions of
 // the value list of one record with MEMBERS text members, the first of them BYTES bytes long.

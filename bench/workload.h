@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The work that every contender does: the table `task`, its records and the six operations on them.
 #pragma once

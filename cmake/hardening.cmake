@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # vornjsondb_hardening(TARGET): hardens it as Debian does its packages. What the compiler does applies to the
 # configurations that optimise, and is left to whoever sets the flags where there is no configuration.

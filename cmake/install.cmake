@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # What is installed: the library, a shared one with its links, the headers, a package for find_package and one for
 # pkg-config, the program with its completion, the manual pages and the licence. Both packages can be moved with what

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # While installing: adds those of the folders that are not there yet, and their parents, to the notes, the inner
 # ones first.

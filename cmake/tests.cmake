@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # What the tests need: where it is missing they are left out, and the build of the library goes on.
 

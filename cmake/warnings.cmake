@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # vornjsondb_warnings(TARGET [FLAG...]): the warnings that the project is clean of, as errors when
 # VORNJSONDB_WERROR is on.

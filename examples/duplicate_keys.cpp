@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 /// @file
 /// Duplicate keys: how a host tells a record that already exists from one that failed otherwise.

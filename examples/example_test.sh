@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # example_test.sh EXPECTED PROGRAM [ARGUMENT...]: runs an example, which has to succeed and to print
 # EXPECTED, standard error included. In log lines PID and LINE stand for the numbers, and TIME for those of a clock.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 /// @file
 /// First steps: opens a database, describes a table of tasks, and creates, gets, lists, updates and

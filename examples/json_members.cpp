@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 /// @file
 /// JSON members: an object and an array are members of a record and come back as such. They are

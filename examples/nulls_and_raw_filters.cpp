@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 /// @file
 /// Nulls and raw filters: a column that is NULL is a member that the record lacks, and what a plain

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # The small examples: each is built against VornJsonDb::vornjsondb, the target of this project and of
 # the installed package, and a test compares what it prints with expected/NAME.txt.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // JSON text as the definition of a table: the member types that are read from it, against a model,
 // and each operation on a handle that has it. The table is called "t" in the input.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The value list against SQLite's own formatter. The first line of the input is a JSON array of
 // values, the rest is the text that the list is appended to:

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // JSON text as the library reads and writes it, against jsoncpp's own reader and writer: the same
 // kinds, values, order, offsets, text and exceptions. The first byte of the input chooses the

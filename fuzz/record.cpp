@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A record through create, save and fetch, against what each type word promises. The input is the
 // list of the members, named a, b, c ... in their order:

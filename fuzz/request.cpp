@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // JSON text as the request of every operation that takes one. The input is an array of the request
 // (the filter) and, where an operation takes a second object, of that; or the request alone.

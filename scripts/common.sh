@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Shared by the scripts; sourced, not run. Leaves the shell in the project's top folder.
 set -euo pipefail

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Which values of a table a definition does not read as they are. Other programs may have written
 // them; what goes through the table is checked there.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The commands, one topic a file. Each returns the exit status, or throws what failure.h declares.
 #pragma once

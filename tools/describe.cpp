@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A definition from a table that exists. The declared types of the columns decide; where one says
 // nothing, the values in the column do.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every record as JSON lines, or as CSV as RFC 4180 describes it.
 #include "commands.h"

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What ends a command early: thrown by its parts, turned into a message and an exit status in main.
 #pragma once

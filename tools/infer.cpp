@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A definition and a CREATE statement from records: such that every record can be stored as it is.
 #include "commands.h"

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // vornjsondb: works with the JSON records in the tables of an SQLite database.
 #include "arguments.h"

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Standard output, apart from the C library's: the log of libvornjsondb never gets in between.
 #pragma once

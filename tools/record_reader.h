@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Records from a file or standard input: JSON lines, one at a time, or a JSON array, as a whole.
 #pragma once

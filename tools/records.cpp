@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // One record, or those that a condition selects: create, save, get, count, update, delete.
 #include "commands.h"

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every contender; the optional ones are missing if their library was not found. "Kept" ones
 // prepare their statements once, the others for each call.

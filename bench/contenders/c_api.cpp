@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A hand-written host on the C API: statements prepared once, values bound, columns read by their
 // types, jsoncpp with a reader and a writer that are kept.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The floor of the library's interface: the texts that it composes, ready made, each run through
 // sqlite3_exec with a callback that throws the rows away. Nothing is decoded. bench_check compares

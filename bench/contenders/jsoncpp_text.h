@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // jsoncpp's reader and writer as a careful host keeps them: made once, without comments.
 #pragma once

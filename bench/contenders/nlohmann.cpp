@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The same hand-written host on the C API, with nlohmann::json in place of jsoncpp.
 #include "contenders/all.h"

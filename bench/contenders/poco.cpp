@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host on Poco::Data with Poco::JSON. A record comes out of a record set, or of a variable for
 // each column.

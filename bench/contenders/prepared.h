@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // How a host uses a C++ library: its statements prepared once, as careful hosts do, or for each
 // call, as the libraries' own examples do; a result's columns in the library's type for the rows of

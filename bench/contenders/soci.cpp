@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host on SOCI, using jsoncpp as the hand-written host does. A record comes out of SOCI's row, or
 // of a variable for each column.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host that lets SQLite's JSON functions take records apart and put them together, and jsoncpp
 // read and write each record as one text.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host on SQLiteCpp, using jsoncpp as the hand-written host does.
 #include "contenders/all.h"

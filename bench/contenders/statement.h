@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Shared by the hand-written hosts on the C API: thin owners of a database and of statements that
 // are prepared once.

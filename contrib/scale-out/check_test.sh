@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # check_test.sh OWNER WORK: what contrib/scale-out/scale-test judges by, on a local file: it counts what is there,
 # and notices what is not.

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # The cases of contrib/scale-out/scale-test with the programs that work on a local file; sourced, not run.
 

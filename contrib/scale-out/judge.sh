@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # What contrib/scale-out/scale-test and check_test.sh judge by; sourced, not run.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The owner of a database, a host that writes records for some seconds and notes what was
 // acknowledged:

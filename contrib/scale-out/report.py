@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """Writes what contrib/scale-out/scale-test measured into its page, between the marks, and the plot beside it.
 

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """check.py SITE: every link and every picture of the site leads to a file and an anchor that are there, nothing is
 fetched from elsewhere, and no mark of Markdown is left in a text."""

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """header.py HEADER: prints the header, line for line, as Doxygen has to read it: it takes "%s" and quotes in the code
 of a comment for marks of its own, and the colon of "@p name:" for a part of the name."""

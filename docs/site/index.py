@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """index.py SITE: takes the pages of files out of the index of the site's search, and gives each section of
 search_terms.json its terms: a search ranks them above what only mentions them."""

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """pages.py FOLDER SITE VERSION: writes FOLDER/mkdocs.yml and, in FOLDER/pages, the guides and the examples as MkDocs
 reads them; the site will be in SITE.

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """screenshots.py SITE FOLDER: pictures of the main pages at the width of a phone and of a desk, in light and in dark
 colours, from the top on. Fails if any page of the site is wider than the window, or has a block of code that is cut."""

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """search.py SITE: searches the site for each term of search_terms.json; the section that explains it has to be the
 first or the second one of the list. Serves the site on this machine, since a page that was opened as a file cannot search."""

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 /// @file
 /// A host that takes records and requests from strangers: a command per line on standard input, an

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Runs a target on files and on the files of folders, as libFuzzer does with a corpus: for tests
 // and for looking at a finding without libFuzzer.

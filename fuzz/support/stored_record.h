@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What becomes of a record, stated without the library: the reference for the record target.
 #pragma once

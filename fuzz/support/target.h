@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What every fuzz target is built on. entry.cpp hands each input to testInput() and checks the
 // process afterwards.

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Creates clean Debian systems, each in its own folder, for the scripts that run something in them; sourced
 # after common.sh. The script must set root, the folder of the system, which is saved as $root.tar.zst.

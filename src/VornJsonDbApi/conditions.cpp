@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 #include "VornJsonDbApi/operation.h"
 #include "util/json_members.h"

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The text so far is itself a format of sqlite3_mprintf. Its grammar there:
 //

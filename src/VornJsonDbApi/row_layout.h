@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What rows of the same columns become, so that only the first of them is decoded by name.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Members of a JSON value of any kind: a value that is not an object has none, where jsoncpp's own
 // calls would throw.

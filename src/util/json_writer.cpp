@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // toString(): the text that jsoncpp's stream writer gives without comments and indentation, written
 // straight into a string.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The log: one line per failed check or message, to syslog or standard output as the host chose.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Values by name for all threads at once. What is in it stays, where it is, until the process ends.
 #pragma once

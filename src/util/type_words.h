@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The vocabulary of "cpptype": one row per word, one column per consumer.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The database that the killed writer and the checker share, what the writer does with it, and what
 // has to be in it according to the writer's reports.

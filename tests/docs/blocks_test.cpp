@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every block of code in the documentation is run, every section of docs/limits.md has a test of
 // its own, and the tests, scripts and guards that pages name exist.

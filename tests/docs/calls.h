@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The calls of a handle, from JSON text to JSON text. A call that fails gives its result instead.
 #pragma once

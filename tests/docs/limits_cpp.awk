@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Writes the C++ of a page into files that the tests include: FOLDER/NAME.inc has the blocks of the
 # section whose test is NAME.

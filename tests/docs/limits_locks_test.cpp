@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/limits.md: locks, what waiting costs, what a retry does, and what a cancelled thread leaves.
 

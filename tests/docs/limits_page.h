@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/limits.md: a test takes its examples from the section that names it.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/limits.md, definitions and the process: names, ids, threads, plugins, the reader.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/log.md: its list of lines is complete, and its forms and examples are what the library
 // writes.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // man/: the page of the class has every declaration of the header, and the other one says the same
 // as the guides, which are run.

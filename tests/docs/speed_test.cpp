@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/speed.md: commits, waits for the disk, scanned rows and the library's part, all counted.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/upgrading.md: rows in every JSON layout of the page are read back as the same record.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Calls on types that are missing, of the wrong kind or partial, and every line that each logs.
 #pragma once

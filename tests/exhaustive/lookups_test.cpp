@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The lookups of member types in every operation, on types that are missing, of the wrong kind
 // or partial: the result, the whole log and what is left in the table.

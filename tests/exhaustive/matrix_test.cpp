@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every argument of every function as every kind of JSON value, including a member of every type
 // word: how the call ends, that it changes nothing that it should not, and that handle and

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // How wide, long and deep records may be. Each failed look-up of member types logs those of all
 // tables, so the tests of look-ups run before the wide tables here.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A page costs the same wherever it is, if its order is that of an index in one direction.
 #include "front/front.h"

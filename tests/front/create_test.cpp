@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Creating records: what is stored, what is refused, duplicates and triggers.
 #include "front/front.h"

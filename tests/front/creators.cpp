@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // creators PROCESSES SECONDS: so many processes create records on one file at once, with a rollback
 // journal and then in WAL. Every text is written once, so no call may say duplicate. The file must

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Records handed out one by one, callbacks that throw, and limits.
 #include "front/front.h"

@@ -1,4 +1,5 @@
 #!/usr/bin/env python3
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """evaluate.py PROGRAM...: judges what the table selects, by what docs/front.md says, with plain Python over
 the records. The program is that of the tests. It writes a line for each table and each of its answers."""

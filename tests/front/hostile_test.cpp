@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every hostile text, and every text in an attack on the example of a guarded host, as a value, a
 // name, an operator, an option, a sort key and a page key: it is refused or harmless. A victim

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Another connection holds a lock, for as long as the table tries or for less.
 #include "front/front.h"

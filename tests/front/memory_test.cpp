@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Each allocation of each operation fails in turn: std::bad_alloc or a reason, nothing is left open
 // and nothing is written.

@@ -1,34 +1,15 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Random conditions, orders and pages, compared with prepared statements that are written apart
 // from the table: with bound values, other SQL for each operator, and pages cut from the whole.
 // evaluate.py judges them, too, in the file that VORN_FRONT_ANSWERS names.
 #include "front/front.h"
+#include "front/oracle_tables.h"
 #include "front/random.h"
 
 #include <fstream>
 
 namespace {
-
-constexpr char kMembers[] = R"({
-    "big":  {"cpptype": "long long"},
-    "code": {"cpptype": "string"},
-    "doc":  {"cpptype": "Json::Value"},
-    "flag": {"cpptype": "bool"},
-    "id":   {"cpptype": "long long"},
-    "name": {"cpptype": "string"},
-    "num":  {"cpptype": "int"}})";
-
-const char* const kTables[] = {
-    "big integer, code text, doc text, flag integer, id integer primary key, name text, num "
-    "integer",
-    "big integer, code text, doc text, flag integer, id integer, name text, num integer, "
-    "primary key (code, id)) without rowid --",
-    "big integer not null, code text, doc text, flag integer, id integer primary key, "
-    "name text collate nocase, num integer",
-};
-const char* const kIndexes[] = {"", "create index @_i on @ (num, name)",
-                                "create index @_i on @ (name)"};
-constexpr int kRows = 60;
 
 // A condition, and the oracle's SQL of it with the values that are bound to it.
 struct Asked {

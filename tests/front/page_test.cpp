@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/front.md: every row of every table is run on the records of the page.
 #include "front/front.h"

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Random records of hostile texts through every operation that writes: what is in the file
 // afterwards is what was sent, or the call was refused with a reason and the file is unchanged.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Shared by the tests that draw what they do. VORN_FRONT_RECORDS and VORN_FRONT_REQUESTS say how
 // much, VORN_FRONT_SEED where the draws begin.

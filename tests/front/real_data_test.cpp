@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every record of Debian's package iso-codes, created in batches and handed out again, and every
 // text that the reader of JSON is tested with.

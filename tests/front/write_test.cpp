@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Creating many, saving, updating and deleting, in and out of a transaction of the host's.
 #include "front/front.h"

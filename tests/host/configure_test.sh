@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # configure_test.sh SOURCE WORK: a plain configuration works with only the library's own dependencies
 # installed, and says which tests it leaves out; if all tests are required it fails. And no part of the project

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A plugin with flags of its own; two_plugins loads two of them. LOG_TO_STDOUT is the flag's
 // initial value.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host whose handles are globals, in several language versions: they work before main, in main
 // and while the process exits. The status tells which step failed.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The header as the only thing that a host includes: it declares what the host needs to open its
 // connection and to read and write JSON.

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # install_ways.sh: runs every block of README's "Install it", word for word: each way ends in the README's
 # host, which has to print what the README says, and is then removed again. For a machine that is thrown

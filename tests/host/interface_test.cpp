@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What a host compiles and links against, beyond what abi/ and debian/libvornjsondb6.symbols check:
 // they hold the exported functions, their types and, for 64 bits, the layout.

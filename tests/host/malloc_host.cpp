@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Fails malloc, n-th call by n-th call, while a host creates and lists records: jsoncpp takes its
 // texts from malloc and throws Json::RuntimeError when there is none. After each the handle works

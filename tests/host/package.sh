@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Shared by the tests that configure and install the library; sourced, not run. Their arguments begin with SOURCE
 # WORK. Those that build hosts go on with HOST EXPECTED: the README's host, and what it prints.

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # package_part_test.sh SOURCE WORK HOST EXPECTED: the library as a part of a host's own build, in every way that
 # the README names.

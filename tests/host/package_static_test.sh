@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # package_static_test.sh SOURCE WORK HOST EXPECTED: installs the static library, moves what was installed, and
 # builds hosts with it: the README's, one with a global handle and one whose plugin has the library inside; and

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # package_test.sh SOURCE WORK HOST EXPECTED HARDENING-CHECK MESON: installs the library as the README says,
 # moves what was installed, and builds the README's host against it in every way that the README

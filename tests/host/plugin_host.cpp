@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Loads a plugin that uses the library, unloads it and loads it again, and uses it a last time
 // while the process exits: the library was loaded after this program's globals were made, so its

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # sharded_test.sh PROGRAM EXPECTED WORK: what examples/sharded says if a tenant's file is not a database,
 # belongs to another owner or cannot be made, and that the other files are as they were.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The header of the table as the only thing that a host includes; every function is compiled.
 #include <VornJsonTable.h>

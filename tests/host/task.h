@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A table of tasks in memory, for hosts and a plugin in every language version since C++11.
 #ifndef TESTS_HOST_TASK_H

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Loads two plugins that have flags of their own, and prints each step after what the library logs
 // to standard output in it. With HOST_HAS_FLAGS it defines the flags, too. The status tells which

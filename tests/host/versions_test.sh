@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # versions_test.sh SOURCE WORK JSONCPP_DIR SQLITE_HEADERS CMAKE_OPTION...: the lowest versions of
 # CMakeLists.txt are those of the README; with them the project configures, and with a lower one it

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every hostile string in the roles of a text that is data: it comes back as it was, and finds and
 // deletes the record that holds it.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every hostile string in the roles of a text that becomes SQL as it is, or decides how values are
 // read: the call ends with a result, logs a failure, and handle and connection go on working.

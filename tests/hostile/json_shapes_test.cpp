@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What a process has learnt of nested objects must not show in those that it reads later. Every
 // process starts afresh, so that there is room for what it learns.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The languages and subdivisions of Debian's package iso-codes through every operation, each
 // record compared whole with its entry in the source file. Members that an entry lacks are absent

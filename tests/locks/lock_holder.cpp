@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Another program that holds a lock: lock_holder FILE SQL runs the text, says "held", and commits
 // when it is told to or left alone (a byte or the end of its input). Then it says "released".

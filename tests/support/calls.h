@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every function of the library by name, with arguments from JSON, for tests that put each of them
 // through the same trouble.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host's connections to a file, without the doubles, and what a call of the library must not
 // leave behind on one.

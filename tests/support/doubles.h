@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Doubles for what the library calls outside itself, put in by symbol interposition: the functions
 // are defined in the test program, where the loader finds them before the real ones. By default

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // SQLite's own formatter as the judge of value lists: wherever C defines what
 //

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Look-ups of member types as their tests expect them in the log, and definitions that have none.
 #pragma once

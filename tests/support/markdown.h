@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The documentation as test data: texts of the project, and the sections, blocks of code and tables
 // of a Markdown page.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Shared by the tests that try very many arguments, or calls that are written as words.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every operation of the library that touches the file, on a table of twelve records, with the log
 // of its failure.

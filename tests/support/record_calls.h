@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A table of three records, the calls of the record operations, and all that a call results in.
 #pragma once

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // When threads begin, end and fork, and how little stack they may have. No doubles here, which
 // would see the library's own variables of a thread come and go.

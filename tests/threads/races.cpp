@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // races jsoncpp|sqlite|library: a race inside it, made by two threads that share what they must
 // not. ThreadSanitizer has to report it, or it sees nothing there.

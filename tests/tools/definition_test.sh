@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Tests the definitions that `infer` and `describe` print, and what they refuse.
 . "$(dirname "${BASH_SOURCE[0]}")/tool.sh"

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Tests how the program ends: usage, help, the log, outputs that cannot be written, and locks.
 project=$(realpath "$(dirname "${BASH_SOURCE[0]}")/../..")

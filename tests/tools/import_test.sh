@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Tests `import`: what it reads, which line it names, and what is in the table if a line fails.
 . "$(dirname "${BASH_SOURCE[0]}")/tool.sh"

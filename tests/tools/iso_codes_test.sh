@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Infers a table for every file of the package iso-codes, imports the file and compares each record.
 . "$(dirname "${BASH_SOURCE[0]}")/tool.sh"

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Tests the commands that read and change records: every output, and what is in the table afterwards.
 . "$(dirname "${BASH_SOURCE[0]}")/tool.sh"

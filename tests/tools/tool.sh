@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # Shared by the tests of the program vornjsondb; sourced, not run, with their arguments: PROGRAM
 # WORK-FOLDER [MEMORY]. Leaves the shell in the work folder, which is empty then.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // SqlExpandMemberList: a request as WHERE terms or as the SET list of an UPDATE.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Value lists after texts that hold conversions of SQLite's formatter: what a "%" in the text so
 // far makes of the values that follow.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Operations of a handle while the host does something unusual: it changes member types, its SQL
 // functions run inside a statement, or memory runs out.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Value lists as long as SQLite's formatter allows, and one byte longer. Where the machine lacks
 // the memory for SQLite's own limit, a double of sqlite3_mprintf has a lower one.

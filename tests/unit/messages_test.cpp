@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Hosts search the log for its texts. data/messages.txt lists all of them: the library and its
 // sources hold these and no others, and each but the guards is logged by some test. This catches a

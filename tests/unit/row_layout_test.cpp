@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Later rows and statements, which are decoded by what is already known of their columns: a host
 // sees no difference.

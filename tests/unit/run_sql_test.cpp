@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // runSqlEx: results, callbacks, error texts and log lines, also while the database is locked.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Column lists, and value lists of records without a percent sign; the definition and the member
 // types that they are made from.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Every attack succeeds against a host without checks, and fails against the example. SECURITY.md
 // names each, and whether it is refused.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The rules of the host itself, and what one user leaves to the others: their notes, their time and
 // the memory of the host.

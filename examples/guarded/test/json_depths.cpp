@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Prints how deep a JSON value may be nested before jsoncpp, or the library's writer of JSON text,
 // overflows a stack of 8 MiB. Every depth is tried in a process of its own. With an argument the

@@ -1,4 +1,5 @@
 #!/usr/bin/env bash
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 # memory_test.sh PROGRAM WORK: that examples/guarded, with any amount of memory that it starts with at all,
 # either lists the largest notes that strangers can make or says that it failed, and then goes on. Nor does a

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // The example's table, somebody else's table beside it, and Eve, who sends lines to the example, or
 // to a host that passes what it reads to the library unchecked.

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """All mutants of a source file: each one is a small change that keeps every line in its place."""
 

@@ -1,3 +1,4 @@
+# SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
 """Mutation testing of src/: every mutant, or a sample of them, judged by the tests.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // A host on a disk that may fail: a database file of a few records, a connection to it and a
 // handle.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What the host process gives the library: the log, the clock, the wait, and three allocators, each
 // with a fault that can be armed: SQLite's through SQLITE_CONFIG_MALLOC, C++'s operator new, and

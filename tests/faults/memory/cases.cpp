@@ -1,14 +1,11 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 #include "faults/memory/points.h"
 #include "faults/memory/store.h"
 
-namespace {
-
 // A long of 64 bits goes beyond the calendar.
 const char* const kLastLong =
     8 == sizeof(long) ? kFailure : R"({"text": "Tue, 19 Jan 2038 03:14:07 GMT"})";
-
-}  // namespace
 
 const std::vector<Case> kCases = {
     {"constructor", R"({"handle": false, "name": "made"})", R"({"made": true, "silent": true})",

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // Fails each allocation of each operation, alone and with all that follow, and checks each time
 // that the call ended in an allowed way and that connection and handle still work.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // What docs/limits.md says of a host that runs out of memory, in processes that have not used the
 // library before.

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // One fault point: a call of a case during which an allocation fails, and everything that has to
 // hold afterwards.
