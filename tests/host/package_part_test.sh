@@ -30,7 +30,8 @@ cmake -S "$work/part" -B "$work/part/build" -DVORNJSONDB_INSTALL=ON -DCMAKE_BUIL
 quietly "the host does not build" cmake --build "$work/part/build" -j "$(nproc)"
 installed "$work/part/build" "$work/part/moved"
 rm -r "$work/part/moved/bin"
-lists "$work/part/moved"
+# Without the program, which the host has not asked for.
+lists "$work/part/moved" "/vornjsondb$/d; /vornjsondb\.1$/d"
 
 # Static.
 host_project part_static -DBUILD_SHARED_LIBS=OFF -DCMAKE_EXE_LINKER_FLAGS=-Wl,-z,defs <<<"$project"
