@@ -118,10 +118,12 @@ TEST_F(ThreadsAndProcesses, ConnectionPerThread)
     EXPECT_EQ(1U, json(listed(reader.api)).size());
     EXPECT_TRUE(state().sleeps.empty());
 
-    // One that waits in vain, and one that fails and leaves no transaction open.
+    // One that waits in vain, before it writes, and one that fails and leaves no transaction open.
     writer.run("begin immediate");
+    takeStatements();
     Json::Value jRecord = json(R"({"text":"x"})");
     EXPECT_FALSE(storeInTurn(reader.api, jRecord));
+    EXPECT_EQ(std::vector<std::string>(500, "begin immediate"), takeStatements());
     EXPECT_EQ(500U, state().sleeps.size());
     writer.run("rollback");
     jRecord["text"] = 7;
