@@ -19,8 +19,9 @@ HEADERS = {"include/VornJsonDbApi.h": "VornJsonDbApi_8h.html", "include/VornJson
 # In reading order.
 NAVIGATION = {
     "": ["README.md", "docs/requests.md", "docs/front.md", "docs/types.md", "docs/limits.md", "docs/log.md"],
-    "Running it": ["docs/operating.md", "docs/threads-and-processes.md", "docs/speed.md", "docs/performance.md",
-                   "docs/reliability.md", "SECURITY.md", "docs/upgrading.md"],
+    "Running it": ["docs/changing-a-table.md", "docs/large-results.md", "docs/backup.md", "docs/operating.md",
+                   "docs/threads-and-processes.md", "docs/speed.md", "docs/performance.md", "docs/reliability.md",
+                   "SECURITY.md", "docs/upgrading.md"],
     "Inside": ["docs/design.md", "CONTRIBUTING.md", "CHANGELOG.md"],
     "Appendix": ["contrib/scale-out/scale-out.md"],
 }

@@ -48,7 +48,8 @@ bool isIncluded(const std::string& strPage, const std::string& strTest)
 // Pages whose sections with code name the test that runs it.
 std::vector<std::string> recipePages()
 {
-    return {"operating", "speed", "threads-and-processes"};
+    return {"backup", "changing-a-table",     "large-results", "operating",
+            "speed",  "threads-and-processes"};
 }
 
 TEST(Documentation, HasNoBlockThatNoTestRuns)
