@@ -160,7 +160,7 @@ public:
     /// Why the last call, or the construction, failed, in words; empty if it did not.
     const std::string& reason() const { return end_.strReason; }
 
-    /// The same as a constant; kNone if it did not fail.
+    /// The same as a value; kNone if it did not fail.
     Cause cause() const { return end_.cause; }
 
     /// After a duplicate: the columns of the constraint, in its order; empty for an index on
@@ -193,15 +193,16 @@ public:
     int create(const Json::Value& jRecord, Json::Value& jStored)
     {
         return static_cast<int>(call({&jRecord}, [&] {
-            const Json::Value jFilled = filled(jRecord);
-            jStored = transact("begin immediate", [&] { return insert({jFilled}); });
+            Json::Value jCopy;
+            const Json::Value& jFilled = filled(jRecord, jCopy);
+            jStored = transact("begin immediate", [&] { return insert({&jFilled}); });
             return 0;
         }));
     }
 
     /// Inserts every record of the array @p jRecords as create() does, all of them or none.
-    /// Records of the same members go into one statement. record() gives the position of the one
-    /// that failed, and the reason begins with it. Returns their number, or -1.
+    /// Records of the same members share a prepared statement. record() gives the position of the
+    /// one that failed, and the reason begins with it. Returns their number, or -1.
     long long createMany(const Json::Value& jRecords)
     {
         return call({&jRecords}, [&] {
@@ -222,10 +223,11 @@ public:
     {
         return static_cast<int>(call({&jRecord}, [&] {
             check(jRecord, true);
-            const std::string strKey = keyTerm(jRecord);
+            const std::string strKey = keyIn({values(key_, jRecord)});
             jStored = transact("begin immediate", [&] {
-                if (0 < change(strKey, jRecord)) return readBack({strKey})[0];
-                return insert({filled(jRecord)});
+                if (0 < change(strKey, jRecord)) return readBack(strKey, 1)[0];
+                Json::Value jCopy;
+                return insert({&filled(jRecord, jCopy)});
             });
             return 0;
         }));
@@ -356,17 +358,15 @@ private:
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
         {"Json::Value", Json::nullValue, "a JSON value"}};
-    static constexpr unsigned kBatch = 100;  // rows of a statement
+    static constexpr unsigned kBatch = 100;  // rows read back together
     static constexpr long long kPage = 200;  // rows of a page of each()
 
     // ---- Calls
 
-    [[noreturn]] static void fail(Cause cause, const std::string& strReason)
+    [[noreturn]] static void refuse(const std::string& strWhy)
     {
-        throw Failure{cause, strReason};
+        throw Failure{Cause::kRefused, strWhy};
     }
-
-    [[noreturn]] static void refuse(const std::string& strWhy) { fail(Cause::kRefused, strWhy); }
 
     [[noreturn]] static void refuseMember(const std::string& strMember, const std::string& strWhy)
     {
@@ -442,11 +442,13 @@ private:
                            const char* szUnit)
     {
         if (0 < nMost && nMost < n)
-            fail(Cause::kLimit, strWhat + " has more than " + std::to_string(nMost) + szUnit);
+            throw Failure{Cause::kLimit,
+                          strWhat + " has more than " + std::to_string(nMost) + szUnit};
     }
 
-    static void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes)
+    void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes) const
     {
+        if (0 == limits_.nRequestMembers && 0 == limits_.nRequestBytes) return;
         if (jValue.isString()) nBytes += jValue.asString().size();
         for (auto it = jValue.begin(); it != jValue.end(); ++it) {
             ++nMembers;
@@ -463,14 +465,14 @@ private:
         const int iCode = sqlite3_extended_errcode(pDb_);
         const int iPrimary = iCode & 0xff;
         const std::string strError = sqlite3_errmsg(pDb_);
+        const std::string strSteps = std::to_string(limits_.nSteps);
         if (SQLITE_INTERRUPT == iPrimary && 0 < limits_.nSteps)
-            fail(Cause::kLimit,
-                 "a statement takes more than " + std::to_string(limits_.nSteps) + " steps");
+            throw Failure{Cause::kLimit, "a statement takes more than " + strSteps + " steps"};
         if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
-            fail(Cause::kLocked, "locked: " + strError);
+            throw Failure{Cause::kLocked, "locked: " + strError};
         if (SQLITE_CONSTRAINT_UNIQUE != iCode && SQLITE_CONSTRAINT_PRIMARYKEY != iCode &&
             SQLITE_CONSTRAINT_ROWID != iCode)
-            fail(Cause::kFailed, strError);
+            throw Failure{Cause::kFailed, strError};
         // UNIQUE constraint failed: item.name, item.lang
         Texts columns;
         const std::string strTable = strName_ + ".";
@@ -479,7 +481,7 @@ private:
         for (std::string strWord; words >> strWord && "index" != strWord;) {
             // A trigger may have written to another table.
             if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), static_cast<int>(n)))
-                fail(Cause::kFailed, strError);
+                throw Failure{Cause::kFailed, strError};
             columns.push_back(strWord.substr(n, strWord.find(',') - n));
         }
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
@@ -492,7 +494,8 @@ private:
         const int iChanges = pApi_->runSqlEx(strSql);
         if (0 > iChanges) failSql();
         if (0 <= iRows && iRows != iChanges)
-            fail(Cause::kChanged, "a trigger or an \"on conflict\" clause ignored a record");
+            throw Failure{Cause::kChanged,
+                          "a trigger or an \"on conflict\" clause ignored a record"};
         return iChanges;
     }
 
@@ -512,12 +515,11 @@ private:
         const auto pStatement = prepare(strSql);
         if (nullptr == pStatement) failSql();
         Texts cells;
-        int iStatus = sqlite3_step(pStatement.get());
-        for (; SQLITE_ROW == iStatus; iStatus = sqlite3_step(pStatement.get())) {
+        while (SQLITE_ROW == sqlite3_step(pStatement.get())) {
             const auto* szText = sqlite3_column_text(pStatement.get(), 0);
             cells.emplace_back(szText ? reinterpret_cast<const char*>(szText) : "");
         }
-        if (SQLITE_DONE != iStatus) failSql();
+        if (SQLITE_OK != sqlite3_reset(pStatement.get())) failSql();
         return cells;
     }
 
@@ -533,6 +535,7 @@ private:
     std::string literal(std::string strMember, const Json::Value& jValue)
     {
         if (jValue.isNull()) return "null";
+        if (isNumber(formOf(strMember))) return std::to_string(jValue.asInt64());
         std::string strTerm;  // name='O''Brien'
         if (0 > pApi_->SqlMakeByMatchField(strMember, const_cast<Json::Value&>(jValue), strTerm))
             throw std::bad_alloc();
@@ -546,10 +549,10 @@ private:
     }
 
     // ('x','en')
-    std::string values(const Json::Value& jRecord)
+    std::string values(const Texts& names, const Json::Value& jRecord)
     {
         const auto value = [&](const auto& strName) { return literal(strName, jRecord[strName]); };
-        return "(" + join(jRecord.getMemberNames(), ",", value) + ")";
+        return "(" + join(names, ",", value) + ")";
     }
 
     template <typename Range, typename ToText>
@@ -692,6 +695,7 @@ private:
     }
 
     static bool isJson(Form form) { return kObject <= form; }
+    static bool isNumber(Form form) { return kText != form && !isJson(form); }  // a bool is 1 or 0
 
     static bool hasKind(Form form, const Json::Value& jValue)
     {
@@ -745,64 +749,88 @@ private:
 
     // ---- Writing
 
-    void check(const Json::Value& jRecord, bool blWithKey = false) const
+    const Json::Value& check(const Json::Value& jRecord, bool blWithKey = false) const
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) checkFits(it.name(), *it);
         for (const std::string& strKey : key_)
             if (blWithKey && jRecord[strKey].isNull())
                 refuseMember(strKey, "missing, expected the whole key");
-    }
-
-    // With its defaults, and null for what no column fills in: in an integer key, SQLite does.
-    Json::Value filled(Json::Value jRecord)
-    {
-        expect(jRecord.isObject(), "the record is ", jRecord, "an object");
-        pApi_->fillDefaultValue(jRecord, false);
-        VORN_JSON_DB::jsonCopyMember(jRecord, jAbsent_, false);
-        check(jRecord, !blRowidKey_);
         return jRecord;
     }
 
-    // code='x' and lang='en'
-    std::string keyTerm(const Json::Value& jRecord)
+    // With its defaults, and null for what no column fills in: in an integer key, SQLite does. A
+    // record that lacks nothing is not copied.
+    const Json::Value& filled(const Json::Value& jRecord, Json::Value& jCopy)
     {
-        return join(key_, " and ", [&](const auto& str) { return equals(str, jRecord[str]); });
+        expect(jRecord.isObject(), "the record is ", jRecord, "an object");
+        if (names_.size() == jRecord.size()) return check(jRecord, !blRowidKey_);
+        jCopy = jRecord;
+        pApi_->fillDefaultValue(jCopy, false);
+        VORN_JSON_DB::jsonCopyMember(jCopy, jAbsent_, false);
+        return check(jCopy, !blRowidKey_);
     }
 
-    // insert into item (id,name) values (1,'x'),(2,'y')
-    // One by one if the records have not all their keys and the same members. Returns the first
-    // row.
-    Json::Value insert(std::vector<Json::Value> records)
+    // (id) in ((1),(2)), (code,lang)=('x','en') or (code,lang)=('y','de')
+    std::string keyIn(const Texts& keys) const
     {
-        const Texts names = records[0].getMemberNames();
-        const auto isAlike = [&](const Json::Value& jRecord) {
-            return !jRecord[key_[0]].isNull() && names == jRecord.getMemberNames();
-        };
-        if (1 < records.size() && !std::all_of(records.begin(), records.end(), isAlike)) {
-            for (const Json::Value& jRecord : records) insert({jRecord});
-            return {};
+        const std::string strKey = "(" + join(key_, ",") + ")";
+        if (1 == key_.size()) return strKey + " in (" + join(keys, ",") + ")";
+        return strKey + "=" + join(keys, (" or " + strKey + "=").c_str());
+    }
+
+    // insert into item (id,name) values (1,'x')
+    // Several records are bound to a prepared statement instead; what fails of them is not logged.
+    // Returns the first row.
+    Json::Value insert(const std::vector<const Json::Value*>& records)
+    {
+        const bool blOne = 1 == records.size();
+        const Texts names = records[0]->getMemberNames();
+        const std::string strSql =
+            "insert into " + strName_ + " (" + join(names, ",") + ") values ";
+        const auto pInsert = prepare(blOne ? "" : strSql + "(:" + join(names, ",:") + ")");
+        Texts keys;
+        for (const Json::Value* pjRecord : records) {
+            if (blOne) run(strSql + values(names, *pjRecord), 1);
+            if (!blOne) insertBound(pInsert.get(), names, *pjRecord);
+            const std::string strRowid = std::to_string(sqlite3_last_insert_rowid(pDb_));
+            keys.push_back(blRowidKey_ ? "(" + strRowid + ")" : values(key_, *pjRecord));
         }
-        run("insert into " + strName_ + " (" + join(names, ",") + ") values " +
-                join(records, ",", [&](const auto& jRecord) { return values(jRecord); }),
-            static_cast<long long>(records.size()));
-        Json::Value& jKey = records[0][key_[0]];
-        // One row was inserted, so the rowid is its own.
-        if (jKey.isNull()) jKey = Json::Int64(sqlite3_last_insert_rowid(pDb_));
-        Texts terms;
-        for (const Json::Value& jRecord : records) terms.push_back(keyTerm(jRecord));
         std::map<std::string, Json::Value> rows;
-        for (Json::Value& jRow : readBack(terms)) rows[keyTerm(jRow)].swap(jRow);
-        for (std::size_t u = 0; u < records.size(); ++u) compare(records[u], rows[terms[u]]);
-        return rows[terms[0]];
+        for (Json::Value& jRow : readBack(keyIn(keys), keys.size()))
+            rows[values(key_, jRow)].swap(jRow);
+        for (std::size_t u = 0; u < keys.size(); ++u) compare(*records[u], rows[keys[u]]);
+        return rows[keys[0]];
     }
 
-    Json::Value readBack(const Texts& terms)
+    // Stores the same as the text. A value that cannot be bound stays NULL, which compare() finds.
+    void insertBound(sqlite3_stmt* pInsert, const Texts& names, const Json::Value& jRecord)
+    {
+        if (nullptr == pInsert || names != jRecord.getMemberNames()) failSql();
+        int i = 0;
+        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
+            const std::string strName = it.name();
+            const Form form = formOf(strName);
+            std::string strText = kText == form ? it->asString() : "";
+            const std::string strSql = isJson(form) ? literal(strName, *it) : "";
+            for (std::size_t u = 1; u + 1 < strSql.size(); u += '\'' == strSql[u] ? 2 : 1)
+                strText += strSql[u];
+            const char* szText = it->isNull() ? nullptr : strText.data();
+            const sqlite3_uint64 nBytes = strText.size();
+            sqlite3_bind_text64(pInsert, ++i, szText, nBytes, SQLITE_TRANSIENT, SQLITE_UTF8);
+            if (isNumber(form) && !it->isNull()) sqlite3_bind_int64(pInsert, i, it->asInt64());
+        }
+        sqlite3_step(pInsert);
+        // A record that a trigger ignored fails, too.
+        if (SQLITE_OK != sqlite3_reset(pInsert) || 1 != sqlite3_changes(pDb_)) failSql();
+    }
+
+    Json::Value readBack(const std::string& strFilter, std::size_t nRows)
     {
         Json::Value jRows;
-        addRows(join(terms, " or "), jRows);
-        if (jRows.size() != terms.size())
-            fail(Cause::kChanged, "a trigger moved or deleted the row that was written");
+        addRows(strFilter, jRows);
+        if (jRows.size() != nRows)
+            throw Failure{Cause::kChanged, "a trigger moved or deleted the row that was written"};
         return jRows;
     }
 
@@ -810,30 +838,36 @@ private:
     // by value and kind.
     void compare(const Json::Value& jSent, const Json::Value& jStored)
     {
-        for (const std::string& strName : jSent.getMemberNames())
-            if (literal(strName, jSent[strName]) != literal(strName, jStored[strName]))
-                fail(Cause::kChanged,
-                     "member " + quoted(strName) +
-                         ": the row holds another value than was sent; a trigger may have set it");
+        for (auto it = jSent.begin(); it != jSent.end(); ++it) {
+            const std::string strName = it.name();
+            const Json::Value& jRow = jStored[strName];
+            if (blRowidKey_ && it->isNull() && key_[0] == strName) continue;  // SQLite makes it
+            if (*it != jRow && literal(strName, *it) != literal(strName, jRow))
+                throw Failure{
+                    Cause::kChanged,
+                    "member " + quoted(strName) +
+                        ": the row holds another value than was sent; a trigger may have set it"};
+        }
     }
 
     // Inserts the records from uFrom to before uTo together, or one by one to find what failed.
     void insertRange(const Json::Value& jRecords, Json::ArrayIndex uFrom, Json::ArrayIndex uTo)
     {
-        std::vector<Json::Value> records;
+        std::vector<Json::Value> copies(uTo - uFrom);
+        std::vector<const Json::Value*> records;
         try {
-            for (Json::ArrayIndex u = uFrom; u < uTo; ++u) records.push_back(filled(jRecords[u]));
+            for (Json::ArrayIndex u = uFrom; u < uTo; ++u)
+                records.push_back(&filled(jRecords[u], copies[u - uFrom]));
             transact("begin immediate", [&] { return insert(records); });
         } catch (Failure& failure) {
-            if (Cause::kLocked == failure.cause) throw;
-            if (Cause::kRefused == failure.cause || uFrom + 1 == uTo) {
-                failure.iRecord =
-                    uFrom + (uFrom + 1 == uTo ? 0U : static_cast<unsigned>(records.size()));
+            const bool blOne = uFrom + 1 == uTo;
+            const bool blRefused = Cause::kRefused == failure.cause;
+            if (blRefused || (blOne && Cause::kLocked != failure.cause)) {
+                failure.iRecord = uFrom + (blOne ? 0U : static_cast<unsigned>(records.size()));
                 failure.strReason.insert(0, "record " + std::to_string(failure.iRecord) + ": ");
-                throw;
             }
             // A trigger may have ended the transaction.
-            if (0 != sqlite3_get_autocommit(pDb_)) throw;
+            if (blOne || blRefused || 0 != sqlite3_get_autocommit(pDb_)) throw;
             for (Json::ArrayIndex u = uFrom; u < uTo; ++u) insertRange(jRecords, u, u + 1);
         }
     }
@@ -851,13 +885,15 @@ private:
         const Texts terms = select("select " + join(key_, "||' and '||", column) + " from " +
                                    strName_ + " where " + strWhere);
         const auto nRows = static_cast<std::ptrdiff_t>(terms.size());
-        run("update " + strName_ + " set (" + join(jValues.getMemberNames(), ",") +
-                ")=" + values(jValues) + " where " + strWhere,
+        const Texts names = jValues.getMemberNames();
+        run("update " + strName_ + " set (" + join(names, ",") + ")=" + values(names, jValues) +
+                " where " + strWhere,
             nRows);
         for (std::ptrdiff_t i = 0; i < nRows; i += kBatch) {
             const auto begin = terms.begin() + i;
             const Texts batch(begin, begin + std::min<std::ptrdiff_t>(kBatch, nRows - i));
-            for (const Json::Value& jRow : readBack(batch)) compare(jValues, jRow);
+            for (const Json::Value& jRow : readBack(join(batch, " or "), batch.size()))
+                compare(jValues, jRow);
         }
         return nRows;
     }
@@ -939,11 +975,10 @@ private:
             {"$like", {" like ", kText}}};
         const auto found = operators.find(strOperator);
         const std::string strWhat = "operator " + quoted(strOperator) + ": ";
+        constexpr char kKnown[] =
+            "\"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", \"$lte\", \"$in\" or \"$like\"";
         if (operators.end() == found)
-            refuseMember(strMember,
-                         strWhat +
-                             "unknown, expected \"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", "
-                             "\"$lte\", \"$in\" or \"$like\"");
+            refuseMember(strMember, strWhat + "unknown, expected " + kKnown);
         const auto [szSql, last] = found->second;
         const Form form = formOf(strMember);
         const bool blLike = kText == last;
@@ -1038,15 +1073,13 @@ private:
     }
 
     // The rows of a list. The raw filter carries the order, the limit and the offset.
-    Json::Value page(const std::string& strWhere, const Json::Value& jOptions,
-                     bool blGoesOn = false)
+    Json::Value page(const std::string& strWhere, const Json::Value& jOptions, bool blMore = false)
     {
         checkOptions(jOptions);
         const SortKeys keys = sortKeys(jOptions["sort"]);
         const auto order = [](const auto& key) { return key.first + (key.second ? " desc" : ""); };
         const std::string strOrder = ") order by " + join(keys, ",", order) + " limit ";
-        const long long iOffset = jOptions.get("offset", 0).asInt64();
-        const std::string strOffset = " offset (" + std::to_string(iOffset);
+        const std::string strOffset = jOptions.get("offset", 0).asString();
         const long long iAsked = jOptions.get("limit", Json::Value::maxInt64).asInt64();
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
@@ -1054,7 +1087,7 @@ private:
         Texts ranges = {"1"};
         if (jOptions.isMember("after")) ranges = rangesAfter(keys, jOptions["after"]);
         // Rows are skipped in all parts together, so they become one.
-        if (0 < iOffset) ranges = {"(" + join(ranges, " or ") + ")"};
+        if ("0" != strOffset) ranges = {"(" + join(ranges, " or ") + ")"};
         return transact("begin", [&] {
             lockForReading();
             Json::Value jRecords(Json::arrayValue);
@@ -1062,7 +1095,8 @@ private:
             for (const std::string& strRange : ranges) {
                 std::string strFilter = strWhere + " and ";
                 strFilter.append(strRange).append(strOrder);
-                strFilter.append(std::to_string(iLimit - jRecords.size())).append(strOffset);
+                strFilter.append(std::to_string(iLimit - jRecords.size()))
+                    .append(" offset (" + strOffset);
                 if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
                 checkLimit("the answer", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
@@ -1070,13 +1104,14 @@ private:
             }
             checkLimit("the answer", limits_.nAnswerRows, jRecords.size(),
                        " records; use the option \"limit\"");
-            if (!blGoesOn || jRecords.empty() || iLimit > jRecords.size()) return jRecords;
+            if (!blMore || jRecords.empty() || iLimit > jRecords.size()) return jRecords;
             // A record that reads otherwise than it is stored would lead to the same page again.
+            const Json::Value& jLast = jRecords[jRecords.size() - 1];
             const auto isLast = [&](const auto& key) {
-                return equals(key.first, jRecords[jRecords.size() - 1][key.first]);
+                return equals(key.first, jLast[key.first]);
             };
-            if (select("select 1 from " + strName_ + " where " + join(keys, " and ", isLast))
-                    .empty())
+            const std::string strLast = join(keys, " and ", isLast);
+            if (select("select 1 from " + strName_ + " where " + strLast).empty())
                 refuse("the last record of a page reads otherwise than it is stored");
             return jRecords;
         });
@@ -1085,9 +1120,7 @@ private:
     // Known before the rows take memory.
     std::size_t bytesOf(const std::string& strFilter) const
     {
-        const auto part = [](const auto& str) {
-            return "ifnull(length(cast(" + str + " as blob)),0)";
-        };
+        const auto part = [](const auto& s) { return "ifnull(length(cast(" + s + " as blob)),0)"; };
         const std::string strSum = join(names_, "+", part);
         return std::stoull(select("select cast(total(n) as integer) from (select " + strSum +
                                   " as n from " + strName_ + " where (" + strFilter + "))")[0]);
