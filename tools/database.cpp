@@ -107,7 +107,12 @@ Table openTable(const std::string& strDatabase, const std::string& strTable, Ope
     const bool blFile = isFile(strTable);
     Json::Value jTable = blFile ? readTable(strTable) : Json::Value();
     Table table;
-    table.database = openDatabase(strDatabase, blFile && Open::kCreating == open);
+    try {
+        table.database = openDatabase(strDatabase, blFile && Open::kCreating == open);
+    } catch (const Failure& failure) {
+        if (blFile || Open::kCreating != open) throw;
+        throw Failure(failure.what() + std::string("; to make it, give a table file"));
+    }
     sqlite3* pDb = table.database.get();
     if (!blFile)
         jTable = describeTable(pDb, strTable);

@@ -91,8 +91,9 @@ private:
             jOne.append(jRecords_[static_cast<Json::ArrayIndex>(u)]);
             if (0 > table_.pRecords->createMany(jOne)) fail(u);
         }
-        throw Failure(toString(places_.front()) + "-" + std::to_string(places_.back().uLine) +
-                      ": " + strReason);
+        const Place& last = places_.back();
+        const unsigned long uLast = 0 < last.uRecord ? last.uRecord : last.uLine;
+        throw Failure(toString(places_.front()) + "-" + std::to_string(uLast) + ": " + strReason);
     }
 
     void keep()

@@ -115,7 +115,8 @@ void appendReal(double d, std::string& strOut)
 
 std::string toString(const Place& place)
 {
-    return place.strSource + (0 < place.uLine ? ":" + std::to_string(place.uLine) : "");
+    return place.strSource + (0 < place.uLine ? ":" + std::to_string(place.uLine) : "") +
+           (0 < place.uRecord ? ", record " + std::to_string(place.uRecord) : "");
 }
 
 Json::Value parseJson(std::string_view strText, const Place& place)

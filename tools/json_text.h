@@ -14,9 +14,10 @@ namespace tool {
 struct Place {
     std::string strSource;
     unsigned long uLine = 0;
+    unsigned long uRecord = 0;  // of an array, from 1
 };
 
-// notes.jsonl:7
+// notes.jsonl:7, or notes.json:7, record 3
 std::string toString(const Place& place);
 
 // Throws Failure with the place and the reason if the text is not JSON, names a member twice,

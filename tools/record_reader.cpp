@@ -44,6 +44,7 @@ bool RecordReader::next(Json::Value& jRecord)
     }
     if (uNext_ == jRecords_.size()) return false;
     jRecord.swap(jRecords_[uNext_++]);
+    place_.uRecord = uNext_;
     const auto uStart = static_cast<std::size_t>(jRecord.getOffsetStart());
     place_.uLine += static_cast<unsigned long>(
         std::count(strText_.begin() + static_cast<std::ptrdiff_t>(uOffset_),

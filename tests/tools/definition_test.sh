@@ -109,7 +109,7 @@ refuses 'table "select": '"$name" --table select <<<'{"a": 1}'
 printf '[{"a": 1},\n{"a":\n 99999999999999999999}]' >large.json
 fails 'large.json:3: member "a": the integer 99999999999999999999 does not fit into 64 bits' infer large.json
 printf '[{"a": 1},\n{"order":\n 1}]' >names.json
-fails 'names.json:2: member "order": '"$name" infer names.json
+fails 'names.json:2, record 2: member "order": '"$name" infer names.json
 printf '[{"a": 1},\n{"a":\n 1} {}]' >broken.json
 fails "broken.json:3: not valid JSON: column 5: Missing ',' or ']' in array declaration" infer broken.json
 fails 'keyed.json: no array under "first"' infer keyed.json --array first

@@ -53,13 +53,15 @@ keeps 0 1 '' "lines:150: $duplicate.name" < <(batch 150 '{"id": 3000, "name": "n
 keeps 0 1 '' "lines:150: $duplicate.id" < <(batch 150 '{"id": 140}')
 keeps 0 1 '' 'lines:3: the record is the integer 7, expected an object' <<<$'{"id": 1}\n\n7'
 keeps 0 1 '' "lines:2: not valid JSON: column 6: Missing ',' or ']' in array declaration" <<<$'[{"id": 1},\n7, 8 {}]'
-keeps 0 1 '' "lines:6: $duplicate.id" <<<$'\n[\n{"id": 1},\n\n{"id": 2,\n"name": "x"}, {"id": 0},\n{"id": 3}]'
-keeps 0 1 '' "lines:3: $duplicate.id" --array rows <<<$'{"x": 1,\n"rows": [{"id": 1},\n{"id": 0}]}'
+keeps 0 1 '' "lines:6, record 3: $duplicate.id" <<<$'\n[\n{"id": 1},\n\n{"id": 2,\n"name": "x"}, {"id": 0},\n{"id": 3}]'
+keeps 0 1 '' "lines:3, record 2: $duplicate.id" --array rows <<<$'{"x": 1,\n"rows": [{"id": 1},\n{"id": 0}]}'
+keeps 0 1 '' 'lines:1, record 3: member "nam": not declared for the table "item"' <<<'[{"id": 1}, {"id": 2}, {"nam": 3}]'
 keeps 0 1 '' 'lines: no array under "row"' --array row <<<'{"rows": []}'
 keeps 0 1 '' 'lines:1: not valid JSON: column 2: Missing '\''}'\'' or object member name' <<<$'{\n"id": 1}'
 fails 'standard input:2: the record is null, expected an object' import "${item[@]}" <<<$'{"id": 1}\nnull'
 fails 'absent.jsonl: No such file or directory' import "${item[@]}" absent.jsonl
 fails '.: Is a directory' import "${item[@]}" .
+fails 'absent.db: unable to open database file; to make it, give a table file' import absent.db item lines
 
 # Keys that SQLite makes
 table log 'id integer primary key, name text unique' id='long long' name=string
@@ -89,6 +91,8 @@ triggered 'before insert on item when new.id = 1200 begin select raise(rollback,
 # It needs a record of an earlier batch, which has gone with the transaction.
 triggered 'before insert on item when exists (select * from item where id = new.id - 1199 and id > 0)
     begin select raise(rollback, '\''too many'\''); end' 'too many' 1101-1200
+{ echo -n '['; paste -sd, lines; echo ']'; } | tr -d '\n' >array
+fails 'array:1, record 1101-1200: too many' import "${item[@]}" array
 
 # ----------------------------------------------------------------------------------- --batch
 # first N: the ids from 0 to N
