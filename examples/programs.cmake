@@ -11,8 +11,8 @@ function(prints_expected name)
 endfunction()
 
 find_package(Threads REQUIRED)
-foreach(name IN ITEMS first_steps duplicate_keys nulls_and_raw_filters json_members transactions
-                      two_threads log_on_syslog operated)
+foreach(name IN ITEMS inventory first_steps duplicate_keys nulls_and_raw_filters json_members
+                      transactions two_threads log_on_syslog operated)
   add_executable(example_${name} ${example_folder}/${name}.cpp)
   target_link_libraries(example_${name} PRIVATE VornJsonDb::vornjsondb Threads::Threads)
   prints_expected(${name})
