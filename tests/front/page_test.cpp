@@ -4,13 +4,15 @@
 #include "front/front.h"
 #include "support/markdown.h"
 
+#include <regex>
+
 namespace {
 
 class FrontPage : public FrontTest {
 protected:
     FrontPage()
     {
-        EXPECT_EQ(3U, page_.blocks.size());
+        EXPECT_EQ(5U, page_.blocks.size());  // two are included below
         EXPECT_EQ("", table_.reason());
         EXPECT_EQ(static_cast<long long>(jRecords_.size()), table_.createMany(jRecords_));
     }
@@ -60,7 +62,7 @@ protected:
 
 TEST_F(FrontPage, ShowsEachOperator)
 {
-    for (const auto& row : table(page_, "Operators", 30).rows) {
+    for (const auto& row : table(page_, "Operators", 31).rows) {
         SCOPED_TRACE(row[1]);
         EXPECT_EQ(row[3], listed(row[1], "null"));
         EXPECT_EQ(row[2], written("WHERE  ( ", " and 1) order by "));
@@ -78,7 +80,7 @@ TEST_F(FrontPage, ShowsWhatIsRefused)
         EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
         EXPECT_EQ(std::vector<std::string>(), takeStatements());
     }
-    for (const auto& row : table(page_, "What the options refuse", 13).rows) {
+    for (const auto& row : table(page_, "What the options refuse", 14).rows) {
         EXPECT_EQ(row[1], listed("null", row[0])) << row[0];
         EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
         EXPECT_EQ(std::vector<std::string>(), takeStatements());
@@ -92,6 +94,61 @@ TEST_F(FrontPage, ShowsEachOrder)
         EXPECT_EQ(row[2], listed("null", row[0]));
         EXPECT_EQ(row[1], written(" order by ", " limit "));
     }
+}
+
+TEST_F(FrontPage, ShowsATypeWordAndAColumnForEachKind)
+{
+    for (const auto& row : table(page_, "Which type word and column", 10).rows) {
+        SCOPED_TRACE(row[0]);
+        Front kept(database_, R"({"id":{"cpptype":"int"},"m":{"cpptype":")" + row[1] + "\"}}",
+                   "id int primary key, m " + row[2]);
+        Json::Value jRecord;
+        jRecord["id"] = 1;
+        jRecord["m"] = json(row[3]);
+        EXPECT_EQ("0", kept.create(jRecord));
+        EXPECT_EQ(jRecord, kept.jStored);
+        Json::Value jCondition;
+        jCondition["m"]["$gte"] = jRecord["m"];
+        EXPECT_EQ("yes" == row[4] ? 1 : -1, kept.table->count(jCondition));
+    }
+}
+
+TEST_F(FrontPage, FindsWhatBeginsWithATextFromAUser)
+{
+    std::vector<long long> counts;
+    for (const std::string strTyped : {"100% w", "100_", "under_", "Under%", "F", "\\", ""}) {
+        Json::Value jCondition;
+#include "front/FindsWhatBeginsWithATextFromAUser.inc"
+        counts.push_back(table_.count(jCondition));
+    }
+    EXPECT_EQ((std::vector<long long>{1, 0, 1, 0, 1, 0, 5}), counts);
+}
+
+TEST_F(FrontPage, AddsTheConditionOfTheHost)
+{
+    Front notes(database_, R"({"id":{"cpptype":"int"},"owner":{"cpptype":"string"}})",
+                "id int primary key, owner text");
+    notes.run("insert into @ values (1, 'ann'), (2, 'bob'), (3, 'ann')");
+    const std::string strUser = "ann";
+    std::vector<long long> counts;
+    for (const char* szAsked : {"{}", "null", R"({"id":{"$lt":3}})", R"({"owner":"bob"})"}) {
+        const Json::Value jAsked = json(szAsked);
+        Json::Value jCondition;
+#include "front/AddsTheConditionOfTheHost.inc"
+        counts.push_back(notes.table->count(jCondition));
+    }
+    EXPECT_EQ((std::vector<long long>{2, 2, 1, 0}), counts);
+}
+
+// What another program wrote.
+TEST_F(FrontPage, SaysHowDamagedJsonReads)
+{
+    database_.run("update front_book set pages=3000000000, tags='[1,', any='oops' where id=1");
+    Json::Value jFound;
+    EXPECT_EQ(1, table_.get(json(R"({"id":1})"), jFound));
+    EXPECT_EQ(2147483647, jFound["pages"].asInt());
+    EXPECT_EQ(json("[1,null]"), jFound["tags"]);
+    EXPECT_TRUE(jFound.isMember("any") && jFound["any"].isNull());
 }
 
 // As many terms and levels as are taken are not too many for SQLite, and one more is refused.
