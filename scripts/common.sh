@@ -9,7 +9,7 @@ build_packages=(build-essential cmake ninja-build libjsoncpp-dev libsqlite3-dev 
 # Debian's static SQLite depends on zlib; the fuzz targets build a locale with a decimal comma.
 test_packages=("${build_packages[@]}" clang devscripts locales meson python3 zlib1g-dev)
 
-site_packages=(doxygen doxygen-awesome-css mkdocs mkdocs-material python3)
+site_packages=(doxygen doxygen-awesome-css mandoc mkdocs mkdocs-material python3)
 
 say() {
     printf '== %s\n' "$*"

@@ -1,16 +1,17 @@
 # SPDX-FileCopyrightText: 2026 The vornjsondb authors
 # SPDX-License-Identifier: MIT
-"""pages.py FOLDER SITE VERSION: writes FOLDER/mkdocs.yml and, in FOLDER/pages, the guides and the examples as MkDocs
-reads them; the site will be in SITE.
+"""pages.py FOLDER SITE VERSION MANDOC: writes FOLDER/mkdocs.yml and, in FOLDER/pages, the guides and the examples as
+MkDocs reads them; the site will be in SITE.
 
 A forge shows a guide as it is. On the site every heading has the name that a forge gives it, a link whose text is a
 file name shows the title of that page or section instead, and a file that is linked and is no guide, such as an
-example, becomes a page of its own."""
+example, becomes a page of its own, and so does the manual page of the program, which MANDOC converts."""
 
 import json
 import os
 import re
 import shutil
+import subprocess
 import sys
 
 PROJECT = os.path.abspath(os.path.join(os.path.dirname(__file__), "..", ".."))
@@ -26,6 +27,7 @@ NAVIGATION = {
     "Appendix": ["contrib/scale-out/scale-out.md"],
 }
 EXAMPLES = "examples/README.md"
+PROGRAM = "man/vornjsondb.1"
 LANGUAGES = {".cpp": "cpp", ".h": "cpp", ".sh": "sh", ".json": "json", ".cmake": "cmake"}
 FENCE = re.compile(r"^(```.*?^```$)", re.MULTILINE | re.DOTALL)
 CODE = re.compile(r"(?<!`)(`+)(?!`)(.+?)(?<!`)\1(?!`)", re.DOTALL)
@@ -88,6 +90,8 @@ def page_of(path):
         return "index.md"
     if path == EXAMPLES:
         return "examples.md"
+    if path == PROGRAM:
+        return "program.md"
     if path.endswith(".md"):
         return os.path.basename(path).lower()
     return "files/" + re.sub(r"[^\w.]", "_", path) + ".md"
@@ -116,7 +120,7 @@ class Guide:
             return f"![{text}]({self.to('pictures/' + os.path.basename(path))})"
         if path in HEADERS:
             return f"[{text}]({self.to(REFERENCE + '/' + HEADERS[path])})"
-        if not path.endswith(".md"):
+        if not path.endswith(".md") and path != PROGRAM:
             self.files.append(path)
         elif is_file_name(text):
             text = section_of(path, anchor) if anchor else title_of(path)
@@ -171,6 +175,22 @@ def write_file_page(folder, path, linked_in):
     write(folder, page_of(path), text)
 
 
+def write_program_page(folder, mandoc):
+    """With the headings in Markdown, for the table of contents and the search."""
+    html = subprocess.run([mandoc, "-Thtml", "-O", "fragment", os.path.join(PROJECT, PROGRAM)],
+                          check=True, stdout=subprocess.PIPE, encoding="utf-8").stdout
+    html = re.sub(r'<table class="head">.*?<div class="manual-text">|</div>\s*<table class="foot">.*|</?section\b.*?>'
+                  r'|</?a\b.*?>| (id|class)=".*?"', "", html, flags=re.DOTALL)
+    html = re.sub("<pre>(.*?)</pre>", r"<pre><code>\1</code></pre>", html, flags=re.DOTALL)
+
+    def heading(match):
+        text = " ".join(re.sub("<.*?>", "", match[2]).split())
+        return f"\n\n{'##' if match[1] == '1' else '###'} {text.capitalize()} {{#{anchor_of(text)}}}\n\n"
+
+    html = re.sub(r"<h([12])>(.*?)</h\1>", heading, html, flags=re.DOTALL)
+    write(folder, page_of(PROGRAM), f"# The program vornjsondb\n\n{html}")
+
+
 def navigation(examples):
     entries = []
     for section, paths in NAVIGATION.items():
@@ -179,12 +199,13 @@ def navigation(examples):
         if not section:
             entries.append({"Examples": [{"Overview": page_of(EXAMPLES)}] +
                             [{os.path.basename(path): page_of(path)} for path in examples]})
+            entries.append({"The program vornjsondb": page_of(PROGRAM)})
             entries.append({"Reference": "reference.md"})
     return entries
 
 
 def main():
-    folder, site, version = sys.argv[1:]
+    folder, site, version, mandoc = sys.argv[1:]
     pages = os.path.join(folder, "pages")
     linked_in = {}
     for path in [path for paths in NAVIGATION.values() for path in paths] + [EXAMPLES]:
@@ -194,6 +215,7 @@ def main():
             linked_in.setdefault(file, []).append(path)
     for path, guides in linked_in.items():
         write_file_page(pages, path, guides)
+    write_program_page(pages, mandoc)
     reference = Guide("docs/site/reference.md", "reference.md")
     reference.write(pages)
     shutil.copy(os.path.join(PROJECT, "docs/site/style.css"), pages)
