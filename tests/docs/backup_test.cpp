@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/backup.md: copies made while a host writes, what they contain, and what a copied file lacks.
 

@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/changing-a-table.md: the ladder, climbed by processes that are killed at every point of it,
 // and what handles see before and after.

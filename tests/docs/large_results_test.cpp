@@ -1,3 +1,4 @@
+// SPDX-FileCopyrightText: 2026 The vornjsondb authors
 // SPDX-License-Identifier: MIT
 // docs/large-results.md: reading by pages takes as much memory for many records as for few.
 
