@@ -4,7 +4,10 @@
 
 #include "docs/recipe_page.h"
 
+#include <sys/resource.h>
+#include <sys/wait.h>
 #include <atomic>
+#include <chrono>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
@@ -62,6 +65,22 @@ std::string recordsOf(const std::string& strFile)
     return strRecords;
 }
 
+// Whether a process that backs up was killed when its copy was half as large as the database.
+bool isKilledHalfway(const std::string& strFrom, const std::string& strTo)
+{
+    const pid_t pid = fork();
+    if (0 == pid) {
+        const rlim_t nHalf = std::filesystem::file_size(strFrom) / 2;
+        const rlimit half = {nHalf, nHalf};
+        const rlimit none = {0, 0};
+        if (0 != setrlimit(RLIMIT_CORE, &none) || 0 != setrlimit(RLIMIT_FSIZE, &half)) _exit(2);
+        _exit(backUp(strFrom, strTo) ? 0 : 1);
+    }
+    int iStatus = 0;
+    EXPECT_EQ(pid, waitpid(pid, &iStatus, 0));
+    return WIFSIGNALED(iStatus) && SIGXFSZ == WTERMSIG(iStatus);
+}
+
 }  // namespace
 
 TEST_F(Backup, WhileAHostWrites)
@@ -106,9 +125,23 @@ TEST_F(Backup, WhileAHostWrites)
     }
 
     // One that fails leaves the backup before it alone.
-    const std::string strRecords = recordsOf(strBackup_);
-    EXPECT_FALSE(backUp(path("nowhere.db"), strBackup_));
-    EXPECT_EQ(strRecords, recordsOf(strBackup_));
+    const std::string strKept = path("kept.db");
+    const std::string strSmall = path("small.db");
+    Host(strSmall).createRange(1, 10);
+    EXPECT_TRUE(backUp(strSmall, strKept));
+    const std::string strRecords = recordsOf(strKept);
+    EXPECT_FALSE(backUp(path("nowhere.db"), strKept));
+    EXPECT_EQ(strRecords, recordsOf(strKept));
+
+    // So does a process that is killed while it copies: the file alone is complete.
+    const std::string strLarge = path("large.db");
+    Host(strLarge).createRange(1, 2000);
+    EXPECT_TRUE(isKilledHalfway(strLarge, strKept));
+    const std::string strAlone = path("alone.db");
+    std::filesystem::copy_file(strKept, strAlone);
+    EXPECT_EQ(strRecords, recordsOf(strAlone));
+    EXPECT_TRUE(backUp(strLarge, strKept));
+    EXPECT_EQ(recordsOf(strLarge), recordsOf(strKept));
 }
 
 TEST_F(Backup, CheckTheCopy)
