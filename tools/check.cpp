@@ -58,7 +58,7 @@ std::string flawOfText(const Cell& cell)
 
 std::string flawOfJson(const Cell& cell, const std::string& strWord)
 {
-    const std::string strFlaw = flawOfText(cell);
+    std::string strFlaw = flawOfText(cell);
     if (!strFlaw.empty()) return strFlaw;
     Json::Value jValue;
     try {

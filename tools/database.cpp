@@ -25,7 +25,7 @@ Json::Value readTable(const std::string& strPath)
     std::ifstream file(strPath);
     const std::string strText(std::istreambuf_iterator<char>(file), {});
     if (!file) throw Failure(strPath + ": " + std::strerror(errno));
-    const Json::Value jTable = parseJson(strText, {strPath, 1});
+    Json::Value jTable = parseJson(strText, {strPath, 1});
     if (!jTable.isObject() || !jTable["name"].isString() || !jTable["create"].isString() ||
         !jTable["definition"].isObject())
         throw Failure(strPath + ": expected \"name\", \"create\" and \"definition\"");

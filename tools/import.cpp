@@ -17,7 +17,7 @@ namespace {
 
 // What is handed to the table at once: as many records as stay in the processor's cache.
 constexpr Json::ArrayIndex kMostRecords = 100;
-constexpr std::size_t kMostBytes = 1024 * 1024;
+constexpr std::size_t kMostBytes = 1048576;
 
 class Import {
 public:

@@ -120,7 +120,7 @@ public:
             throw Failure("key " + toText(strKey_) + ": there is a member " +
                           toText(alike->second) + szHint);
         if (!blThere) kinds_[strKey_] = kInteger;
-        const Json::Value jTable = makeTable(strName, kinds_, strKey_);
+        Json::Value jTable = makeTable(strName, kinds_, strKey_);
         bindTable(memory_.get(), jTable);
         return jTable;
     }

@@ -14,6 +14,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <memory>
+#include <sstream>
 
 namespace tool {
 
@@ -37,15 +38,13 @@ std::unique_ptr<Json::CharReader> newReader()
 // jsoncpp reports on several lines: "* Line 1, Column 8\n  Missing ':' after object member name\n"
 [[noreturn]] void failParsing(const Place& place, const std::string& strErrors)
 {
+    std::istringstream errors(strErrors);
+    std::string strText;
     unsigned uLine = 1;
     unsigned uColumn = 0;
-    int nRead = 0;
-    std::sscanf(strErrors.c_str(), "* Line %u, Column %u %n", &uLine, &uColumn, &nRead);
-    const std::string strReason = strErrors.substr(static_cast<std::size_t>(nRead));
-    fail(place,
-         "not valid JSON: column " + std::to_string(uColumn) + ": " +
-             strReason.substr(0, strReason.find('\n')),
-         uLine);
+    errors >> strText >> strText >> uLine >> strText >> strText >> uColumn >> std::ws;
+    std::getline(errors, strText);
+    fail(place, "not valid JSON: column " + std::to_string(uColumn) + ": " + strText, uLine);
 }
 
 // The text that a value was read from.
@@ -89,7 +88,7 @@ void appendQuoted(std::string_view strText, std::string& strOut)
             continue;
         }
         char szEscape[8];
-        std::snprintf(szEscape, sizeof szEscape, "\\u%04x", static_cast<unsigned>(c));
+        (void)std::snprintf(szEscape, sizeof szEscape, "\\u%04x", static_cast<unsigned>(c));
         strOut += szEscape;
     }
     strOut.append(strText, uDone);
@@ -104,7 +103,7 @@ void appendReal(double d, std::string& strOut)
     }
     char szText[40];
     for (int iDigits = 15; iDigits <= 17; ++iDigits) {
-        std::snprintf(szText, sizeof szText, "%.*g", iDigits, d);
+        (void)std::snprintf(szText, sizeof szText, "%.*g", iDigits, d);
         if (std::strtod(szText, nullptr) == d) break;
     }
     strOut += szText;
