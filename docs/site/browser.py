@@ -4,6 +4,7 @@
 
 import contextlib
 import json
+import socket
 import subprocess
 import sys
 import tempfile
@@ -12,7 +13,15 @@ import urllib.request
 
 CHROMIUM = ["--headless", "--no-sandbox", "--disable-gpu", "--disable-quic", "--no-first-run",
             "--disable-background-networking", "--disable-component-update", "--disable-sync", "--hide-scrollbars"]
-PORT = 9595
+
+
+def free_port():
+    with socket.socket() as probe:
+        probe.bind(("127.0.0.1", 0))
+        return probe.getsockname()[1]
+
+
+PORT = free_port()
 
 
 def ask(path, values=None, method=None):
