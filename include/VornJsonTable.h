@@ -754,7 +754,8 @@ private:
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) checkFits(it.name(), *it);
         for (const std::string& strKey : key_)
-            if (blWithKey && jRecord[strKey].isNull())
+            if (jRecord[strKey].isNull() &&
+                (blWithKey || (!blRowidKey_ && jRecord.isMember(strKey))))
                 refuseMember(strKey, "missing, expected the whole key");
         return jRecord;
     }

@@ -62,7 +62,7 @@ TEST_F(SecurityPage, NamesEveryAttackOnce)
 {
     std::string strNamed[2];
     for (const auto& row : table(readPage("../SECURITY.md"), "The trust table", 24).rows)
-        for (const int i : {0, 1}) strNamed[i] += row[3 + i] + ",";
+        for (const std::size_t i : {0U, 1U}) strNamed[i] += row[3 + i] + ",";
     std::string strMade[2];
     for (const Attack& attack : attacks()) {
         World world(Kind::kExample, attack.uMoreNotes);
