@@ -3,7 +3,7 @@
 // Every block of code in the documentation is run, every section of docs/limits.md has a test of
 // its own, and the tests, scripts and guards that pages name exist.
 
-#include "docs/limits_page.h"
+#include "docs/section_test.h"
 
 #include <unistd.h>
 #include <filesystem>
@@ -111,7 +111,7 @@ TEST(Documentation, NamesScriptsThatExist)
 TEST(LimitsPage, NamesOneTestInEachSection)
 {
     std::set<std::string> named;
-    for (const MarkdownSection& section : limitsPage().sections) {
+    for (const MarkdownSection& section : pageOf("limits.md").sections) {
         SCOPED_TRACE(section.strHeading);
         const auto tests = matches(section.strText, R"(`((?:Memory)?Limits)\.(\w+)`)", {1, 2});
         if (tests.empty()) {

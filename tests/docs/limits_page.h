@@ -5,15 +5,9 @@
 
 #include "docs/section_test.h"
 
-inline const MarkdownPage& limitsPage()
-{
-    static const MarkdownPage page = readPage("limits.md");
-    return page;
-}
-
 class Limits : public SectionTest {
 protected:
-    Limits() : SectionTest(limitsPage()) {}
+    Limits() : SectionTest("limits.md") {}
 
     // The ids of the records that recList gives, like "123".
     std::string ids(const std::string& strRequest = "null")
@@ -29,7 +23,7 @@ protected:
 
     // The table that the page begins with, in a file, so that a second connection can be opened.
     Database database_{Database::Place::kFile};
-    const std::string strMembers_ = limitsPage().blocks.at(0).strText;
-    Table table_{database_, strMembers_, limitsPage().blocks.at(1).strText};
+    const std::string strMembers_ = pageOf("limits.md").blocks.at(0).strText;
+    Table table_{database_, strMembers_, pageOf("limits.md").blocks.at(1).strText};
     VornJsonDbApi& api_ = table_.api;
 };

@@ -24,12 +24,6 @@ namespace {
 #include "operating/Prometheus.inc"
 #include "operating/SizeOfTheLog.inc"
 
-const MarkdownPage& operatingPage()
-{
-    static const MarkdownPage page = readPage("operating.md");
-    return page;
-}
-
 // The clock of SQLite's connections that are opened through this VFS.
 sqlite3_int64 nMilliseconds = 1;
 
@@ -47,7 +41,7 @@ const char* vfsWithOwnClock()
 
 class Operating : public SectionTest {
 protected:
-    Operating() : SectionTest(operatingPage())
+    Operating() : SectionTest("operating.md")
     {
         watch(database_.get(), counters_);
         // A condition that takes 150 ms.

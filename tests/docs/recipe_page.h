@@ -7,11 +7,10 @@
 
 #include <unistd.h>
 #include <filesystem>
-#include <map>
 
 class RecipePage : public SectionTest {
 protected:
-    explicit RecipePage(const std::string& strFile) : SectionTest(page(strFile))
+    explicit RecipePage(const std::string& strFile) : SectionTest(strFile)
     {
         std::filesystem::remove_all(folder_);  // of a killed process that had the same id
         std::filesystem::create_directory(folder_);
@@ -26,14 +25,6 @@ protected:
     std::string path(const std::string& strName) const { return folder_ / strName; }
 
 private:
-    static const MarkdownPage& page(const std::string& strFile)
-    {
-        static std::map<std::string, MarkdownPage> pages;
-        const auto [it, blNew] = pages.try_emplace(strFile);
-        if (blNew) it->second = readPage(strFile);
-        return it->second;
-    }
-
     const std::filesystem::path folder_ = std::filesystem::temp_directory_path() /
                                           ("vornjsondb-" + std::to_string(getpid()) + "-recipe");
 };

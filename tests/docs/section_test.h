@@ -6,12 +6,22 @@
 #include "docs/calls.h"
 #include "support/markdown.h"
 
+#include <map>
 #include <set>
+
+// A page of docs/, read once.
+inline const MarkdownPage& pageOf(const std::string& strFile)
+{
+    static std::map<std::string, MarkdownPage> pages;
+    const auto [it, blNew] = pages.try_emplace(strFile);
+    if (blNew) it->second = readPage(strFile);
+    return it->second;
+}
 
 class SectionTest : public HostTest {
 protected:
     // The page has a section that names the test, as `Suite.Name`.
-    explicit SectionTest(const MarkdownPage& page) : section_(ownSection(page)) {}
+    explicit SectionTest(const std::string& strFile) : section_(ownSection(pageOf(strFile))) {}
 
     // Every example of the section has been read; tests include the C++ at compile time.
     ~SectionTest() override

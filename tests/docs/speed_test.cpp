@@ -13,18 +13,12 @@ namespace {
 #include "speed/MemoryStatistics.inc"
 #include "speed/Transactions.inc"
 
-const MarkdownPage& speedPage()
-{
-    static const MarkdownPage page = readPage("speed.md");
-    return page;
-}
-
 std::atomic<int> iSyncs{0};
 
 // Without a database: one of the tests needs a process in which SQLite is not initialised.
 class Speed : public SectionTest {
 protected:
-    Speed() : SectionTest(speedPage()) {}
+    Speed() : SectionTest("speed.md") {}
 };
 
 struct Tasks {
@@ -75,7 +69,7 @@ int fdatasync(int /*iFile*/)
 
 TEST_F(Speed, LibrarysPart)
 {
-    for (const auto& row : table(speedPage(), "What the library costs", 5).rows) {
+    for (const auto& row : table(pageOf("speed.md"), "What the library costs", 5).rows) {
         const double dLibrary = instructions("this library", row[0]);
         const double dPart = 100 * (1 - instructions("the floor", row[0]) / dLibrary);
         // The figures of that page change a little with each measurement.
@@ -128,7 +122,7 @@ TEST_F(Speed, WalAndSynchronous)
         EXPECT_EQ(strResult, strListed);
         return std::to_string(iCounted);
     };
-    for (const auto& row : table(speedPage(), "WAL and synchronous", 4).rows) {
+    for (const auto& row : table(pageOf("speed.md"), "WAL and synchronous", 4).rows) {
         SCOPED_TRACE(row[0] + ", " + row[1]);
         EXPECT_EQ(row[0], tasks.database.value("pragma journal_mode=" + row[0]));
         tasks.database.run("pragma synchronous=" + row[1]);

@@ -14,12 +14,6 @@ namespace {
 #include "threads-and-processes/OneThread.inc"
 #include "threads-and-processes/Prefork.inc"
 
-const MarkdownPage& threadsPage()
-{
-    static const MarkdownPage page = readPage("threads-and-processes.md");
-    return page;
-}
-
 using doubles::state;
 
 constexpr int kWriters = 3;
@@ -28,7 +22,7 @@ const char kMembers[] = R"({"id":{"cpptype":"long long"},"text":{"cpptype":"stri
 
 class ThreadsAndProcesses : public SectionTest {
 protected:
-    ThreadsAndProcesses() : SectionTest(threadsPage()) {}
+    ThreadsAndProcesses() : SectionTest("threads-and-processes.md") {}
     ~ThreadsAndProcesses() override
     {
         for (const char* szEnd : {"-wal", "-shm"}) unlink((strFile_ + szEnd).c_str());
