@@ -40,11 +40,8 @@ std::string rowOf(const Json::Value& jRecord, const std::vector<std::string>& me
 
 int exportRecords(const Arguments& arguments, Output& output)
 {
+    if (!arguments.has("csv")) return list(arguments, output);
     const Table table = openTable(arguments.values[0], arguments.values[1], Open::kExisting);
-    if (!arguments.has("csv")) {
-        forEachRecord(table, arguments, [&](const Json::Value& jRecord) { output.line(jRecord); });
-        return kDone;
-    }
     const std::vector<std::string> members = table.jMembers.getMemberNames();
     std::string strHead;
     for (const std::string& strMember : members)

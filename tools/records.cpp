@@ -33,6 +33,18 @@ Json::Value conditionOf(const Arguments& arguments, std::size_t nArguments)
     return jCondition;
 }
 
+// Stores the record by the operation and prints it.
+int store(const Arguments& arguments, Output& output,
+          int (VornJsonTable::*operation)(const Json::Value&, Json::Value&))
+{
+    const Json::Value jRecord = parseArgument(arguments.values[2], "RECORD");
+    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kCreating);
+    Json::Value jStored;
+    table.checked((*table.pRecords.*operation)(jRecord, jStored));
+    output.line(jStored);
+    return kDone;
+}
+
 }  // namespace
 
 Json::Value parseArgument(const std::string& strArgument, const char* szName)
@@ -44,22 +56,12 @@ Json::Value parseArgument(const std::string& strArgument, const char* szName)
 
 int create(const Arguments& arguments, Output& output)
 {
-    const Json::Value jRecord = parseArgument(arguments.values[2], "RECORD");
-    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kCreating);
-    Json::Value jStored;
-    table.checked(table.pRecords->create(jRecord, jStored));
-    output.line(jStored);
-    return kDone;
+    return store(arguments, output, &VornJsonTable::create);
 }
 
 int save(const Arguments& arguments, Output& output)
 {
-    const Json::Value jRecord = parseArgument(arguments.values[2], "RECORD");
-    const Table table = openTable(arguments.values[0], arguments.values[1], Open::kCreating);
-    Json::Value jStored;
-    table.checked(table.pRecords->save(jRecord, jStored));
-    output.line(jStored);
-    return kDone;
+    return store(arguments, output, &VornJsonTable::save);
 }
 
 int get(const Arguments& arguments, Output& output)
