@@ -98,9 +98,9 @@ def page_of(path):
 
 
 class Guide:
-    def __init__(self, path, page=None):
+    def __init__(self, path):
         self.path = path
-        self.page = page or page_of(path)
+        self.page = page_of(path)
         self.files = []
         self.pictures = []
 
@@ -216,7 +216,7 @@ def main():
     for path, guides in linked_in.items():
         write_file_page(pages, path, guides)
     write_program_page(pages, mandoc)
-    reference = Guide("docs/site/reference.md", "reference.md")
+    reference = Guide("docs/site/reference.md")
     reference.write(pages)
     shutil.copy(os.path.join(PROJECT, "docs/site/style.css"), pages)
     examples = sorted(path for path in linked_in if os.path.dirname(path) == "examples" and path.endswith(".cpp"))
