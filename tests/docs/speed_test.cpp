@@ -41,7 +41,7 @@ Json::Value tenRecords(int iFirst)
 // The number of instructions of an operation, from the table of docs/performance.md.
 double instructions(const std::string& strContender, const std::string& strOperation)
 {
-    static const MarkdownTable counts = table(readPage("performance.md"), "Instructions", 13);
+    static const MarkdownTable counts = table(readPage("performance.md"), "Instructions", 14);
     for (std::size_t i = 1; i < counts.header.size(); ++i)
         for (const auto& row : counts.rows)
             if (strOperation == counts.header[i] && strContender == row[0])
