@@ -118,6 +118,9 @@ int report(const std::string& strCommand, const char* szWhat)
 int main(int argc, char** argv)
 {
     (void)std::signal(SIGPIPE, SIG_IGN);
+    // There is one thread, and nobody asks how much memory is in use.
+    sqlite3_config(SQLITE_CONFIG_SINGLETHREAD);
+    sqlite3_config(SQLITE_CONFIG_MEMSTATUS, 0);
     Output output;
     Arguments arguments;
     try {
