@@ -61,7 +61,7 @@
 /// - `$gt`, `$gte`, `$lt`, `$lte`: order of "string", "int" and "long long" members;
 /// - `$in`: one of the values of an array;
 /// - `$like`: a pattern for a "string" member, with `%`, `_` and a backslash as escape;
-/// - `$or`: an array of conditions, one of which must hold.
+/// - `$or` and `$and`, instead of a member: an array of conditions; one must hold, or all.
 ///
 /// JSON members know `$eq`, `$ne`, `$in` and null, and compare their stored text. For such
 /// a member an object without a key that begins with "$" is a value; write `{"$eq": value}` if the
@@ -100,18 +100,21 @@
 #include <utility>
 #include <vector>
 
+static_assert(201703L <= __cplusplus, "VornJsonTable.h needs C++17");
+
 /// One SQLite table as a store of JSON records that come back as they were sent.
 class VornJsonTable {
 public:
     /// Why a call failed.
     enum class Cause {
-        kNone,       ///< it did not
-        kRefused,    ///< the table, the record or the request cannot be handled exactly
-        kDuplicate,  ///< another record has the same values in the columns of a constraint
-        kLocked,     ///< another connection held a lock for too long
-        kChanged,    ///< the row was ignored, or is not as it was sent: a trigger, as a rule
-        kLimit,      ///< one of the limits was reached
-        kFailed      ///< SQLite failed: another constraint, the disk, memory
+        kNone,        ///< it did not
+        kRefused,     ///< the table, the record or the request cannot be handled exactly
+        kDuplicate,   ///< another record has the same values in the columns of a constraint
+        kLocked,      ///< another connection held a lock for too long
+        kChanged,     ///< the row was ignored, or is not as it was sent: a trigger, as a rule
+        kLimit,       ///< one of the limits was reached
+        kConstraint,  ///< another constraint: not null, check, a foreign key, a trigger's raise()
+        kFailed       ///< SQLite failed: the disk, memory
     };
 
     /// Limits for requests of strangers. 0 means no limit. The defaults suit a small service.
@@ -130,13 +133,13 @@ public:
     using RowCallback = std::function<bool(const Json::Value& jRecord)>;
 
     /// Binds the open connection @p pDb to the table @p strName as @p jDefinition defines it (the
-    /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate, which has to succeed if the
-    /// table already exists (`create table if not exists ...`).
+    /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate, in a transaction; it has to
+    /// succeed if the table already exists (`create table if not exists ...`).
     ///
     /// If the table cannot be handled exactly, cause() is kRefused after the construction, reason()
-    /// names the member or column and what to use instead, and every operation returns -1 with that
-    /// reason. If SQLite fails, the cause is kFailed or kLocked: make another object to try again.
-    /// Refused are
+    /// names the member or column and what to use instead, every operation returns -1 with that
+    /// reason, and a table that the statement has just made is gone again. If SQLite fails, the
+    /// cause is kFailed or kLocked: make another object to try again. Refused are
     ///
     /// - type words other than "string", "int", "long long", "bool", "Json::objectValue",
     ///   "Json::arrayValue" and "Json::Value", and defaults of another kind than the type word;
@@ -168,15 +171,15 @@ public:
     const std::vector<std::string>& columns() const { return end_.columns; }
 
     /// After createMany() failed: the position of the record that failed, counted from 0; -1 if it
-    /// was no single one, such as after a lock, a constraint that SQLite checks at the commit, or a
-    /// trigger that ended the host's transaction. -1 after any other call.
-    long long record() const { return end_.iRecord; }
+    /// was no single one, such as after a lock, or a constraint that SQLite checks at the commit.
+    /// -1 after any other call.
+    long long record() const { return iIndex_; }
 
     /// The members of the primary key, in its order.
     const std::vector<std::string>& key() const { return key_; }
 
     /// Sets limits for the calls from now on. A new table has none: setLimits({}) sets the defaults
-    /// of Limits.
+    /// of Limits, and setLimits({0, 0, 0, 0, 0}) removes them.
     void setLimits(const Limits& limits) { limits_ = limits; }
 
     /// Inserts the record @p jRecord and sets @p jStored to the row as it was read back.
@@ -193,23 +196,32 @@ public:
     int create(const Json::Value& jRecord, Json::Value& jStored)
     {
         return static_cast<int>(call({&jRecord}, [&] {
-            Json::Value jCopy;
-            const Json::Value& jFilled = filled(jRecord, jCopy);
-            jStored = transact("begin immediate", [&] { return insert({&jFilled}); });
+            jStored = transact("begin immediate", [&] { return insert(jRecord); });
             return 0;
         }));
     }
 
     /// Inserts every record of the array @p jRecords as create() does, all of them or none.
-    /// Records of the same members share a prepared statement. record() gives the position of the
-    /// one that failed, and the reason begins with it. Returns their number, or -1.
+    /// They share prepared statements, except those that leave out a member whose column has a
+    /// default. record() gives the position of the one that failed, and the reason begins with it.
+    /// Returns their number, or -1.
     long long createMany(const Json::Value& jRecords)
     {
         return call({&jRecords}, [&] {
             expect(jRecords.isArray(), "the records are ", jRecords, "an array");
             return transact("begin immediate", [&] {
-                for (Json::ArrayIndex u = 0; u < jRecords.size(); u += kBatch)
-                    insertRange(jRecords, u, std::min(u + kBatch, jRecords.size()));
+                const auto is = [](const auto& str) { return str + " is :" + str; };
+                const auto pInsert = prepare("insert into " + strName_ + " (" + join(names_, ",") +
+                                             ") values (:" + join(names_, ",:") + ")");
+                const auto pFind =
+                    prepare("select 1 from " + strName_ + " where " +
+                            join(names_, " collate binary and ", is) + " collate binary and (" +
+                            join(key_, ",") + ")=(:" + join(key_, ",:") + ")");
+                for (const Json::Value& jRecord : jRecords) {
+                    ++iIndex_;
+                    insert(jRecord, pInsert.get(), pFind.get());
+                }
+                iIndex_ = -1;
                 return jRecords.size();
             });
         });
@@ -223,11 +235,9 @@ public:
     {
         return static_cast<int>(call({&jRecord}, [&] {
             check(jRecord, true);
-            const std::string strKey = keyIn({values(key_, jRecord)});
+            const std::string strKey = keyIs(jRecord);
             jStored = transact("begin immediate", [&] {
-                if (0 < change(strKey, jRecord)) return readBack(strKey, 1)[0];
-                Json::Value jCopy;
-                return insert({&filled(jRecord, jCopy)});
+                return 0 < change(strKey, jRecord) ? readBack(strKey, jRecord)[0] : insert(jRecord);
             });
             return 0;
         }));
@@ -262,7 +272,7 @@ public:
             Json::Value jNext = jOptions;
             long long iLeft = jNext.get("limit", Json::Value::maxInt64).asInt64();
             const auto nMost = static_cast<long long>(limits_.nAnswerRows);
-            const long long iPage = 0 < nMost ? std::min(nMost, kPage) : kPage;
+            const long long iPage = 0 < nMost ? std::min<long long>(nMost, kPage) : kPage;
             for (long long nRecords = 0;; iLeft -= iPage) {
                 jNext["limit"] = Json::Int64(std::min(iLeft, iPage));
                 const Json::Value jPage = page(strWhere, jNext, true);
@@ -281,13 +291,11 @@ public:
     /// Returns 1, or 0 if there is none, or -1.
     int get(const Json::Value& jCondition, Json::Value& jRecord)
     {
-        return static_cast<int>(call({&jCondition}, [&] {
-            Json::Value jOptions;
-            jOptions["limit"] = 1;
-            Json::Value jPage = page(condition(jCondition), jOptions);
-            if (!jPage.empty()) jRecord.swap(jPage[0]);
-            return jPage.size();
-        }));
+        Json::Value jOptions, jRecords;
+        jOptions["limit"] = 1;
+        const long long nRecords = list(jCondition, jOptions, jRecords);
+        if (0 < nRecords) jRecord.swap(jRecords[0]);
+        return static_cast<int>(nRecords);
     }
 
     /// Returns the number of records that the condition selects, or -1.
@@ -308,21 +316,18 @@ public:
     /// number of records, or -1.
     long long update(const Json::Value& jCondition, const Json::Value& jValues)
     {
-        return updateRows(jCondition, jValues, "updateAll() updates every record");
+        return updateRows(jCondition, jValues, false);
     }
 
     /// The same for every record of the table.
-    long long updateAll(const Json::Value& jValues) { return updateRows({}, jValues, ""); }
+    long long updateAll(const Json::Value& jValues) { return updateRows({}, jValues, true); }
 
     /// Deletes the records that the condition selects. An empty condition is refused. Returns the
     /// number of rows deleted, or -1.
-    long long remove(const Json::Value& jCondition)
-    {
-        return removeRows(jCondition, "removeAll() deletes every record");
-    }
+    long long remove(const Json::Value& jCondition) { return removeRows(jCondition, false); }
 
     /// Deletes every record. Returns the number of rows deleted, or -1.
-    long long removeAll() { return removeRows({}, ""); }
+    long long removeAll() { return removeRows({}, true); }
 
 private:
     using Texts = std::vector<std::string>;
@@ -341,7 +346,6 @@ private:
         Cause cause = Cause::kNone;
         std::string strReason = {};
         Texts columns = {};
-        long long iRecord = -1;
     };
 
     using SortKeys = std::vector<std::pair<std::string, bool>>;  // true: descending
@@ -358,25 +362,24 @@ private:
         {"Json::objectValue", Json::objectValue, "an object"},
         {"Json::arrayValue", Json::arrayValue, "an array"},
         {"Json::Value", Json::nullValue, "a JSON value"}};
-    static constexpr unsigned kBatch = 100;  // rows read back together
-    static constexpr long long kPage = 200;  // rows of a page of each()
+    static constexpr int kPage = 200;  // rows that are read together
 
     // ---- Calls
 
-    [[noreturn]] static void refuse(const std::string& strWhy)
+    [[noreturn]] static void fail(const std::string& strWhy, Cause cause = Cause::kRefused)
     {
-        throw Failure{Cause::kRefused, strWhy};
+        throw Failure{cause, strWhy};
     }
 
-    [[noreturn]] static void refuseMember(const std::string& strMember, const std::string& strWhy)
+    [[noreturn]] static void failMember(const std::string& strMember, const std::string& strWhy)
     {
-        refuse("member " + quoted(strMember) + ": " + strWhy);
+        fail("member " + quoted(strMember) + ": " + strWhy);
     }
 
     static void expect(bool blFits, const std::string& strWhat, const Json::Value& jValue,
                        const char* szExpected)
     {
-        if (!blFits) refuse(strWhat + kindOf(jValue) + ", expected " + szExpected);
+        if (!blFits) fail(strWhat + kindOf(jValue) + ", expected " + szExpected);
     }
 
     // Runs the work in a transaction, or in a savepoint of the host's, and undoes it if it throws.
@@ -417,17 +420,20 @@ private:
     long long call(std::initializer_list<const Json::Value*> arguments, Work work)
     {
         long long iResult = -1;
+        iIndex_ = -1;
         try {
-            if (!strRefused_.empty()) refuse(strRefused_);
+            if (!strRefused_.empty()) fail(strRefused_);
             std::size_t nMembers = 0;
             std::size_t nBytes = 0;
             for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes);
-            checkLimit("the request", limits_.nRequestMembers, nMembers, " members");
-            checkLimit("the request", limits_.nRequestBytes, nBytes, " bytes");
+            checkLimit("the request has", limits_.nRequestMembers, nMembers, " values");
+            checkLimit("the request has", limits_.nRequestBytes, nBytes, " bytes");
             iResult = work();
             end_ = {};
         } catch (const Failure& failure) {
             end_ = failure;
+            if (Cause::kLocked == failure.cause) iIndex_ = -1;
+            if (0 <= iIndex_) end_.strReason.insert(0, "record " + std::to_string(iIndex_) + ": ");
         } catch (const std::bad_alloc&) {
             throw;
         } catch (const std::exception& error) {
@@ -438,12 +444,10 @@ private:
         return iResult;
     }
 
-    static void checkLimit(const std::string& strWhat, std::size_t nMost, std::size_t n,
-                           const char* szUnit)
+    static void checkLimit(const char* szWhat, std::size_t nMost, std::size_t n, const char* szUnit)
     {
         if (0 < nMost && nMost < n)
-            throw Failure{Cause::kLimit,
-                          strWhat + " has more than " + std::to_string(nMost) + szUnit};
+            fail(szWhat + (" more than " + std::to_string(nMost)) + szUnit, Cause::kLimit);
     }
 
     void measure(const Json::Value& jValue, std::size_t& nMembers, std::size_t& nBytes) const
@@ -460,29 +464,29 @@ private:
     // ---- Statements
 
     // Throws what SQLite says about the statement that has just failed.
-    [[noreturn]] void failSql() const
+    [[noreturn]] void failSql()
     {
         const int iCode = sqlite3_extended_errcode(pDb_);
         const int iPrimary = iCode & 0xff;
         const std::string strError = sqlite3_errmsg(pDb_);
         const std::string strSteps = std::to_string(limits_.nSteps);
         if (SQLITE_INTERRUPT == iPrimary && 0 < limits_.nSteps)
-            throw Failure{Cause::kLimit, "a statement takes more than " + strSteps + " steps"};
+            fail("a statement takes more than " + strSteps + " steps", Cause::kLimit);
         if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
-            throw Failure{Cause::kLocked, "locked: " + strError};
+            fail("locked: " + strError, Cause::kLocked);
+        const Cause other = SQLITE_CONSTRAINT == iPrimary ? Cause::kConstraint : Cause::kFailed;
         if (SQLITE_CONSTRAINT_UNIQUE != iCode && SQLITE_CONSTRAINT_PRIMARYKEY != iCode &&
             SQLITE_CONSTRAINT_ROWID != iCode)
-            throw Failure{Cause::kFailed, strError};
+            fail(strError, other);
         // UNIQUE constraint failed: item.name, item.lang
         Texts columns;
-        const std::string strTable = strName_ + ".";
-        const std::size_t n = strTable.size();
         std::istringstream words(strError.substr(strError.find(':') + 1));
         for (std::string strWord; words >> strWord && "index" != strWord;) {
+            const std::size_t uDot = strWord.find('.');
             // A trigger may have written to another table.
-            if (0 != sqlite3_strnicmp(strWord.c_str(), strTable.c_str(), static_cast<int>(n)))
-                throw Failure{Cause::kFailed, strError};
-            columns.push_back(strWord.substr(n, strWord.find(',') - n));
+            if (0 != sqlite3_stricmp(strWord.substr(0, uDot).c_str(), strName_.c_str()))
+                fail(strError, other);
+            columns.push_back(strWord.substr(uDot + 1, strWord.find(',') - uDot - 1));
         }
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
@@ -494,8 +498,7 @@ private:
         const int iChanges = pApi_->runSqlEx(strSql);
         if (0 > iChanges) failSql();
         if (0 <= iRows && iRows != iChanges)
-            throw Failure{Cause::kChanged,
-                          "a trigger or an \"on conflict\" clause ignored a record"};
+            fail("a trigger or an \"on conflict\" clause ignored a record", Cause::kChanged);
         return iChanges;
     }
 
@@ -510,7 +513,7 @@ private:
     }
 
     // The first column of a statement of the table's own; NULL as an empty text.
-    Texts select(const std::string& strSql) const
+    Texts select(const std::string& strSql)
     {
         const auto pStatement = prepare(strSql);
         if (nullptr == pStatement) failSql();
@@ -572,13 +575,13 @@ private:
 
     int open(Json::Value& jDefinition, std::string& strCreate)
     {
-        if (nullptr == pDb_) refuse("the connection is null");
-        if (strCreate.empty()) refuse("the CREATE statement is empty");
+        if (nullptr == pDb_) fail("the connection is null");
+        if (strCreate.empty()) fail("the CREATE statement is empty");
         checkName("table ", strName_);
         const Json::Value jMembers =
             Json::Path("." + strName_ + ".member").resolve(std::as_const(jDefinition));
         if (!jMembers.isObject() || jMembers.empty())
-            refuse("the definition has no members for the table " + quoted(strName_));
+            fail("the definition has no members for the table " + quoted(strName_));
         names_ = jMembers.getMemberNames();
         Json::Value jTypes;
         for (const std::string& strMember : names_) {
@@ -589,32 +592,33 @@ private:
             const auto found = std::find_if(std::begin(kForms), std::end(kForms),
                                             [&](const auto& row) { return row.szWord == strWord; });
             if (std::end(kForms) == found)
-                refuseMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
+                failMember(strMember, "type word " + quoted(strWord) + ", expected " + kWords);
             members_[strMember] = static_cast<Form>(found - std::begin(kForms));
             checkFits(strMember, jMember["cppDefaultValue"], "the default is ");
             for (const char* szKey : {"cpptype", "cppDefaultValue"})
                 if (jMember.isMember(szKey)) jTypes[strMember][szKey] = jMember[szKey];
         }
-        pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strCreate);
-        // The constructor cannot say whether the statement failed.
-        if (0 > pApi_->tableCreate()) failSql();
-        return transact("begin", [&] {
+        // Not the CREATE: the table must not stay if it is refused.
+        std::string strNothing = "select 1";
+        pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strNothing);
+        return transact(prepare("select 1 from " + strName_) ? "begin" : "begin immediate", [&] {
+            run(strCreate);
             lockForReading();
             readColumns();
             if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
-                refuse("table " + quoted(strName_) + ": " + sqlite3_errmsg(pDb_));
+                fail("table " + quoted(strName_) + ": " + sqlite3_errmsg(pDb_));
             // Types are kept by table name for the life of the process.
             const Json::Value& jHeld = VORN_JSON_DB::recType(jDefinition, strName_);
             if (jHeld.toStyledString() != jTypes.toStyledString())
-                refuse("the process already holds the table " + quoted(strName_) +
-                       " with other types; use the same definition or another name");
+                fail("the process already holds the table " + quoted(strName_) +
+                     " with other types; use the same definition or another name");
             return 0;
         });
     }
 
     // Names are written without quotes. SQLite takes some of its words as names, but
     // "current_time" is the time even so.
-    void checkName(const char* szWhat, const std::string& strName) const
+    void checkName(const char* szWhat, const std::string& strName)
     {
         constexpr char kPlain[] = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_0123456789";
         const std::string strSql = join({"with ", " as (select 7 as ", ") select ", "||", " from ",
@@ -622,61 +626,55 @@ private:
                                         strName.c_str());
         if ('9' >= strName[0] || std::string::npos != strName.find_first_not_of(kPlain) ||
             !prepare(strSql) || Texts{"77"} != select(strSql))
-            refuse(
-                szWhat + quoted(strName) +
-                ": expected a name of letters, digits and \"_\" that SQLite takes without quotes");
+            fail(szWhat + quoted(strName) +
+                 ": expected letters, digits and \"_\", and no word of SQLite's");
     }
 
     void readColumns()
     {
         const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
         key_ = select("select name " + strColumns + "pk order by pk");
-        if (key_.empty()) refuse("table " + quoted(strName_) + ": no primary key");
+        if (key_.empty()) fail("table " + quoted(strName_) + ": no primary key");
         // An integer primary key is the rowid itself and has no index.
         const std::string strIndex =
             "select name from pragma_index_list('" + strName_ + "') where origin='pk'";
         blRowidKey_ = select(strIndex).empty();
         for (const std::string& strKey : key_) {
-            const char* szCollation = nullptr;
-            if (SQLITE_OK != sqlite3_table_column_metadata(pDb_, nullptr, strName_.c_str(),
-                                                           strKey.c_str(), nullptr, &szCollation,
-                                                           nullptr, nullptr, nullptr))
-                failSql();
-            const Texts other =
-                select(join({"select 1 from pragma_index_xinfo((", strIndex, ")) where name='",
-                             strKey, "' and coll<>'", szCollation, "' collate nocase"},
-                            ""));
-            if (!other.empty())
-                refuseMember(strKey, "the primary key has another collation than the column");
+            const char* szCollation = "";
+            sqlite3_table_column_metadata(pDb_, nullptr, strName_.c_str(), strKey.c_str(), nullptr,
+                                          &szCollation, nullptr, nullptr, nullptr);
+            const Texts keys = select("select coll from pragma_index_xinfo((" + strIndex +
+                                      ")) where name='" + strKey + "'");
+            if (!blRowidKey_ && 0 != sqlite3_stricmp(keys[0].c_str(), szCollation))
+                failMember(strKey, "the primary key has another collation than the column");
         }
-        const std::string strTypes = "select type " + strColumns + "name='";
         for (const std::string& strMember : names_) {
-            const Texts types = select(join({strTypes, strMember, "'"}, ""));
-            if (types.empty()) refuseMember(strMember, "the table has no column of this name");
+            const Texts types = select("select type " + strColumns + "name='" + strMember + "'");
+            if (types.empty()) failMember(strMember, "the table has no column of this name");
             // Another affinity changes a value or its order.
             const bool blText = kText == formOf(strMember) || isJson(formOf(strMember));
             const std::string strKind = select("select typeof(cast('7' as " + types[0] + "))")[0];
             if (!types[0].empty() && "blob" != strKind && (blText ? "text" : "integer") != strKind)
-                refuseMember(strMember, "column type " + quoted(types[0]) + ", expected " +
-                                            (blText ? "a text column" : "an integer column"));
+                failMember(strMember, "column type " + quoted(types[0]) + ", expected " +
+                                          (blText ? "a text column" : "an integer column"));
         }
         const std::string strAbsent = "select name " + strColumns + "pk or dflt_value is null";
         for (const std::string& strMember : select(strAbsent)) jAbsent_[strMember];
         if (blRowidKey_ && kLong != formOf(key_[0]))
-            refuseMember(key_[0], "over an integer primary key, expected \"long long\"");
+            failMember(key_[0], "over an integer primary key, expected \"long long\"");
         const Texts others = select("select name " + strColumns + "hidden<>1 and name not in ('" +
                                     join(names_, "','") + "')");
         if (!others.empty())
-            refuse("column " + quoted(others[0]) + ": not in the definition; declare it");
+            fail("column " + quoted(others[0]) + ": not in the definition; declare it");
     }
 
     // ---- Values
 
     Form formOf(const std::string& strMember) const
     {
-        if (0 == members_.count(strMember))
-            refuseMember(strMember, "not declared for the table " + quoted(strName_));
-        return members_.at(strMember);
+        const auto found = members_.find(strMember);
+        if (members_.end() != found) return found->second;
+        failMember(strMember, "not declared for the table " + quoted(strName_));
     }
 
     // A text from outside in a reason: one line, and not too long.
@@ -705,16 +703,16 @@ private:
                (kInt == form ? jValue.isInt() : jValue.isInt64());
     }
 
-    void checkFits(const std::string& strMember, const Json::Value& jValue,
-                   const char* szIs = "") const
+    void checkFits(const std::string& strMember, const Json::Value& jValue, const char* szIs = "",
+                   bool blNull = true) const
     {
         const Form form = formOf(strMember);
         const bool blKind = hasKind(form, jValue);
-        if (jValue.isNull() || (blKind && isExact(form, jValue, 1))) return;
+        if (jValue.isNull() ? blNull : blKind && isExact(form, jValue, 1)) return;
         const char* szExpected = !blKind         ? kForms[form].szExpected
                                  : kText == form ? "UTF-8 without NUL bytes"
                                                  : "UTF-8, finite numbers and 1000 levels at most";
-        refuseMember(strMember, szIs + kindOf(jValue) + ", expected " + szExpected);
+        failMember(strMember, szIs + kindOf(jValue) + ", expected " + szExpected);
     }
 
     // Whether a text can hold the value.
@@ -749,14 +747,13 @@ private:
 
     // ---- Writing
 
-    const Json::Value& check(const Json::Value& jRecord, bool blWithKey = false) const
+    const Json::Value& check(const Json::Value& jRecord, bool blKey = false) const
     {
         expect(jRecord.isObject(), "the record is ", jRecord, "an object");
         for (auto it = jRecord.begin(); it != jRecord.end(); ++it) checkFits(it.name(), *it);
         for (const std::string& strKey : key_)
-            if (jRecord[strKey].isNull() &&
-                (blWithKey || (!blRowidKey_ && jRecord.isMember(strKey))))
-                refuseMember(strKey, "missing, expected the whole key");
+            if (jRecord[strKey].isNull() && (blKey || (!blRowidKey_ && jRecord.isMember(strKey))))
+                failMember(strKey, "missing, expected the whole key");
         return jRecord;
     }
 
@@ -772,105 +769,85 @@ private:
         return check(jCopy, !blRowidKey_);
     }
 
-    // (id) in ((1),(2)), (code,lang)=('x','en') or (code,lang)=('y','de')
-    std::string keyIn(const Texts& keys) const
+    // (code,lang)=('x','en')
+    std::string keyIs(const Json::Value& j)
     {
-        const std::string strKey = "(" + join(key_, ",") + ")";
-        if (1 == key_.size()) return strKey + " in (" + join(keys, ",") + ")";
-        return strKey + "=" + join(keys, (" or " + strKey + "=").c_str());
+        return "(" + join(key_, ",") + ")=" + values(key_, j);
     }
 
     // insert into item (id,name) values (1,'x')
-    // Several records are bound to a prepared statement instead; what fails of them is not logged.
-    // Returns the first row.
-    Json::Value insert(const std::vector<const Json::Value*>& records)
+    // Returns the row, or null if it was found by the prepared statements. What cannot be bound to
+    // them goes as text, and so does what fails: the library logs it and tries it again.
+    Json::Value insert(const Json::Value& jSent, sqlite3_stmt* pInsert = nullptr,
+                       sqlite3_stmt* pFind = nullptr)
     {
-        const bool blOne = 1 == records.size();
-        const Texts names = records[0]->getMemberNames();
-        const std::string strSql =
-            "insert into " + strName_ + " (" + join(names, ",") + ") values ";
-        const auto pInsert = prepare(blOne ? "" : strSql + "(:" + join(names, ",:") + ")");
-        Texts keys;
-        for (const Json::Value* pjRecord : records) {
-            if (blOne) run(strSql + values(names, *pjRecord), 1);
-            if (!blOne) insertBound(pInsert.get(), names, *pjRecord);
-            const std::string strRowid = std::to_string(sqlite3_last_insert_rowid(pDb_));
-            keys.push_back(blRowidKey_ ? "(" + strRowid + ")" : values(key_, *pjRecord));
+        Json::Value jCopy;
+        const Json::Value* pjRecord = &filled(jSent, jCopy);
+        const bool blBound = nullptr != pInsert && names_.size() == pjRecord->size();
+        if (blBound) bind({pInsert, pFind}, *pjRecord);
+        if (!blBound || SQLITE_DONE != step(pInsert) || 1 != sqlite3_changes(pDb_)) {
+            const Texts names = pjRecord->getMemberNames();
+            run("insert into " + strName_ + " (" + join(names, ",") + ") values " +
+                    values(names, *pjRecord),
+                1);
         }
-        std::map<std::string, Json::Value> rows;
-        for (Json::Value& jRow : readBack(keyIn(keys), keys.size()))
-            rows[values(key_, jRow)].swap(jRow);
-        for (std::size_t u = 0; u < keys.size(); ++u) compare(*records[u], rows[keys[u]]);
-        return rows[keys[0]];
+        if ((*pjRecord)[key_[0]].isNull()) {
+            jCopy = *pjRecord;
+            jCopy[key_[0]] = Json::Int64(sqlite3_last_insert_rowid(pDb_));
+            pjRecord = &jCopy;
+            if (blBound) bind({pFind}, jCopy);
+        }
+        if (blBound && SQLITE_ROW == step(pFind)) return {};
+        return readBack(keyIs(*pjRecord), *pjRecord)[0];
     }
 
-    // Stores the same as the text. A value that cannot be bound stays NULL, which compare() finds.
-    void insertBound(sqlite3_stmt* pInsert, const Texts& names, const Json::Value& jRecord)
+    int step(sqlite3_stmt* pStatement)
     {
-        if (nullptr == pInsert || names != jRecord.getMemberNames()) failSql();
+        const int iStep = sqlite3_step(pStatement);
+        // After "on conflict rollback", nothing may be written.
+        if (SQLITE_OK != sqlite3_reset(pStatement) && 0 != sqlite3_get_autocommit(pDb_)) failSql();
+        return iStep;
+    }
+
+    // Binds what the text of a record would hold. A value that cannot be bound stays NULL, so the
+    // row will not be found.
+    void bind(std::initializer_list<sqlite3_stmt*> statements, const Json::Value& jRecord)
+    {
         int i = 0;
-        for (auto it = jRecord.begin(); it != jRecord.end(); ++it) {
-            const std::string strName = it.name();
-            const Form form = formOf(strName);
-            std::string strText = kText == form ? it->asString() : "";
-            const std::string strSql = isJson(form) ? literal(strName, *it) : "";
+        for (const auto& [strName, form] : members_) {
+            ++i;
+            const Json::Value& jValue = jRecord[strName];
+            std::string strText = kText == form ? jValue.asString() : "";
+            const std::string strSql = isJson(form) ? literal(strName, jValue) : "";
             for (std::size_t u = 1; u + 1 < strSql.size(); u += '\'' == strSql[u] ? 2 : 1)
                 strText += strSql[u];
-            const char* szText = it->isNull() ? nullptr : strText.data();
-            const sqlite3_uint64 nBytes = strText.size();
-            sqlite3_bind_text64(pInsert, ++i, szText, nBytes, SQLITE_TRANSIENT, SQLITE_UTF8);
-            if (isNumber(form) && !it->isNull()) sqlite3_bind_int64(pInsert, i, it->asInt64());
+            const char* szText = jValue.isNull() ? nullptr : strText.data();
+            for (sqlite3_stmt* pStatement : statements) {
+                if (isNumber(form) && nullptr != szText)
+                    sqlite3_bind_int64(pStatement, i, jValue.asInt64());
+                else
+                    sqlite3_bind_text64(pStatement, i, szText, strText.size(), SQLITE_TRANSIENT,
+                                        SQLITE_UTF8);
+            }
         }
-        sqlite3_step(pInsert);
-        // A record that a trigger ignored fails, too.
-        if (SQLITE_OK != sqlite3_reset(pInsert) || 1 != sqlite3_changes(pDb_)) failSql();
     }
 
-    Json::Value readBack(const std::string& strFilter, std::size_t nRows)
+    // The rows, at least n, which have to hold the values that were sent: a trigger may have
+    // changed them. SQL tells numbers by value and kind.
+    Json::Value readBack(const std::string& strRows, const Json::Value& jSent, std::size_t n = 1)
     {
         Json::Value jRows;
-        addRows(strFilter, jRows);
-        if (jRows.size() != nRows)
-            throw Failure{Cause::kChanged, "a trigger moved or deleted the row that was written"};
-        return jRows;
-    }
-
-    // The members that were sent; the database, or a trigger, may set the others. SQL tells numbers
-    // by value and kind.
-    void compare(const Json::Value& jSent, const Json::Value& jStored)
-    {
+        addRows(strRows, jRows);
         for (auto it = jSent.begin(); it != jSent.end(); ++it) {
-            const std::string strName = it.name();
-            const Json::Value& jRow = jStored[strName];
-            if (blRowidKey_ && it->isNull() && key_[0] == strName) continue;  // SQLite makes it
-            if (*it != jRow && literal(strName, *it) != literal(strName, jRow))
-                throw Failure{
-                    Cause::kChanged,
-                    "member " + quoted(strName) +
-                        ": the row holds another value than was sent; a trigger may have set it"};
+            const std::string str = it.name();
+            const auto same = [&](const Json::Value& jRow) {
+                return *it == jRow[str] || literal(str, *it) == literal(str, jRow[str]);
+            };
+            if (n > jRows.size() || !std::all_of(jRows.begin(), jRows.end(), same))
+                fail("member " + quoted(str) + ": the row differs or is gone; see its triggers",
+                     Cause::kChanged);
         }
-    }
-
-    // Inserts the records from uFrom to before uTo together, or one by one to find what failed.
-    void insertRange(const Json::Value& jRecords, Json::ArrayIndex uFrom, Json::ArrayIndex uTo)
-    {
-        std::vector<Json::Value> copies(uTo - uFrom);
-        std::vector<const Json::Value*> records;
-        try {
-            for (Json::ArrayIndex u = uFrom; u < uTo; ++u)
-                records.push_back(&filled(jRecords[u], copies[u - uFrom]));
-            transact("begin immediate", [&] { return insert(records); });
-        } catch (Failure& failure) {
-            const bool blOne = uFrom + 1 == uTo;
-            const bool blRefused = Cause::kRefused == failure.cause;
-            if (blRefused || (blOne && Cause::kLocked != failure.cause)) {
-                failure.iRecord = uFrom + (blOne ? 0U : static_cast<unsigned>(records.size()));
-                failure.strReason.insert(0, "record " + std::to_string(failure.iRecord) + ": ");
-            }
-            // A trigger may have ended the transaction.
-            if (blOne || blRefused || 0 != sqlite3_get_autocommit(pDb_)) throw;
-            for (Json::ArrayIndex u = uFrom; u < uTo; ++u) insertRange(jRecords, u, u + 1);
-        }
+        return jRows;
     }
 
     // update item set (id,name)=(1,'x') where id=1
@@ -890,31 +867,29 @@ private:
         run("update " + strName_ + " set (" + join(names, ",") + ")=" + values(names, jValues) +
                 " where " + strWhere,
             nRows);
-        for (std::ptrdiff_t i = 0; i < nRows; i += kBatch) {
+        for (std::ptrdiff_t i = 0; i < nRows; i += kPage) {
             const auto begin = terms.begin() + i;
-            const Texts batch(begin, begin + std::min<std::ptrdiff_t>(kBatch, nRows - i));
-            for (const Json::Value& jRow : readBack(join(batch, " or "), batch.size()))
-                compare(jValues, jRow);
+            const Texts batch(begin, begin + std::min<std::ptrdiff_t>(kPage, nRows - i));
+            readBack(join(batch, " or "), jValues, batch.size());
         }
         return nRows;
     }
 
-    long long updateRows(const Json::Value& jCondition, const Json::Value& jValues,
-                         const char* szIfEmpty)
+    long long updateRows(const Json::Value& jCondition, const Json::Value& jValues, bool blAll)
     {
         return call({&jCondition, &jValues}, [&] {
-            const std::string strWhere = condition(jCondition, szIfEmpty);
+            const std::string strWhere = condition(jCondition, blAll);
             check(jValues);
-            if (jValues.empty()) refuse("there are no values to set");
+            if (jValues.empty()) fail("there are no values to set");
             return transact("begin immediate", [&] { return change(strWhere, jValues); });
         });
     }
 
-    long long removeRows(const Json::Value& jCondition, const char* szIfEmpty)
+    long long removeRows(const Json::Value& jCondition, bool blAll)
     {
         return call({&jCondition}, [&] {
-            const std::string strSql =
-                "delete from " + strName_ + " where " + condition(jCondition, szIfEmpty);
+            const auto strSql =
+                "delete from " + strName_ + " where " + condition(jCondition, blAll);
             return transact("begin immediate", [&] { return run(strSql); });
         });
     }
@@ -922,31 +897,32 @@ private:
     // ---- Conditions
 
     // The SQL of a condition; 1 for an empty one.
-    std::string condition(const Json::Value& jCondition, const std::string& strIfEmpty = "")
+    std::string condition(const Json::Value& jCondition, bool blAll = true)
     {
         nTerms_ = 0;
-        const bool blEmpty = jCondition.empty() && !jCondition.isArray();
-        if (blEmpty && !strIfEmpty.empty()) refuse("the condition is empty; " + strIfEmpty);
-        return blEmpty ? "1" : "(" + terms(jCondition, 0) + ")";
+        if (!jCondition.empty() || jCondition.isArray()) return "(" + terms(jCondition, 0) + ")";
+        if (!blAll) fail("the condition is empty; updateAll() and removeAll() take every record");
+        return "1";
     }
 
     // a=1 and ((b=2) or (c=3))
     std::string terms(const Json::Value& jCondition, int iNesting)
     {
         expect(jCondition.isObject(), "the condition is ", jCondition, "an object");
-        if (jCondition.empty()) refuse("a condition in a list is empty");
-        if (10 < iNesting) refuse("operator \"$or\": nested deeper than 10 levels");
+        if (jCondition.empty()) fail("a condition in a list is empty");
+        if (10 < iNesting) fail("the condition has lists nested deeper than 10 levels");
         Texts parts;
         for (const std::string& strName : jCondition.getMemberNames()) {
             const Json::Value& jValue = jCondition[strName];
-            if ("$or" != strName) {
+            const bool blAnd = "$and" == strName;
+            if (!blAnd && "$or" != strName) {
                 parts.push_back(memberTerms(strName, jValue));
                 continue;
             }
-            expect(jValue.isArray() && !jValue.empty(), "operator \"$or\": ", jValue,
-                   "an array of one or more conditions");
+            expect(jValue.isArray() && !jValue.empty(), "operator " + quoted(strName) + ": ",
+                   jValue, "an array of one or more conditions");
             const auto each = [&](const auto& jEach) { return terms(jEach, iNesting + 1); };
-            parts.push_back("((" + join(jValue, ") or (", each) + "))");
+            parts.push_back("((" + join(jValue, blAnd ? ") and (" : ") or (", each) + "))");
         }
         return join(parts, " and ");
     }
@@ -959,7 +935,7 @@ private:
         const bool blAny = std::any_of(names.begin(), names.end(), isOperator);
         const bool blOperators = isJson(formOf(strMember)) ? blAny : jValue.isObject();
         if (!blOperators) return term(strMember, "$eq", jValue);
-        if (names.empty()) refuseMember(strMember, "an empty object, expected operators");
+        if (names.empty()) failMember(strMember, "an empty object, expected operators");
         const auto part = [&](const auto& str) { return term(strMember, str, jValue[str]); };
         return join(names, " and ", part);
     }
@@ -967,7 +943,7 @@ private:
     std::string term(const std::string& strMember, const std::string& strOperator,
                      const Json::Value& jValue)
     {
-        if (300 < ++nTerms_) refuse("the condition has more than 300 terms");
+        if (300 < ++nTerms_) fail("the condition has more than 300 terms");
         if ("$in" == strOperator) return listTerm(strMember, jValue);
         // Its SQL, and the last form that it is for.
         static const std::map<std::string, std::pair<const char*, Form>> operators = {
@@ -975,23 +951,19 @@ private:
             {"$gte", {">=", kLong}},     {"$lt", {"<", kLong}},       {"$lte", {"<=", kLong}},
             {"$like", {" like ", kText}}};
         const auto found = operators.find(strOperator);
-        const std::string strWhat = "operator " + quoted(strOperator) + ": ";
+        const std::string strWhat =
+            "member " + quoted(strMember) + ": operator " + quoted(strOperator) + ": ";
         constexpr char kKnown[] =
             "\"$eq\", \"$ne\", \"$gt\", \"$gte\", \"$lt\", \"$lte\", \"$in\" or \"$like\"";
-        if (operators.end() == found)
-            refuseMember(strMember, strWhat + "unknown, expected " + kKnown);
+        if (operators.end() == found) fail(strWhat + "unknown, expected " + kKnown);
         const auto [szSql, last] = found->second;
         const Form form = formOf(strMember);
         const bool blLike = kText == last;
         if (last < form)
-            refuseMember(strMember,
-                         strWhat + "type word " + quoted(kForms[form].szWord) + ", expected " +
-                             (blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\""));
-        if (kAny != last && jValue.isNull())
-            refuseMember(strMember, kindOf(jValue) + ", expected " + kForms[form].szExpected);
-        checkFits(strMember, jValue);
-        if (blLike && 1000 < jValue.asString().size())
-            refuseMember(strMember, strWhat + "a string of more than 1000 bytes");
+            fail(strWhat + "type word " + quoted(kForms[form].szWord) + ", expected " +
+                 (blLike ? "\"string\"" : "\"string\", \"int\" or \"long long\""));
+        checkFits(strMember, jValue, "", kAny == last);
+        if (blLike && 1000 < jValue.asString().size()) fail(strWhat + "more than 1000 bytes");
         if ("$eq" == strOperator) return equals(strMember, jValue);
         return strMember + szSql + literal(strMember, jValue) + (blLike ? " escape '\\'" : "");
     }
@@ -1024,9 +996,9 @@ private:
             else if ("sort" == strOption)
                 expect(jValue.isArray(), strWhat, jValue, "an array of names");
             else if ("after" == strOption)
-                expect(jValue.isObject(), strWhat, jValue, "a record");
+                expect(jValue.isNull() || jValue.isObject(), strWhat, jValue, "a record");
             else
-                refuse(strWhat + "unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
+                fail(strWhat + "unknown, expected \"sort\", \"limit\", \"offset\" or \"after\"");
         }
     }
 
@@ -1041,7 +1013,7 @@ private:
             blDescending = '-' == strKey[0];
             const std::string strMember = strKey.substr(blDescending ? 1 : 0);
             if (isJson(formOf(strMember)))
-                refuseMember(strMember, "JSON in option \"sort\", expected what has an order");
+                failMember(strMember, "JSON in option \"sort\", expected what has an order");
             keys.emplace_back(strMember, blDescending);
         }
         for (const std::string& strKey : key_) {
@@ -1054,8 +1026,9 @@ private:
 
     // What follows the last record, in parts that an index can find: first the rows that differ
     // from it in the last key only, then those that differ in the one before, and so on.
-    Texts rangesAfter(const SortKeys& keys, const Json::Value& jLast)
+    Texts rangesAfter(const SortKeys& keys, const Json::Value& jLast, bool blStored = false)
     {
+        if (jLast.isNull()) return {"1"};
         check(jLast, true);
         std::string strEqual;
         Texts ranges;
@@ -1070,6 +1043,9 @@ private:
             strEqual += equals(strName, jValue) + " and ";
         }
         std::reverse(ranges.begin(), ranges.end());
+        // Otherwise the next page would begin anywhere.
+        if (blStored && select("select 1 from " + strName_ + " where " + strEqual + "1").empty())
+            fail("the last record of a page reads otherwise than it is stored");
         return ranges;
     }
 
@@ -1081,12 +1057,11 @@ private:
         const auto order = [](const auto& key) { return key.first + (key.second ? " desc" : ""); };
         const std::string strOrder = ") order by " + join(keys, ",", order) + " limit ";
         const std::string strOffset = jOptions.get("offset", 0).asString();
-        const long long iAsked = jOptions.get("limit", Json::Value::maxInt64).asInt64();
-        const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         // One more than allowed shows that there are too many.
-        const long long iLimit = 0 < nMost ? std::min(iAsked, nMost + 1) : iAsked;
-        Texts ranges = {"1"};
-        if (jOptions.isMember("after")) ranges = rangesAfter(keys, jOptions["after"]);
+        const auto nMost = static_cast<long long>(limits_.nAnswerRows);
+        const Json::Int64 iMost = 0 < nMost ? nMost + 1 : Json::Value::maxInt64;
+        const long long iLimit = std::min(iMost, jOptions.get("limit", iMost).asInt64());
+        Texts ranges = rangesAfter(keys, jOptions["after"]);
         // Rows are skipped in all parts together, so they become one.
         if ("0" != strOffset) ranges = {"(" + join(ranges, " or ") + ")"};
         return transact("begin", [&] {
@@ -1094,32 +1069,24 @@ private:
             Json::Value jRecords(Json::arrayValue);
             std::size_t nBytes = 0;
             for (const std::string& strRange : ranges) {
-                std::string strFilter = strWhere + " and ";
-                strFilter.append(strRange).append(strOrder);
-                strFilter.append(std::to_string(iLimit - jRecords.size()))
-                    .append(" offset (" + strOffset);
+                const std::string strLeft = std::to_string(iLimit - jRecords.size());
+                const std::string strFilter = join(
+                    {strWhere, " and ", strRange, strOrder, strLeft, " offset (", strOffset}, "");
                 if (0 < limits_.nAnswerBytes) nBytes += bytesOf(strFilter);
-                checkLimit("the answer", limits_.nAnswerBytes, nBytes, " bytes");
+                checkLimit("the answer has", limits_.nAnswerBytes, nBytes, " bytes");
                 addRows(strFilter, jRecords);
                 if (iLimit == jRecords.size()) break;
             }
-            checkLimit("the answer", limits_.nAnswerRows, jRecords.size(),
+            checkLimit("the answer has", limits_.nAnswerRows, jRecords.size(),
                        " records; use the option \"limit\"");
-            if (!blMore || jRecords.empty() || iLimit > jRecords.size()) return jRecords;
-            // A record that reads otherwise than it is stored would lead to the same page again.
-            const Json::Value& jLast = jRecords[jRecords.size() - 1];
-            const auto isLast = [&](const auto& key) {
-                return equals(key.first, jLast[key.first]);
-            };
-            const std::string strLast = join(keys, " and ", isLast);
-            if (select("select 1 from " + strName_ + " where " + strLast).empty())
-                refuse("the last record of a page reads otherwise than it is stored");
+            if (blMore && !jRecords.empty() && iLimit == jRecords.size())
+                rangesAfter(keys, jRecords[jRecords.size() - 1], true);
             return jRecords;
         });
     }
 
     // Known before the rows take memory.
-    std::size_t bytesOf(const std::string& strFilter) const
+    std::size_t bytesOf(const std::string& strFilter)
     {
         const auto part = [](const auto& s) { return "ifnull(length(cast(" + s + " as blob)),0)"; };
         const std::string strSum = join(names_, "+", part);
@@ -1138,6 +1105,7 @@ private:
     Limits limits_{0, 0, 0, 0, 0};
     std::string strRefused_;  // why the construction was refused
     Failure end_;             // of the last call
+    long long iIndex_ = -1;   // that createMany() is inserting
     int nTerms_ = 0;          // of the condition that is being translated
 };
 

@@ -59,41 +59,14 @@ public:
 private:
     static constexpr char kBegin[] = "begin immediate";
 
-    [[noreturn]] void fail()
+    [[noreturn]] void fail() const
     {
-        if (0 != sqlite3_get_autocommit(table_.database.get())) repeat();
         const long long iRecord = table_.pRecords->record();
-        if (0 > iRecord) throw Failure(reason());
-        fail(static_cast<std::size_t>(iRecord));
-    }
-
-    [[noreturn]] void fail(std::size_t uRecord) const
-    {
-        throw Failure(toString(places_[uRecord]) + ": " + reason());
-    }
-
-    // Without the position, "record 7: ".
-    std::string reason() const
-    {
         const std::string& strReason = table_.pRecords->reason();
-        return 0 > table_.pRecords->record() ? strReason
-                                             : strReason.substr(strReason.find(' ', 7) + 1);
-    }
-
-    // A trigger has ended the transaction, and the table cannot say at which record: it may depend
-    // on records before them.
-    [[noreturn]] void repeat()
-    {
-        const std::string strReason = reason();
-        transaction_.emplace(table_.database.get(), kBegin);
-        for (std::size_t u = 0; u < places_.size(); ++u) {
-            Json::Value jOne;
-            jOne.append(jRecords_[static_cast<Json::ArrayIndex>(u)]);
-            if (0 > table_.pRecords->createMany(jOne)) fail(u);
-        }
-        const Place& last = places_.back();
-        const unsigned long uLast = 0 < last.uRecord ? last.uRecord : last.uLine;
-        throw Failure(toString(places_.front()) + "-" + std::to_string(uLast) + ": " + strReason);
+        if (0 > iRecord) throw Failure(strReason);
+        // Without the position, "record 7: ".
+        throw Failure(toString(places_[static_cast<std::size_t>(iRecord)]) + ": " +
+                      strReason.substr(strReason.find(' ', 7) + 1));
     }
 
     void keep()

@@ -139,7 +139,7 @@ Host::Host(sqlite3* pDb, const std::string& strAuthor)
 Json::Value Host::mine(const Json::Value& jCondition) const
 {
     Json::Value jMine = jAll_;
-    jMine["$or"].append(jCondition);
+    jMine["$and"].append(jCondition);
     return jMine;
 }
 

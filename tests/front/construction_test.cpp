@@ -15,8 +15,7 @@ constexpr char kWords[] =
     ", expected \"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", "
     "\"Json::arrayValue\" or \"Json::Value\"; fractions as integers of the smallest unit, as text "
     "or inside JSON";
-constexpr char kNeedsQuotes[] =
-    ": expected a name of letters, digits and \"_\" that SQLite takes without quotes";
+constexpr char kNeedsQuotes[] = ": expected letters, digits and \"_\", and no word of SQLite's";
 
 std::string word(const char* szWord)
 {
@@ -199,6 +198,25 @@ TEST_F(Construction, RefusesWhatItCannotOpen)
               VornJsonTable(database_.get(), "front_none", jDefinition,
                             "create view if not exists front_none as select 1 as a")
                   .reason());
+}
+
+// So that the statement can be corrected.
+TEST_F(Construction, LeavesNoTableThatItRefuses)
+{
+    const std::string strName = freshName();
+    const char* const kMembers =
+        R"({"id":{"cpptype":"long long"},"tags":{"cpptype":"Json::arrayValue"}})";
+    {
+        Front front(database_, strName, kMembers, "id integer primary key, tags json");
+        EXPECT_EQ(VornJsonTable::Cause::kRefused, front.table->cause());
+        EXPECT_EQ(Rows{}, front.rows("select name from sqlite_master where name = '@'"));
+        database_.run("begin");
+        Front again(database_, strName, kMembers, "id integer primary key, tags json");
+        EXPECT_EQ(Rows{}, again.rows("select name from sqlite_master where name = '@'"));
+        database_.run("commit");
+    }
+    Front front(database_, strName, kMembers, "id integer primary key, tags json text");
+    EXPECT_EQ("0", front.create(json(R"({"tags":[1]})")));
 }
 
 }  // namespace

@@ -17,6 +17,10 @@ constexpr char kColumns[] =
     "any text, flag integer, id integer primary key, list text, name text unique, obj text, "
     "qty integer default 3";
 
+constexpr char kOtherAny[] =
+    "changed: member \"any\": the row differs or is gone; see its triggers";
+constexpr char kOtherName[] =
+    "changed: member \"name\": the row differs or is gone; see its triggers";
 constexpr char kExact[] = ", expected UTF-8, finite numbers and 1000 levels at most";
 
 struct Case {
@@ -150,11 +154,12 @@ TEST_F(Create, TellsOtherConstraintsFromDuplicates)
     front_.run("create table @_log (a unique)");
     front_.run("create trigger @_t after insert on @ begin insert into @_log values (1); end");
     EXPECT_EQ("0", front_.create(json("{}")));
-    expectRefused(front_.named("failed: UNIQUE constraint failed: @_log.a"), json("{}"));
+    expectRefused(front_.named("constraint: UNIQUE constraint failed: @_log.a"), json("{}"));
     Front strict(database_, R"({"a":{"cpptype":"int"},"id":{"cpptype":"long long"}})",
                  "a int not null check (a > 0), id integer primary key");
-    EXPECT_EQ(strict.named("failed: NOT NULL constraint failed: @.a"), strict.create(json("{}")));
-    EXPECT_EQ("failed: CHECK constraint failed: a > 0", strict.create(json(R"({"a":0})")));
+    EXPECT_EQ(strict.named("constraint: NOT NULL constraint failed: @.a"),
+              strict.create(json("{}")));
+    EXPECT_EQ("constraint: CHECK constraint failed: a > 0", strict.create(json(R"({"a":0})")));
 }
 
 TEST_F(Create, UndoesWhatATriggerChanged)
@@ -162,19 +167,11 @@ TEST_F(Create, UndoesWhatATriggerChanged)
     const Case cases[] = {
         {"before insert on @ begin select raise(ignore); end",
          "changed: a trigger or an \"on conflict\" clause ignored a record"},
-        {"after insert on @ begin update @ set name = 'x' where id = new.id; end",
-         "changed: member \"name\": the row holds another value than was sent; a trigger may have "
-         "set "
-         "it"},
-        {"after insert on @ begin update @ set any = '1' where id = new.id; end",
-         "changed: member \"any\": the row holds another value than was sent; a trigger may have "
-         "set "
-         "it"},
-        {"after insert on @ begin delete from @ where id = new.id; end",
-         "changed: a trigger moved or deleted the row that was written"},
-        {"after insert on @ begin update @ set id = id + 1 where id = new.id; end",
-         "changed: a trigger moved or deleted the row that was written"},
-        {"before insert on @ begin select raise(abort, 'not today'); end", "failed: not today"},
+        {"after insert on @ begin update @ set name = 'x' where id = new.id; end", kOtherName},
+        {"after insert on @ begin update @ set any = '1' where id = new.id; end", kOtherAny},
+        {"after insert on @ begin delete from @ where id = new.id; end", kOtherAny},
+        {"after insert on @ begin update @ set id = id + 1 where id = new.id; end", kOtherAny},
+        {"before insert on @ begin select raise(abort, 'not today'); end", "constraint: not today"},
     };
     EXPECT_EQ("0", front_.create(json(R"({"id":1,"name":"first"})")));
     for (const Case& one : cases) {

@@ -208,7 +208,7 @@ TEST_F(FrontLimits, EndACallWithAReason)
 {
     limit(&Limits::nRequestMembers, 3);
     EXPECT_EQ("0", front_.list(json(R"({"id":{"$in":[-1]}})")));
-    const std::string strMembers = "limit: the request has more than 3 members";
+    const std::string strMembers = "limit: the request has more than 3 values";
     EXPECT_EQ(strMembers, front_.list(json(R"({"id":{"$in":[-1,-2]}})")));
     EXPECT_EQ(strMembers, front_.list(json(R"({"id":-1})"), json(R"({"sort":["id","rank"]})")));
     EXPECT_EQ(strMembers, front_.createMany(json(R"([{"id":-1},{"id":-2}])")));
@@ -253,7 +253,7 @@ TEST_F(FrontLimits, HaveDefaultsForStrangers)
               front_.list({}));
     Json::Value jMany;
     for (int i = 0; i < 1000; ++i) jMany["id"]["$in"][i] = i;
-    EXPECT_EQ("limit: the request has more than 1000 members", front_.list(jMany));
+    EXPECT_EQ("limit: the request has more than 1000 values", front_.list(jMany));
 }
 
 // EAGAIN in errno looks like a lock to the library.

@@ -12,6 +12,7 @@ import re
 import subprocess
 import sys
 
+LISTS = {"$or": any, "$and": all}
 ORDERS = {"$gt": operator.gt, "$gte": operator.ge, "$lt": operator.lt, "$lte": operator.le}
 
 
@@ -60,8 +61,8 @@ class Table:
 
     def selects(self, condition, record):
         return all(
-            any(self.selects(each, record) for each in wanted)
-            if name == "$or"
+            LISTS[name](self.selects(each, record) for each in wanted)
+            if name in LISTS
             else self.fits(name, wanted, record.get(name))
             for name, wanted in (condition or {}).items()
         )

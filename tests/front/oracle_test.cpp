@@ -149,11 +149,12 @@ protected:
             names.erase(names.begin() + static_cast<std::ptrdiff_t>(u));
         }
         if (2 < iLevel || !draws_.once(3)) return asked;
-        std::string strGroup = "0";
+        const bool blAll = draws_.once(3);
+        std::string strGroup = blAll ? "1" : "0";
         for (std::size_t n = 1 + draws_.below(3); 0 < n; --n) {
             const Asked inner = this->asked(iLevel + 1);
-            asked.jCondition["$or"].append(inner.jCondition);
-            strGroup += " or (" + inner.strSql + ")";
+            asked.jCondition[blAll ? "$and" : "$or"].append(inner.jCondition);
+            strGroup += (blAll ? " and (" : " or (") + inner.strSql + ")";
             asked.bound.insert(asked.bound.end(), inner.bound.begin(), inner.bound.end());
         }
         // The table writes its terms in the order of their names; the sum is the same.

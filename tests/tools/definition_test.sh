@@ -19,7 +19,7 @@ infers() {
 }
 
 # What is said of a bad name.
-name='expected a name of letters, digits and "_" that SQLite takes without quotes'
+name='expected letters, digits and "_", and no word of SQLite'"'"'s'
 # refuses MESSAGE ARGUMENT...: for the JSON lines on standard input
 refuses() {
     cat >given.jsonl

@@ -83,16 +83,16 @@ triggered() {
     fails "lines:${3:-1200}: $2" import "${item[@]}" lines
 }
 triggered 'after insert on item when new.id = 1200 begin update item set name = '\''y'\'' where id = 1200; end' \
-    'member "name": the row holds another value than was sent; a trigger may have set it'
+    'member "name": the row differs or is gone; see its triggers'
 triggered 'before insert on item when new.id = 1200 begin select raise(ignore); end' \
     'a trigger or an "on conflict" clause ignored a record'
 triggered 'before insert on item when new.id = 1200 begin select raise(abort, '\''not 1200'\''); end' 'not 1200'
 triggered 'before insert on item when new.id = 1200 begin select raise(rollback, '\''record 3: no'\''); end' 'record 3: no'
-# It needs a record of an earlier batch, which has gone with the transaction.
+# It needs a record that has gone with the transaction.
 triggered 'before insert on item when exists (select * from item where id = new.id - 1199 and id > 0)
-    begin select raise(rollback, '\''too many'\''); end' 'too many' 1101-1200
+    begin select raise(rollback, '\''too many'\''); end' 'too many' 1200
 { echo -n '['; paste -sd, lines; echo ']'; } | tr -d '\n' >array
-fails 'array:1, record 1101-1200: too many' import "${item[@]}" array
+fails 'array:1, record 1200: too many' import "${item[@]}" array
 
 # ----------------------------------------------------------------------------------- --batch
 # first N: the ids from 0 to N

@@ -71,7 +71,7 @@ TEST_F(GuardedHost, RefusesWithAReason)
         {"the patterns are too long",
          {list(R"({"$or":[{"title":{"$like":"%1234567890%"}},{"id":{"$ne":7},"body":{"$like":)"
                R"("%123456789012345678"}}]})")}},
-        {"the request has more than 200 members",
+        {"the request has more than 200 values",
          {list(R"({"id":{"$in":[1)" + repeated(198, ",1") + "]}}")}},
     };
     for (const auto& [szReason, lines] : cases)
