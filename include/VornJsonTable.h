@@ -40,7 +40,8 @@
 /// written to the table. After any result, no statement and no transaction of the table's own is
 /// open.
 ///
-/// Exceptions: nothing is thrown except std::bad_alloc, for lack of memory.
+/// Exceptions: nothing is thrown except std::bad_alloc, for lack of memory. After it, reason() and
+/// cause() are still those of an earlier call.
 ///
 /// Transactions: a call that writes runs in a transaction of its own (`begin immediate`), or in a
 /// savepoint if the host has a transaction open; a call that reads runs in a read transaction. Some
@@ -72,11 +73,12 @@
 ///     {"sort": ["-created", "name"], "limit": 10, "offset": 20, "after": <last record>}
 ///
 /// Records come in the order of "sort" ("-" means descending; a missing member sorts as SQLite
-/// sorts NULL: before every value), then by the primary key, in the direction of the last of
-/// "sort". "after" takes the last record of a page and gives what follows it.
+/// sorts NULL: before every value; a member counts once), then by the primary key, in the direction
+/// of the last of "sort". "after" takes the last record of a page and gives what follows it.
 ///
 /// Log: the library logs every statement that SQLite refuses, duplicates too, with the values in
-/// it. What the table itself refuses is not logged. docs/front.md says how to keep values out.
+/// it. What the table itself refuses is not logged, nor what createMany() binds to prepared
+/// statements. docs/front.md says how to keep values out.
 ///
 /// Threads: as for VornJsonDbApi. Do not change the member types of the table through
 /// VORN_JSON_DB::recType(), nor the columns of the table, while the object exists.
@@ -105,17 +107,17 @@ static_assert(201703L <= __cplusplus, "VornJsonTable.h needs C++17");
 /// One SQLite table as a store of JSON records that come back as they were sent.
 class VornJsonTable {
 public:
-    /// Why a call failed.
-    enum class Cause {
-        kNone,        ///< it did not
-        kRefused,     ///< the table, the record or the request cannot be handled exactly
-        kDuplicate,   ///< another record has the same values in the columns of a constraint
-        kLocked,      ///< another connection held a lock for too long
-        kChanged,     ///< the row was ignored, or is not as it was sent: a trigger, as a rule
-        kLimit,       ///< one of the limits was reached
-        kConstraint,  ///< another constraint: not null, check, a foreign key, a trigger's raise()
-        kFailed       ///< SQLite failed: the disk, memory
-    };
+    /// Why a call failed:
+    ///
+    /// - kNone: it did not;
+    /// - kRefused: the table, the record or the request cannot be handled exactly;
+    /// - kDuplicate: another record has the same values in the columns of a constraint;
+    /// - kLocked: another connection held a lock for too long;
+    /// - kChanged: the row was ignored, or is not as it was sent: a trigger, as a rule;
+    /// - kLimit: one of the limits was reached;
+    /// - kInvalid: another constraint: not null, check, a foreign key, a trigger's raise();
+    /// - kFailed: SQLite failed: the disk, memory, a value that is too long.
+    enum class Cause { kNone, kRefused, kDuplicate, kLocked, kChanged, kLimit, kInvalid, kFailed };
 
     /// Limits for requests of strangers. 0 means no limit. The defaults suit a small service.
     struct Limits {
@@ -133,8 +135,9 @@ public:
     using RowCallback = std::function<bool(const Json::Value& jRecord)>;
 
     /// Binds the open connection @p pDb to the table @p strName as @p jDefinition defines it (the
-    /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate, in a transaction; it has to
-    /// succeed if the table already exists (`create table if not exists ...`).
+    /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate: CREATE statements that
+    /// succeed if the table already exists (`create table if not exists ...`). If it does not, they
+    /// run in a transaction, where some pragmas have no effect.
     ///
     /// If the table cannot be handled exactly, cause() is kRefused after the construction, reason()
     /// names the member or column and what to use instead, every operation returns -1 with that
@@ -157,8 +160,7 @@ public:
         strRefused_ = end_.strReason;
     }
 
-    VornJsonTable(const VornJsonTable&) = delete;
-    VornJsonTable& operator=(const VornJsonTable&) = delete;
+    VornJsonTable& operator=(VornJsonTable&&) = delete;  // nor copied
 
     /// Why the last call, or the construction, failed, in words; empty if it did not.
     const std::string& reason() const { return end_.strReason; }
@@ -173,7 +175,7 @@ public:
     /// After createMany() failed: the position of the record that failed, counted from 0; -1 if it
     /// was no single one, such as after a lock, or a constraint that SQLite checks at the commit.
     /// -1 after any other call.
-    long long record() const { return iIndex_; }
+    long long record() const { return end_.iRecord; }
 
     /// The members of the primary key, in its order.
     const std::vector<std::string>& key() const { return key_; }
@@ -210,18 +212,28 @@ public:
         return call({&jRecords}, [&] {
             expect(jRecords.isArray(), "the records are ", jRecords, "an array");
             return transact("begin immediate", [&] {
+                // In a transaction of the host's: from here on, no record meets a lock.
+                run("insert into " + strName_ + " select * from " + strName_ + " where 0");
                 const auto is = [](const auto& str) { return str + " is :" + str; };
                 const auto pInsert = prepare("insert into " + strName_ + " (" + join(names_, ",") +
                                              ") values (:" + join(names_, ",:") + ")");
-                const auto pFind =
-                    prepare("select 1 from " + strName_ + " where " +
-                            join(names_, " collate binary and ", is) + " collate binary and (" +
-                            join(key_, ",") + ")=(:" + join(key_, ",:") + ")");
-                for (const Json::Value& jRecord : jRecords) {
-                    ++iIndex_;
-                    insert(jRecord, pInsert.get(), pFind.get());
+                const std::string strFind = "select 1 from " + strName_ + " where " +
+                                            join(names_, " collate binary and ", is) +
+                                            " collate binary and (" + join(key_, ",") +
+                                            ")=(:" + join(key_, ",:") + ")";
+                // In UTF-16, it would find what SQLite has replaced.
+                const char* szNever = "UTF-8" == select("pragma encoding")[0] ? "" : " and 0";
+                const auto pFind = prepare(strFind + szNever);
+                for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
+                    try {
+                        insert(jRecords[u], pInsert.get(), pFind.get());
+                    } catch (Failure& failure) {
+                        if (Cause::kLocked == failure.cause) throw;
+                        failure.iRecord = u;
+                        failure.strReason.insert(0, "record " + std::to_string(u) + ": ");
+                        throw;
+                    }
                 }
-                iIndex_ = -1;
                 return jRecords.size();
             });
         });
@@ -346,6 +358,7 @@ private:
         Cause cause = Cause::kNone;
         std::string strReason = {};
         Texts columns = {};
+        long long iRecord = -1;
     };
 
     using SortKeys = std::vector<std::pair<std::string, bool>>;  // true: descending
@@ -388,9 +401,9 @@ private:
     {
         const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
         const char* szUndo = blHosts ? "rollback to vorn_table; release vorn_table" : "rollback";
-        run(blHosts ? "savepoint vorn_table" : szBegin);
-        limitSteps(limits_.nSteps);
         try {
+            run(blHosts ? "savepoint vorn_table" : szBegin);
+            limitSteps(limits_.nSteps);
             auto result = work();
             run(blHosts ? "release vorn_table" : "commit");
             limitSteps(0);
@@ -420,7 +433,6 @@ private:
     long long call(std::initializer_list<const Json::Value*> arguments, Work work)
     {
         long long iResult = -1;
-        iIndex_ = -1;
         try {
             if (!strRefused_.empty()) fail(strRefused_);
             std::size_t nMembers = 0;
@@ -432,8 +444,6 @@ private:
             end_ = {};
         } catch (const Failure& failure) {
             end_ = failure;
-            if (Cause::kLocked == failure.cause) iIndex_ = -1;
-            if (0 <= iIndex_) end_.strReason.insert(0, "record " + std::to_string(iIndex_) + ": ");
         } catch (const std::bad_alloc&) {
             throw;
         } catch (const std::exception& error) {
@@ -474,7 +484,7 @@ private:
             fail("a statement takes more than " + strSteps + " steps", Cause::kLimit);
         if (SQLITE_BUSY == iPrimary || SQLITE_LOCKED == iPrimary)
             fail("locked: " + strError, Cause::kLocked);
-        const Cause other = SQLITE_CONSTRAINT == iPrimary ? Cause::kConstraint : Cause::kFailed;
+        const Cause other = SQLITE_CONSTRAINT == iPrimary ? Cause::kInvalid : Cause::kFailed;
         if (SQLITE_CONSTRAINT_UNIQUE != iCode && SQLITE_CONSTRAINT_PRIMARYKEY != iCode &&
             SQLITE_CONSTRAINT_ROWID != iCode)
             fail(strError, other);
@@ -491,15 +501,18 @@ private:
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
 
-    // Runs one statement that gives no rows, and has to change so many if their number is known.
-    // Returns the number of rows changed.
-    int run(const std::string& strSql, long long iRows = -1)
+    // Runs one statement that gives no rows. Returns the number of rows changed.
+    int run(const std::string& strSql)
     {
         const int iChanges = pApi_->runSqlEx(strSql);
         if (0 > iChanges) failSql();
-        if (0 <= iRows && iRows != iChanges)
-            fail("a trigger or an \"on conflict\" clause ignored a record", Cause::kChanged);
         return iChanges;
+    }
+
+    void checkChanges(long long nRows)
+    {
+        if (nRows != sqlite3_changes(pDb_))
+            fail("a trigger or an \"on conflict\" clause ignored a record", Cause::kChanged);
     }
 
     // From here on, no read in the transaction meets a lock.
@@ -601,8 +614,10 @@ private:
         // Not the CREATE: the table must not stay if it is refused.
         std::string strNothing = "select 1";
         pApi_ = std::make_unique<VornJsonDbApi>(pDb_, strName_, jDefinition, strNothing);
-        return transact(prepare("select 1 from " + strName_) ? "begin" : "begin immediate", [&] {
-            run(strCreate);
+        const bool blNew = nullptr == prepare("select 1 from " + strName_);
+        if (!blNew) run(strCreate);
+        return transact(blNew ? "begin immediate" : "begin", [&] {
+            if (blNew) run(strCreate);
             lockForReading();
             readColumns();
             if (!prepare("update " + strName_ + " set " + join(names_, "=null,") + "=null"))
@@ -627,7 +642,7 @@ private:
         if ('9' >= strName[0] || std::string::npos != strName.find_first_not_of(kPlain) ||
             !prepare(strSql) || Texts{"77"} != select(strSql))
             fail(szWhat + quoted(strName) +
-                 ": expected letters, digits and \"_\", and no word of SQLite's");
+                 ": expected letters, digits and \"_\", and no keyword of SQL");
     }
 
     void readColumns()
@@ -776,60 +791,53 @@ private:
     }
 
     // insert into item (id,name) values (1,'x')
-    // Returns the row, or null if it was found by the prepared statements. What cannot be bound to
-    // them goes as text, and so does what fails: the library logs it and tries it again.
+    // What the prepared statements cannot hold goes as text. Returns the row, or null if they have
+    // found it.
     Json::Value insert(const Json::Value& jSent, sqlite3_stmt* pInsert = nullptr,
                        sqlite3_stmt* pFind = nullptr)
     {
         Json::Value jCopy;
         const Json::Value* pjRecord = &filled(jSent, jCopy);
-        const bool blBound = nullptr != pInsert && names_.size() == pjRecord->size();
-        if (blBound) bind({pInsert, pFind}, *pjRecord);
-        if (!blBound || SQLITE_DONE != step(pInsert) || 1 != sqlite3_changes(pDb_)) {
-            const Texts names = pjRecord->getMemberNames();
+        const bool blBound = nullptr != pFind && names_.size() == pjRecord->size();
+        const Texts names = pjRecord->getMemberNames();
+        if (blBound)
+            step(pInsert, *pjRecord);
+        else
             run("insert into " + strName_ + " (" + join(names, ",") + ") values " +
-                    values(names, *pjRecord),
-                1);
-        }
+                values(names, *pjRecord));
+        checkChanges(1);
         if ((*pjRecord)[key_[0]].isNull()) {
             jCopy = *pjRecord;
             jCopy[key_[0]] = Json::Int64(sqlite3_last_insert_rowid(pDb_));
             pjRecord = &jCopy;
-            if (blBound) bind({pFind}, jCopy);
         }
-        if (blBound && SQLITE_ROW == step(pFind)) return {};
+        if (blBound && step(pFind, *pjRecord)) return {};
         return readBack(keyIs(*pjRecord), *pjRecord)[0];
     }
 
-    int step(sqlite3_stmt* pStatement)
-    {
-        const int iStep = sqlite3_step(pStatement);
-        // After "on conflict rollback", nothing may be written.
-        if (SQLITE_OK != sqlite3_reset(pStatement) && 0 != sqlite3_get_autocommit(pDb_)) failSql();
-        return iStep;
-    }
-
-    // Binds what the text of a record would hold. A value that cannot be bound stays NULL, so the
-    // row will not be found.
-    void bind(std::initializer_list<sqlite3_stmt*> statements, const Json::Value& jRecord)
+    // Binds what the text of the record would hold. Returns whether the statement gives a row.
+    bool step(sqlite3_stmt* pStatement, const Json::Value& jRecord)
     {
         int i = 0;
         for (const auto& [strName, form] : members_) {
-            ++i;
             const Json::Value& jValue = jRecord[strName];
             std::string strText = kText == form ? jValue.asString() : "";
             const std::string strSql = isJson(form) ? literal(strName, jValue) : "";
             for (std::size_t u = 1; u + 1 < strSql.size(); u += '\'' == strSql[u] ? 2 : 1)
                 strText += strSql[u];
             const char* szText = jValue.isNull() ? nullptr : strText.data();
-            for (sqlite3_stmt* pStatement : statements) {
-                if (isNumber(form) && nullptr != szText)
-                    sqlite3_bind_int64(pStatement, i, jValue.asInt64());
-                else
-                    sqlite3_bind_text64(pStatement, i, szText, strText.size(), SQLITE_TRANSIENT,
-                                        SQLITE_UTF8);
-            }
+            ++i;
+            if (SQLITE_OK != (isNumber(form) && nullptr != szText
+                                  ? sqlite3_bind_int64(pStatement, i, jValue.asInt64())
+                                  : sqlite3_bind_text64(pStatement, i, szText, strText.size(),
+                                                        SQLITE_TRANSIENT, SQLITE_UTF8)))
+                failSql();
         }
+        sqlite3_stmt_status(pStatement, SQLITE_STMTSTATUS_VM_STEP, 1);  // nSteps is for each step
+        bool blRow = false;
+        while (SQLITE_ROW == sqlite3_step(pStatement)) blRow = true;
+        if (SQLITE_OK != sqlite3_reset(pStatement)) failSql();
+        return blRow;
     }
 
     // The rows, at least n, which have to hold the values that were sent: a trigger may have
@@ -844,7 +852,7 @@ private:
                 return *it == jRow[str] || literal(str, *it) == literal(str, jRow[str]);
             };
             if (n > jRows.size() || !std::all_of(jRows.begin(), jRows.end(), same))
-                fail("member " + quoted(str) + ": the row differs or is gone; see its triggers",
+                fail("member " + quoted(str) + ": the row differs or is gone; see the triggers",
                      Cause::kChanged);
         }
         return jRows;
@@ -865,8 +873,8 @@ private:
         const auto nRows = static_cast<std::ptrdiff_t>(terms.size());
         const Texts names = jValues.getMemberNames();
         run("update " + strName_ + " set (" + join(names, ",") + ")=" + values(names, jValues) +
-                " where " + strWhere,
-            nRows);
+            " where " + strWhere);
+        checkChanges(nRows);
         for (std::ptrdiff_t i = 0; i < nRows; i += kPage) {
             const auto begin = terms.begin() + i;
             const Texts batch(begin, begin + std::min<std::ptrdiff_t>(kPage, nRows - i));
@@ -921,8 +929,10 @@ private:
             }
             expect(jValue.isArray() && !jValue.empty(), "operator " + quoted(strName) + ": ",
                    jValue, "an array of one or more conditions");
-            const auto each = [&](const auto& jEach) { return terms(jEach, iNesting + 1); };
-            parts.push_back("((" + join(jValue, blAnd ? ") and (" : ") or (", each) + "))");
+            Texts list;
+            for (Json::ArrayIndex u = 0; u < jValue.size(); ++u)
+                list.push_back(terms(jValue[u], iNesting + 1));
+            parts.push_back("((" + join(list, blAnd ? ") and (" : ") or (") + "))");
         }
         return join(parts, " and ");
     }
@@ -1007,6 +1017,12 @@ private:
     {
         SortKeys keys;
         bool blDescending = false;
+        // A second time, a member changes nothing.
+        const auto add = [&](const std::string& strMember) {
+            const auto isIt = [&](const auto& key) { return strMember == key.first; };
+            if (std::none_of(keys.begin(), keys.end(), isIt))
+                keys.emplace_back(strMember, blDescending);
+        };
         for (const Json::Value& jKey : jSort) {
             expect(jKey.isString(), "option \"sort\": ", jKey, "the name of a member");
             const std::string strKey = jKey.asString();
@@ -1014,13 +1030,9 @@ private:
             const std::string strMember = strKey.substr(blDescending ? 1 : 0);
             if (isJson(formOf(strMember)))
                 failMember(strMember, "JSON in option \"sort\", expected what has an order");
-            keys.emplace_back(strMember, blDescending);
+            add(strMember);
         }
-        for (const std::string& strKey : key_) {
-            const auto isKey = [&](const auto& key) { return strKey == key.first; };
-            if (std::none_of(keys.begin(), keys.end(), isKey))
-                keys.emplace_back(strKey, blDescending);
-        }
+        std::for_each(key_.begin(), key_.end(), add);
         return keys;
     }
 
@@ -1105,7 +1117,6 @@ private:
     Limits limits_{0, 0, 0, 0, 0};
     std::string strRefused_;  // why the construction was refused
     Failure end_;             // of the last call
-    long long iIndex_ = -1;   // that createMany() is inserting
     int nTerms_ = 0;          // of the condition that is being translated
 };
 

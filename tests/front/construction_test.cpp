@@ -15,7 +15,7 @@ constexpr char kWords[] =
     ", expected \"string\", \"int\", \"long long\", \"bool\", \"Json::objectValue\", "
     "\"Json::arrayValue\" or \"Json::Value\"; fractions as integers of the smallest unit, as text "
     "or inside JSON";
-constexpr char kNeedsQuotes[] = ": expected letters, digits and \"_\", and no word of SQLite's";
+constexpr char kNeedsQuotes[] = ": expected letters, digits and \"_\", and no keyword of SQL";
 
 std::string word(const char* szWord)
 {

@@ -18,9 +18,9 @@ constexpr char kColumns[] =
     "qty integer default 3";
 
 constexpr char kOtherAny[] =
-    "changed: member \"any\": the row differs or is gone; see its triggers";
+    "changed: member \"any\": the row differs or is gone; see the triggers";
 constexpr char kOtherName[] =
-    "changed: member \"name\": the row differs or is gone; see its triggers";
+    "changed: member \"name\": the row differs or is gone; see the triggers";
 constexpr char kExact[] = ", expected UTF-8, finite numbers and 1000 levels at most";
 
 struct Case {
@@ -154,12 +154,11 @@ TEST_F(Create, TellsOtherConstraintsFromDuplicates)
     front_.run("create table @_log (a unique)");
     front_.run("create trigger @_t after insert on @ begin insert into @_log values (1); end");
     EXPECT_EQ("0", front_.create(json("{}")));
-    expectRefused(front_.named("constraint: UNIQUE constraint failed: @_log.a"), json("{}"));
+    expectRefused(front_.named("invalid: UNIQUE constraint failed: @_log.a"), json("{}"));
     Front strict(database_, R"({"a":{"cpptype":"int"},"id":{"cpptype":"long long"}})",
                  "a int not null check (a > 0), id integer primary key");
-    EXPECT_EQ(strict.named("constraint: NOT NULL constraint failed: @.a"),
-              strict.create(json("{}")));
-    EXPECT_EQ("constraint: CHECK constraint failed: a > 0", strict.create(json(R"({"a":0})")));
+    EXPECT_EQ(strict.named("invalid: NOT NULL constraint failed: @.a"), strict.create(json("{}")));
+    EXPECT_EQ("invalid: CHECK constraint failed: a > 0", strict.create(json(R"({"a":0})")));
 }
 
 TEST_F(Create, UndoesWhatATriggerChanged)
@@ -171,7 +170,7 @@ TEST_F(Create, UndoesWhatATriggerChanged)
         {"after insert on @ begin update @ set any = '1' where id = new.id; end", kOtherAny},
         {"after insert on @ begin delete from @ where id = new.id; end", kOtherAny},
         {"after insert on @ begin update @ set id = id + 1 where id = new.id; end", kOtherAny},
-        {"before insert on @ begin select raise(abort, 'not today'); end", "constraint: not today"},
+        {"before insert on @ begin select raise(abort, 'not today'); end", "invalid: not today"},
     };
     EXPECT_EQ("0", front_.create(json(R"({"id":1,"name":"first"})")));
     for (const Case& one : cases) {

@@ -15,8 +15,8 @@
 // The result of a call: its number, or the cause and the reason.
 inline std::string outcomeOf(const VornJsonTable& table, long long iResult)
 {
-    constexpr const char* kCauses[] = {"none",    "refused", "duplicate",  "locked",
-                                       "changed", "limit",   "constraint", "failed"};
+    constexpr const char* kCauses[] = {"none",    "refused", "duplicate", "locked",
+                                       "changed", "limit",   "invalid",   "failed"};
     const std::string strCause = kCauses[static_cast<int>(table.cause())];
     if (0 > iResult) return strCause + ": " + table.reason();
     EXPECT_EQ("none", strCause);

@@ -46,7 +46,7 @@ TEST_F(HostTransaction, BlamesNoRecordForWhatFailsAtTheCommit)
     EXPECT_EQ("", front.table->reason());
     front.run("pragma foreign_keys=on");
     EXPECT_EQ("2", front.createMany(json(R"([{"id":1,"of":2},{"id":2}])")));
-    EXPECT_EQ("constraint: FOREIGN KEY constraint failed",
+    EXPECT_EQ("invalid: FOREIGN KEY constraint failed",
               front.createMany(json(R"([{"id":3},{"id":4,"of":9},{"id":5}])")));
     EXPECT_EQ(-1, front.table->record());
     EXPECT_EQ("2", front.list({}));
@@ -63,7 +63,7 @@ TEST_F(HostTransaction, TriesNothingAgainOutsideTheHostsTransaction)
     EXPECT_EQ(-1, front_.table->createMany(jRecords));
     EXPECT_EQ("record 2: closed", front_.table->reason());
     EXPECT_EQ(2, front_.table->record());
-    EXPECT_EQ(VornJsonTable::Cause::kConstraint, front_.table->cause());
+    EXPECT_EQ(VornJsonTable::Cause::kInvalid, front_.table->cause());
     EXPECT_EQ(1, sqlite3_get_autocommit(database_.get()));
     EXPECT_EQ("0", front_.list({}));
     EXPECT_EQ("4", front_.createMany(jRecords));

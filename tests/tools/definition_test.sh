@@ -19,7 +19,7 @@ infers() {
 }
 
 # What is said of a bad name.
-name='expected letters, digits and "_", and no word of SQLite'"'"'s'
+name='expected letters, digits and "_", and no keyword of SQL'
 # refuses MESSAGE ARGUMENT...: for the JSON lines on standard input
 refuses() {
     cat >given.jsonl

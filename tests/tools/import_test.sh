@@ -83,7 +83,7 @@ triggered() {
     fails "lines:${3:-1200}: $2" import "${item[@]}" lines
 }
 triggered 'after insert on item when new.id = 1200 begin update item set name = '\''y'\'' where id = 1200; end' \
-    'member "name": the row differs or is gone; see its triggers'
+    'member "name": the row differs or is gone; see the triggers'
 triggered 'before insert on item when new.id = 1200 begin select raise(ignore); end' \
     'a trigger or an "on conflict" clause ignored a record'
 triggered 'before insert on item when new.id = 1200 begin select raise(abort, '\''not 1200'\''); end' 'not 1200'
