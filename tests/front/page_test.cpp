@@ -12,7 +12,7 @@ class FrontPage : public FrontTest {
 protected:
     FrontPage()
     {
-        EXPECT_EQ(5U, page_.blocks.size());  // two are included below
+        EXPECT_EQ(6U, page_.blocks.size());  // three are included below
         EXPECT_EQ("", table_.reason());
         EXPECT_EQ(static_cast<long long>(jRecords_.size()), table_.createMany(jRecords_));
     }
@@ -98,7 +98,7 @@ TEST_F(FrontPage, ShowsEachOrder)
 
 TEST_F(FrontPage, ShowsATypeWordAndAColumnForEachKind)
 {
-    for (const auto& row : table(page_, "Which type word and column", 10).rows) {
+    for (const auto& row : table(page_, "Which type word and column", 11).rows) {
         SCOPED_TRACE(row[0]);
         Front kept(database_, R"({"id":{"cpptype":"int"},"m":{"cpptype":")" + row[1] + "\"}}",
                    "id int primary key, m " + row[2]);
@@ -138,6 +138,36 @@ TEST_F(FrontPage, AddsTheConditionOfTheHost)
         counts.push_back(notes.table->count(jCondition));
     }
     EXPECT_EQ((std::vector<long long>{2, 2, 1, 0}), counts);
+}
+
+TEST_F(FrontPage, TellsADuplicate)
+{
+    Front kept(database_, R"({"id":{"cpptype":"int"},"mail":{"cpptype":"string"},
+                              "phone":{"cpptype":"string"},"street":{"cpptype":"string"},
+                              "number":{"cpptype":"int"}})",
+               "id int primary key, mail text not null unique, phone text unique, street text, "
+               "number integer, unique (street, number)");
+    VornJsonTable& users = *kept.table;
+    std::vector<std::string> answers;
+    for (const char* szUser :
+         {R"({"id":1,"mail":"a","phone":"1","street":"s","number":1})", R"({"id":2,"mail":"a"})",
+          R"({"id":1,"mail":"b"})", R"({"id":3,"mail":"c","street":"s","number":1})",
+          R"({"id":4,"mail":"d"})", R"({"id":5,"mail":"e"})", R"({"id":6})"}) {
+        const Json::Value jUser = json(szUser);
+        Json::Value jStored;
+        std::string strAnswer;
+#include "front/TellsADuplicate.inc"
+        answers.push_back(strAnswer);
+    }
+    EXPECT_EQ((std::vector<std::string>{"", "taken: mail\n", "taken: id\n",
+                                        "taken: street\ntaken: number\n", "", "", ""}),
+              answers);
+    EXPECT_EQ(VornJsonTable::Cause::kConstraint, users.cause());
+    EXPECT_EQ("0", kept.save(json(R"({"id":1,"mail":"b"})")));
+    EXPECT_EQ("0", kept.save(json(R"({"id":2,"mail":"a"})")));
+    EXPECT_EQ(4, users.count({}));
+    EXPECT_EQ("duplicate", kept.save(json(R"({"id":9,"mail":"a"})")).substr(0, 9));
+    EXPECT_EQ((std::vector<std::string>{"mail"}), users.columns());
 }
 
 // What another program wrote.
