@@ -654,17 +654,18 @@ private:
         const std::string strIndex =
             "select name from pragma_index_list('" + strName_ + "') where origin='pk'";
         blRowidKey_ = select(strIndex).empty();
-        for (const std::string& strKey : key_) {
+        const Texts collations =
+            select("select coll from pragma_index_xinfo((" + strIndex + ")) where key");
+        for (std::size_t u = 0; u < collations.size(); ++u) {
             const char* szCollation = "";
-            sqlite3_table_column_metadata(pDb_, nullptr, strName_.c_str(), strKey.c_str(), nullptr,
+            sqlite3_table_column_metadata(pDb_, nullptr, strName_.c_str(), key_[u].c_str(), nullptr,
                                           &szCollation, nullptr, nullptr, nullptr);
-            const Texts keys = select("select coll from pragma_index_xinfo((" + strIndex +
-                                      ")) where name='" + strKey + "'");
-            if (!blRowidKey_ && 0 != sqlite3_stricmp(keys[0].c_str(), szCollation))
-                failMember(strKey, "the primary key has another collation than the column");
+            if (0 != sqlite3_stricmp(collations[u].c_str(), szCollation))
+                failMember(key_[u], "the primary key has another collation than the column");
         }
         for (const std::string& strMember : names_) {
-            const Texts types = select("select type " + strColumns + "name='" + strMember + "'");
+            const Texts types =
+                select(join({"select type ", strColumns, "name='", strMember, "'"}, ""));
             if (types.empty()) failMember(strMember, "the table has no column of this name");
             // Another affinity changes a value or its order.
             const bool blText = kText == formOf(strMember) || isJson(formOf(strMember));
