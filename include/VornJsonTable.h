@@ -136,13 +136,13 @@ public:
 
     /// Binds the open connection @p pDb to the table @p strName as @p jDefinition defines it (the
     /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate: CREATE statements that
-    /// succeed if the table already exists (`create table if not exists ...`). If it does not, they
-    /// run in a transaction, where some pragmas have no effect.
+    /// succeed if the table already exists (`create table if not exists ...`). They run in a
+    /// transaction if it does not exist; some pragmas have no effect there.
     ///
     /// If the table cannot be handled exactly, cause() is kRefused after the construction, reason()
-    /// names the member or column and what to use instead, every operation returns -1 with that
-    /// reason, and a table that the statement has just made is gone again. If SQLite fails, the
-    /// cause is kFailed or kLocked: make another object to try again. Refused are
+    /// names the member or column and what to use instead, and every operation returns -1 with that
+    /// reason; if the table did not exist before, it does not exist now. If SQLite fails, every
+    /// operation returns -1 with that reason, too: make another object to try again. Refused are
     ///
     /// - type words other than "string", "int", "long long", "bool", "Json::objectValue",
     ///   "Json::arrayValue" and "Json::Value", and defaults of another kind than the type word;
@@ -160,7 +160,7 @@ public:
         strRefused_ = end_.strReason;
     }
 
-    VornJsonTable& operator=(VornJsonTable&&) = delete;  // nor copied
+    VornJsonTable& operator=(VornJsonTable&&) = delete;  // neither moved nor copied
 
     /// Why the last call, or the construction, failed, in words; empty if it did not.
     const std::string& reason() const { return end_.strReason; }
@@ -173,7 +173,8 @@ public:
     const std::vector<std::string>& columns() const { return end_.columns; }
 
     /// After createMany() failed: the position of the record that failed, counted from 0; -1 if it
-    /// was no single one, such as after a lock, or a constraint that SQLite checks at the commit.
+    /// was no single one, such as after a lock, a constraint that SQLite checks at the commit, or a
+    /// trigger that does not compile.
     /// -1 after any other call.
     long long record() const { return end_.iRecord; }
 
@@ -222,7 +223,8 @@ public:
                                             " collate binary and (" + join(key_, ",") +
                                             ")=(:" + join(key_, ",:") + ")";
                 // In UTF-16, it would find what SQLite has replaced.
-                const char* szNever = "UTF-8" == select("pragma encoding")[0] ? "" : " and 0";
+                const char* szNever =
+                    "61" == select("select hex(cast('a' as blob))")[0] ? "" : " and 0";
                 const auto pFind = prepare(strFind + szNever);
                 for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
                     try {
@@ -401,9 +403,9 @@ private:
     {
         const bool blHosts = 0 == sqlite3_get_autocommit(pDb_);
         const char* szUndo = blHosts ? "rollback to vorn_table; release vorn_table" : "rollback";
+        run(blHosts ? "savepoint vorn_table" : szBegin);
+        limitSteps(limits_.nSteps);
         try {
-            run(blHosts ? "savepoint vorn_table" : szBegin);
-            limitSteps(limits_.nSteps);
             auto result = work();
             run(blHosts ? "release vorn_table" : "commit");
             limitSteps(0);
@@ -501,7 +503,8 @@ private:
         throw Failure{Cause::kDuplicate, "duplicate: " + strError, columns};
     }
 
-    // Runs one statement that gives no rows. Returns the number of rows changed.
+    // Runs statements whose rows do not matter. Returns the number of rows that the last one
+    // changed.
     int run(const std::string& strSql)
     {
         const int iChanges = pApi_->runSqlEx(strSql);
@@ -650,12 +653,13 @@ private:
         const std::string strColumns = "from pragma_table_xinfo('" + strName_ + "') where ";
         key_ = select("select name " + strColumns + "pk order by pk");
         if (key_.empty()) fail("table " + quoted(strName_) + ": no primary key");
-        // An integer primary key is the rowid itself and has no index.
-        const std::string strIndex =
-            "select name from pragma_index_list('" + strName_ + "') where origin='pk'";
-        blRowidKey_ = select(strIndex).empty();
+        // One for each member of the key, which may name it twice.
         const Texts collations =
-            select("select coll from pragma_index_xinfo((" + strIndex + ")) where key");
+            select("select coll from pragma_index_list('" + strName_ +
+                   "') as l, pragma_index_xinfo(l.name) where origin='pk' and key "
+                   "group by cid order by min(seqno)");
+        // An integer primary key is the rowid itself and has no index.
+        blRowidKey_ = collations.empty();
         for (std::size_t u = 0; u < collations.size(); ++u) {
             const char* szCollation = "";
             sqlite3_table_column_metadata(pDb_, nullptr, strName_.c_str(), key_[u].c_str(), nullptr,
@@ -799,13 +803,12 @@ private:
     {
         Json::Value jCopy;
         const Json::Value* pjRecord = &filled(jSent, jCopy);
-        const bool blBound = nullptr != pFind && names_.size() == pjRecord->size();
-        const Texts names = pjRecord->getMemberNames();
+        const bool blBound = pInsert && pFind && names_.size() == pjRecord->size();
         if (blBound)
             step(pInsert, *pjRecord);
         else
-            run("insert into " + strName_ + " (" + join(names, ",") + ") values " +
-                values(names, *pjRecord));
+            run("insert into " + strName_ + " (" + join(pjRecord->getMemberNames(), ",") +
+                ") values " + values(pjRecord->getMemberNames(), *pjRecord));
         checkChanges(1);
         if ((*pjRecord)[key_[0]].isNull()) {
             jCopy = *pjRecord;

@@ -200,6 +200,7 @@ TEST_F(Create, FindsTheRowWhateverTheKey)
         "code text, lang text, primary key (lang, code)",
         "code text, lang text, primary key (lang, code)) without rowid --",
         "code text primary key default (hex(randomblob(8))), lang text",
+        "code text collate nocase, lang text, primary key (code, lang, code)",
     };
     for (const char* szColumns : kKeys) {
         Front front(database_, R"({"code":{"cpptype":"string"},"lang":{"cpptype":"string"}})",

@@ -69,4 +69,24 @@ TEST_F(HostTransaction, TriesNothingAgainOutsideTheHostsTransaction)
     EXPECT_EQ("4", front_.createMany(jRecords));
 }
 
+// A call that cannot begin undoes nothing of the one around it.
+TEST_F(HostTransaction, KeepsACallWhoseTriggerCallsAnotherTable)
+{
+    Front log(database_, R"({"id":{"cpptype":"long long"}})", "id integer primary key");
+    const auto write = [](sqlite3_context* pContext, int, sqlite3_value**) {
+        Json::Value jStored;
+        auto* pLog = static_cast<VornJsonTable*>(sqlite3_user_data(pContext));
+        EXPECT_EQ(-1, pLog->create(json(R"({"id":1})"), jStored));
+        sqlite3_result_null(pContext);
+    };
+    ASSERT_EQ(SQLITE_OK, sqlite3_create_function(database_.get(), "write", 0, SQLITE_UTF8,
+                                                 log.table.get(), write, nullptr, nullptr));
+    front_.run("create trigger @_t after delete on @ begin select write(); end");
+    EXPECT_EQ("2", front_.createMany(json(R"([{"id":1},{"id":2}])")));
+    database_.run("begin");
+    EXPECT_EQ(1, front_.table->remove(json(R"({"id":1})")));
+    database_.run("commit");
+    EXPECT_EQ((Rows{{"2"}}), front_.rows("select id from @"));
+}
+
 }  // namespace
