@@ -476,7 +476,7 @@ private:
     // ---- Statements
 
     // Throws what SQLite says about the statement that has just failed.
-    [[noreturn]] void failSql()
+    [[noreturn]] void failSql() const
     {
         const int iCode = sqlite3_extended_errcode(pDb_);
         const int iPrimary = iCode & 0xff;
@@ -512,7 +512,7 @@ private:
         return iChanges;
     }
 
-    void checkChanges(long long nRows)
+    void checkChanges(long long nRows) const
     {
         if (nRows != sqlite3_changes(pDb_))
             fail("a trigger or an \"on conflict\" clause ignored a record", Cause::kChanged);
@@ -529,7 +529,7 @@ private:
     }
 
     // The first column of a statement of the table's own; NULL as an empty text.
-    Texts select(const std::string& strSql)
+    Texts select(const std::string& strSql) const
     {
         const auto pStatement = prepare(strSql);
         if (nullptr == pStatement) failSql();
@@ -636,7 +636,7 @@ private:
 
     // Names are written without quotes. SQLite takes some of its words as names, but
     // "current_time" is the time even so.
-    void checkName(const char* szWhat, const std::string& strName)
+    void checkName(const char* szWhat, const std::string& strName) const
     {
         constexpr char kPlain[] = "abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_0123456789";
         const std::string strSql = join({"with ", " as (select 7 as ", ") select ", "||", " from ",
@@ -1102,7 +1102,7 @@ private:
     }
 
     // Known before the rows take memory.
-    std::size_t bytesOf(const std::string& strFilter)
+    std::size_t bytesOf(const std::string& strFilter) const
     {
         const auto part = [](const auto& s) { return "ifnull(length(cast(" + s + " as blob)),0)"; };
         const std::string strSum = join(names_, "+", part);
