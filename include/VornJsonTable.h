@@ -218,14 +218,12 @@ public:
                 const auto is = [](const auto& str) { return str + " is :" + str; };
                 const auto pInsert = prepare("insert into " + strName_ + " (" + join(names_, ",") +
                                              ") values (:" + join(names_, ",:") + ")");
-                const std::string strFind = "select 1 from " + strName_ + " where " +
-                                            join(names_, " collate binary and ", is) +
-                                            " collate binary and (" + join(key_, ",") +
-                                            ")=(:" + join(key_, ",:") + ")";
                 // In UTF-16, it would find what SQLite has replaced.
-                const char* szNever =
-                    "61" == select("select hex(cast('a' as blob))")[0] ? "" : " and 0";
-                const auto pFind = prepare(strFind + szNever);
+                const char* szNever = "UTF-8" == select("pragma encoding")[0] ? "" : " and 0";
+                const auto pFind =
+                    prepare("select 1 from " + strName_ + " where " +
+                            join(names_, " collate binary and ", is) + " collate binary and (" +
+                            join(key_, ",") + ")=(:" + join(key_, ",:") + ")" + szNever);
                 for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
                     try {
                         insert(jRecords[u], pInsert.get(), pFind.get());
@@ -1076,7 +1074,9 @@ private:
         // One more than allowed shows that there are too many.
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
         const Json::Int64 iMost = 0 < nMost ? nMost + 1 : Json::Value::maxInt64;
-        const long long iLimit = std::min(iMost, jOptions.get("limit", iMost).asInt64());
+        const long long iLimit = jOptions.get("limit", iMost).asInt64();
+        checkLimit("option \"limit\":", limits_.nAnswerRows, jOptions.get("limit", 0).asUInt64(),
+                   " records");
         Texts ranges = rangesAfter(keys, jOptions["after"]);
         // Rows are skipped in all parts together, so they become one.
         if ("0" != strOffset) ranges = {"(" + join(ranges, " or ") + ")"};
