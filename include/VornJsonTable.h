@@ -66,7 +66,8 @@
 ///
 /// JSON members know `$eq`, `$ne`, `$in` and null, and compare their stored text. For such
 /// a member an object without a key that begins with "$" is a value; write `{"$eq": value}` if the
-/// value comes from outside. docs/front.md shows the SQL for each operator and type word.
+/// value comes from outside. The page "The table for requests from people" of the documentation
+/// shows the SQL for each operator and type word.
 ///
 /// Options of list() and each(), an object or null:
 ///
@@ -78,7 +79,7 @@
 ///
 /// Log: the library logs every statement that SQLite refuses, duplicates too, with the values in
 /// it. What the table itself refuses is not logged, nor what createMany() binds to prepared
-/// statements. docs/front.md says how to keep values out.
+/// statements. The same page says how to keep values out.
 ///
 /// Threads: as for VornJsonDbApi. Do not change the member types of the table through
 /// VORN_JSON_DB::recType(), nor the columns of the table, while the object exists.
@@ -136,13 +137,17 @@ public:
 
     /// Binds the open connection @p pDb to the table @p strName as @p jDefinition defines it (the
     /// shape is that of VORN_JSON_DB::recType) and runs @p strCreate: CREATE statements that
-    /// succeed if the table already exists (`create table if not exists ...`). They run in a
-    /// transaction if it does not exist; some pragmas have no effect there.
+    /// succeed if the table already exists (`create table if not exists ...`, which leaves it the
+    /// constraints and defaults that it has). They run in a transaction if it does not exist; some
+    /// pragmas have no effect there. In the definition, keys of a member other than "cpptype" and
+    /// "cppDefaultValue" are ignored.
     ///
     /// If the table cannot be handled exactly, cause() is kRefused after the construction, reason()
     /// names the member or column and what to use instead, and every operation returns -1 with that
     /// reason; if the table did not exist before, it does not exist now. If SQLite fails, every
-    /// operation returns -1 with that reason, too: make another object to try again. Refused are
+    /// operation returns -1 with that reason and cause, too: make another object to try again.
+    ///
+    /// Refused are
     ///
     /// - type words other than "string", "int", "long long", "bool", "Json::objectValue",
     ///   "Json::arrayValue" and "Json::Value", and defaults of another kind than the type word;
@@ -157,7 +162,7 @@ public:
         : pDb_(pDb), strName_(std::move(strName))
     {
         call({}, [&] { return open(jDefinition, strCreate); });
-        strRefused_ = end_.strReason;
+        refused_ = end_;
     }
 
     VornJsonTable& operator=(VornJsonTable&&) = delete;  // neither moved nor copied
@@ -169,7 +174,7 @@ public:
     Cause cause() const { return end_.cause; }
 
     /// After a duplicate: the columns of the constraint, in its order; empty for an index on
-    /// expressions.
+    /// expressions. Of several such constraints, SQLite names one, not always the primary key.
     const std::vector<std::string>& columns() const { return end_.columns; }
 
     /// After createMany() failed: the position of the record that failed, counted from 0; -1 if it
@@ -218,12 +223,11 @@ public:
                 const auto is = [](const auto& str) { return str + " is :" + str; };
                 const auto pInsert = prepare("insert into " + strName_ + " (" + join(names_, ",") +
                                              ") values (:" + join(names_, ",:") + ")");
-                // In UTF-16, it would find what SQLite has replaced.
-                const char* szNever = "UTF-8" == select("pragma encoding")[0] ? "" : " and 0";
-                const auto pFind =
-                    prepare("select 1 from " + strName_ + " where " +
-                            join(names_, " collate binary and ", is) + " collate binary and (" +
-                            join(key_, ",") + ")=(:" + join(key_, ",:") + ")" + szNever);
+                // In UTF-16, where "a" takes two bytes, it would find what SQLite has replaced.
+                const auto pFind = prepare(
+                    "select 1 from " + strName_ + " where length(cast('a' as blob))=1 and " +
+                    join(names_, " collate binary and ", is) + " collate binary and (" +
+                    join(key_, ",") + ")=(:" + join(key_, ",:") + ")");
                 for (Json::ArrayIndex u = 0; u < jRecords.size(); ++u) {
                     try {
                         insert(jRecords[u], pInsert.get(), pFind.get());
@@ -240,9 +244,10 @@ public:
     }
 
     /// Updates the row that has the key of @p jRecord, or inserts the record as create() does, and
-    /// sets @p jStored to the row as it was read back. The record must contain the whole key.
-    /// Members left out keep their value, unless a trigger sets them. No other row is touched: a
-    /// conflict with another constraint is a duplicate. Returns 0 or -1.
+    /// sets @p jStored to the row as it was read back. The record must contain the whole key, which
+    /// is stored as it is spelt here, even if the column ignores case. Members left out keep their
+    /// value, unless a trigger sets them. No other row is touched: a conflict with another
+    /// constraint is a duplicate. Returns 0 or -1.
     int save(const Json::Value& jRecord, Json::Value& jStored)
     {
         return static_cast<int>(call({&jRecord}, [&] {
@@ -269,9 +274,10 @@ public:
     /// Calls @p callback with each record that the condition selects, in the order of the options.
     /// It reads pages of 200 records, or of nAnswerRows if that is less, so it needs the memory of
     /// one page. Each page is read as a whole before its records are handed out, and no statement
-    /// is open meanwhile, so the callback may use the table. Open a transaction around the call if
-    /// all pages have to show the same state. If the last record of a page reads otherwise than
-    /// another program stored it, the call ends with kRefused.
+    /// is open meanwhile, so the callback may use the table; but if it changes the key or a member
+    /// of "sort" so that records move on to later pages, they come again, perhaps without end. Open
+    /// a transaction around the call if all pages have to show the same state. If the last record
+    /// of a page reads otherwise than another program stored it, the call ends with kRefused.
     ///
     /// Returns the number of calls, also if the callback stopped, or -1. If the callback throws
     /// anything but std::bad_alloc, the result is -1 with its message as the reason.
@@ -300,7 +306,7 @@ public:
     }
 
     /// Sets @p jRecord to the first record, in the order of the key, that the condition selects.
-    /// Returns 1, or 0 if there is none, or -1.
+    /// Returns 1; or 0 if there is none, or -1, and leaves @p jRecord as it was.
     int get(const Json::Value& jCondition, Json::Value& jRecord)
     {
         Json::Value jOptions, jRecords;
@@ -434,7 +440,7 @@ private:
     {
         long long iResult = -1;
         try {
-            if (!strRefused_.empty()) fail(strRefused_);
+            if (!refused_.strReason.empty()) throw Failure(refused_);
             std::size_t nMembers = 0;
             std::size_t nBytes = 0;
             for (const Json::Value* pjArgument : arguments) measure(*pjArgument, nMembers, nBytes);
@@ -704,7 +710,7 @@ private:
     static std::string kindOf(const Json::Value& jValue)
     {
         constexpr const char* kKinds[] = {
-            "null",     "the integer ", "the integer ", "a number with a fraction",
+            "null",     "the integer ", "the integer ", "a floating-point number",
             "a string", "a boolean",    "an array",     "an object"};
         const bool blInteger = jValue.isIntegral() && Json::realValue != jValue.type();
         return kKinds[jValue.type()] + (blInteger ? jValue.asString() : "");
@@ -930,7 +936,7 @@ private:
                 continue;
             }
             expect(jValue.isArray() && !jValue.empty(), "operator " + quoted(strName) + ": ",
-                   jValue, "an array of one or more conditions");
+                   jValue, "one or more conditions in an array");
             Texts list;
             for (Json::ArrayIndex u = 0; u < jValue.size(); ++u)
                 list.push_back(terms(jValue[u], iNesting + 1));
@@ -1004,7 +1010,7 @@ private:
             const std::string strWhat = "option " + quoted(strOption) + ": ";
             if ("limit" == strOption || "offset" == strOption)
                 expect(hasKind(kLong, jValue) && 0 <= jValue.asInt64(), strWhat, jValue,
-                       "an integer from 0");
+                       "an integer from 0 to 9223372036854775807");
             else if ("sort" == strOption)
                 expect(jValue.isArray(), strWhat, jValue, "an array of names");
             else if ("after" == strOption)
@@ -1073,7 +1079,8 @@ private:
         const std::string strOffset = jOptions.get("offset", 0).asString();
         // One more than allowed shows that there are too many.
         const auto nMost = static_cast<long long>(limits_.nAnswerRows);
-        const Json::Int64 iMost = 0 < nMost ? nMost + 1 : Json::Value::maxInt64;
+        const Json::Int64 iMost =
+            0 < nMost && Json::Value::maxInt64 > nMost ? nMost + 1 : Json::Value::maxInt64;
         const long long iLimit = jOptions.get("limit", iMost).asInt64();
         checkLimit("option \"limit\":", limits_.nAnswerRows, jOptions.get("limit", 0).asUInt64(),
                    " records");
@@ -1119,9 +1126,9 @@ private:
     Texts key_;
     bool blRowidKey_ = false;  // the key is the integer primary key
     Limits limits_{0, 0, 0, 0, 0};
-    std::string strRefused_;  // why the construction was refused
-    Failure end_;             // of the last call
-    int nTerms_ = 0;          // of the condition that is being translated
+    Failure refused_;  // of the construction
+    Failure end_;      // of the last call
+    int nTerms_ = 0;   // of the condition that is being translated
 };
 
 #endif

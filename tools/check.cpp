@@ -35,7 +35,7 @@ std::string kindOf(const Cell& cell)
 {
     switch (cell.type()) {
     case SQLITE_INTEGER: return "the integer " + std::to_string(cell.integer());
-    case SQLITE_FLOAT: return "a number with a fraction";
+    case SQLITE_FLOAT: return "a floating-point number";
     case SQLITE_TEXT: return "text";
     default: return "a blob";
     }

@@ -81,7 +81,7 @@ TEST_F(Create, RefusesWhatCannotBeStoredExactly)
          "refused: member \"qty\": a string, expected an integer from "
          "-2147483648 to 2147483647"},
         {R"({"qty":1.0})",
-         "refused: member \"qty\": a number with a fraction, expected an integer "
+         "refused: member \"qty\": a floating-point number, expected an integer "
          "from -2147483648 to 2147483647"},
         {R"({"qty":2147483648})",
          "refused: member \"qty\": the integer 2147483648, expected an "
@@ -109,7 +109,7 @@ TEST_F(Create, RefusesWhatCannotBeStoredExactly)
     jRecord.clear();
     for (const double dValue : {HUGE_VAL, -HUGE_VAL, std::nan("")}) {
         jRecord["any"] = dValue;
-        expectRefused(std::string("refused: member \"any\": a number with a fraction") + kExact,
+        expectRefused(std::string("refused: member \"any\": a floating-point number") + kExact,
                       jRecord);
     }
 }

@@ -140,8 +140,11 @@ TEST_F(FrontLocks, KeepTheConstructionFromReading)
         database_.get(), front_->strName, jDefinition,
         front_->named(std::string("create table if not exists @ (") + kColumns + ")"));
     EXPECT_EQ("locked: database is locked", table.reason());
-    EXPECT_EQ(VornJsonTable::Cause::kLocked, table.cause());
     other_.run("commit");
+    EXPECT_EQ(VornJsonTable::Cause::kLocked, table.cause());
+    EXPECT_EQ(-1, table.count({}));
+    EXPECT_EQ("locked: database is locked", table.reason());
+    EXPECT_EQ(VornJsonTable::Cause::kLocked, table.cause());
 }
 
 }  // namespace

@@ -80,7 +80,7 @@ TEST_F(FrontPage, ShowsWhatIsRefused)
         EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
         EXPECT_EQ(std::vector<std::string>(), takeStatements());
     }
-    for (const auto& row : table(page_, "What the options refuse", 13).rows) {
+    for (const auto& row : table(page_, "What the options refuse", 14).rows) {
         EXPECT_EQ(row[1], listed("null", row[0])) << row[0];
         EXPECT_EQ(VornJsonTable::Cause::kRefused, table_.cause());
         EXPECT_EQ(std::vector<std::string>(), takeStatements());
