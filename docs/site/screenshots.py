@@ -10,8 +10,8 @@ import sys
 
 from browser import browser
 
-PAGES = ("index", "requests", "types", "limits", "log", "performance", "design", "examples",
-         "files/examples_first_steps.cpp", "reference/classVornJsonDbApi")
+PAGES = ("index", "requests", "front", "types", "limits", "log", "performance", "operating", "design",
+         "reference/classVornJsonDbApi")
 WIDTHS = (400, 1280)
 COLOURS = ("light", "dark")
 HIGHEST = 6000
