@@ -96,6 +96,26 @@ TEST_F(FrontPage, ShowsEachOrder)
     }
 }
 
+TEST_F(FrontPage, SortsUnderTheCollationOfAColumn)
+{
+    for (const auto& [strColumn, strSorted, nFound] :
+         {std::tuple("text", R"([null,"Zebra","apple","bee"])", 1),
+          std::tuple("text collate nocase", R"([null,"apple","bee","Zebra"])", 2)}) {
+        Front kept(database_, R"({"id":{"cpptype":"int"},"m":{"cpptype":"string"}})",
+                   std::string("id int primary key, m ") + strColumn);
+        kept.run("insert into @ values (1, 'Zebra'), (2, 'bee'), (3, 'apple'), (4, null)");
+        Json::Value jOptions = json(R"({"sort":["m"],"limit":1})");
+        Json::Value jNames(Json::arrayValue);
+        Json::Value jPage;
+        while (1 == kept.table->list({}, jOptions, jPage)) {
+            jNames.append(jPage[0]["m"]);
+            jOptions["after"] = jPage[0];
+        }
+        EXPECT_EQ(json(strSorted), jNames);
+        EXPECT_EQ(nFound, kept.table->count(json(R"({"m":{"$in":["apple","ZEBRA"]}})")));
+    }
+}
+
 TEST_F(FrontPage, ShowsATypeWordAndAColumnForEachKind)
 {
     for (const auto& row : table(page_, "Which type word and column", 11).rows) {

@@ -37,6 +37,16 @@ same 'standard input' '{"imported":1}' "$("$program" import "${item[@]}" <<<'{"i
 same 'standard input by name' '{"imported":1}' "$("$program" import "${item[@]}" - <<<'{"id": 8}')"
 same 'both' 7,8 "$(ids)"
 
+# The example of the manual page for comma-separated values.
+table book 'isbn text primary key, title text, year integer' isbn=string title=string year='long long'
+printf 'isbn,title,year\n007,"a, ""b""",1999\n008,100%%,\n' >books.csv
+made=$(sqlite3 :memory: '.mode csv' '.import books.csv t' '.mode json' \
+    "select isbn, title, cast(nullif(year, '') as integer) as year from t" |
+    "$program" import library.db book.json)
+same 'from comma-separated values' '{"imported":2}' "$made"
+same 'what they held' $'{"isbn":"007","title":"a, \\"b\\"","year":1999}\n{"isbn":"008","title":"100%"}' \
+    "$("$program" list library.db book)"
+
 # ------------------------------------------------------------------------- which line it names
 # A line in each part of a batch: the lines before and after it are good.
 # batch LINE TEXT: 2,500 lines, one of which is the text
