@@ -111,7 +111,7 @@ mkdir -p "$work/removed/usr/include" "$work/removed/usr/share/man"
 : >"$work/removed/usr/include/other.h"
 (cd "$work/removed" && find . | LC_ALL=C sort) >"$work/before"
 # shellcheck disable=SC2016 # the marks of a block
-sed -n '/^To remove it again, /,/^ldconfig$/p' "$source/README.md" |
+sed -n '/^To uninstall it, /,/^ldconfig$/p' "$source/README.md" |
     sed -n '/^xargs/p' | sed "s|build/install/|$work/build/|" >"$work/remove.sh"
 [ "$(wc -l <"$work/remove.sh")" = 2 ] || fail "the README removes it otherwise"
 for _ in 1 2; do
