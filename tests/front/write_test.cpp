@@ -241,4 +241,20 @@ TEST_F(Write, SavesMembersThatMayNotBeLeftOut)
     EXPECT_EQ(json(R"({"id":1,"n":2,"text":"x"})"), front.jStored);
 }
 
+TEST_F(Write, TellsAFullDatabase)
+{
+    begin(kTwo);
+    database_.run("pragma max_page_count = 1");  // no more than there are
+    Json::Value jBig;
+    jBig["name"] = std::string(100000, 'x');
+    Json::Value jBigs;
+    jBigs.append(jBig);
+    const std::string strFull = "database or disk is full";
+    expectUnchanged("failed: " + strFull, front_.create(jBig));
+    expectUnchanged("failed: record 0: " + strFull, front_.createMany(jBigs));
+    expectUnchanged("failed: " + strFull, front_.update(json(R"({"id":1})"), jBig));
+    jBig["id"] = 1;
+    expectUnchanged("failed: " + strFull, front_.save(jBig));
+}
+
 }  // namespace
