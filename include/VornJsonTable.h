@@ -232,7 +232,6 @@ public:
                     try {
                         insert(jRecords[u], pInsert.get(), pFind.get());
                     } catch (Failure& failure) {
-                        if (Cause::kLocked == failure.cause) throw;
                         failure.iRecord = u;
                         failure.strReason.insert(0, "record " + std::to_string(u) + ": ");
                         throw;
